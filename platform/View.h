@@ -1,0 +1,211 @@
+#pragma once
+
+#include <memory>
+#include <vector>
+
+#include "platform/Bitmap.h"
+#include "platform/Font.h"
+#include "platform/Handler.h"
+#include "platform/Rect.h"
+#include "platform/Region.h"
+
+class BWindow;
+struct ViewPeer;
+
+// Which edges of the parent a view's edges follow when the parent is resized. A view that follows both of two opposite
+// edges grows and shrinks.
+constexpr uint32 B_FOLLOW_NONE = 0;
+constexpr uint32 B_FOLLOW_LEFT = 0x0001;
+constexpr uint32 B_FOLLOW_RIGHT = 0x0002;
+constexpr uint32 B_FOLLOW_LEFT_RIGHT = 0x0003;
+constexpr uint32 B_FOLLOW_H_CENTER = 0x0004;
+constexpr uint32 B_FOLLOW_TOP = 0x0010;
+constexpr uint32 B_FOLLOW_BOTTOM = 0x0020;
+constexpr uint32 B_FOLLOW_TOP_BOTTOM = 0x0030;
+constexpr uint32 B_FOLLOW_V_CENTER = 0x0040;
+constexpr uint32 B_FOLLOW_ALL_SIDES = 0x0033;
+constexpr uint32 B_FOLLOW_ALL = B_FOLLOW_ALL_SIDES;
+
+constexpr uint32 B_WILL_DRAW = 0x01;
+constexpr uint32 B_FRAME_EVENTS = 0x02;
+constexpr uint32 B_NAVIGABLE = 0x04;
+constexpr uint32 B_PULSE_NEEDED = 0x08;
+constexpr uint32 B_FULL_UPDATE_ON_RESIZE = 0x10;
+
+enum drawing_mode { B_OP_COPY, B_OP_OVER };
+
+// Pointer buttons and modifier keys, as GetMouse and modifiers report them.
+constexpr uint32 B_PRIMARY_MOUSE_BUTTON = 1;
+constexpr uint32 B_SECONDARY_MOUSE_BUTTON = 2;
+constexpr uint32 B_TERTIARY_MOUSE_BUTTON = 4;
+constexpr uint32 B_SHIFT_KEY = 1;
+constexpr uint32 B_COMMAND_KEY = 2;
+constexpr uint32 B_CONTROL_KEY = 4;
+
+// The modifier keys held down as of the last event. Any thread.
+uint32 modifiers();
+
+// A rectangle of a window that draws itself, takes the pointer and keys, and holds child views. A child belongs to its
+// parent, which deletes it; RemoveChild hands it back. Coordinates are those of the view's own bounds, in logical
+// pixels; rectangles include their edges.
+//
+// Drawing happens inside Draw, while the layer runs a paint pass (of the screen, of a picture in a test or of a printed
+// page); the same call at any other time draws nothing and asks for a paint pass instead. Shapes and text are smooth.
+// Everything but GetMouse is for the interface thread, with the window's lock held once the view is in a window.
+class BView : public BHandler {
+  public:
+    // frame is in the parent's coordinates; flags are the B_WILL_DRAW family.
+    BView(BRect frame, const char* name, uint32 resizingMode, uint32 flags);
+    ~BView() override;
+
+    void SetName(const char* name) override;
+    [[nodiscard]] BLooper* Looper() const override;
+
+    // --- the tree ---
+    // Takes ownership. A view that is in a tree already is refused.
+    void AddChild(BView* child);
+    // Gives the child back to the caller; false when it is not a child of this view.
+    bool RemoveChild(BView* child);
+    bool RemoveSelf();
+    [[nodiscard]] BView* Parent() const { return parent_; }
+    [[nodiscard]] BWindow* Window() const { return window_; }
+    [[nodiscard]] int32 CountChildren() const { return static_cast<int32>(children_.size()); }
+    [[nodiscard]] BView* ChildAt(int32 index) const;
+    // This view or the first below it that has the name; null when there is none.
+    [[nodiscard]] BView* FindView(const char* name) const;
+
+    // --- hooks ---
+    virtual void AttachedToWindow() {}
+    virtual void DetachedFromWindow() {}
+    // Draws the part of the view that updateRect covers.
+    virtual void Draw(BRect updateRect);
+    // Called for views with B_FRAME_EVENTS: the new Width() and Height().
+    virtual void FrameResized(float width, float height);
+    virtual void MouseDown(BPoint where);
+    virtual void MouseUp(BPoint where);
+    // The text that assistive technology reads for this view beside its name; UTF-8. The base has none.
+    [[nodiscard]] virtual std::string AccessibleDescription() const { return {}; }
+
+    // --- place and size ---
+    [[nodiscard]] BRect Frame() const;
+    // The visible rectangle in the view's own coordinates: its left top is where the view is scrolled to.
+    [[nodiscard]] virtual BRect Bounds() const;
+    void MoveTo(float x, float y);
+    void MoveBy(float dx, float dy);
+    void ResizeTo(float width, float height);
+    void ResizeBy(float dx, float dy);
+    // The size at which a control shows all of itself; the base answers with the present one.
+    virtual void GetPreferredSize(float* width, float* height) const;
+    void ResizeToPreferred();
+    virtual void ScrollTo(BPoint where);
+    [[nodiscard]] uint32 ResizingMode() const { return resizingMode_; }
+    [[nodiscard]] uint32 Flags() const { return flags_; }
+    [[nodiscard]] BPoint ConvertToScreen(BPoint point) const;
+    [[nodiscard]] BPoint ConvertFromScreen(BPoint point) const;
+
+    // Hiding nests: a view hidden twice must be shown twice.
+    void Show();
+    void Hide();
+    [[nodiscard]] bool IsHidden() const { return hideCount_ > 0; }
+
+    virtual void MakeFocus(bool focus = true);
+    [[nodiscard]] virtual bool IsFocus() const;
+
+    // The pointer's place in this view and the buttons held, as of the last event that reached the view. While a button
+    // that was pressed in the view is held, all pointer events reach it. Any thread.
+    void GetMouse(BPoint* where, uint32* buttons, bool checkQueue = true) const;
+
+    // --- drawing state ---
+    // The background, painted before Draw.
+    void SetViewColor(rgb_color color);
+    [[nodiscard]] rgb_color ViewColor() const { return viewColor_; }
+    virtual void SetHighColor(rgb_color color);
+    void SetHighColor(uint8 red, uint8 green, uint8 blue) { SetHighColor({red, green, blue, 255}); }
+    [[nodiscard]] rgb_color HighColor() const { return highColor_; }
+    void SetLowColor(rgb_color color) { lowColor_ = color; }
+    void SetLowColor(uint8 red, uint8 green, uint8 blue) { lowColor_ = {red, green, blue, 255}; }
+    [[nodiscard]] rgb_color LowColor() const { return lowColor_; }
+    void SetDrawingMode(drawing_mode mode) { drawingMode_ = mode; }
+    [[nodiscard]] drawing_mode DrawingMode() const { return drawingMode_; }
+    // Width of lines and outlines; 1 at first.
+    void SetPenSize(float size) { penSize_ = size; }
+    [[nodiscard]] float PenSize() const { return penSize_; }
+    void MovePenTo(BPoint point) { pen_ = point; }
+    void MovePenTo(float x, float y) { pen_ = {x, y}; }
+    [[nodiscard]] BPoint PenLocation() const { return pen_; }
+
+    virtual void SetFont(const BFont* font, uint32 properties = B_FONT_ALL);
+    void GetFont(BFont* font) const { *font = font_; }
+    void SetFontSize(float size);
+    [[nodiscard]] float StringWidth(const char* text) const { return font_.StringWidth(text); }
+    void GetFontHeight(font_height* height) const { font_.GetHeight(height); }
+
+    // Limits drawing to region; null lifts the limit.
+    void ConstrainClippingRegion(const BRegion* region);
+    // The area that drawing is limited to now: the region given last, else the bounds.
+    void GetClippingRegion(BRegion* region) const;
+
+    // --- drawing, in the high colour; outlines lie inside the shape's rectangle ---
+    void StrokeLine(BPoint from, BPoint to);
+    // From the pen, which moves to the line's end.
+    void StrokeLine(BPoint to);
+    void StrokeRect(BRect rect);
+    void FillRect(BRect rect);
+    // As FillRect, in the low colour.
+    void FillRectLow(BRect rect);
+    void StrokeRoundRect(BRect rect, float xRadius, float yRadius);
+    void FillRoundRect(BRect rect, float xRadius, float yRadius);
+    void StrokeEllipse(BPoint center, float xRadius, float yRadius);
+    void FillEllipse(BPoint center, float xRadius, float yRadius);
+    // Angles in degrees, counter-clockwise from three o'clock. A filled arc is a slice from the centre; a stroked arc is
+    // the curve and the two lines to the centre when closed is set.
+    void StrokeArc(BPoint center, float xRadius, float yRadius, float startAngle, float sweep);
+    void FillArc(BPoint center, float xRadius, float yRadius, float startAngle, float sweep);
+    // The text's baseline starts at point (without one: at the pen, which moves to the text's end).
+    void DrawString(const char* text, BPoint point);
+    void DrawString(const char* text);
+    // Draws the source part of the bitmap into the target rectangle, scaled when the sizes differ. In B_OP_OVER
+    // transparent pixels leave what is below; in B_OP_COPY they are drawn in the low colour.
+    void DrawBitmap(const BBitmap* bitmap, BRect source, BRect target);
+    void DrawBitmap(const BBitmap* bitmap, BPoint leftTop);
+
+    virtual void Invalidate();
+    virtual void Invalidate(BRect rect);
+    // Paints what waits to be painted, now.
+    void Flush();
+
+  protected:
+    // For the layer's controls, which bring a widget of their own.
+    BView(BRect frame, const char* name, uint32 resizingMode, uint32 flags, std::unique_ptr<ViewPeer> peer);
+    [[nodiscard]] ViewPeer* Peer() const { return peer_.get(); }
+
+  private:
+    friend class BWindow;
+    friend struct ViewAccess;
+
+    void EnterWindow(BWindow* window);
+    void LeaveWindow();
+    void ParentResized(float dx, float dy);
+    void PlaceWidget();
+
+    BView* parent_ = nullptr;
+    BWindow* window_ = nullptr;
+    std::vector<std::unique_ptr<BView>> children_;
+    BRect frame_;
+    BPoint origin_;
+    uint32 resizingMode_;
+    uint32 flags_;
+    int32 hideCount_ = 0;
+
+    rgb_color viewColor_{255, 255, 255, 255};
+    rgb_color highColor_{0, 0, 0, 255};
+    rgb_color lowColor_{255, 255, 255, 255};
+    drawing_mode drawingMode_ = B_OP_COPY;
+    float penSize_ = 1;
+    BPoint pen_;
+    BFont font_;
+    BRegion clipping_;
+    bool clipped_ = false;
+
+    std::unique_ptr<ViewPeer> peer_;
+};
