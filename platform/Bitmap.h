@@ -13,7 +13,8 @@ constexpr uint8 B_TRANSPARENT_MAGIC_CMAP8 = 255;
 // The colour of an entry of the system's 8-bit colour map; entry 255 is fully transparent.
 rgb_color color_map_entry(uint8 index);
 
-// A picture in memory, drawn by BView::DrawBitmap. Not a view: nothing draws into it but SetBits. Interface thread.
+// A picture in memory, drawn by BView::DrawBitmap. Not a view: nothing draws into it but SetBits. Interface
+// thread.
 class BBitmap {
   public:
     BBitmap(BRect bounds, color_space space);
@@ -24,8 +25,9 @@ class BBitmap {
     [[nodiscard]] BRect Bounds() const { return bounds_; }
     [[nodiscard]] color_space ColorSpace() const { return space_; }
 
-    // Copies length bytes of pixels, rows top to bottom without padding, to the byte offset given. In B_CMAP8 a pixel is
-    // one byte; in the other spaces four: blue, green, red, alpha. Bytes beyond the bitmap are left out.
+    // Copies length bytes of pixels, rows top to bottom without padding, to the byte offset given. In B_CMAP8
+    // a pixel is one byte; in the other spaces four: blue, green, red, alpha. Bytes beyond the bitmap are
+    // left out.
     void SetBits(const void* data, int32 length, int32 offset, color_space space);
 
   private:

@@ -17,9 +17,9 @@ constexpr uint32 B_FONT_ALL = 0xFF;
 
 struct FontFace;
 
-// A font: a face and a size in logical pixels. A value; copies are cheap. It measures text, it does not draw. The
-// three system fonts exist from the construction of the application object to its end and follow the person's
-// interface font.
+// A font: a face and a size in logical pixels. A value; copies are cheap. It measures text, it does not draw.
+// The three system fonts exist from the construction of the application object to its end and follow the
+// person's interface font.
 class BFont {
   public:
     // The plain system font. An application object must exist.

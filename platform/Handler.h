@@ -9,8 +9,8 @@ class BLooper;
 class LooperCore;
 struct HandlerToken;
 
-// Something that messages can be addressed to: a looper, a window, a view. It owns no queue; its looper does. A message
-// that is still queued when its handler dies is dropped. Lives on the interface thread.
+// Something that messages can be addressed to: a looper, a window, a view. It owns no queue; its looper does.
+// A message that is still queued when its handler dies is dropped. Lives on the interface thread.
 class BHandler {
   public:
     explicit BHandler(const char* name = nullptr);
@@ -18,7 +18,8 @@ class BHandler {
     BHandler(const BHandler&) = delete;
     BHandler& operator=(const BHandler&) = delete;
 
-    // Called with the looper's lock held, one message at a time. The message is the looper's; copy what must last.
+    // Called with the looper's lock held, one message at a time. The message is the looper's; copy what must
+    // last.
     virtual void MessageReceived(BMessage* message);
 
     [[nodiscard]] const char* Name() const { return name_.c_str(); }
@@ -35,8 +36,8 @@ class BHandler {
     std::shared_ptr<HandlerToken> token_;
 };
 
-// A safe address of a handler: it may outlive the handler, may be copied, and may be used from any thread. Sending to a
-// handler that is gone fails and does nothing else.
+// A safe address of a handler: it may outlive the handler, may be copied, and may be used from any thread.
+// Sending to a handler that is gone fails and does nothing else.
 class BMessenger {
   public:
     BMessenger() = default;
@@ -47,8 +48,8 @@ class BMessenger {
     status_t SendMessage(const BMessage& message) const;
     [[nodiscard]] bool IsValid() const;
 
-    // Locks the target's looper as BLooper::LockWithTimeout does; B_BAD_VALUE when the looper is gone. After B_OK the
-    // looper stays alive until UnlockTarget.
+    // Locks the target's looper as BLooper::LockWithTimeout does; B_BAD_VALUE when the looper is gone. After
+    // B_OK the looper stays alive until UnlockTarget.
     [[nodiscard]] status_t LockTargetWithTimeout(bigtime_t timeout) const;
     void UnlockTarget() const;
 

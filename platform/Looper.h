@@ -2,20 +2,22 @@
 
 #include "platform/Handler.h"
 
-// A queue of messages with a lock. All loopers are served by the one interface thread, yet each keeps what can be
-// observed of a loop of its own: it handles one message at a time, in the order in which they were posted, with its
-// lock held; while a handler waits (a modal dialog), what is posted to the same looper waits in its queue, and other
-// loopers go on.
+// A queue of messages with a lock. All loopers are served by the one interface thread, yet each keeps what
+// can be observed of a loop of its own: it handles one message at a time, in the order in which they were
+// posted, with its lock held; while a handler waits (a modal dialog), what is posted to the same looper waits
+// in its queue, and other loopers go on.
 //
-// PostMessage, Lock, LockWithTimeout and Unlock may be called from any thread; everything else only on the interface
-// thread. The interface thread never waits for a worker: a message or a paint pass that finds the lock taken by another
-// thread is tried again a moment later. A worker must not wait for the interface thread while it holds the lock.
+// PostMessage, Lock, LockWithTimeout and Unlock may be called from any thread; everything else only on the
+// interface thread. The interface thread never waits for a worker: a message or a paint pass that finds the
+// lock taken by another thread is tried again a moment later. A worker must not wait for the interface thread
+// while it holds the lock.
 class BLooper : public BHandler {
   public:
     explicit BLooper(const char* name = nullptr);
     ~BLooper() override;
 
-    // Queues a copy of message for handler (null: the looper itself). B_OK, or B_BAD_VALUE when the looper is quitting.
+    // Queues a copy of message for handler (null: the looper itself). B_OK, or B_BAD_VALUE when the looper is
+    // quitting.
     status_t PostMessage(const BMessage* message, BHandler* handler = nullptr);
     status_t PostMessage(uint32 code, BHandler* handler = nullptr);
 
@@ -27,16 +29,16 @@ class BLooper : public BHandler {
     // Whether the calling thread holds the lock.
     [[nodiscard]] bool IsLocked() const;
 
-    // The message being handled; null outside a handler. In a mouse hook it is the press, with the fields "where"
-    // (point), "buttons", "modifiers" and "clicks" (int32).
+    // The message being handled; null outside a handler. In a mouse hook it is the press, with the fields
+    // "where" (point), "buttons", "modifiers" and "clicks" (int32).
     [[nodiscard]] BMessage* CurrentMessage() const;
 
     // Handles a message that no override took: B_QUIT_REQUESTED asks QuitRequested and then calls Quit.
     void MessageReceived(BMessage* message) override;
     // Whether the looper may quit now. The base says yes.
     virtual bool QuitRequested() { return true; }
-    // Ends the looper and deletes it: at once, or as soon as the handler that is running returns. What is still queued
-    // is dropped. The caller must not touch the looper afterwards.
+    // Ends the looper and deletes it: at once, or as soon as the handler that is running returns. What is
+    // still queued is dropped. The caller must not touch the looper afterwards.
     virtual void Quit();
 
     [[nodiscard]] BLooper* Looper() const override { return const_cast<BLooper*>(this); }

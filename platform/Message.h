@@ -12,8 +12,8 @@
 constexpr uint32 B_QUIT_REQUESTED = '_QRQ';
 constexpr uint32 B_ABOUT_REQUESTED = '_ABR';
 
-// A message: a code and typed, named fields, each of which may hold several values in order. A plain value: copying it
-// copies its fields. It reaches a looper by PostMessage, which keeps a copy of its own.
+// A message: a code and typed, named fields, each of which may hold several values in order. A plain value:
+// copying it copies its fields. It reaches a looper by PostMessage, which keeps a copy of its own.
 //
 // Every Find operation returns B_OK and stores the value, or leaves the caller's variable alone and returns
 // B_NAME_NOT_FOUND (no such field), B_BAD_INDEX (fewer values) or B_BAD_TYPE (values of another type).

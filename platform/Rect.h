@@ -13,7 +13,8 @@ struct BPoint {
     BPoint operator-(const BPoint& other) const { return {x - other.x, y - other.y}; }
 };
 
-// A rectangle that includes its right and bottom edges: (0, 0, 15, 15) covers 16 x 16 pixels, though its Width() is
+// A rectangle that includes its right and bottom edges: (0, 0, 15, 15) covers 16 x 16 pixels, though its
+// Width() is
 // 15. The default rectangle (0, 0, -1, -1) is invalid: it covers nothing.
 struct BRect {
     float left = 0;

@@ -4,8 +4,8 @@
 
 #include "platform/Rect.h"
 
-// An area as a list of rectangles, used to say where a view may draw. A plain value. Its rectangles may overlap; it is
-// no area arithmetic.
+// An area as a list of rectangles, used to say where a view may draw. A plain value. Its rectangles may
+// overlap; it is no area arithmetic.
 class BRegion {
   public:
     BRegion() = default;

@@ -12,8 +12,8 @@
 class BWindow;
 struct ViewPeer;
 
-// Which edges of the parent a view's edges follow when the parent is resized. A view that follows both of two opposite
-// edges grows and shrinks.
+// Which edges of the parent a view's edges follow when the parent is resized. A view that follows both of two
+// opposite edges grows and shrinks.
 constexpr uint32 B_FOLLOW_NONE = 0;
 constexpr uint32 B_FOLLOW_LEFT = 0x0001;
 constexpr uint32 B_FOLLOW_RIGHT = 0x0002;
@@ -45,13 +45,14 @@ constexpr uint32 B_CONTROL_KEY = 4;
 // The modifier keys held down as of the last event. Any thread.
 uint32 modifiers();
 
-// A rectangle of a window that draws itself, takes the pointer and keys, and holds child views. A child belongs to its
-// parent, which deletes it; RemoveChild hands it back. Coordinates are those of the view's own bounds, in logical
-// pixels; rectangles include their edges.
+// A rectangle of a window that draws itself, takes the pointer and keys, and holds child views. A child
+// belongs to its parent, which deletes it; RemoveChild hands it back. Coordinates are those of the view's own
+// bounds, in logical pixels; rectangles include their edges.
 //
-// Drawing happens inside Draw, while the layer runs a paint pass (of the screen, of a picture in a test or of a printed
-// page); the same call at any other time draws nothing and asks for a paint pass instead. Shapes and text are smooth.
-// Everything but GetMouse is for the interface thread, with the window's lock held once the view is in a window.
+// Drawing happens inside Draw, while the layer runs a paint pass (of the screen, of a picture in a test or of
+// a printed page); the same call at any other time draws nothing and asks for a paint pass instead. Shapes
+// and text are smooth. Everything but GetMouse is for the interface thread, with the window's lock held once
+// the view is in a window.
 class BView : public BHandler {
   public:
     // frame is in the parent's coordinates; flags are the B_WILL_DRAW family.
@@ -111,8 +112,8 @@ class BView : public BHandler {
     virtual void MakeFocus(bool focus = true);
     [[nodiscard]] virtual bool IsFocus() const;
 
-    // The pointer's place in this view and the buttons held, as of the last event that reached the view. While a button
-    // that was pressed in the view is held, all pointer events reach it. Any thread.
+    // The pointer's place in this view and the buttons held, as of the last event that reached the view.
+    // While a button that was pressed in the view is held, all pointer events reach it. Any thread.
     void GetMouse(BPoint* where, uint32* buttons, bool checkQueue = true) const;
 
     // --- drawing state ---
@@ -157,15 +158,15 @@ class BView : public BHandler {
     void FillRoundRect(BRect rect, float xRadius, float yRadius);
     void StrokeEllipse(BPoint center, float xRadius, float yRadius);
     void FillEllipse(BPoint center, float xRadius, float yRadius);
-    // Angles in degrees, counter-clockwise from three o'clock. A filled arc is a slice from the centre; a stroked arc is
-    // the curve and the two lines to the centre when closed is set.
+    // Angles in degrees, counter-clockwise from three o'clock. A filled arc is a slice from the centre; a
+    // stroked arc is the curve and the two lines to the centre when closed is set.
     void StrokeArc(BPoint center, float xRadius, float yRadius, float startAngle, float sweep);
     void FillArc(BPoint center, float xRadius, float yRadius, float startAngle, float sweep);
     // The text's baseline starts at point (without one: at the pen, which moves to the text's end).
     void DrawString(const char* text, BPoint point);
     void DrawString(const char* text);
-    // Draws the source part of the bitmap into the target rectangle, scaled when the sizes differ. In B_OP_OVER
-    // transparent pixels leave what is below; in B_OP_COPY they are drawn in the low colour.
+    // Draws the source part of the bitmap into the target rectangle, scaled when the sizes differ. In
+    // B_OP_OVER transparent pixels leave what is below; in B_OP_COPY they are drawn in the low colour.
     void DrawBitmap(const BBitmap* bitmap, BRect source, BRect target);
     void DrawBitmap(const BBitmap* bitmap, BPoint leftTop);
 

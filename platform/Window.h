@@ -18,12 +18,13 @@ constexpr uint32 B_NOT_ZOOMABLE = 0x0040;
 constexpr uint32 B_NOT_RESIZABLE = 0x0002;
 constexpr uint32 B_WILL_ACCEPT_FIRST_CLICK = 0x0010;
 
-// A window with its looper. It is created hidden with new, shown with Show, and deletes itself in Quit. It belongs to
-// the application's list of windows until then, owns the views added to it, and is used on the interface thread with
-// its lock held (the constructor's thread has it until Show).
+// A window with its looper. It is created hidden with new, shown with Show, and deletes itself in Quit. It
+// belongs to the application's list of windows until then, owns the views added to it, and is used on the
+// interface thread with its lock held (the constructor's thread has it until Show).
 //
 // The close box posts B_QUIT_REQUESTED to the window, and so does the Escape key in a window with the feel
-// B_MODAL_APP_WINDOW_FEEL, which also keeps the person out of the application's other windows while it is shown.
+// B_MODAL_APP_WINDOW_FEEL, which also keeps the person out of the application's other windows while it is
+// shown.
 class BWindow : public BLooper {
   public:
     // frame is the window's content in screen coordinates.

@@ -1,0 +1,59 @@
+#pragma once
+
+#include <vector>
+
+#include "platform/Looper.h"
+
+class BWindow;
+struct ApplicationPeer;
+
+// A file named by its full path.
+struct entry_ref {
+    std::string path;
+};
+
+// What the running application knows of itself.
+struct app_info {
+    entry_ref ref; // the executable
+    std::string signature;
+};
+
+// The application: starts the toolkit, keeps the list of windows, and runs the interface thread's loop. There
+// is exactly one, made by main before anything else of the layer is used; be_app points at it. The thread
+// that makes it is the interface thread.
+class BApplication : public BLooper {
+  public:
+    explicit BApplication(const char* signature);
+    ~BApplication() override;
+
+    // Serves all loopers until the application quits. A quit request posted earlier ends it at once.
+    virtual void Run();
+
+    // B_QUIT_REQUESTED asks every window's QuitRequested; when all agree it quits them and ends Run.
+    // B_ABOUT_REQUESTED calls AboutRequested.
+    void MessageReceived(BMessage* message) override;
+    bool QuitRequested() override;
+    // Quits every window and ends Run, as soon as nothing waits any more (an open dialog is closed first). It
+    // does not delete the application object, which belongs to main.
+    void Quit() override;
+    virtual void AboutRequested() {}
+
+    [[nodiscard]] int32 CountWindows() const;
+    // Null when the index lies outside. Any thread.
+    [[nodiscard]] BWindow* WindowAt(int32 index) const;
+
+    // Always B_OK.
+    status_t GetAppInfo(app_info* info) const;
+    // Makes GetAppInfo answer with this executable, so that a test has a home folder of its own. To be called
+    // before the application object is made; null goes back to the running program's own file.
+    static void SetExecutablePath(const char* path);
+
+  private:
+    friend class BWindow;
+    friend struct ApplicationAccess;
+
+    std::string signature_;
+    std::unique_ptr<ApplicationPeer> peer_;
+};
+
+extern BApplication* be_app;

@@ -1,0 +1,59 @@
+#pragma once
+
+#include "platform/View.h"
+
+// Sends a message to a handler when something is invoked. Owns its message. Interface thread.
+class BInvoker {
+  public:
+    // Takes ownership of message, which may be null.
+    BInvoker(BMessage* message, const BHandler* target);
+    virtual ~BInvoker();
+    BInvoker(const BInvoker&) = delete;
+    BInvoker& operator=(const BInvoker&) = delete;
+
+    void SetMessage(BMessage* message) { message_.reset(message); }
+    [[nodiscard]] BMessage* Message() const { return message_.get(); }
+    // Where messages go from now on; null goes back to the default (a control's window).
+    virtual status_t SetTarget(const BHandler* target);
+    // Queues a copy of message, or of the invoker's own when null. B_BAD_VALUE when there is no message or no
+    // target.
+    virtual status_t Invoke(BMessage* message = nullptr);
+
+  protected:
+    // Where messages go while no target was set.
+    [[nodiscard]] virtual const BHandler* DefaultTarget() const { return nullptr; }
+
+  private:
+    std::unique_ptr<BMessage> message_;
+    BMessenger target_;
+    bool hasTarget_ = false;
+};
+
+constexpr int32 B_CONTROL_OFF = 0;
+constexpr int32 B_CONTROL_ON = 1;
+
+// Base of the controls a person works: a toolkit widget with a label, a value and a message sent to the
+// window (or the target set) when it is worked.
+class BControl : public BView, public BInvoker {
+  public:
+    ~BControl() override;
+
+    virtual void SetLabel(const char* label);
+    [[nodiscard]] const char* Label() const { return label_.c_str(); }
+    virtual void SetEnabled(bool enabled);
+    [[nodiscard]] bool IsEnabled() const { return enabled_; }
+    virtual void SetValue(int32 value) { value_ = value; }
+    [[nodiscard]] int32 Value() const { return value_; }
+
+  protected:
+    BControl(BRect frame, const char* name, const char* label, BMessage* message, uint32 resizingMode,
+             uint32 flags, std::unique_ptr<ViewPeer> peer);
+    [[nodiscard]] const BHandler* DefaultTarget() const override;
+    // For a control whose value the person has just changed.
+    void TakeValue(int32 value) { value_ = value; }
+
+  private:
+    std::string label_;
+    int32 value_ = B_CONTROL_OFF;
+    bool enabled_ = true;
+};

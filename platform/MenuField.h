@@ -1,0 +1,39 @@
+#pragma once
+
+#include <functional>
+
+#include "platform/Menu.h"
+
+// A label with a button that shows a menu's marked item and opens the menu. Owns the menu. The button is as
+// wide as its text asks for, within the frame; a text that does not fit is shortened in the middle and shown
+// whole as a tool tip.
+class BMenuField : public BView {
+  public:
+    // The height is adjusted to what the button needs. Takes ownership of menu.
+    BMenuField(BRect frame, const char* name, const char* label, BMenu* menu,
+               uint32 resizingMode = B_FOLLOW_LEFT | B_FOLLOW_TOP, uint32 flags = B_WILL_DRAW | B_NAVIGABLE);
+    ~BMenuField() override;
+
+    [[nodiscard]] BMenu* Menu() const { return menu_.get(); }
+    [[nodiscard]] BMenuItem* MenuItem() const { return menu_->FindMarked(); }
+    [[nodiscard]] const char* Label() const { return label_.c_str(); }
+    void SetDivider(float divider);
+    [[nodiscard]] float Divider() const;
+    void SetEnabled(bool enabled);
+    [[nodiscard]] bool IsEnabled() const;
+    // The right edge of what is visible, in the parent's coordinates: the button's, not the frame's.
+    [[nodiscard]] float VisibleRight() const;
+    // Called after the shown text, and with it VisibleRight, has changed.
+    void SetTextChangedHook(std::function<void()> hook);
+
+    void MakeFocus(bool focus = true) override;
+    [[nodiscard]] bool IsFocus() const override;
+
+  private:
+    friend struct MenuAccess;
+    void ShowMarked();
+
+    std::string label_;
+    std::unique_ptr<BMenu> menu_;
+    std::function<void()> textChanged_;
+};

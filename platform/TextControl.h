@@ -1,0 +1,32 @@
+#pragma once
+
+#include "platform/Control.h"
+
+// A line of text with a label to its left. Its message, if any, goes out when the person leaves a changed
+// text or presses Enter in it.
+class BTextControl : public BControl {
+  public:
+    // The height is adjusted to what the line needs. The divider is half the width at first.
+    BTextControl(BRect frame, const char* name, const char* label, const char* text, BMessage* message,
+                 uint32 resizingMode = B_FOLLOW_LEFT | B_FOLLOW_TOP,
+                 uint32 flags = B_WILL_DRAW | B_NAVIGABLE);
+
+    void SetLabel(const char* label) override;
+    void SetText(const char* text);
+    // UTF-8; valid until the text changes or the next call.
+    [[nodiscard]] const char* Text() const;
+    // Width of the label's part, from the control's left edge to the text field.
+    void SetDivider(float divider);
+    [[nodiscard]] float Divider() const;
+
+    // Limits the text to a number of bytes of UTF-8, typed, pasted or set: what is put in is cut, between
+    // whole characters, and what was there stays. Line ends and tabs are turned into blanks.
+    void SetMaxBytes(int32 bytes);
+
+    void MakeFocus(bool focus = true) override;
+    [[nodiscard]] bool IsFocus() const override;
+    void GetPreferredSize(float* width, float* height) const override;
+
+  private:
+    mutable std::string text_;
+};
