@@ -1,0 +1,40 @@
+#pragma once
+
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <stdexcept>
+#include <stdlib.h>
+#include <string>
+
+// A folder of the test's own, removed with everything in it at the end.
+class TemporaryFolder {
+  public:
+    TemporaryFolder() {
+        std::string name = (std::filesystem::temp_directory_path() / "quorvan-test-XXXXXX").string();
+        if (mkdtemp(name.data()) == nullptr)
+            throw std::runtime_error("no temporary folder");
+        path_ = name;
+    }
+    TemporaryFolder(const TemporaryFolder&) = delete;
+    TemporaryFolder& operator=(const TemporaryFolder&) = delete;
+    ~TemporaryFolder() {
+        std::error_code ignored;
+        std::filesystem::remove_all(path_, ignored);
+    }
+
+    [[nodiscard]] const std::string& Path() const { return path_; }
+    [[nodiscard]] std::string File(const std::string& name) const { return path_ + "/" + name; }
+
+    void Write(const std::string& name, const std::string& content) const {
+        std::ofstream(File(name), std::ios::binary) << content;
+    }
+    [[nodiscard]] std::string Read(const std::string& name) const {
+        std::ifstream file(File(name), std::ios::binary);
+        return {std::istreambuf_iterator<char>(file), {}};
+    }
+    [[nodiscard]] bool Has(const std::string& name) const { return std::filesystem::exists(File(name)); }
+
+  private:
+    std::string path_;
+};
