@@ -1,0 +1,38 @@
+// Between the layer's value types and the toolkit's. Only for the layer's own sources.
+#pragma once
+
+#include <QColor>
+#include <QFont>
+#include <QImage>
+#include <QPointF>
+#include <QRectF>
+
+#include "platform/Bitmap.h"
+#include "platform/Font.h"
+#include "platform/Rect.h"
+
+// Our rectangles name their last pixel, the toolkit's the edge behind it.
+inline QRectF ToQt(const BRect& rect) {
+    return {QPointF(rect.left, rect.top), QPointF(rect.right + 1, rect.bottom + 1)};
+}
+inline BRect FromQt(const QRectF& rect) {
+    return {static_cast<float>(rect.left()), static_cast<float>(rect.top()),
+            static_cast<float>(rect.right() - 1), static_cast<float>(rect.bottom() - 1)};
+}
+inline QPointF ToQt(const BPoint& point) {
+    return {point.x, point.y};
+}
+inline BPoint FromQt(const QPointF& point) {
+    return {static_cast<float>(point.x()), static_cast<float>(point.y())};
+}
+inline QColor ToQt(rgb_color color) {
+    return {color.red, color.green, color.blue, color.alpha};
+}
+
+struct FontAccess {
+    static QFont ToQt(const BFont& font);
+};
+
+struct BitmapAccess {
+    static const QImage& Image(const BBitmap& bitmap);
+};
