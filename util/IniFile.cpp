@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cstdlib>
 #include <limits>
+#include <memory>
 #include <sys/stat.h>
 
 #include "util/CharacterBuffer.h"
@@ -91,11 +92,10 @@ std::string WithEntry(std::string_view rest, std::string_view section, std::stri
     return content;
 }
 
-std::string TemporaryPathFor(std::string_view path) {
-    const std::size_t slash = path.rfind('/');
-    std::string temporary(path.substr(0, slash == std::string_view::npos ? 0 : slash + 1));
-    temporary += "ini_file.tmp";
-    return temporary;
+// Where `path` leads to when it is a symbolic link: the link must stay. Empty when it leads nowhere.
+std::string FollowLinks(const char* path) {
+    const std::unique_ptr<char, decltype(&std::free)> resolved(realpath(path, nullptr), &std::free);
+    return resolved == nullptr ? std::string() : std::string(resolved.get());
 }
 
 } // namespace
@@ -145,17 +145,16 @@ int INI_FILEx::ReadInt(const char* section, const char* key, int defaultValue) c
 int INI_FILEx::WriteString(const char* section, const char* key, const char* value) const {
     std::string content;
     struct stat status {};
-    if (!CanBeWritten(section, key, value) || !ReadWholeFile(filePath_, content, MaxFileSize) ||
-        stat(filePath_, &status) != 0)
+    const std::string file = FollowLinks(filePath_);
+    if (!CanBeWritten(section, key, value) || !ReadWholeFile(file, content, MaxFileSize) ||
+        stat(file.c_str(), &status) != 0)
         return 1;
     const std::string changed = WithEntry(content, section, key, value);
     // Nothing to rewrite: the eleven column widths of a closing window are mostly the old ones.
     if (changed == content)
         return 0;
-    return WriteWholeFile(filePath_, TemporaryPathFor(filePath_), changed, status.st_mode & 07777U,
-                          ExistingFile::Replace)
-               ? 0
-               : 1;
+    const std::string temporary = file.substr(0, file.rfind('/') + 1) + "ini_file.tmp";
+    return WriteWholeFile(file, temporary, changed, status.st_mode & 07777U, ExistingFile::Replace) ? 0 : 1;
 }
 
 int INI_FILEx::WriteInt(const char* section, const char* key, int value) const {

@@ -172,8 +172,10 @@ TEST_F(IniFileTest, AFailedWriteKeepsTheOldSettings) {
     EXPECT_EQ(folder_.Read("mine"), "mine");
 }
 
-TEST_F(IniFileTest, KeepsPermissionsAndLeaksNothing) {
-    folder_.Write(Name, "[G]\nK=1\n");
+TEST_F(IniFileTest, KeepsPermissionsAndLinksAndLeaksNothing) {
+    std::filesystem::create_directory(folder_.File("elsewhere"));
+    folder_.Write("elsewhere/real.ini", "[G]\nK=1\n");
+    std::filesystem::create_symlink("elsewhere/real.ini", folder_.File(Name));
     ASSERT_EQ(chmod(folder_.File(Name).c_str(), 0640), 0);
     const int before = dup(0);
     close(before);
@@ -182,6 +184,8 @@ TEST_F(IniFileTest, KeepsPermissionsAndLeaksNothing) {
     const int after = dup(0);
     close(after);
     EXPECT_EQ(after, before);
+    EXPECT_EQ(folder_.Read("elsewhere/real.ini"), "[G]\nK=v\n");
+    EXPECT_TRUE(std::filesystem::is_symlink(folder_.File(Name)));
     EXPECT_EQ(std::filesystem::status(folder_.File(Name)).permissions(), std::filesystem::perms{0640});
 }
 
