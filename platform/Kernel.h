@@ -38,8 +38,8 @@ int32 suggest_thread_priority(uint32 taskFlags = 0, int32 period = 0, bigtime_t 
 // B_NO_MEMORY when no thread can be made. Priorities are advice; ordinary programs may not raise theirs.
 thread_id spawn_thread(thread_func function, const char* name, int32 priority, void* data);
 status_t resume_thread(thread_id thread);
-// Waits for the thread's end and stores what it returned. B_OK, B_BAD_THREAD_ID when there is no such thread.
-// On the interface thread the wait keeps all windows painted.
+// Waits for the thread's end and stores what it returned. B_OK, B_BAD_THREAD_ID when there is no such thread
+// (any more). On the interface thread the wait keeps all windows painted.
 status_t wait_for_thread(thread_id thread, int32* result);
 // Asks the thread to stop and waits for its end as wait_for_thread does. Nothing is ever torn down by force:
 // the thread's waits in this header end at once with B_INTERRUPTED, thread_stop_fd becomes readable, and the

@@ -8,9 +8,17 @@
 #include "platform/Rect.h"
 #include "platform/Types.h"
 
+// A message code written as four letters, first letter in the highest byte.
+constexpr uint32 message_code(const char (&letters)[5]) {
+    uint32 code = 0;
+    for (int i = 0; i < 4; i++)
+        code = code << 8 | static_cast<uint8>(letters[i]);
+    return code;
+}
+
 // Message codes that the layer itself sends or answers.
-constexpr uint32 B_QUIT_REQUESTED = '_QRQ';
-constexpr uint32 B_ABOUT_REQUESTED = '_ABR';
+constexpr uint32 B_QUIT_REQUESTED = message_code("_QRQ");
+constexpr uint32 B_ABOUT_REQUESTED = message_code("_ABR");
 
 // A message: a code and typed, named fields, each of which may hold several values in order. A plain value:
 // copying it copies its fields. It reaches a looper by PostMessage, which keeps a copy of its own.

@@ -159,7 +159,7 @@ class BView : public BHandler {
     void StrokeEllipse(BPoint center, float xRadius, float yRadius);
     void FillEllipse(BPoint center, float xRadius, float yRadius);
     // Angles in degrees, counter-clockwise from three o'clock. A filled arc is a slice from the centre; a
-    // stroked arc is the curve and the two lines to the centre when closed is set.
+    // stroked arc is the curve alone.
     void StrokeArc(BPoint center, float xRadius, float yRadius, float startAngle, float sweep);
     void FillArc(BPoint center, float xRadius, float yRadius, float startAngle, float sweep);
     // The text's baseline starts at point (without one: at the pen, which moves to the text's end).
@@ -172,7 +172,8 @@ class BView : public BHandler {
 
     virtual void Invalidate();
     virtual void Invalidate(BRect rect);
-    // Paints what waits to be painted, now.
+    // Paints what waits to be painted, now. Any thread; on a worker, painting is left to follow a moment
+    // later.
     void Flush();
 
   protected:
@@ -197,6 +198,7 @@ class BView : public BHandler {
     uint32 resizingMode_;
     uint32 flags_;
     int32 hideCount_ = 0;
+    bool focusWanted_ = false;
 
     rgb_color viewColor_{255, 255, 255, 255};
     rgb_color highColor_{0, 0, 0, 255};

@@ -36,7 +36,6 @@ class BWindow : public BLooper {
     void AddChild(BView* child);
     bool RemoveChild(BView* child);
     [[nodiscard]] BView* FindView(const char* name) const;
-    [[nodiscard]] BView* CurrentFocus() const;
 
     [[nodiscard]] const char* Title() const { return Name(); }
     void SetTitle(const char* title);
@@ -69,6 +68,9 @@ class BWindow : public BLooper {
     virtual void FrameResized(float width, float height);
 
     void Quit() override;
+
+  protected:
+    void DispatchMessage(BMessage* message, BHandler* handler) override;
 
   private:
     friend class BView;

@@ -31,6 +31,9 @@ inline QColor ToQt(rgb_color color) {
 
 struct FontAccess {
     static QFont ToQt(const BFont& font);
+    // The application object makes the three system fonts and deletes them at its end.
+    static void MakeSystemFonts();
+    static void DeleteSystemFonts();
 };
 
 struct BitmapAccess {

@@ -4,6 +4,7 @@
 #include <mutex>
 
 #include <QPainter>
+#include <QPainterPath>
 #include <QPointer>
 #include <QWidget>
 
@@ -24,6 +25,9 @@ struct ViewPeer {
 
     QPointer<QWidget> widget;
     QPainter* painter = nullptr;
+    // What the painter was limited to when the paint pass began.
+    QPainterPath baseClip;
+    bool hasBaseClip = false;
 
     std::mutex pointerMutex; // guards the two below, which watcher threads read
     BPoint pointer;
@@ -37,6 +41,8 @@ struct ViewAccess {
     // The frame changed on the toolkit's side or by a control's own adjustment: takes it over without moving
     // widgets.
     static void SetFrame(BView* view, const BRect& frame);
+    // The painter of the paint pass under way; null, with a paint pass asked for, when there is none.
+    static QPainter* Painter(BView* view);
     // Notes where the pointer is and which buttons are held, for GetMouse.
     static void NotePointer(BView* view, BPoint where, uint32 buttons);
 };

@@ -1,0 +1,142 @@
+#include "platform/Application.h"
+
+#include <algorithm>
+#include <clocale>
+#include <filesystem>
+#include <mutex>
+
+#include <QApplication>
+#include <QTimer>
+
+#include "platform/Window.h"
+#include "platform/private/ApplicationPeer.h"
+#include "platform/private/Convert.h"
+#include "platform/private/KernelThreads.h"
+#include "platform/private/Loop.h"
+#include "platform/private/ViewPeer.h"
+
+BApplication* be_app = nullptr;
+
+namespace {
+
+constexpr int kQuitRetryMilliseconds = 5;
+constexpr bigtime_t kThreadPatience = 5000000;
+
+std::string gExecutablePath; // empty: ask the system
+
+// The toolkit wants its arguments to live as long as itself.
+int gArgumentCount = 1;
+char gProgramName[] = "quorvan";
+char* gArguments[] = {gProgramName, nullptr};
+
+std::string RunningExecutable() {
+    std::error_code error;
+    const auto path = std::filesystem::read_symlink("/proc/self/exe", error);
+    return error ? std::string() : path.string();
+}
+
+} // namespace
+
+BApplication::BApplication(const char* signature)
+    : BLooper("application"), signature_(signature), peer_(std::make_unique<ApplicationPeer>()) {
+    be_app = this;
+    peer_->toolkit = std::make_unique<QApplication>(gArgumentCount, gArguments);
+    // The toolkit takes over the person's locale; numbers in files and on screen keep the decimal point all
+    // the same.
+    std::setlocale(LC_NUMERIC, "C");
+    QApplication::setApplicationName(QStringLiteral("Quorvan"));
+    QApplication::setDesktopFileName(QStringLiteral("quorvan"));
+    // The loop ends when the application says so, not when a start-up dialog closes before the first window
+    // opens.
+    QApplication::setQuitOnLastWindowClosed(false);
+    OpenInterfaceThread();
+    ApplicationAccess::WatchModifiers(*peer_->toolkit);
+    FontAccess::MakeSystemFonts();
+}
+
+BApplication::~BApplication() {
+    while (BWindow* window = WindowAt(0))
+        delete window;
+    StopAllThreads(kThreadPatience);
+    CloseInterfaceThread();
+    FontAccess::DeleteSystemFonts();
+    peer_->toolkit.reset();
+    be_app = nullptr;
+}
+
+void BApplication::Run() {
+    QApplication::exec();
+}
+
+void BApplication::MessageReceived(BMessage* message) {
+    if (message->what == B_ABOUT_REQUESTED)
+        AboutRequested();
+    else
+        BLooper::MessageReceived(message);
+}
+
+bool BApplication::QuitRequested() {
+    for (int32 index = 0; BWindow* window = WindowAt(index); index++)
+        if (!window->QuitRequested())
+            return false;
+    return true;
+}
+
+void BApplication::Quit() {
+    if (peer_->quitting)
+        return;
+    peer_->quitting = true;
+    ApplicationAccess::QuitWhenNothingWaits(*this);
+}
+
+int32 BApplication::CountWindows() const {
+    const std::lock_guard guard(peer_->mutex);
+    return static_cast<int32>(peer_->windows.size());
+}
+
+BWindow* BApplication::WindowAt(int32 index) const {
+    const std::lock_guard guard(peer_->mutex);
+    if (index < 0 || static_cast<std::size_t>(index) >= peer_->windows.size())
+        return nullptr;
+    return peer_->windows[static_cast<std::size_t>(index)];
+}
+
+status_t BApplication::GetAppInfo(app_info* info) const {
+    info->ref.path = gExecutablePath.empty() ? RunningExecutable() : gExecutablePath;
+    info->signature = signature_;
+    return B_OK;
+}
+
+void BApplication::SetExecutablePath(const char* path) {
+    gExecutablePath = path ? path : "";
+}
+
+void ApplicationAccess::AddWindow(BWindow* window) {
+    const std::lock_guard guard(be_app->peer_->mutex);
+    be_app->peer_->windows.push_back(window);
+}
+
+void ApplicationAccess::RemoveWindow(BWindow* window) {
+    const std::lock_guard guard(be_app->peer_->mutex);
+    std::erase(be_app->peer_->windows, window);
+}
+
+// A handler that waits for a dialog must return before its window can go, so the innermost dialog is closed
+// first, then the one outside it, until nothing waits.
+void ApplicationAccess::QuitWhenNothingWaits(BApplication& application) {
+    if (CountInterfaceWaits() > 0) {
+        if (!RejectInnermostDialog())
+            QuitModalWindows(application);
+        QTimer::singleShot(kQuitRetryMilliseconds, application.peer_->toolkit.get(),
+                           [&application] { QuitWhenNothingWaits(application); });
+        return;
+    }
+    for (int32 index = application.CountWindows() - 1; index >= 0; index--)
+        application.WindowAt(index)->Quit();
+    if (application.CountWindows() > 0) {
+        QTimer::singleShot(kQuitRetryMilliseconds, application.peer_->toolkit.get(),
+                           [&application] { QuitWhenNothingWaits(application); });
+        return;
+    }
+    QApplication::quit();
+}

@@ -1,0 +1,203 @@
+// The drawing calls of BView: each draws with the painter of the paint pass under way, and asks for one when
+// there is none.
+
+#include <cmath>
+
+#include <QPainter>
+#include <QPainterPath>
+
+#include "platform/View.h"
+#include "platform/private/Convert.h"
+#include "platform/private/ViewPeer.h"
+
+namespace {
+
+// Lines run through the middle of pixels, except straight lines of an even width, which run between two.
+double LineOffset(BPoint from, BPoint to, float width) {
+    const bool straight = from.x == to.x || from.y == to.y;
+    return straight && std::fmod(width, 2.0F) == 0 ? 0.0 : 0.5;
+}
+
+QPen LinePen(BPoint from, BPoint to, rgb_color color, float width) {
+    const bool straight = from.x == to.x || from.y == to.y;
+    return {ToQt(color), width, Qt::SolidLine, straight ? Qt::SquareCap : Qt::RoundCap, Qt::RoundJoin};
+}
+
+// The middle line of an outline that lies wholly inside rect.
+QRectF OutlineRect(const BRect& rect, float pen) {
+    return ToQt(rect).adjusted(pen / 2.0, pen / 2.0, -pen / 2.0, -pen / 2.0);
+}
+
+QRectF EllipseRect(BPoint center, float xRadius, float yRadius) {
+    return {center.x + 0.5 - xRadius, center.y + 0.5 - yRadius, 2.0 * xRadius, 2.0 * yRadius};
+}
+
+} // namespace
+
+PaintPass::PaintPass(BView* view, QPainter* painter) : peer_(ViewAccess::Peer(view)), outer_(peer_->painter) {
+    painter->save();
+    painter->setRenderHints(QPainter::Antialiasing | QPainter::TextAntialiasing |
+                            QPainter::SmoothPixmapTransform);
+    peer_->painter = painter;
+    peer_->hasBaseClip = painter->hasClipping();
+    if (peer_->hasBaseClip)
+        peer_->baseClip = painter->clipPath();
+    view->ConstrainClippingRegion(nullptr);
+}
+
+PaintPass::~PaintPass() {
+    peer_->painter->restore();
+    peer_->painter = outer_;
+}
+
+QPainter* ViewAccess::Painter(BView* view) {
+    QPainter* painter = view->peer_->painter;
+    if (!painter)
+        view->Invalidate();
+    return painter;
+}
+
+void BView::ConstrainClippingRegion(const BRegion* region) {
+    clipped_ = region != nullptr;
+    clipping_ = region ? *region : BRegion();
+    QPainter* painter = peer_->painter;
+    if (!painter)
+        return;
+    if (peer_->hasBaseClip)
+        painter->setClipPath(peer_->baseClip);
+    else
+        painter->setClipping(false);
+    if (!region)
+        return;
+    QPainterPath path;
+    path.setFillRule(Qt::WindingFill);
+    for (int index = 0; index < region->CountRects(); index++)
+        path.addRect(ToQt(region->RectAt(index)));
+    painter->setClipPath(path, peer_->hasBaseClip ? Qt::IntersectClip : Qt::ReplaceClip);
+}
+
+void BView::GetClippingRegion(BRegion* region) const {
+    if (clipped_)
+        *region = clipping_;
+    else
+        region->Set(Bounds());
+}
+
+void BView::StrokeLine(BPoint from, BPoint to) {
+    pen_ = to;
+    if (QPainter* painter = ViewAccess::Painter(this)) {
+        const double offset = LineOffset(from, to, penSize_);
+        painter->setPen(LinePen(from, to, highColor_, penSize_));
+        painter->drawLine(ToQt(from) + QPointF(offset, offset), ToQt(to) + QPointF(offset, offset));
+    }
+}
+
+void BView::StrokeLine(BPoint to) {
+    StrokeLine(pen_, to);
+}
+
+void BView::StrokeRect(BRect rect) {
+    if (QPainter* painter = ViewAccess::Painter(this)) {
+        painter->setPen(QPen(ToQt(highColor_), penSize_, Qt::SolidLine, Qt::SquareCap, Qt::MiterJoin));
+        painter->setBrush(Qt::NoBrush);
+        painter->drawRect(OutlineRect(rect, penSize_));
+    }
+}
+
+void BView::FillRect(BRect rect) {
+    if (QPainter* painter = ViewAccess::Painter(this))
+        painter->fillRect(ToQt(rect), ToQt(highColor_));
+}
+
+void BView::FillRectLow(BRect rect) {
+    if (QPainter* painter = ViewAccess::Painter(this))
+        painter->fillRect(ToQt(rect), ToQt(lowColor_));
+}
+
+void BView::StrokeRoundRect(BRect rect, float xRadius, float yRadius) {
+    if (QPainter* painter = ViewAccess::Painter(this)) {
+        painter->setPen(QPen(ToQt(highColor_), penSize_));
+        painter->setBrush(Qt::NoBrush);
+        painter->drawRoundedRect(OutlineRect(rect, penSize_), xRadius, yRadius);
+    }
+}
+
+void BView::FillRoundRect(BRect rect, float xRadius, float yRadius) {
+    if (QPainter* painter = ViewAccess::Painter(this)) {
+        painter->setPen(Qt::NoPen);
+        painter->setBrush(ToQt(highColor_));
+        painter->drawRoundedRect(ToQt(rect), xRadius, yRadius);
+    }
+}
+
+void BView::StrokeEllipse(BPoint center, float xRadius, float yRadius) {
+    if (QPainter* painter = ViewAccess::Painter(this)) {
+        painter->setPen(QPen(ToQt(highColor_), penSize_));
+        painter->setBrush(Qt::NoBrush);
+        painter->drawEllipse(EllipseRect(center, xRadius, yRadius));
+    }
+}
+
+void BView::FillEllipse(BPoint center, float xRadius, float yRadius) {
+    if (QPainter* painter = ViewAccess::Painter(this)) {
+        painter->setPen(Qt::NoPen);
+        painter->setBrush(ToQt(highColor_));
+        painter->drawEllipse(EllipseRect(center, xRadius, yRadius));
+    }
+}
+
+void BView::StrokeArc(BPoint center, float xRadius, float yRadius, float startAngle, float sweep) {
+    if (QPainter* painter = ViewAccess::Painter(this)) {
+        // A path takes the angles as they are; the painter's own arc calls round them to sixteenths of a
+        // degree.
+        const QRectF ellipse = EllipseRect(center, xRadius, yRadius);
+        QPainterPath path;
+        path.arcMoveTo(ellipse, startAngle);
+        path.arcTo(ellipse, startAngle, sweep);
+        painter->setPen(QPen(ToQt(highColor_), penSize_, Qt::SolidLine, Qt::FlatCap));
+        painter->setBrush(Qt::NoBrush);
+        painter->drawPath(path);
+    }
+}
+
+void BView::FillArc(BPoint center, float xRadius, float yRadius, float startAngle, float sweep) {
+    if (QPainter* painter = ViewAccess::Painter(this)) {
+        const QRectF ellipse = EllipseRect(center, xRadius, yRadius);
+        QPainterPath path(ellipse.center());
+        path.arcTo(ellipse, startAngle, sweep);
+        path.closeSubpath();
+        painter->setPen(Qt::NoPen);
+        painter->setBrush(ToQt(highColor_));
+        painter->drawPath(path);
+    }
+}
+
+void BView::DrawString(const char* text, BPoint point) {
+    pen_ = {point.x + font_.StringWidth(text), point.y};
+    if (QPainter* painter = ViewAccess::Painter(this)) {
+        painter->setFont(FontAccess::ToQt(font_));
+        painter->setPen(ToQt(highColor_));
+        painter->drawText(ToQt(point), QString::fromUtf8(text));
+    }
+}
+
+void BView::DrawString(const char* text) {
+    DrawString(text, pen_);
+}
+
+void BView::DrawBitmap(const BBitmap* bitmap, BRect source, BRect target) {
+    QPainter* painter = ViewAccess::Painter(this);
+    if (!painter || !bitmap)
+        return;
+    if (drawingMode_ == B_OP_COPY)
+        painter->fillRect(ToQt(target), ToQt(lowColor_));
+    painter->drawImage(ToQt(target), BitmapAccess::Image(*bitmap), ToQt(source));
+}
+
+void BView::DrawBitmap(const BBitmap* bitmap, BPoint leftTop) {
+    if (!bitmap)
+        return;
+    BRect target = bitmap->Bounds();
+    target.OffsetTo(leftTop.x, leftTop.y);
+    DrawBitmap(bitmap, bitmap->Bounds(), target);
+}

@@ -1,0 +1,27 @@
+#pragma once
+
+#include <memory>
+#include <mutex>
+#include <vector>
+
+#include <QApplication>
+
+#include "platform/Application.h"
+
+// What the application object has on the toolkit's side.
+struct ApplicationPeer {
+    std::mutex mutex; // guards the list of windows, which other threads look through
+    std::vector<BWindow*> windows;
+    std::unique_ptr<QApplication> toolkit;
+    bool quitting = false; // interface thread
+};
+
+// The layer's own way into the application object.
+struct ApplicationAccess {
+    static void AddWindow(BWindow* window);
+    static void RemoveWindow(BWindow* window);
+    static void QuitWhenNothingWaits(BApplication& application);
+    static void QuitModalWindows(BApplication& application);
+    // Keeps modifiers() true by looking at every event.
+    static void WatchModifiers(QApplication& toolkit);
+};

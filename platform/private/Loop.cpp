@@ -1,0 +1,189 @@
+#include "platform/private/Loop.h"
+
+#include <atomic>
+#include <chrono>
+#include <condition_variable>
+#include <memory>
+#include <mutex>
+#include <thread>
+#include <vector>
+
+#include <QDialog>
+#include <QEventLoop>
+#include <QMetaObject>
+#include <QPointer>
+#include <QTimer>
+
+#include "platform/Kernel.h"
+#include "platform/private/LooperCore.h"
+
+namespace {
+
+constexpr bigtime_t kInterfaceLockPatience = 10000;
+constexpr int kCancelPollMilliseconds = 50;
+
+// The toolkit object that carries work to the interface thread, while there is one.
+std::mutex gPostMutex;
+QObject* gPostBox = nullptr;
+std::atomic<std::thread::id> gInterfaceThread;
+
+// One lock for all semaphores and thread states: they are few, and waits on them rare.
+std::mutex gKernelMutex;
+std::condition_variable gKernelChanged;
+
+// A wait of the interface thread. Innermost last; the outer ones can only end after it.
+struct InterfaceWait {
+    const std::function<bool()>* condition;
+    QEventLoop* loop;
+};
+std::vector<InterfaceWait> gInterfaceWaits; // interface thread only
+std::vector<QDialog*> gOpenDialogs;         // interface thread only
+int gWaitDepth = 0;                         // interface thread only
+
+void CheckInterfaceWaits() {
+    const std::lock_guard guard(gKernelMutex);
+    for (const InterfaceWait& wait : gInterfaceWaits)
+        if ((*wait.condition)())
+            wait.loop->quit();
+}
+
+status_t WaitOnInterfaceThread(const std::function<bool()>& condition, bigtime_t timeout) {
+    const auto holds = [&] {
+        const std::lock_guard guard(gKernelMutex);
+        return condition();
+    };
+    if (holds())
+        return B_OK;
+    if (timeout <= 0)
+        return B_TIMED_OUT;
+    QEventLoop loop;
+    QTimer timer;
+    timer.setSingleShot(true);
+    QObject::connect(&timer, &QTimer::timeout, &loop, &QEventLoop::quit);
+    if (timeout != B_INFINITE_TIMEOUT)
+        timer.start(std::chrono::milliseconds((timeout + 999) / 1000));
+    gInterfaceWaits.push_back({&condition, &loop});
+    gWaitDepth++;
+    // A change between the check above and here left its notice in the toolkit's queue, so it is not missed.
+    loop.exec();
+    gWaitDepth--;
+    gInterfaceWaits.pop_back();
+    return holds() ? B_OK : B_TIMED_OUT;
+}
+
+status_t WaitOnWorker(const std::function<bool()>& condition, bigtime_t timeout) {
+    std::unique_lock guard(gKernelMutex);
+    const auto done = [&] { return condition() || thread_stop_requested(); };
+    if (timeout == B_INFINITE_TIMEOUT)
+        gKernelChanged.wait(guard, done);
+    else if (!gKernelChanged.wait_for(guard, std::chrono::microseconds(timeout), done))
+        return B_TIMED_OUT;
+    return condition() ? B_OK : B_INTERRUPTED;
+}
+
+} // namespace
+
+bool OnInterfaceThread() {
+    return std::this_thread::get_id() == gInterfaceThread.load();
+}
+
+void RunOnInterfaceThread(std::function<void()> work, QObject* context) {
+    const std::lock_guard guard(gPostMutex);
+    QObject* receiver = context ? context : gPostBox;
+    if (receiver)
+        QMetaObject::invokeMethod(receiver, std::move(work), Qt::QueuedConnection);
+}
+
+bool CallOnInterfaceThread(std::function<void()> work) {
+    if (OnInterfaceThread()) {
+        work();
+        return true;
+    }
+    const auto finished = std::make_shared<bool>(false);
+    RunOnInterfaceThread([work = std::move(work), finished] {
+        work();
+        ChangeKernelState([&] { *finished = true; });
+    });
+    return WaitUntil([finished] { return *finished; }, B_INFINITE_TIMEOUT) == B_OK;
+}
+
+status_t WaitUntil(const std::function<bool()>& condition, bigtime_t timeout) {
+    return OnInterfaceThread() ? WaitOnInterfaceThread(condition, timeout) : WaitOnWorker(condition, timeout);
+}
+
+void ChangeKernelState(const std::function<void()>& change) {
+    {
+        const std::lock_guard guard(gKernelMutex);
+        change();
+        gKernelChanged.notify_all();
+    }
+    RunOnInterfaceThread(CheckInterfaceWaits);
+}
+
+void LookAtKernelState(const std::function<void()>& look) {
+    const std::lock_guard guard(gKernelMutex);
+    look();
+}
+
+InterfaceLock::InterfaceLock(BLooper* looper)
+    : looper_(looper), held_(!looper || looper->LockWithTimeout(kInterfaceLockPatience) == B_OK) {}
+
+InterfaceLock::~InterfaceLock() {
+    if (looper_ && held_)
+        looper_->Unlock();
+}
+
+CurrentMessageScope::CurrentMessageScope(BLooper* looper, BMessage* message)
+    : looper_(looper), outer_(looper ? looper->CurrentMessage() : nullptr) {
+    if (looper_)
+        LooperAccess::Core(*looper_).SetCurrent(message);
+}
+
+CurrentMessageScope::~CurrentMessageScope() {
+    if (looper_)
+        LooperAccess::Core(*looper_).SetCurrent(outer_);
+}
+
+int RunDialog(QDialog& dialog, const std::function<bool()>& cancelled) {
+    QTimer poll;
+    if (cancelled) {
+        QObject::connect(&poll, &QTimer::timeout, &dialog, [&] {
+            if (cancelled())
+                dialog.reject();
+        });
+        poll.start(kCancelPollMilliseconds);
+    }
+    gOpenDialogs.push_back(&dialog);
+    gWaitDepth++;
+    const int result = dialog.exec();
+    gWaitDepth--;
+    gOpenDialogs.pop_back();
+    return result;
+}
+
+int CountInterfaceWaits() {
+    return gWaitDepth;
+}
+
+bool RejectInnermostDialog() {
+    if (gOpenDialogs.empty())
+        return false;
+    gOpenDialogs.back()->reject();
+    return true;
+}
+
+void OpenInterfaceThread() {
+    gInterfaceThread = std::this_thread::get_id();
+    const std::lock_guard guard(gPostMutex);
+    gPostBox = new QObject;
+}
+
+void CloseInterfaceThread() {
+    QObject* box = nullptr;
+    {
+        const std::lock_guard guard(gPostMutex);
+        std::swap(box, gPostBox);
+    }
+    delete box;
+    gInterfaceThread = std::thread::id();
+}

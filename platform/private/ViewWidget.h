@@ -1,0 +1,33 @@
+#pragma once
+
+#include <QWidget>
+
+#include "platform/Message.h"
+
+class BView;
+
+// The widget of a plain view: it paints by calling the view's Draw, and hands presses to the view's window as
+// messages, so that they wait their turn like everything else.
+class ViewWidget : public QWidget {
+    Q_DISABLE_COPY_MOVE(ViewWidget)
+
+  public:
+    explicit ViewWidget(BView* owner) : owner_(owner) {}
+
+  protected:
+    bool event(QEvent* event) override;
+    void paintEvent(QPaintEvent* event) override;
+    void mousePressEvent(QMouseEvent* event) override;
+    void mouseMoveEvent(QMouseEvent* event) override;
+    void mouseReleaseEvent(QMouseEvent* event) override;
+
+  private:
+    void NotePointer(const QMouseEvent& event);
+    void PostPointerMessage(const QMouseEvent& event, uint32 code, int clicks);
+
+    BView* owner_;
+};
+
+// What pointer hooks are called by.
+constexpr uint32 kMouseDownCode = message_code("_MDN");
+constexpr uint32 kMouseUpCode = message_code("_MUP");
