@@ -1,0 +1,63 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <span>
+
+#include "db/RecordTypes.h"
+
+// The regions of a data file as bytes: 52 bytes of header, 44 for each column, then the records.
+// doc/data-file.md has the byte tables. Nothing here touches a file, so that all of it can be fed bytes of
+// any origin.
+
+inline constexpr std::size_t HeaderSize = 52;
+inline constexpr std::size_t ColumnEntrySize = 44;
+
+/// Values of a record's first byte. Any other value (no version of the engine writes one) counts as active.
+namespace RecordStatus {
+inline constexpr std::uint8_t Active = 0;
+inline constexpr std::uint8_t Deleted = 1;
+inline constexpr std::uint8_t Locked = 2;
+} // namespace RecordStatus
+
+/// Where the records of a file lie.
+struct RECORD_AREA {
+    std::int64_t dataStart = 0;    ///< offset of record 0
+    std::int32_t recordLength = 0; ///< bytes of a record, the status byte included
+    std::int32_t recordCount = 0;
+
+    [[nodiscard]] std::int64_t OffsetOf(std::int64_t record) const {
+        return dataStart + record * recordLength;
+    }
+};
+
+/// What a file's length says about the counts in its header.
+enum class FileCounts {
+    Agree,   ///< at most one record more than counted: what an interrupted append leaves behind
+    TooFew,  ///< records are missing at the end; the count was lowered to the whole records that are there
+    TooMany, ///< the file goes on behind the last counted record
+};
+
+/// Reads a header. A description without a terminator is cut at 31 characters.
+[[nodiscard]] DATABASE_HEADER DecodeHeader(std::span<const std::uint8_t, HeaderSize> bytes);
+void EncodeHeader(const DATABASE_HEADER& header, std::span<std::uint8_t, HeaderSize> bytes);
+
+/// Reads a column entry. A name without a terminator is cut at 31 characters; padding is ignored.
+[[nodiscard]] COLUMN_ENTRY DecodeColumn(std::span<const std::uint8_t, ColumnEntrySize> bytes);
+void EncodeColumn(const COLUMN_ENTRY& column, std::span<std::uint8_t, ColumnEntrySize> bytes);
+
+/// Offset of record 0 in a file with that many columns.
+[[nodiscard]] constexpr std::int64_t DataStart(int columnCount) {
+    return static_cast<std::int64_t>(HeaderSize + ColumnEntrySize * static_cast<std::size_t>(columnCount));
+}
+
+/// Tells whether a file of that length can be the header's: no negative count, records of at least their
+/// status byte, and a column table that is there in full.
+[[nodiscard]] bool HeaderMakesSense(const DATABASE_HEADER& header, std::int64_t fileLength);
+
+/// Tells whether the column lies inside the data of a record of `recordLength` bytes.
+[[nodiscard]] bool ColumnFits(const COLUMN_ENTRY& column, int recordLength);
+
+/// Compares the record count of a header that makes sense with the file's length, lowering the count to what
+/// is there.
+[[nodiscard]] FileCounts CheckRecordCount(DATABASE_HEADER* header, std::int64_t fileLength);

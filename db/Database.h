@@ -1,0 +1,243 @@
+#pragma once
+
+#include <cstdint>
+#include <memory>
+
+#include "db/Condition.h"
+#include "db/DataFile.h"
+#include "db/Errors.h"
+#include "db/File.h"
+#include "db/ReadCache.h"
+#include "db/RecordTypes.h"
+#include "util/Paths.h"
+
+/// How a query works on the result set that is there.
+namespace QueryMode {
+inline constexpr int New = 0; ///< begin a new set from all records
+inline constexpr int And = 1; ///< keep the records of the set that also match
+inline constexpr int Or = 2;  ///< add the records that match
+} // namespace QueryMode
+
+struct COMPACTION_PATHS;
+
+/// One open data file of fixed-length records with typed columns: makes or opens it, reads and writes its
+/// records, selects records by queries, changes them together and rewrites the file without its deleted
+/// records. The file's bytes are described in doc/data-file.md.
+///
+/// It keeps no record that the file does not have: every operation that changes the file returns after the
+/// kernel has taken the bytes. It does not guard the file against other processes, and does not lock: an
+/// object is used by one thread at a time. Any number of objects, each on its own file, work independently.
+///
+/// Unless said otherwise an operation returns 0 on success and -1 on failure and then leaves file, counts and
+/// result set as they were; GetLastError tells why. Record numbers count from 0, deleted records included; a
+/// record keeps its number until Compress. "Record data" is the record without its status byte, recordLength
+/// - 1 bytes.
+class DATABASE {
+  public:
+    /// Opens the file at `path`; with a null path the object waits for Open or Create. The outcome is known
+    /// from GetLastError or IsOpen. An object without an open file has no records and no columns: every
+    /// operation on it fails or finds nothing. `operations` must outlive the object.
+    explicit DATABASE(const char* path, FileOperations& operations = SystemFiles());
+    DATABASE(const DATABASE&) = delete;
+    DATABASE& operator=(const DATABASE&) = delete;
+    /// Closes the file. The header is not written: see SetImmediateHeaderWrite.
+    ~DATABASE();
+
+    // File and header
+
+    /// Makes a new file without records and opens it. `name`, `type`, `size` and, for floats, `format` are
+    /// taken from each of the `columns`; a negative size becomes the type's own (AdjustColumnSize), a float
+    /// without decimals gets 2. Fails with 1102 when the path exists, 1110 when the columns do not fit a
+    /// record of 32767 bytes, a string has no positive width or there are no column entries for the count,
+    /// 1109 when the file cannot be written or the path is longer than 127 characters, 1104 or 1106 without
+    /// memory. A failure leaves no file behind, and the object with what it had open before.
+    int Create(const char* path, const char* description, int columnCount, const COLUMN_ENTRY* columns);
+
+    /// Opens an existing file, closing the one that was open. A file that may not be written is opened for
+    /// reading: operations that would change it then fail. Nothing is written. Fails with 1103 when the file
+    /// cannot be opened, the path is longer than 127 characters, or header and columns make no sense
+    /// (negative counts, a column table that is cut off, a column outside the record), 1105, 1107 or 1108
+    /// without memory; then no file is open. When fewer records are there than the header counts, those that
+    /// are there whole can be read; a deleted count that cannot be is counted afresh. See IsDamaged.
+    int Open(const char* path);
+
+    [[nodiscard]] bool IsOpen() const { return file_.IsOpen(); }
+
+    /// Tells whether the counts in the header disagreed with the file when it was opened: records missing,
+    /// more than one record too many, or an impossible deleted count. Compress refuses such a file, and with
+    /// records too many Append does, because they would throw away what is there.
+    [[nodiscard]] bool IsDamaged() const { return fileCounts_ != FileCounts::Agree || deletedCountWasWrong_; }
+
+    /// Writes the header while immediate header writing is on (the default). Fails with 2901.
+    int WriteDbHeader();
+    /// Switches writing the header after each change of the counts; switching on writes it at once. While
+    /// off, the header in the file keeps the old counts, also after the object is gone. Fails with 2901.
+    int SetImmediateHeaderWrite(int on);
+    /// Gives a column with a negative size the width of its type; strings and unknown types keep theirs.
+    /// Returns 0.
+    int AdjustColumnSize(COLUMN_ENTRY* column) const;
+    /// Bytes of a text line that holds a record: per string column its width + 2, per byte 1, short, long or
+    /// float 16, date 8, time 6, and one for every column.
+    [[nodiscard]] int CalculateIOBufferSize() const;
+    /// Copies column `index` to `out`. Fails with 1101.
+    int GetColumnInfo(int index, COLUMN_ENTRY* out);
+    /// Copies the header in memory, which is always current, to `out`. Returns 0.
+    int GetHeaderInfo(DATABASE_HEADER* out) const;
+
+    // Records
+
+    /// Adds a record with the given data behind the last one and returns its number, which becomes the
+    /// current record; -1 on failure: 2801 write error, 2802 no file, 2803 the file holds records that its
+    /// header does not count, 2804 no more record numbers, 2901 header not written.
+    long Append(const void* data);
+    /// Copies the data of record `n` to `data`, through the read cache when there is one, and makes it
+    /// current. Returns 1 on success. Fails with 1201, 1202 or 1209 (read error).
+    int Read(long n, void* data);
+    /// The same, always from the file.
+    int UnBufferedRead(long n, void* data);
+    /// Overwrites the current record, as Write does. Fails with 2101 when there is none.
+    int Update(const void* data);
+    /// Overwrites record `n`, which loses its lock, and makes it current. Fails with 1302, 1303 or 1309 (file
+    /// error).
+    int Write(long n, const void* data);
+    /// Marks record `n` as deleted; it leaves the result set, and no record is current. Fails with 1402,
+    /// 1403, 1409 (file error) or 2901.
+    int Delete(long n);
+    /// Makes deleted record `n` active and current again; it does not return to the result set. Fails with
+    /// 1502, 1503, 1509 (file error) or 2901.
+    int UnDelete(long n);
+    /// Marks record `n` as locked and makes it current. The mark stops nothing; only UnLock, IsLocked and a
+    /// second Lock look at it. Fails with 2301, 2302, 2303 or 2309 (file error).
+    int Lock(long n);
+    /// 1 when record `n` is marked as locked, 0 when not. Fails with 2501, 2502 or 2509 (file error).
+    int IsLocked(long n);
+    /// Takes the mark off and makes the record current. Fails with 2401, 2402, 2403 or 2409 (file error).
+    int UnLock(long n);
+    /// Gives the read cache a size in units of 1024 bytes; 0 removes it. Fails with 2601 (no memory, or more
+    /// than ReadCache::MaximumKilobytes): then there is no cache.
+    int SetReadCache(int kilobytes);
+    /// How many records of the result set come before record `n` in the order of the walk; -1 when it is not
+    /// in it.
+    [[nodiscard]] long ConvertPhysToLogRecordNumber(long n) const;
+    [[nodiscard]] long GetNumberOfActiveRecords() const;
+    /// Returns the code of the latest failure and forgets it; 0 when there was none. Copies the code's
+    /// message, at most 57 characters and the terminator, to `message` unless that is null.
+    int GetLastError(char* message);
+
+    // Queries
+
+    /// Selects records by a statement such as "Name contains fund" and a QueryMode; returns the number of
+    /// records in the set or -1: 1601 AND or OR after a sort, 1602 column, 1603 operator, 1604 and 1605
+    /// memory, 1606 "contains" on a column that is no string, 1607 AND or OR without a set, 1608 statement or
+    /// mode, 1609 read error. A failure leaves set and walk as they were, except that after 1605 and 1609
+    /// there is no set. A null or empty statement is QueryReset. The walk begins anew.
+    long Query(const char* statement, int mode);
+    /// Takes a statement apart into buffers of 32 bytes each. Returns 0, or 1 when a token is missing or too
+    /// long.
+    int ParseQueryStatement(const char* statement, char* column, char* op, char* value) const;
+    /// Makes the result set hold all active records and returns their number; -1 on failure: 1001 or 1002
+    /// memory, 1609 read error.
+    long QueryReset();
+    /// Runs the last statement again as a new query, QueryReset when there was none.
+    void QueryRefresh();
+    /// 1 when there is a result set that holds fewer than all active records, else 0.
+    [[nodiscard]] int IsQueryActive() const;
+
+    /// The walk through the result set; QueryReset when there is none. Each returns the data of the record
+    /// found, which becomes the current one, and stores its number in `*record` unless that is null; null at
+    /// the end. The data may be changed and given to Update; it is valid until the next walk call, Open,
+    /// Create or Compress. Records deleted since the query drop out of the set; records appended since are
+    /// not in it. A read error returns null with 1209 and leaves the record in the set.
+    void* QueryGetFirst(long* record);
+    void* QueryGetNext(long* record);
+    void* QueryGetLast(long* record);
+    void* QueryGetPrev(long* record);
+    /// The one operation behind these: searches from slot `start`, or from one `step` after the last record
+    /// found when it is negative, in steps of `step`.
+    void* QueryGetXXX(long start, long step, long* record);
+
+    /// 0 (the default): queries ignore the case of the letters A to Z. Otherwise strings are compared
+    /// exactly.
+    void SetCaseSensitivity(int on);
+    /// Compares as queries do, the CompareOperator `op` between field and value: 1 when it holds, else 0.
+    [[nodiscard]] int CompareStringVals(int op, const char* field, const char* value) const;
+    template <class T>
+    [[nodiscard]] int CompareVals(int op, T field, T value) const {
+        return CompareValues(op, field, value);
+    }
+
+    // Compaction
+
+    /// Rewrites the file without its deleted records, through a temporary file (extension .new) and a backup
+    /// of the old one (.bak), both gone afterwards. Records are renumbered in their old order, locks are
+    /// gone, the result set is dropped. Owner and permissions stay; of a symbolic link the target is
+    /// rewritten. The argument has no effect. Fails with 2701 to 2709; file and object are then as before and
+    /// usable, except: after 2703 the data is in the backup only, which the object goes on using
+    /// (RestoreCompactionBackup, or the next Compress, puts it back), and after 2704 the file may be
+    /// compacted already, with the backup left beside it.
+    int Compress(int ignored);
+
+  private:
+    // File and header
+    [[nodiscard]] int Fail(int code);
+    [[nodiscard]] int OpenFile(const char* path);
+    [[nodiscard]] bool LayOutColumns(const COLUMN_ENTRY* wanted, DATABASE_HEADER* header,
+                                     COLUMN_ENTRY* columns) const;
+    [[nodiscard]] static int ReadLayout(const File& file, std::int64_t length, DATABASE_HEADER* header,
+                                        std::unique_ptr<COLUMN_ENTRY[]>* columns);
+    [[nodiscard]] bool RecountDeleted();
+    [[nodiscard]] int WriteHeaderBytes();
+    [[nodiscard]] static int WriteLayout(File& file, const DATABASE_HEADER& header,
+                                         const COLUMN_ENTRY* columns);
+    void Adopt(File file, const char* path, const DATABASE_HEADER& header,
+               std::unique_ptr<COLUMN_ENTRY[]> columns, std::unique_ptr<std::uint8_t[]> recordBuffer);
+    void CloseFile();
+    void DropResultSet();
+    [[nodiscard]] const COLUMN_ENTRY* FindColumn(const char* name) const;
+
+    // Records
+    [[nodiscard]] RECORD_AREA Area() const { return {dataStart_, header_.recordLength, header_.recordCount}; }
+    [[nodiscard]] bool IsRecordNumber(long n) const { return n >= 0 && n < header_.recordCount; }
+    [[nodiscard]] std::size_t DataSize() const { return static_cast<std::size_t>(header_.recordLength) - 1; }
+    [[nodiscard]] int FetchRecord(long n, void* data, bool cached);
+    [[nodiscard]] int LookUpStatus(long n, int invalidRecord, int readFailed, std::uint8_t* status);
+    [[nodiscard]] int WriteStatus(long n, std::uint8_t status);
+    [[nodiscard]] int ChangeStatus(long n, std::uint8_t from, std::uint8_t to, int failure);
+    [[nodiscard]] int ChangeCounts(std::int32_t recordCount, std::int32_t deletedCount);
+    void RemoveFromResultSet(long n);
+
+    // Queries
+    [[nodiscard]] int PrepareCondition(const char* statement, Condition* condition) const;
+    [[nodiscard]] bool NewSlots();
+    [[nodiscard]] ReadCache* ScanCache(ReadCache* own);
+    [[nodiscard]] int TakeOutDeleted();
+    [[nodiscard]] int RunQuery(const Condition& condition, int mode);
+    void MergeMatches(const Condition& condition, int mode, std::int32_t first, std::int32_t count,
+                      const std::uint8_t* records);
+
+    // Compaction
+    [[nodiscard]] int WriteCompacted(File& target);
+    [[nodiscard]] int CopyActiveRecords(File& target, std::int32_t* copied);
+    [[nodiscard]] int SwapIn(const COMPACTION_PATHS& paths);
+
+    DATABASE_HEADER header_{};
+    std::unique_ptr<COLUMN_ENTRY[]> columns_;
+    char path_[PathBufferSize]{};
+    FileOperations& operations_;
+    File file_;
+    std::unique_ptr<std::int32_t[]> slots_; // the result set: slot i holds a record number, or -1 for none
+    std::int32_t slotCount_ = 0;            // records when the set was built
+    std::int32_t resultCount_ = 0;          // slots that are not -1
+    long walkPosition_ = 0;                 // slot of the record that the walk found last; may lie outside
+    std::unique_ptr<std::uint8_t[]> recordBuffer_; // what the walk hands out
+    char lastStatement_[256]{};
+    bool sorted_ = false;
+    bool immediateHeaderWrite_ = true;
+    bool caseSensitive_ = false;
+    ReadCache cache_;
+    std::int64_t dataStart_ = 0;
+    int lastError_ = DatabaseError::None;
+    std::int32_t currentRecord_ = -1;
+    FileCounts fileCounts_ = FileCounts::Agree;
+    bool deletedCountWasWrong_ = false;
+};

@@ -1,0 +1,264 @@
+#include "db/File.h"
+
+#include <cerrno>
+#include <cstdio>
+#include <filesystem>
+#include <utility>
+
+#include <fcntl.h>
+#include <unistd.h>
+
+namespace {
+
+// Calls until the result is something else than "interrupted".
+template <class Call>
+auto Retry(Call call) {
+    auto result = call();
+    while (result < 0 && errno == EINTR) {
+        result = call();
+    }
+    return result;
+}
+
+int ErrorOf(int result) {
+    return result < 0 ? errno : 0;
+}
+
+int FlagsOf(FileMode mode) {
+    // Not blocking, so that a pipe in a file's place is refused instead of waited for.
+    constexpr int common = O_CLOEXEC | O_NONBLOCK | O_NOCTTY;
+    switch (mode) {
+    case FileMode::ReadOnly:
+        return O_RDONLY | common;
+    case FileMode::CreateNew:
+        return O_RDWR | O_CREAT | O_EXCL | common;
+    case FileMode::ReadWrite:
+        break;
+    }
+    return O_RDWR | common;
+}
+
+} // namespace
+
+int FileOperations::Open(const char* path, int flags, mode_t mode) {
+    return ::open(path, flags, mode);
+}
+
+int FileOperations::Close(int descriptor) {
+    return ::close(descriptor);
+}
+
+int FileOperations::Status(int descriptor, struct stat* status) {
+    return ::fstat(descriptor, status);
+}
+
+ssize_t FileOperations::ReadAt(int descriptor, void* data, std::size_t size, off_t offset) {
+    return ::pread(descriptor, data, size, offset);
+}
+
+ssize_t FileOperations::WriteAt(int descriptor, const void* data, std::size_t size, off_t offset) {
+    return ::pwrite(descriptor, data, size, offset);
+}
+
+int FileOperations::Truncate(int descriptor, off_t length) {
+    return ::ftruncate(descriptor, length);
+}
+
+int FileOperations::Sync(int descriptor) {
+    return ::fsync(descriptor);
+}
+
+int FileOperations::SetOwner(int descriptor, uid_t owner, gid_t group) {
+    return ::fchown(descriptor, owner, group);
+}
+
+int FileOperations::SetMode(int descriptor, mode_t mode) {
+    return ::fchmod(descriptor, mode);
+}
+
+int FileOperations::Rename(const char* from, const char* to) {
+    return ::rename(from, to);
+}
+
+int FileOperations::Remove(const char* path) {
+    return ::unlink(path);
+}
+
+FileOperations& SystemFiles() {
+    static FileOperations operations;
+    return operations;
+}
+
+File::File(FileOperations& operations) : operations_(&operations) {}
+
+File::File(File&& other) noexcept
+    : operations_(other.operations_), descriptor_(std::exchange(other.descriptor_, -1)) {}
+
+File& File::operator=(File&& other) noexcept {
+    if (this != &other) {
+        Close();
+        operations_ = other.operations_;
+        descriptor_ = std::exchange(other.descriptor_, -1);
+    }
+    return *this;
+}
+
+File::~File() {
+    Close();
+}
+
+int File::Open(const std::string& path, FileMode mode) {
+    Close();
+    constexpr mode_t permissions = 0666; // less the user's mask
+    int opened = Retry([&] { return operations_->Open(path.c_str(), FlagsOf(mode), permissions); });
+    if (opened < 0) {
+        return errno;
+    }
+    descriptor_ = opened;
+    struct stat status {};
+    int error = ErrorOf(operations_->Status(descriptor_, &status));
+    if (error == 0 && !S_ISREG(status.st_mode)) {
+        error = EINVAL;
+    }
+    if (error != 0) {
+        Close();
+    }
+    return error;
+}
+
+void File::Close() {
+    if (descriptor_ >= 0) {
+        // An interrupted close has closed all the same; the bytes were the kernel's before.
+        operations_->Close(std::exchange(descriptor_, -1));
+    }
+}
+
+int File::ReadUpTo(std::int64_t offset, void* data, std::size_t size, std::size_t* got) const {
+    *got = 0;
+    while (*got < size) {
+        auto* target = static_cast<char*>(data) + *got;
+        ssize_t count = Retry([&] {
+            return operations_->ReadAt(descriptor_, target, size - *got, offset + static_cast<off_t>(*got));
+        });
+        if (count < 0) {
+            return errno;
+        }
+        if (count == 0) {
+            break;
+        }
+        *got += static_cast<std::size_t>(count);
+    }
+    return 0;
+}
+
+int File::ReadAt(std::int64_t offset, void* data, std::size_t size) const {
+    std::size_t got = 0;
+    int error = ReadUpTo(offset, data, size, &got);
+    return error == 0 && got < size ? ENODATA : error;
+}
+
+int File::WriteAt(std::int64_t offset, const void* data, std::size_t size) {
+    std::size_t done = 0;
+    while (done < size) {
+        const auto* source = static_cast<const char*>(data) + done;
+        ssize_t count = Retry([&] {
+            return operations_->WriteAt(descriptor_, source, size - done, offset + static_cast<off_t>(done));
+        });
+        if (count < 0) {
+            return errno;
+        }
+        if (count == 0) {
+            return EIO;
+        }
+        done += static_cast<std::size_t>(count);
+    }
+    return 0;
+}
+
+int File::Length(std::int64_t* length) const {
+    struct stat status {};
+    int error = ErrorOf(operations_->Status(descriptor_, &status));
+    *length = status.st_size;
+    return error;
+}
+
+int File::Truncate(std::int64_t length) {
+    return ErrorOf(Retry([&] { return operations_->Truncate(descriptor_, length); }));
+}
+
+int File::Sync() {
+    return ErrorOf(Retry([&] { return operations_->Sync(descriptor_); }));
+}
+
+int File::TakeOwnerAndMode(const File& other) {
+    struct stat theirs {};
+    struct stat ours {};
+    if (operations_->Status(other.descriptor_, &theirs) < 0 || operations_->Status(descriptor_, &ours) < 0) {
+        return errno;
+    }
+    mode_t mode = theirs.st_mode & 07777;
+    if (ours.st_uid != theirs.st_uid || ours.st_gid != theirs.st_gid) {
+        if (operations_->SetOwner(descriptor_, theirs.st_uid, theirs.st_gid) < 0) {
+            mode &= 0777; // another's file: what runs in the owner's name must not move to us
+        }
+    }
+    return ErrorOf(Retry([&] { return operations_->SetMode(descriptor_, mode); }));
+}
+
+bool File::IsAt(const std::string& path) const {
+    struct stat ours {};
+    struct stat theirs {};
+    return descriptor_ >= 0 && operations_->Status(descriptor_, &ours) == 0 &&
+           ::stat(path.c_str(), &theirs) == 0 && ours.st_dev == theirs.st_dev && ours.st_ino == theirs.st_ino;
+}
+
+int RenameFile(FileOperations& operations, const std::string& from, const std::string& to) {
+    return ErrorOf(Retry([&] { return operations.Rename(from.c_str(), to.c_str()); }));
+}
+
+int RemoveFile(FileOperations& operations, const std::string& path) {
+    return ErrorOf(Retry([&] { return operations.Remove(path.c_str()); }));
+}
+
+int SyncFolderOf(FileOperations& operations, const std::string& path) {
+    std::string folder = std::filesystem::path(path).parent_path().string();
+    if (folder.empty()) {
+        folder = ".";
+    }
+    int descriptor =
+        Retry([&] { return operations.Open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC, 0); });
+    if (descriptor < 0) {
+        return errno;
+    }
+    int error = ErrorOf(Retry([&] { return operations.Sync(descriptor); }));
+    operations.Close(descriptor);
+    return error;
+}
+
+bool FileExists(const std::string& path) {
+    struct stat status {};
+    return ::lstat(path.c_str(), &status) == 0;
+}
+
+std::string FollowLinks(const std::string& path) {
+    namespace fs = std::filesystem;
+    constexpr int mostLinks = 40; // the system's own bound
+    std::error_code error;
+    fs::path current(path);
+    for (int links = 0; links <= mostLinks; ++links) {
+        fs::path folder = fs::canonical(current.has_parent_path() ? current.parent_path() : ".", error);
+        if (error) {
+            return {};
+        }
+        current = folder / current.filename();
+        if (!fs::is_symlink(fs::symlink_status(current, error))) {
+            return current.string();
+        }
+        fs::path target = fs::read_symlink(current, error);
+        if (error) {
+            return {};
+        }
+        current = folder / target; // an absolute target replaces the folder
+    }
+    return {};
+}

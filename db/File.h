@@ -1,0 +1,95 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <string>
+
+#include <sys/stat.h>
+#include <sys/types.h>
+
+/// The system calls through which the engine reaches files, one virtual operation each. Results are the
+/// system's: negative (with errno set) on failure. Tests derive from it to make a chosen call fail, write
+/// short or end the process; the program uses SystemFiles().
+class FileOperations {
+  public:
+    FileOperations() = default;
+    FileOperations(const FileOperations&) = delete;
+    FileOperations& operator=(const FileOperations&) = delete;
+    virtual ~FileOperations() = default;
+
+    virtual int Open(const char* path, int flags, mode_t mode);
+    virtual int Close(int descriptor);
+    virtual int Status(int descriptor, struct stat* status);
+    virtual ssize_t ReadAt(int descriptor, void* data, std::size_t size, off_t offset);
+    virtual ssize_t WriteAt(int descriptor, const void* data, std::size_t size, off_t offset);
+    virtual int Truncate(int descriptor, off_t length);
+    virtual int Sync(int descriptor);
+    virtual int SetOwner(int descriptor, uid_t owner, gid_t group);
+    virtual int SetMode(int descriptor, mode_t mode);
+    virtual int Rename(const char* from, const char* to);
+    virtual int Remove(const char* path);
+};
+
+/// The operations that go straight to the system. They hold no state and live as long as the program.
+FileOperations& SystemFiles();
+
+/// How File::Open treats the file.
+enum class FileMode {
+    ReadWrite, ///< it must exist
+    ReadOnly,  ///< it must exist
+    CreateNew, ///< it must not exist (not even as a symbolic link); opened for reading and writing
+};
+
+/// One open file, read and written by position. It is the only place where the engine touches files.
+/// Interrupted calls and short transfers are continued until they are complete or fail. It buffers nothing:
+/// when a write returns, the kernel has the bytes. It knows nothing about what the bytes mean.
+///
+/// Every operation that can fail returns 0 or the errno number of the failure. The owner of a File uses it on
+/// one thread at a time.
+class File {
+  public:
+    /// A File without an open file; `operations` must outlive it.
+    explicit File(FileOperations& operations);
+    File(File&& other) noexcept;
+    File& operator=(File&& other) noexcept;
+    ~File();
+
+    /// Opens the file at `path`, closing the one that was open. Anything but a regular file is refused
+    /// (EINVAL).
+    [[nodiscard]] int Open(const std::string& path, FileMode mode);
+    void Close();
+    [[nodiscard]] bool IsOpen() const { return descriptor_ >= 0; }
+
+    /// Reads exactly `size` bytes; a file that ends before is ENODATA.
+    [[nodiscard]] int ReadAt(std::int64_t offset, void* data, std::size_t size) const;
+    /// Reads up to `size` bytes; `got` becomes the number read, less than `size` only at the end of the file.
+    [[nodiscard]] int ReadUpTo(std::int64_t offset, void* data, std::size_t size, std::size_t* got) const;
+    /// Writes all of `size` bytes. After a failure any part of them may have been written.
+    [[nodiscard]] int WriteAt(std::int64_t offset, const void* data, std::size_t size);
+
+    [[nodiscard]] int Length(std::int64_t* length) const;
+    [[nodiscard]] int Truncate(std::int64_t length);
+    /// Returns when the file's bytes have reached the disk.
+    [[nodiscard]] int Sync();
+    /// Gives this file the permissions of `other` and, as far as the process may, its owner and group.
+    [[nodiscard]] int TakeOwnerAndMode(const File& other);
+    /// Tells whether `path` names this very file.
+    [[nodiscard]] bool IsAt(const std::string& path) const;
+
+  private:
+    FileOperations* operations_;
+    int descriptor_ = -1;
+};
+
+/// Renames a file, replacing what is at `to`. Returns 0 or an errno number.
+[[nodiscard]] int RenameFile(FileOperations& operations, const std::string& from, const std::string& to);
+/// Removes a file. Returns 0 or an errno number.
+[[nodiscard]] int RemoveFile(FileOperations& operations, const std::string& path);
+/// Returns when the names in the folder that holds `path` have reached the disk. Returns 0 or an errno
+/// number.
+[[nodiscard]] int SyncFolderOf(FileOperations& operations, const std::string& path);
+/// Tells whether a file, folder or symbolic link of that name exists.
+[[nodiscard]] bool FileExists(const std::string& path);
+/// The absolute path of the file that `path` leads to through symbolic links, also when that file does not
+/// exist (yet). Empty when the folder does not exist or the links form a ring.
+[[nodiscard]] std::string FollowLinks(const std::string& path);

@@ -1,0 +1,82 @@
+#include "db/Statement.h"
+
+#include <array>
+#include <cstdlib>
+#include <cstring>
+#include <limits>
+#include <string_view>
+
+#include <clocale>
+
+namespace {
+
+constexpr const char* Delimiters = " \t\n\r";
+constexpr const char* ValueDelimiters = "\t\n\r";
+
+// Takes the next token off `rest`, the delimiter that ended it included.
+bool TakeToken(std::string_view* rest, const char* delimiters, char (&token)[TokenSize]) {
+    std::size_t begin = rest->find_first_not_of(delimiters);
+    if (begin == std::string_view::npos) {
+        return false;
+    }
+    std::size_t end = rest->find_first_of(delimiters, begin);
+    std::string_view text = rest->substr(begin, end == std::string_view::npos ? end : end - begin);
+    if (text.size() >= TokenSize) {
+        return false;
+    }
+    text.copy(token, text.size());
+    token[text.size()] = '\0';
+    *rest = end == std::string_view::npos ? std::string_view() : rest->substr(end + 1);
+    return true;
+}
+
+// Reads numbers of fixed widths that stand one after the other; those after the first that is missing are 0.
+std::array<std::int32_t, 3> DigitGroups(const char* digits, std::array<int, 3> widths) {
+    std::array<std::int32_t, 3> numbers{};
+    digits += std::strspn(digits, " ");
+    for (std::size_t group = 0; group < widths.size(); ++group) {
+        for (int i = 0; i < widths[group] && *digits >= '0' && *digits <= '9'; ++i, ++digits) {
+            numbers[group] = numbers[group] * 10 + (*digits - '0');
+        }
+    }
+    return numbers;
+}
+
+locale_t PlainLocale() {
+    static const locale_t plain = newlocale(LC_ALL_MASK, "C", nullptr);
+    return plain;
+}
+
+} // namespace
+
+bool SplitStatement(const char* statement, STATEMENT* result) {
+    if (statement == nullptr) {
+        return false;
+    }
+    std::string_view rest(statement, strnlen(statement, LongestStatement + 1));
+    return rest.size() <= LongestStatement && TakeToken(&rest, Delimiters, result->column) &&
+           TakeToken(&rest, Delimiters, result->op) && TakeToken(&rest, ValueDelimiters, result->value);
+}
+
+std::int64_t WholeNumber(const char* text) {
+    return std::strtoll(text, nullptr, 10);
+}
+
+float SingleNumber(const char* text) {
+    const double number = strtod_l(text, nullptr, PlainLocale());
+    constexpr double largest = std::numeric_limits<float>::max();
+    if (number > largest || number < -largest) {
+        return number > 0 ? std::numeric_limits<float>::infinity() : -std::numeric_limits<float>::infinity();
+    }
+    return static_cast<float>(number);
+}
+
+std::int32_t PackedDate(const char* digits) {
+    const auto [year, month, day] = DigitGroups(digits, {4, 2, 2});
+    return year * 65536 + month * 256 + day;
+}
+
+std::int32_t PackedTime(const char* digits) {
+    const auto [hour, minute, second] = DigitGroups(digits, {2, 2, 2});
+    return hour * 65536 + minute * 256 + second;
+}

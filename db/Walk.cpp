@@ -1,0 +1,81 @@
+#include <limits>
+
+#include "db/Database.h"
+
+namespace {
+
+constexpr std::int32_t NotInSet = -1;
+
+// A position outside the numbers' range stays at its end: still outside the set.
+long Moved(long position, long step) {
+    long moved = 0;
+    if (!__builtin_add_overflow(position, step, &moved)) {
+        return moved;
+    }
+    return step < 0 ? std::numeric_limits<long>::min() : std::numeric_limits<long>::max();
+}
+
+} // namespace
+
+void* DATABASE::QueryGetFirst(long* record) {
+    return QueryGetXXX(0, 1, record);
+}
+
+void* DATABASE::QueryGetNext(long* record) {
+    return QueryGetXXX(-1, 1, record);
+}
+
+void* DATABASE::QueryGetLast(long* record) {
+    return QueryGetXXX(static_cast<long>(header_.recordCount) - 1, -1, record);
+}
+
+void* DATABASE::QueryGetPrev(long* record) {
+    return QueryGetXXX(-1, -1, record);
+}
+
+void* DATABASE::QueryGetXXX(long start, long step, long* record) {
+    if (!slots_ && QueryReset() < 0) {
+        return nullptr;
+    }
+    if (resultCount_ == 0) {
+        return nullptr;
+    }
+    // Records appended since the query have no slot: a walk may begin or stand among them, but finds none
+    // there.
+    const auto inFile = [this](long position) { return position >= 0 && position < header_.recordCount; };
+    walkPosition_ = start >= 0 ? start : Moved(walkPosition_, step);
+    while (inFile(walkPosition_)) {
+        const std::int32_t number = walkPosition_ < slotCount_ ? slots_[walkPosition_] : NotInSet;
+        if (number != NotInSet) {
+            const int code = FetchRecord(number, recordBuffer_.get(), cache_.HasBuffer());
+            if (code == DatabaseError::None) {
+                if (record != nullptr) {
+                    *record = number;
+                }
+                return recordBuffer_.get();
+            }
+            if (code == DatabaseError::ReadFailed) {
+                lastError_ = code;
+                return nullptr;
+            }
+            slots_[walkPosition_] = NotInSet; // deleted since the query
+            --resultCount_;
+        }
+        if (step == 0) {
+            return nullptr;
+        }
+        walkPosition_ = Moved(walkPosition_, step);
+    }
+    return nullptr;
+}
+
+long DATABASE::ConvertPhysToLogRecordNumber(long n) const {
+    long before = 0;
+    for (std::int32_t i = 0; i < slotCount_; ++i) {
+        if (slots_[i] == n && n >= 0) {
+            return before;
+        }
+        before += slots_[i] != NotInSet ? 1 : 0;
+    }
+    return -1;
+}
