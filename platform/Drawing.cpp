@@ -96,11 +96,17 @@ void BView::StrokeLine(BPoint to) {
     StrokeLine(pen_, to);
 }
 
+// Four filled strips, since the painter leaves the corners of a smooth outline pale.
 void BView::StrokeRect(BRect rect) {
     if (QPainter* painter = ViewAccess::Painter(this)) {
-        painter->setPen(QPen(ToQt(highColor_), penSize_, Qt::SolidLine, Qt::SquareCap, Qt::MiterJoin));
-        painter->setBrush(Qt::NoBrush);
-        painter->drawRect(OutlineRect(rect, penSize_));
+        const QRectF outer = ToQt(rect);
+        const double pen = penSize_;
+        const double inner = outer.height() - 2 * pen;
+        const QColor color = ToQt(highColor_);
+        painter->fillRect(QRectF(outer.left(), outer.top(), outer.width(), pen), color);
+        painter->fillRect(QRectF(outer.left(), outer.bottom() - pen, outer.width(), pen), color);
+        painter->fillRect(QRectF(outer.left(), outer.top() + pen, pen, inner), color);
+        painter->fillRect(QRectF(outer.right() - pen, outer.top() + pen, pen, inner), color);
     }
 }
 

@@ -10,21 +10,20 @@
 
 #include <QDialog>
 #include <QEventLoop>
-#include <QMetaObject>
-#include <QPointer>
 #include <QTimer>
 
 #include "platform/Kernel.h"
 #include "platform/private/LooperCore.h"
+#include "platform/private/PostBox.h"
 
 namespace {
 
 constexpr bigtime_t kInterfaceLockPatience = 10000;
 constexpr int kCancelPollMilliseconds = 50;
 
-// The toolkit object that carries work to the interface thread, while there is one.
+// Carries work to the interface thread, while there is one.
 std::mutex gPostMutex;
-QObject* gPostBox = nullptr;
+std::unique_ptr<PostBox> gPostBox;
 std::atomic<std::thread::id> gInterfaceThread;
 
 // One lock for all semaphores and thread states: they are few, and waits on them rare.
@@ -89,9 +88,8 @@ bool OnInterfaceThread() {
 
 void RunOnInterfaceThread(std::function<void()> work, QObject* context) {
     const std::lock_guard guard(gPostMutex);
-    QObject* receiver = context ? context : gPostBox;
-    if (receiver)
-        QMetaObject::invokeMethod(receiver, std::move(work), Qt::QueuedConnection);
+    if (gPostBox)
+        gPostBox->Post(std::move(work), context);
 }
 
 bool CallOnInterfaceThread(std::function<void()> work) {
@@ -175,15 +173,11 @@ bool RejectInnermostDialog() {
 void OpenInterfaceThread() {
     gInterfaceThread = std::this_thread::get_id();
     const std::lock_guard guard(gPostMutex);
-    gPostBox = new QObject;
+    gPostBox = std::make_unique<PostBox>();
 }
 
 void CloseInterfaceThread() {
-    QObject* box = nullptr;
-    {
-        const std::lock_guard guard(gPostMutex);
-        std::swap(box, gPostBox);
-    }
-    delete box;
+    const std::lock_guard guard(gPostMutex);
+    gPostBox.reset();
     gInterfaceThread = std::thread::id();
 }
