@@ -45,15 +45,6 @@ bool WriteNewFile(const std::string& path, std::string_view content, mode_t mode
            fsync(file.Get()) == 0 && file.Close();
 }
 
-bool MoveWithoutReplacing(const std::string& from, const std::string& to) {
-    if (renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, to.c_str(), RENAME_NOREPLACE) == 0)
-        return true;
-    // Not every file system knows that call; a second name for the file does not replace either.
-    if (errno != EINVAL && errno != ENOSYS)
-        return false;
-    return link(from.c_str(), to.c_str()) == 0 && unlink(from.c_str()) == 0;
-}
-
 } // namespace
 
 bool ReadWholeFile(const std::string& path, std::string& content, std::size_t maxBytes) {
@@ -95,4 +86,13 @@ bool WriteWholeFile(const std::string& path, const std::string& temporaryPath, s
         errno = reason;
     }
     return moved;
+}
+
+bool MoveWithoutReplacing(const std::string& from, const std::string& to) {
+    if (renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, to.c_str(), RENAME_NOREPLACE) == 0)
+        return true;
+    // Not every file system knows that call; a second name for the file does not replace either.
+    if (errno != EINVAL && errno != ENOSYS)
+        return false;
+    return link(from.c_str(), to.c_str()) == 0 && unlink(from.c_str()) == 0;
 }

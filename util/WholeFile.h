@@ -22,3 +22,7 @@ enum class ExistingFile { Replace, Keep };
 // says why.
 [[nodiscard]] bool WriteWholeFile(const std::string& path, const std::string& temporaryPath,
                                   std::string_view content, mode_t mode, ExistingFile existing);
+
+// Renames `from` to `to`, which must not exist, not even as a link that leads nowhere: EEXIST then. True on
+// success; otherwise errno says why.
+[[nodiscard]] bool MoveWithoutReplacing(const std::string& from, const std::string& to);
