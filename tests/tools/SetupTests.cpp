@@ -1,0 +1,245 @@
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <cstdlib>
+#include <cstring>
+#include <filesystem>
+#include <map>
+#include <set>
+#include <sstream>
+#include <string>
+#include <sys/wait.h>
+#include <vector>
+
+#include "TemporaryFolder.h"
+#include "app/RecordLayouts.h"
+#include "db/Database.h"
+#include "util/CharacterBuffer.h"
+#include "util/IniFile.h"
+
+namespace {
+
+namespace fs = std::filesystem;
+
+class SetupTest : public testing::Test {
+  protected:
+    SetupTest() { folder_.Write("built", "a program"); }
+
+    // Runs quorvan-cli with the words of `arguments`; `before` is shell text in front of it.
+    int Run(const std::string& arguments, const std::string& before = "") {
+        const std::string command =
+            "cd '" + folder_.Path() + "' && " + before + "'" + QUORVAN_CLI "' " + arguments + " >out 2>err";
+        const int status = std::system(command.c_str());
+        output_ = folder_.Read("out");
+        errors_ = folder_.Read("err");
+        return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    }
+    int Setup(const std::string& more = "") {
+        return Run("setup home --program '" + folder_.File("built") + "' " + more);
+    }
+
+    bool Says(const std::string& line) const { return output_.find(line + "\n") != std::string::npos; }
+
+    // Every file of the new folder with its content and the time of its last change.
+    std::map<std::string, std::pair<std::string, fs::file_time_type>> Files() const {
+        std::map<std::string, std::pair<std::string, fs::file_time_type>> files;
+        for (const auto& entry : fs::recursive_directory_iterator(folder_.File("home"))) {
+            const std::string name = fs::relative(entry.path(), folder_.Path()).string();
+            if (entry.is_regular_file())
+                files[name] = {folder_.Read(name), entry.last_write_time()};
+        }
+        return files;
+    }
+
+    template <class Record>
+    std::vector<Record> Records(const char* name) const {
+        DATABASE database(folder_.File(std::string("home/") + name).c_str());
+        EXPECT_TRUE(database.IsOpen() && !database.IsDamaged()) << name;
+        DATABASE_HEADER header{};
+        database.GetHeaderInfo(&header);
+        std::vector<Record> records(static_cast<std::size_t>(header.recordCount));
+        for (std::size_t i = 0; i < records.size(); ++i)
+            EXPECT_EQ(database.Read(static_cast<long>(i), &records[i]), 1);
+        return records;
+    }
+    int RecordLength(const char* name) const {
+        DATABASE_HEADER header{};
+        DATABASE(folder_.File(std::string("home/") + name).c_str()).GetHeaderInfo(&header);
+        return header.recordLength;
+    }
+
+    TemporaryFolder folder_;
+    std::string output_;
+    std::string errors_;
+};
+
+TEST_F(SetupTest, MakesAFolderThatRuns) {
+    ASSERT_EQ(Setup(), 0) << errors_;
+    std::set<std::string> names;
+    for (const auto& [name, file] : Files()) {
+        names.insert(name.substr(5));
+        EXPECT_NE(output_.find("made  " + name.substr(5)), std::string::npos) << output_;
+    }
+    EXPECT_EQ(names, (std::set<std::string>{"portfol.db", "invest.db", "misc.db", "Quorvan.ini",
+                                            "Quorvan.cfg", "quorvan", "help/Quorvan.html"}));
+    EXPECT_EQ(Records<PORTFOLIO_DATA>("portfol.db").size(), 0U);
+    EXPECT_EQ(Records<INVESTMENT_DATA>("invest.db").size(), 0U);
+    EXPECT_EQ(RecordLength("portfol.db"), 33);
+    EXPECT_EQ(RecordLength("invest.db"), 231);
+    EXPECT_EQ(RecordLength("misc.db"), 65);
+    std::map<std::string, int> categories;
+    for (const CATEGORY_DATA& entry : Records<CATEGORY_DATA>("misc.db"))
+        ++categories[entry.Category];
+    EXPECT_GE(categories["Type"], 5);
+    EXPECT_GE(categories["Agent"], 3);
+    EXPECT_EQ(categories.size(), 2U);
+    EXPECT_EQ(folder_.Read("home/quorvan"), "a program");
+    EXPECT_EQ(fs::status(folder_.File("home/quorvan")).permissions() & fs::perms::owner_all,
+              fs::perms::owner_all);
+    EXPECT_EQ(fs::status(folder_.File("home/Quorvan.ini")).permissions(),
+              fs::perms{0600}); // a password goes there
+    for (const char* name : {"Quorvan.ini", "Quorvan.cfg", "help/Quorvan.html"}) {
+        std::ifstream resource(std::string(QUORVAN_RESOURCES "/") + name);
+        std::stringstream content;
+        content << resource.rdbuf();
+        EXPECT_EQ(folder_.Read(std::string("home/") + name), content.str());
+    }
+}
+
+TEST_F(SetupTest, TheFirstTextFilesCanBeReadByTheProgram) {
+    ASSERT_EQ(Setup(), 0) << errors_;
+    const INI_FILEx settings(folder_.File("home/Quorvan.ini").c_str());
+    char text[64];
+    settings.ReadString("GENERAL", "Password", "missing", text);
+    EXPECT_STREQ(text, "");
+    settings.ReadString("GENERAL", "IsConnectedURL", "", text);
+    EXPECT_STREQ(text, "localhost");
+    for (int column = 0; column <= 10; ++column)
+        EXPECT_GE(settings.ReadInt("DISPLAY", ("ColumnWidth" + std::to_string(column)).c_str(), 0), 20)
+            << column;
+    // A short line would end the list of sources, a long one would be taken for two.
+    std::istringstream sources(folder_.Read("home/Quorvan.cfg"));
+    for (std::string line; std::getline(sources, line);) {
+        EXPECT_TRUE(line.starts_with(";")) << line;
+        EXPECT_TRUE(line.size() >= 9 && line.size() <= 254) << line;
+    }
+}
+
+TEST_F(SetupTest, NeverChangesAFileThatExists) {
+    ASSERT_EQ(Setup(), 0);
+    folder_.Write("home/Quorvan.ini", "mine");
+    folder_.Write("home/quorvan", "my program");
+    fs::remove(folder_.File("home/Quorvan.cfg"));
+    fs::create_symlink("nowhere", folder_.File("home/Quorvan.cfg"));
+    const auto before = Files();
+    EXPECT_EQ(Setup("--sample"), 0) << errors_;
+    EXPECT_EQ(Files(), before);
+    EXPECT_FALSE(folder_.Has("home/nowhere"));
+    EXPECT_EQ(output_.find("made"), std::string::npos) << output_;
+    EXPECT_TRUE(Says("kept  Quorvan.ini"));
+    EXPECT_NE(output_.find("kept  quorvan: it differs"), std::string::npos);
+    EXPECT_NE(output_.find("no sample"), std::string::npos);
+    // What is missing is made anew, without a sample while the other data file has its own.
+    fs::remove(folder_.File("home/invest.db"));
+    EXPECT_EQ(Setup("--sample"), 0);
+    EXPECT_TRUE(Says("made  invest.db: empty"));
+    EXPECT_EQ(Setup("--update-program"), 0);
+    EXPECT_EQ(folder_.Read("home/quorvan"), "a program");
+    EXPECT_EQ(folder_.Read("home/Quorvan.ini"), "mine");
+}
+
+TEST_F(SetupTest, LeavesABackupItsPlace) {
+    ASSERT_EQ(Setup("--sample"), 0);
+    fs::rename(folder_.File("home/invest.db"), folder_.File("home/invest.bak"));
+    ASSERT_EQ(Setup(), 0);
+    EXPECT_TRUE(Says("kept  invest.bak"));
+    EXPECT_FALSE(folder_.Has("home/invest.db"));
+}
+
+std::string Movement(const INVESTMENT_DATA& record) {
+    if (record.QuoteError != 0)
+        return "error";
+    if (record.PrevPrice <= 0)
+        return "unknown";
+    return record.Price > record.PrevPrice ? "risen" : record.Price < record.PrevPrice ? "fallen" : "equal";
+}
+
+TEST_F(SetupTest, TheSampleIsVaried) {
+    ASSERT_EQ(Setup("--sample"), 0) << errors_;
+    std::map<std::string, int> investments;
+    std::set<std::string> portfolios, movements, risks, kinds;
+    bool blanks = false;
+    bool fractions = false;
+    for (const INVESTMENT_DATA& record : Records<INVESTMENT_DATA>("invest.db")) {
+        ++investments[record.Portfolio];
+        movements.insert(Movement(record));
+        risks.insert(record.Risk);
+        const bool stock = std::strcmp(record.Type, "Stock") == 0;
+        const bool fund = std::strstr(record.Type, "Fund") != nullptr;
+        kinds.insert(std::string(stock  ? "stock"
+                                 : fund ? "fund"
+                                        : "other") +
+                     (record.Retire != 0 ? " retirement" : ""));
+        fractions = fractions || (stock && record.Price * 32 == std::floor(record.Price * 32) &&
+                                  record.Price != std::floor(record.Price));
+        EXPECT_NE(record.Name[0], '\0');
+        EXPECT_EQ(record.Value, record.Shares * record.Price) << record.Name;
+        // No text fills its field, so none was cut.
+        EXPECT_LT(FieldText(record.Name).size(), sizeof record.Name - 1);
+        EXPECT_LT(FieldText(record.Ticker).size(), sizeof record.Ticker - 1);
+    }
+    for (const PORTFOLIO_DATA& record : Records<PORTFOLIO_DATA>("portfol.db")) {
+        portfolios.insert(record.Name);
+        blanks = blanks || std::strchr(record.Name, ' ') != nullptr;
+        EXPECT_GE(investments[record.Name], 15) << record.Name;
+    }
+    EXPECT_EQ(portfolios, (std::set<std::string>{"My Retirement Fund", "F\xC3\xBCr sp\xC3\xA4ter"}));
+    EXPECT_EQ(investments.size(), 2U);
+    EXPECT_EQ(movements, (std::set<std::string>{"error", "unknown", "risen", "fallen", "equal"}));
+    EXPECT_EQ(risks, (std::set<std::string>{"Low", "Med", "High"}));
+    EXPECT_EQ(kinds, (std::set<std::string>{"stock", "fund", "other", "stock retirement", "fund retirement",
+                                            "other retirement"}));
+    EXPECT_TRUE(blanks);
+    EXPECT_TRUE(fractions);
+}
+
+TEST_F(SetupTest, FailsWithOneClearSentence) {
+    const std::string program = " --program '" + folder_.File("built") + "'";
+    const struct {
+        std::string arguments;
+        int status;
+        const char* sentence;
+    } cases[] = {{"setup built/home" + program, 1, "cannot be made: Not a directory"},
+                 {"setup built" + program, 1, "cannot be made: Not a directory"},
+                 {"setup ''" + program, 1, "the name is empty"},
+                 {"setup " + std::string(109, 'd') + program, 1, "path is too long"},
+                 {"setup home --program nothing", 1, "nothing cannot be read: No such file"},
+                 {"", 2, "subcommand"},
+                 {"setup", 2, "FOLDER"},
+                 {"setup home --simple", 2, "--simple"}};
+    for (const auto& c : cases) {
+        EXPECT_EQ(Run(c.arguments), c.status) << c.arguments;
+        EXPECT_NE(errors_.find(c.sentence), std::string::npos) << errors_;
+        EXPECT_TRUE(c.status == 2 || errors_.find('\n') == errors_.size() - 1) << errors_;
+    }
+    EXPECT_FALSE(folder_.Has(std::string(109, 'd')));
+    EXPECT_EQ(Run("setup --help"), 0);
+    EXPECT_NE(output_.find("--sample"), std::string::npos);
+}
+
+TEST_F(SetupTest, AFullDiskLeavesNoPartOfAFile) {
+    // Room for the settings, for neither the help nor the sample.
+    EXPECT_EQ(Run("setup home --sample --program '" + folder_.File("built") + "'", "ulimit -f 8; "), 1);
+    EXPECT_NE(errors_.find("invest.db cannot be made"), std::string::npos) << errors_;
+    EXPECT_NE(errors_.find("help/Quorvan.html cannot be made: File too large"), std::string::npos) << errors_;
+    std::set<std::string> names;
+    for (const auto& [name, file] : Files())
+        names.insert(name);
+    EXPECT_EQ(names, (std::set<std::string>{"home/misc.db", "home/Quorvan.ini", "home/Quorvan.cfg",
+                                            "home/quorvan"}));
+    EXPECT_EQ(Setup("--sample"), 0) << errors_;
+    EXPECT_TRUE(Says("made  invest.db: sample investments"));
+    EXPECT_TRUE(Says("kept  Quorvan.ini"));
+}
+
+} // namespace

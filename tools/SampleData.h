@@ -1,0 +1,15 @@
+#pragma once
+
+class DATABASE;
+
+// What a new folder's data files begin with. Each function appends its records to an open data file that has
+// the columns of app/RecordLayouts.h, and is false when the engine refused one; GetLastError of the file then
+// says why.
+
+// The entries of the Type and Agent pick lists, which every folder gets.
+[[nodiscard]] bool AppendPickLists(DATABASE& categories);
+
+// Two portfolios to try the program with, and their investments: every risk, every price movement, stocks and
+// funds and others, held for retirement or not, names with blanks and beyond ASCII. All names are made up.
+[[nodiscard]] bool AppendSamplePortfolios(DATABASE& portfolios);
+[[nodiscard]] bool AppendSampleInvestments(DATABASE& investments);

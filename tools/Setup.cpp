@@ -1,0 +1,255 @@
+#include "tools/Setup.h"
+
+#include <cerrno>
+#include <filesystem>
+#include <functional>
+#include <ostream>
+#include <span>
+#include <string_view>
+#include <sys/stat.h>
+#include <system_error>
+#include <unistd.h>
+#include <utility>
+
+#include "app/RecordLayouts.h"
+#include "db/Database.h"
+#include "tools/FirstFiles.h"
+#include "tools/SampleData.h"
+#include "util/WholeFile.h"
+
+namespace {
+
+namespace fs = std::filesystem;
+
+constexpr std::size_t MaxProgramSize = std::size_t{1} << 30U;
+
+std::string Reason(int error) {
+    return std::generic_category().message(error);
+}
+
+// Whether the name is taken, be it by a link that leads nowhere.
+bool Exists(const std::string& path) {
+    struct stat status {};
+    return lstat(path.c_str(), &status) == 0;
+}
+
+mode_t Permissions(mode_t wanted) {
+    const mode_t mask = umask(0);
+    umask(mask);
+    return wanted & ~mask;
+}
+
+struct DataFilePlan {
+    const char* stem; // the file's name without its extension
+    const char* description;
+    std::span<const COLUMN_ENTRY> columns;
+    std::function<bool(DATABASE&)> fill;
+    const char* content;
+};
+
+class FolderSetup {
+  public:
+    FolderSetup(const SetupOptions& options, std::ostream& output, std::ostream& errors)
+        : options_(options), output_(output), errors_(errors) {}
+
+    int Run();
+
+  private:
+    bool MakeFolder();
+    bool MakeSubfolder(const std::string& name);
+    void MakeDataFiles();
+    // Prepares all of the files before the first takes its name, and makes none when one fails: investments
+    // without their portfolios would be no sample.
+    void MakeTogether(std::span<const DataFilePlan> plans);
+    bool PrepareDataFile(const DataFilePlan& plan);
+    void MakeFile(const std::string& name, std::string_view content, mode_t mode);
+    void InstallProgram();
+    void CopyProgram(std::string_view content, ExistingFile existing);
+
+    // The outcome of a step that ends with a file of that name: errno has the reason of a failure.
+    void Conclude(bool done, const std::string& name, const std::string& remark);
+    void Made(const std::string& name, const std::string& remark);
+    void Kept(const std::string& name, const std::string& remark);
+    void Fail(const std::string& sentence);
+
+    // Whether the data file has data: in its backup when the program was killed while it rewrote the file.
+    // The program puts that back, unless a new file has taken its place.
+    [[nodiscard]] bool IsThere(const std::string& stem) const {
+        return Exists(PathOf(FileOf(stem))) || Exists(PathOf(BackupOf(stem)));
+    }
+    [[nodiscard]] static std::string FileOf(const std::string& stem) { return stem + ".db"; }
+    [[nodiscard]] static std::string BackupOf(const std::string& stem) { return stem + ".bak"; }
+    [[nodiscard]] std::string PathOf(const std::string& name) const { return folder_ + "/" + name; }
+    [[nodiscard]] std::string TemporaryFor(const std::string& name) const { return PathOf(name) + ".part"; }
+
+    const SetupOptions& options_;
+    std::ostream& output_;
+    std::ostream& errors_;
+    std::string folder_;
+    bool failed_ = false;
+};
+
+void FolderSetup::Made(const std::string& name, const std::string& remark) {
+    output_ << "made  " << name << (remark.empty() ? "" : ": ") << remark << '\n';
+}
+
+void FolderSetup::Kept(const std::string& name, const std::string& remark) {
+    output_ << "kept  " << name << (remark.empty() ? "" : ": ") << remark << '\n';
+}
+
+void FolderSetup::Fail(const std::string& sentence) {
+    errors_ << "quorvan-cli: " << sentence << '\n';
+    failed_ = true;
+}
+
+void FolderSetup::Conclude(bool done, const std::string& name, const std::string& remark) {
+    const int error = errno;
+    if (done)
+        Made(name, remark);
+    else if (error == EEXIST)
+        Kept(name, "");
+    else
+        Fail(PathOf(name) + " cannot be made: " + Reason(error) + ".");
+}
+
+bool FolderSetup::MakeFolder() {
+    std::error_code error;
+    const fs::path wanted =
+        options_.folder.empty() ? fs::path() : fs::weakly_canonical(options_.folder, error);
+    std::string path = wanted.string();
+    while (path.size() > 1 && path.back() == '/')
+        path.pop_back();
+    if (path.empty()) {
+        Fail("The folder '" + options_.folder +
+             "' cannot be used: " + (error ? error.message() : std::string("the name is empty")) + ".");
+        return false;
+    }
+    if (path.size() > MaxFolderLength) {
+        Fail("The folder's path is too long: " + path + " has " + std::to_string(path.size()) +
+             " bytes, and Quorvan's files need one of at most " + std::to_string(MaxFolderLength) + ".");
+        return false;
+    }
+    fs::create_directories(path, error);
+    if (!error && !fs::is_directory(path, error) && !error)
+        error = std::make_error_code(std::errc::not_a_directory);
+    if (error) {
+        Fail("The folder " + path + " cannot be made: " + error.message() + ".");
+        return false;
+    }
+    folder_ = path;
+    return true;
+}
+
+bool FolderSetup::MakeSubfolder(const std::string& name) {
+    std::error_code error;
+    fs::create_directory(PathOf(name), error);
+    if (error)
+        Fail(PathOf(name) + " cannot be made: " + error.message() + ".");
+    return !error;
+}
+
+bool FolderSetup::PrepareDataFile(const DataFilePlan& plan) {
+    const std::string name = FileOf(plan.stem);
+    const std::string temporary = TemporaryFor(name);
+    unlink(temporary.c_str());
+    std::vector<COLUMN_ENTRY> columns(plan.columns.begin(), plan.columns.end());
+    DATABASE database(nullptr);
+    if (database.Create(temporary.c_str(), plan.description, static_cast<int>(columns.size()),
+                        columns.data()) == 0 &&
+        (!plan.fill || plan.fill(database)))
+        return true;
+    const int error = errno;
+    char message[128] = "";
+    database.GetLastError(message);
+    unlink(temporary.c_str());
+    Fail(PathOf(name) + " cannot be made: " + message + (error != 0 ? " (" + Reason(error) + ")." : "."));
+    return false;
+}
+
+void FolderSetup::MakeTogether(std::span<const DataFilePlan> plans) {
+    bool prepared = true;
+    for (const DataFilePlan& plan : plans)
+        prepared = prepared && (IsThere(plan.stem) || PrepareDataFile(plan));
+    for (const DataFilePlan& plan : plans) {
+        const std::string name = FileOf(plan.stem);
+        if (IsThere(plan.stem))
+            Kept(Exists(PathOf(name)) ? name : BackupOf(plan.stem), "");
+        else if (prepared)
+            Conclude(MoveWithoutReplacing(TemporaryFor(name), PathOf(name)), name, plan.content);
+        unlink(TemporaryFor(name).c_str());
+    }
+}
+
+void FolderSetup::MakeDataFiles() {
+    const bool sample = options_.sample && !IsThere("portfol") && !IsThere("invest");
+    const DataFilePlan empty[] = {
+        {"invest", "Quorvan investments", InvestmentColumns, {}, "empty"},
+        {"portfol", "Quorvan portfolios", PortfolioColumns, {}, "empty"},
+    };
+    const DataFilePlan sampled[] = {
+        {"invest", "Quorvan investments", InvestmentColumns, AppendSampleInvestments, "sample investments"},
+        {"portfol", "Quorvan portfolios", PortfolioColumns, AppendSamplePortfolios, "sample portfolios"},
+    };
+    const DataFilePlan pickLists[] = {
+        {"misc", "Quorvan pick lists", CategoryColumns, AppendPickLists, "entries for Type and Agent"},
+    };
+    MakeTogether(sample ? sampled : empty);
+    MakeTogether(pickLists);
+    if (options_.sample && !sample)
+        output_ << "no sample is added: it goes into new data files only\n";
+}
+
+void FolderSetup::MakeFile(const std::string& name, std::string_view content, mode_t mode) {
+    if (Exists(PathOf(name)))
+        Kept(name, "");
+    else
+        Conclude(
+            WriteWholeFile(PathOf(name), TemporaryFor(name), content, Permissions(mode), ExistingFile::Keep),
+            name, "");
+}
+
+void FolderSetup::CopyProgram(std::string_view content, ExistingFile existing) {
+    Conclude(WriteWholeFile(PathOf("quorvan"), TemporaryFor("quorvan"), content, Permissions(0755), existing),
+             "quorvan", "copied from " + options_.program);
+}
+
+void FolderSetup::InstallProgram() {
+    const bool there = Exists(PathOf("quorvan"));
+    std::string content;
+    if (options_.program.empty()) {
+        if (there)
+            Kept("quorvan", "");
+        else
+            Fail("The program quorvan was not found beside quorvan-cli; name it with --program FILE.");
+    } else if (!ReadWholeFile(options_.program, content, MaxProgramSize)) {
+        Fail("The program " + options_.program + " cannot be read: " + Reason(errno) + ".");
+    } else if (std::string present; !there) {
+        CopyProgram(content, ExistingFile::Keep);
+    } else if (ReadWholeFile(PathOf("quorvan"), present, MaxProgramSize) && present == content) {
+        Kept("quorvan", "");
+    } else if (options_.updateProgram) {
+        CopyProgram(content, ExistingFile::Replace);
+    } else {
+        Kept("quorvan", "it differs from " + options_.program + "; --update-program replaces it");
+    }
+}
+
+int FolderSetup::Run() {
+    if (!MakeFolder())
+        return 1;
+    output_ << "Quorvan folder " << folder_ << '\n';
+    MakeDataFiles();
+    // It may come to hold a password.
+    MakeFile("Quorvan.ini", FirstSettings(), 0600);
+    MakeFile("Quorvan.cfg", FirstQuoteSources(), 0666);
+    if (MakeSubfolder("help"))
+        MakeFile("help/Quorvan.html", HelpDocument(), 0666);
+    InstallProgram();
+    return failed_ ? 1 : 0;
+}
+
+} // namespace
+
+int RunSetup(const SetupOptions& options, std::ostream& output, std::ostream& errors) {
+    return FolderSetup(options, output, errors).Run();
+}

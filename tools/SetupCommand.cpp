@@ -1,0 +1,43 @@
+#include "tools/SetupCommand.h"
+
+#include <CLI/CLI.hpp>
+#include <filesystem>
+#include <iostream>
+#include <memory>
+
+#include "tools/Setup.h"
+
+namespace {
+
+// The program lies beside quorvan-cli, or in its own folder of the same build. Empty when it is in neither.
+std::string FindProgram() {
+    std::error_code error;
+    const std::filesystem::path own = std::filesystem::read_symlink("/proc/self/exe", error).parent_path();
+    for (const char* place : {"quorvan", "../app/quorvan"}) {
+        const std::filesystem::path candidate = (own / place).lexically_normal();
+        if (std::filesystem::is_regular_file(candidate, error))
+            return candidate.string();
+    }
+    return {};
+}
+
+} // namespace
+
+void AddSetupCommand(CLI::App& application, int& status) {
+    CLI::App* command = application.add_subcommand(
+        "setup", "Make a folder that Quorvan runs from. Files that exist are never changed.");
+    const auto options = std::make_shared<SetupOptions>();
+    command->add_option("FOLDER", options->folder, "The folder; made where it does not exist")->required();
+    command->add_flag("--sample", options->sample, "Fill new data files with two sample portfolios");
+    command->add_option("--program", options->program,
+                        "The quorvan executable to copy (default: the one found beside "
+                        "quorvan-cli)");
+    command->add_flag("--update-program", options->updateProgram,
+                      "Replace the folder's program when it is another version");
+    command->callback([options, &status] {
+        if (options->program.empty())
+            options->program = FindProgram();
+        status = RunSetup(*options, std::cout, std::cerr);
+        std::cout.flush();
+    });
+}
