@@ -1,0 +1,64 @@
+#!/bin/bash
+# Builds Quorvan, makes a folder for it and starts it there.
+set -eu
+here=$(cd "$(dirname "$0")" && pwd)
+. "$here/scripts/packages.sh"
+
+usage() {
+    cat <<'END'
+Usage: ./run.sh [FOLDER] [--sample]
+
+Installs what is missing, builds Quorvan, makes FOLDER (~/Quorvan when none is
+given) and starts the program from there. Files in FOLDER that exist are kept;
+only the program itself is brought up to date.
+
+  --sample   fill a new folder with two sample portfolios
+
+Without a display the program runs on a virtual one, is taken on a short tour,
+and pictures of it are saved.
+END
+}
+
+folder=
+options=()
+for argument in "$@"; do
+    case $argument in
+    --sample) options+=(--sample) ;;
+    -h | --help) usage && exit 0 ;;
+    -*) usage >&2 && exit 2 ;;
+    *)
+        [ -z "$folder" ] || { usage >&2 && exit 2; }
+        folder=$argument
+        ;;
+    esac
+done
+if [ -z "$folder" ]; then
+    [ -n "${HOME:-}" ] || fail "there is no home folder; name a folder: ./run.sh FOLDER"
+    folder=$HOME/Quorvan
+fi
+
+packages=("${build_packages[@]}" "${run_packages[@]}")
+if [ -z "${DISPLAY:-}${WAYLAND_DISPLAY:-}" ]; then
+    packages+=("${display_packages[@]}")
+elif [ -z "${DISPLAY:-}" ]; then
+    packages+=(qt6-wayland)
+fi
+install_missing "${packages[@]}"
+
+build=$here/build/run
+echo "Building Quorvan (the first time takes some minutes)"
+# Nothing but the program is built, so the packages of the benchmarks are not needed.
+quietly "the build could not be prepared" \
+    cmake -S "$here" --preset release -B "$build" -DQUORVAN_BENCH=OFF
+quietly "the build failed" \
+    cmake --build "$build" --parallel "$(nproc)" --target quorvan quorvan-cli
+
+"$build/tools/quorvan-cli" setup "$folder" "${options[@]}" --program "$build/app/quorvan" --update-program ||
+    fail "the folder $folder could not be made ready"
+
+cd "$folder"
+if [ -n "${DISPLAY:-}${WAYLAND_DISPLAY:-}" ]; then
+    echo "Starting $PWD/quorvan"
+    exec ./quorvan
+fi
+exec "$here/scripts/tour.sh" "$PWD" "$here/build/tour"

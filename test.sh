@@ -1,0 +1,21 @@
+#!/bin/bash
+# Installs what is missing, builds everything and runs all tests: plain, under AddressSanitizer with
+# UndefinedBehaviorSanitizer, and those with threads under ThreadSanitizer.
+set -eu
+cd "$(dirname "$0")"
+. scripts/packages.sh
+
+install_missing "${build_packages[@]}" "${run_packages[@]}" "${display_packages[@]}" "${test_packages[@]}"
+
+echo "Checking the format"
+git ls-files -z '*.h' '*.cpp' | xargs -0 clang-format --dry-run --Werror ||
+    fail "the files named above are not formatted; run: git ls-files -z '*.h' '*.cpp' | xargs -0 clang-format -i"
+
+for preset in dev asan tsan; do
+    echo "Building $preset"
+    quietly "the build of $preset could not be prepared" cmake --preset "$preset"
+    quietly "the build of $preset failed" cmake --build --preset "$preset"
+    echo "Testing $preset"
+    ctest --preset "$preset" || fail "tests failed in $preset"
+done
+echo "All tests passed."
