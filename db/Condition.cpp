@@ -12,6 +12,7 @@
 namespace {
 
 constexpr unsigned char FirstNonAscii = 128;
+constexpr int CaseBit = 'a' - 'A';
 
 constexpr unsigned char Lowered(unsigned char c) {
     return c >= 'A' && c <= 'Z' ? static_cast<unsigned char>(c + ('a' - 'A')) : c;
@@ -119,6 +120,49 @@ struct TimeField {
     }
 };
 
+template <class Word>
+Word LoadWord(const void* bytes) {
+    Word word = 0;
+    std::memcpy(&word, bytes, sizeof(Word));
+    return word;
+}
+
+// Copies a field in lower letters. False when it has a byte of 128 or above, from where on letters keep their
+// case.
+bool LowerAscii(const std::uint8_t* field, std::size_t width, std::uint8_t* lowered) {
+    std::uint8_t seen = 0;
+    for (std::size_t i = 0; i < width; ++i) {
+        const std::uint8_t c = field[i];
+        seen |= c;
+        lowered[i] = static_cast<std::uint8_t>(c + (static_cast<std::uint8_t>(c - 'A') < 26 ? 'a' - 'A' : 0));
+    }
+    return seen < FirstNonAscii;
+}
+
+constexpr std::size_t SearchBlock = 16;
+
+// Searches value in text. The first and the last byte of the value are looked for at a whole block of places
+// at once, which compilers turn into a few instructions; bytes up to a block and the value's length behind
+// the text are read.
+bool Contains(const std::uint8_t* text, std::size_t length, std::string_view value) {
+    const auto first = static_cast<std::uint8_t>(value.front());
+    const auto last = static_cast<std::uint8_t>(value.back());
+    const std::size_t lastAt = value.size() - 1;
+    for (std::size_t at = 0; at + value.size() <= length; at += SearchBlock) {
+        std::uint8_t candidates = 0;
+        for (std::size_t i = 0; i < SearchBlock; ++i) {
+            candidates |=
+                static_cast<std::uint8_t>((text[at + i] == first) & (text[at + i + lastAt] == last));
+        }
+        for (std::size_t i = at; candidates != 0 && i < at + SearchBlock && i + value.size() <= length; ++i) {
+            if (text[i] == first && std::memcmp(text + i, value.data(), value.size()) == 0) {
+                return true;
+            }
+        }
+    }
+    return false;
+}
+
 } // namespace
 
 // The loops over records, one for each way to compare, so that nothing is decided again for each record.
@@ -143,6 +187,24 @@ struct Matchers {
         }
     }
 
+    // Two letters that differ in case only differ in one bit: a field equals the value when the bits that
+    // count agree. A whole word is compared at once where the column has room for it.
+    template <bool Equal, class Word>
+    static void SameTexts(const Condition& self, const std::uint8_t* field, std::size_t stride,
+                          std::size_t count, std::uint8_t* matches) {
+        const std::size_t compared = std::min(self.length_ + 1, self.width_);
+        const bool tooLong = self.length_ > self.width_;
+        for (std::size_t i = 0; i < count; ++i, field += stride) {
+            Word difference = tooLong ? 1 : 0;
+            for (std::size_t at = 0; at < compared && difference == 0; at += sizeof(Word)) {
+                difference =
+                    static_cast<Word>((LoadWord<Word>(field + at) ^ LoadWord<Word>(self.text_ + at)) &
+                                      LoadWord<Word>(self.bits_ + at));
+            }
+            matches[i] = (difference == 0) == Equal;
+        }
+    }
+
     template <class Compare>
     static void ExactTexts(const Condition& self, const std::uint8_t* field, std::size_t stride,
                            std::size_t count, std::uint8_t* matches) {
@@ -155,7 +217,10 @@ struct Matchers {
                                 std::size_t count, std::uint8_t* matches) {
         const std::string_view value(self.text_, self.length_);
         for (std::size_t i = 0; i < count; ++i, field += stride) {
-            matches[i] = ContainsLowered(TextOf(field, self.width_), value);
+            const std::string_view text = TextOf(field, self.width_);
+            matches[i] = LowerAscii(field, self.width_, self.scratch_.get())
+                             ? Contains(self.scratch_.get(), text.size(), value)
+                             : ContainsLowered(text, value);
         }
     }
 
@@ -192,12 +257,18 @@ struct Matchers {
         }
     }
 
-    static Matcher OfTexts(int op, bool exact) {
+    template <bool Equal>
+    static Matcher OfSameTexts(std::size_t width) {
+        return width % sizeof(std::uint64_t) == 0 ? SameTexts<Equal, std::uint64_t>
+                                                  : SameTexts<Equal, std::uint8_t>;
+    }
+
+    static Matcher OfTexts(int op, bool exact, std::size_t width) {
         switch (op) {
         case CompareOperator::Equal:
-            return exact ? ExactTexts<std::equal_to<>> : LoweredTexts<std::equal_to<>>;
+            return OfSameTexts<true>(width);
         case CompareOperator::Different:
-            return exact ? ExactTexts<std::not_equal_to<>> : LoweredTexts<std::not_equal_to<>>;
+            return OfSameTexts<false>(width);
         case CompareOperator::Less:
             return exact ? ExactTexts<std::less<>> : LoweredTexts<std::less<>>;
         case CompareOperator::LessOrEqual:
@@ -226,13 +297,8 @@ bool Condition::Prepare(const COLUMN_ENTRY& column, int op, const char* value, b
     width_ = static_cast<std::size_t>(column.size);
     switch (column.type) {
     case ColumnType::String:
-        length_ = strnlen(value, TokenSize - 1);
-        std::memcpy(text_, value, length_);
-        if (!exact) {
-            strlwr(text_);
-        }
-        matcher_ = Matchers::OfTexts(op, exact);
-        break;
+        matcher_ = Matchers::OfTexts(op, exact, width_);
+        return PrepareText(value, op == CompareOperator::Contains, exact);
     case ColumnType::Byte:
         whole_ = static_cast<std::int8_t>(WholeNumber(value));
         matcher_ = Matchers::OfNumbers<ByteField>(op);
@@ -259,6 +325,28 @@ bool Condition::Prepare(const COLUMN_ENTRY& column, int op, const char* value, b
         break;
     default:
         matcher_ = Matchers::Nothing;
+    }
+    return true;
+}
+
+bool Condition::PrepareText(const char* value, bool searched, bool exact) {
+    length_ = strnlen(value, TokenSize - 1);
+    std::memcpy(text_, value, length_);
+    std::memset(bits_, 0xFF, length_ + 1);
+    if (!exact) {
+        strlwr(text_);
+        const std::size_t ascii = AsciiLength({text_, length_});
+        for (std::size_t i = 0; i < ascii; ++i) {
+            bits_[i] = static_cast<char>(text_[i] >= 'a' && text_[i] <= 'z' ? ~CaseBit : ~0);
+        }
+    }
+    if (searched) {
+        const std::size_t size = width_ + SearchBlock + TokenSize;
+        scratch_ = TryAllocate<std::uint8_t>(size);
+        if (!scratch_) {
+            return false;
+        }
+        std::memset(scratch_.get(), 0, size);
     }
     return true;
 }

@@ -2,6 +2,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <memory>
 
 #include "db/RecordTypes.h"
 #include "db/Statement.h"
@@ -64,6 +65,7 @@ class Condition {
 
   private:
     friend struct Matchers;
+    [[nodiscard]] bool PrepareText(const char* value, bool searched, bool exact);
     using Matcher = void (*)(const Condition& self, const std::uint8_t* fields, std::size_t stride,
                              std::size_t count, std::uint8_t* matches);
 
@@ -73,5 +75,8 @@ class Condition {
     std::int32_t whole_ = 0; // the value for integers, dates and times
     float single_ = 0;       // the value for floats
     char text_[TokenSize]{}; // the value for strings, lowered unless the comparison is exact
+    char bits_[TokenSize]{}; // of each byte of text_ and its terminator, the bits in which an equal field
+                             // agrees
     std::size_t length_ = 0; // of text_
+    std::unique_ptr<std::uint8_t[]> scratch_; // for Contains: a field's text in lower letters
 };

@@ -38,6 +38,10 @@ int FlagsOf(FileMode mode) {
     return O_RDWR | common;
 }
 
+std::filesystem::path FolderOf(const std::filesystem::path& path) {
+    return path.has_parent_path() ? path.parent_path() : std::filesystem::path(".");
+}
+
 } // namespace
 
 int FileOperations::Open(const char* path, int flags, mode_t mode) {
@@ -221,10 +225,7 @@ int RemoveFile(FileOperations& operations, const std::string& path) {
 }
 
 int SyncFolderOf(FileOperations& operations, const std::string& path) {
-    std::string folder = std::filesystem::path(path).parent_path().string();
-    if (folder.empty()) {
-        folder = ".";
-    }
+    const std::filesystem::path folder = FolderOf(path);
     int descriptor =
         Retry([&] { return operations.Open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC, 0); });
     if (descriptor < 0) {
@@ -246,7 +247,7 @@ std::string FollowLinks(const std::string& path) {
     std::error_code error;
     fs::path current(path);
     for (int links = 0; links <= mostLinks; ++links) {
-        fs::path folder = fs::canonical(current.has_parent_path() ? current.parent_path() : ".", error);
+        fs::path folder = fs::canonical(FolderOf(current), error);
         if (error) {
             return {};
         }
