@@ -1,0 +1,114 @@
+#include "util/InterfaceHelpers.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstring>
+
+#include "platform/Application.h"
+#include "platform/Font.h"
+#include "platform/Screen.h"
+#include "platform/View.h"
+#include "platform/Window.h"
+#include "util/CharacterBuffer.h"
+
+namespace {
+
+constexpr bigtime_t WindowLockPatience = 200000; // microseconds
+
+} // namespace
+
+void MessageBox(const char* text, alert_type type) {
+    (new BAlert("", text, "Ok", nullptr, nullptr, B_WIDTH_AS_USUAL, type))->Go();
+}
+
+bool YesNoBox(const char* text) {
+    constexpr int32 no = 1;
+    return (new BAlert("", text, "Yes", "No", nullptr, B_WIDTH_AS_USUAL, B_WARNING_ALERT))->Go() == no;
+}
+
+bool GetHomeDir(char (&out)[PathBufferSize]) {
+    app_info info;
+    be_app->GetAppInfo(&info);
+    const std::string& program = info.ref.path;
+    const std::size_t slash = program.rfind('/');
+    const bool fits = CopyText(out, std::string_view(program).substr(0, slash == program.npos ? 0 : slash));
+    if (!fits)
+        out[0] = '\0';
+    return fits;
+}
+
+void GetScreenCenter(BPoint* out) {
+    const BRect screen = BScreen().Frame();
+    GetBRectCenter(&screen, out);
+}
+
+void GetBRectCenter(const BRect* rect, BPoint* out) {
+    *out = {(rect->left + rect->right) * 0.5F, (rect->top + rect->bottom) * 0.5F};
+}
+
+float GetFontHeight(const BFont* font) {
+    font_height height;
+    font->GetHeight(&height);
+    return height.ascent + height.descent + height.leading;
+}
+
+BWindow* GetAppWindow(const BApplication* app, const char* title) {
+    BWindow* window = nullptr;
+    for (int32 i = 0; (window = app->WindowAt(i)) != nullptr; ++i) {
+        if (window->LockWithTimeout(WindowLockPatience) != B_OK)
+            continue;
+        const bool found = std::strcmp(window->Title(), title) == 0;
+        window->Unlock();
+        if (found)
+            return window;
+    }
+    return nullptr;
+}
+
+void DrawText(BView* view, const BRect* rect, const char* text, uint8 flags) {
+    font_height height;
+    view->GetFontHeight(&height);
+    const float textWidth = std::ceil(view->StringWidth(text));
+    const float textHeight = std::ceil(height.ascent + height.descent);
+    BPoint center;
+    GetBRectCenter(rect, &center);
+
+    float x = rect->left;
+    if (flags & DrawTextCenter)
+        x = center.x - textWidth * 0.5F;
+    else if (flags & DrawTextRight)
+        x = rect->right - textWidth - 2;
+    float y = rect->top + height.ascent;
+    if (flags & DrawTextMiddle)
+        y += (rect->bottom - rect->top - textHeight) * 0.5F;
+    else if (flags & DrawTextBottom)
+        y = rect->bottom - height.descent;
+    view->MovePenTo(std::max(x, rect->left), std::min(y, rect->bottom));
+
+    BRegion before;
+    view->GetClippingRegion(&before);
+    const BRegion inside(*rect);
+    view->ConstrainClippingRegion(&inside);
+    view->DrawString(text);
+    view->ConstrainClippingRegion(&before);
+}
+
+void SetColor(rgb_color* color, uint8 redPart, uint8 greenPart, uint8 bluePart) {
+    *color = {redPart, greenPart, bluePart, 255};
+}
+
+void ThreeDRectangle(BView* view, const BRect* rect, uint8 sunken) {
+    const rgb_color lit = sunken ? colors::dark_gray : colors::white;
+    const rgb_color shaded = sunken ? colors::white : colors::dark_gray;
+    const float penSize = view->PenSize();
+    view->SetPenSize(2);
+    view->MovePenTo(rect->left, rect->top);
+    view->SetHighColor(lit);
+    view->StrokeLine({rect->right, rect->top});
+    view->SetHighColor(shaded);
+    view->StrokeLine({rect->right, rect->bottom});
+    view->StrokeLine({rect->left, rect->bottom});
+    view->SetHighColor(lit);
+    view->StrokeLine({rect->left, rect->top});
+    view->SetPenSize(penSize);
+}
