@@ -1,0 +1,124 @@
+#include "dialogs/BDialog.h"
+
+#include <atomic>
+
+#include "platform/Application.h"
+#include "platform/Button.h"
+#include "platform/Kernel.h"
+#include "util/InterfaceHelpers.h"
+
+namespace {
+
+// Asks the interface thread to show a dialog that runs for another thread.
+constexpr uint32 MessageShow = 2000;
+
+constexpr float BottomMargin = 20;
+constexpr float RightMargin = 10;
+
+} // namespace
+
+struct BDialog::Outcome {
+    sem_id semaphore = -1;
+    std::atomic<uint32> result = DialogCancel;
+    std::atomic<bool> ended = false;
+
+    void End(uint32 with) {
+        if (ended.exchange(true))
+            return;
+        result = with;
+        delete_sem(semaphore);
+    }
+};
+
+BDialog::BDialog(BRect frame, const char* title, uint16 flags)
+    : BWindow(frame, title, B_FLOATING_WINDOW_LOOK, B_MODAL_APP_WINDOW_FEEL,
+              B_NOT_RESIZABLE | B_NOT_ZOOMABLE | B_WILL_ACCEPT_FIRST_CLICK),
+      topView_(new BView(Bounds(), "top view", B_FOLLOW_ALL_SIDES, B_WILL_DRAW)),
+      fontHeight_(GetFontHeight(be_bold_font)),
+      outcome_(std::make_shared<Outcome>()) {
+    topView_->SetViewColor(colors::gray);
+    AddChild(topView_);
+    AddButtons(flags);
+}
+
+BDialog::~BDialog() {
+    outcome_->End(DialogCancel);
+}
+
+void BDialog::AddButtons(uint16 flags) {
+    const BRect bounds = Bounds();
+    const float width = topView_->StringWidth("  Cancel  ");
+    const float step = width + RightMargin;
+    const float bottom = bounds.bottom - BottomMargin;
+    BRect frame(bounds.right - 2 * step, bottom - 1.5F * fontHeight_, bounds.right - 2 * step + width,
+                bottom);
+    if (flags & DialogHasOk) {
+        auto* ok =
+            new BButton(frame, "Ok button", "Ok", new BMessage(DialogOk), B_FOLLOW_LEFT | B_FOLLOW_BOTTOM);
+        topView_->AddChild(ok);
+        SetDefaultButton(ok);
+    }
+    frame.OffsetBy(step, 0);
+    if (flags & DialogHasCancel)
+        topView_->AddChild(new BButton(frame, "cancel button", "Cancel", new BMessage(DialogCancel),
+                                       B_FOLLOW_RIGHT | B_FOLLOW_BOTTOM));
+}
+
+uint32 BDialog::DoModal() {
+    const std::shared_ptr<Outcome> outcome = outcome_;
+    const BMessenger self(this);
+    const sem_id semaphore = create_sem(0, "ModalSem");
+    outcome->semaphore = semaphore;
+    // Windows are shown by the interface thread, which alone holds the lock of one that was never shown.
+    // Another thread asks for it through the application's queue: a hidden window does not serve its own yet.
+    if (IsLocked()) {
+        Show();
+    } else {
+        const BMessage show(MessageShow);
+        be_app->PostMessage(&show, this);
+    }
+
+    // Nobody releases the semaphore; its end is the dialog's. The wait itself keeps the windows painted.
+    status_t status = B_OK;
+    while (status == B_OK || status == B_TIMED_OUT)
+        status = acquire_sem_etc(semaphore, 1, B_RELATIVE_TIMEOUT, B_INFINITE_TIMEOUT);
+
+    if (status == B_INTERRUPTED && self.LockTargetWithTimeout(B_INFINITE_TIMEOUT) == B_OK) {
+        // The dialog is still there; with its lock held nothing is in the middle of writing the caller's
+        // buffers.
+        outcome->End(DialogCancel);
+        self.UnlockTarget();
+    }
+    self.SendMessage(BMessage(B_QUIT_REQUESTED));
+    return outcome->result;
+}
+
+void BDialog::EndDialog(uint32 result) {
+    Hide();
+    outcome_->End(result);
+}
+
+void BDialog::MessageReceived(BMessage* message) {
+    if (message->what == MessageShow) {
+        Show();
+        return;
+    }
+    if (outcome_->ended && message->what != B_QUIT_REQUESTED)
+        return;
+    switch (message->what) {
+    case DialogCancel:
+        EndDialog(DialogCancel);
+        return;
+    case DialogOk:
+        if (OnOK() == 1)
+            EndDialog(DialogOk);
+        return;
+    default:
+        break;
+    }
+    const int handled = HandleMessage(message);
+    if (handled == 0)
+        BWindow::MessageReceived(message);
+    else if (handled == 2)
+        EndDialog(DialogOk);
+}
