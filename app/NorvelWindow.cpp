@@ -1,0 +1,188 @@
+#include "app/NorvelWindow.h"
+
+#include <algorithm>
+
+#include "ColumnListView/BetterScrollView.h"
+#include "ColumnListView/CLVColumn.h"
+#include "ColumnListView/ColumnListView.h"
+#include "app/AppState.h"
+#include "app/MessageCodes.h"
+#include "app/NorvelItem.h"
+#include "platform/Application.h"
+#include "platform/Button.h"
+#include "platform/MenuBar.h"
+#include "platform/MenuField.h"
+#include "platform/StringView.h"
+#include "util/CharacterBuffer.h"
+#include "util/InterfaceHelpers.h"
+
+namespace {
+
+constexpr const char* WindowTitle = "Quorvan"; // the price update finds the window by it
+
+constexpr float LeastSize = 200;
+constexpr float GreatestSize = 10000;
+constexpr float ScrollBarSpace = 14;
+constexpr float ButtonSpace = 50; // below the list
+constexpr float ButtonStep = 125;
+constexpr float TotalLeft = 200;
+constexpr float TotalGap = 10;
+
+constexpr const char* WidthSection = "DISPLAY";
+constexpr const char* WidthKey = "ColumnWidth%d";
+constexpr int DefaultWidth = 50;
+
+struct ColumnInfo {
+    const char* label;
+    uint32 flags;
+    float minWidth;
+};
+constexpr ColumnInfo Columns[InvestmentColumnCount] = {
+    {nullptr, CLVF_FIXED_POSITION | CLVF_FIXED_WIDTH | CLVF_KEEP_FIRST | CLVF_JOIN_HEADER | CLVF_PASS_INDENT,
+     20},
+    {"Name", CLVF_SORTABLE, 50},
+    {"Ticker", CLVF_SORTABLE, 20},
+    {"Type", CLVF_SORTABLE, 20},
+    {"Shares", CLVF_SORTABLE, 20},
+    {"Price", CLVF_SORTABLE, 20},
+    {"Value", CLVF_SORTABLE, 20},
+    {"Date", CLVF_SORTABLE, 20},
+    {"Retire", CLVF_SORTABLE, 20},
+    {"Risk", CLVF_SORTABLE, 20},
+    {"Agent", CLVF_SORTABLE, 20},
+};
+
+struct ButtonInfo {
+    const char* name;
+    const char* label;
+    uint32 code;
+};
+constexpr ButtonInfo Buttons[] = {
+    {"add button", "Add", MessageInvestmentAdd},
+    {"print button", "Print", MessagePortfolioPrint},
+    {"chart button", "Charts", MessagePortfolioChart},
+    {"Update button", "Update", MessagePortfolioUpdate},
+};
+
+} // namespace
+
+NorvelWindow::NorvelWindow()
+    : BWindow({100, 100, 600, 300}, WindowTitle, B_DOCUMENT_WINDOW, B_WILL_ACCEPT_FIRST_CLICK),
+      settings_(app_state->settingsPath) {
+    SetSizeLimits(LeastSize, GreatestSize, LeastSize, GreatestSize);
+    BView* topView = AddTopView();
+    const float barHeight = AddMenus(topView)->Frame().Height();
+    AddSelector(topView, barHeight + 1);
+    AddTotalValueView(topView, barHeight + 1, barHeight);
+    AddInvestmentList(topView, barHeight + 1 + selector_->Frame().Height() + 1);
+    AddButtons(topView);
+    LoadPortfolioList();
+    LoadInvestmentList();
+    MenusBeginning();
+    investmentList_->MakeFocus();
+    Show();
+}
+
+NorvelWindow::~NorvelWindow() {
+    selector_->SetTextChangedHook(nullptr);
+    SaveColumnWidths();
+    be_app->PostMessage(B_QUIT_REQUESTED);
+}
+
+void NorvelWindow::Quit() {
+    ClearInvestmentList();
+    BWindow::Quit();
+}
+
+BView* NorvelWindow::AddTopView() {
+    auto* topView = new BView(Bounds(), "top view", B_FOLLOW_ALL_SIDES, B_WILL_DRAW);
+    topView->SetViewColor(colors::gray);
+    AddChild(topView);
+    return topView;
+}
+
+BMenuBar* NorvelWindow::AddMenus(BView* topView) {
+    menuBar_ = new BMenuBar(BRect(0, 0, 0, 0), "menu bar");
+    LoadMenus(menuBar_);
+    topView->AddChild(menuBar_);
+    return menuBar_;
+}
+
+void NorvelWindow::AddSelector(BView* topView, float top) {
+    auto* menu = new BPopUpMenu("        "); // what the field shows while nothing is marked
+    selector_ = new BMenuField({0, top, 300, top + 20}, "", "Portfolio:", menu, B_FOLLOW_LEFT | B_FOLLOW_TOP,
+                               B_WILL_DRAW | B_NAVIGABLE);
+    selector_->SetDivider(topView->StringWidth("Portfolio: "));
+    topView->AddChild(selector_);
+    selector_->SetTextChangedHook([this] { PlaceTotalValueView(); });
+}
+
+void NorvelWindow::AddTotalValueView(BView* topView, float top, float height) {
+    totalValueView_ = new BStringView({TotalLeft, top, Bounds().right + TotalLeft, top + height},
+                                      "total value", "Total Value: $0.00");
+    totalValueView_->SetHighColor(colors::green);
+    topView->AddChild(totalValueView_);
+    PlaceTotalValueView();
+}
+
+void NorvelWindow::PlaceTotalValueView() {
+    if (totalValueView_)
+        totalValueView_->MoveTo(std::max(TotalLeft, selector_->VisibleRight() + TotalGap),
+                                selector_->Frame().top);
+}
+
+void NorvelWindow::AddInvestmentList(BView* topView, float top) {
+    const BRect frame(0, top, Bounds().right - ScrollBarSpace,
+                      Bounds().bottom - ScrollBarSpace - ButtonSpace);
+    BetterScrollView* container = nullptr;
+    investmentList_ = new ColumnListView(
+        frame, &container, nullptr, B_FOLLOW_ALL_SIDES, B_WILL_DRAW | B_FRAME_EVENTS | B_NAVIGABLE,
+        B_MULTIPLE_SELECTION_LIST, false, true, true, true, B_NO_BORDER, be_plain_font);
+    AddColumns();
+    investmentList_->SetViewColor(colors::light_gray);
+    investmentList_->SetFont(be_fixed_font);
+    investmentList_->SetSortFunction(NorvelItem::MyCompare);
+    if (FindCommand(MessageInvestmentInvoked))
+        investmentList_->SetInvocationMessage(new BMessage(MessageInvestmentInvoked));
+    topView->AddChild(container);
+}
+
+void NorvelWindow::AddColumns() {
+    for (int index = 0; index < InvestmentColumnCount; ++index) {
+        char key[32];
+        FormatInto(key, sizeof key, WidthKey, index);
+        const auto width = static_cast<float>(settings_.ReadInt(WidthSection, key, DefaultWidth));
+        const ColumnInfo& info = Columns[index];
+        investmentList_->AddColumn(new CLVColumn(info.label, width, info.flags, info.minWidth));
+    }
+}
+
+void NorvelWindow::SaveColumnWidths() const {
+    const CLVColumn* column = nullptr;
+    for (int index = 0; (column = investmentList_->ColumnAt(index)) != nullptr; ++index) {
+        char key[32];
+        FormatInto(key, sizeof key, WidthKey, index);
+        // Without a settings file there is nowhere to keep them.
+        static_cast<void>(settings_.WriteInt(WidthSection, key, static_cast<int>(column->Width())));
+    }
+}
+
+void NorvelWindow::AddButtons(BView* topView) {
+    BRect frame(10, Bounds().bottom - 40, 100, Bounds().bottom - 10);
+    for (const ButtonInfo& info : Buttons) {
+        auto* button = new BButton(frame, info.name, info.label, new BMessage(info.code),
+                                   B_FOLLOW_LEFT | B_FOLLOW_BOTTOM);
+        button->SetEnabled(FindCommand(info.code) != nullptr);
+        topView->AddChild(button);
+        frame.OffsetBy(ButtonStep, 0);
+    }
+}
+
+void NorvelWindow::MessageReceived(BMessage* message) {
+    if (message->what == MessagePortfolioSelected)
+        OnPortfolioSelected(message);
+    else if (const Command* command = FindCommand(message->what))
+        (this->*command->run)();
+    else
+        BWindow::MessageReceived(message);
+}

@@ -1,0 +1,110 @@
+#pragma once
+
+#include "app/RecordLayouts.h"
+#include "platform/Window.h"
+#include "util/IniFile.h"
+
+class BMenu;
+class BMenuBar;
+class BMenuField;
+class BMenuItem;
+class BStringView;
+class ColumnListView;
+class NorvelItem;
+
+// The program's main window: the portfolio selector, the portfolio's total value, the list of its
+// investments, four buttons and the menus. It turns menu items, buttons and the list's invocation into
+// messages and each message into one command. What a command does to the files is PortfolioRules' business;
+// the databases, paths and the clipboard are app_state's, which must exist as long as the window.
+//
+// The application object creates it; it deletes itself when it quits, and asks the application to quit as it
+// goes. Interface thread.
+class NorvelWindow : public BWindow {
+  public:
+    // Builds the window, loads the selector and the last portfolio's investments, and shows it all.
+    NorvelWindow();
+    // Saves the column widths.
+    ~NorvelWindow() override;
+
+    void MessageReceived(BMessage* message) override;
+    void MenusBeginning() override;
+    // Deletes the rows first.
+    void Quit() override;
+
+    // The sum of the Value of the current portfolio's investments, which are left as the investment
+    // database's result set.
+    [[nodiscard]] float PortfolioTotalValue();
+    // False, after telling the person so, when there is no portfolio, or no row in the list.
+    [[nodiscard]] bool IsPortfolioPresent();
+    [[nodiscard]] bool IsInvestmentPresent();
+
+  private:
+    // What a command needs before its menu item can be chosen.
+    enum class Needs { Nothing, Portfolio, Investment };
+    struct Command {
+        uint32 code;
+        Needs needs;
+        void (NorvelWindow::*run)();
+    };
+    // The commands there are. A menu item or button whose code is not here is disabled.
+    static const Command Commands[];
+    [[nodiscard]] static const Command* FindCommand(uint32 code);
+    [[nodiscard]] bool CanRun(const Command& command) const;
+
+    // --- building ---
+    BView* AddTopView();
+    BMenuBar* AddMenus(BView* topView);
+    void LoadMenus(BMenuBar* bar);
+    void AddSelector(BView* topView, float top);
+    void AddTotalValueView(BView* topView, float top, float height);
+    void AddInvestmentList(BView* topView, float top);
+    void AddColumns();
+    void AddButtons(BView* topView);
+    // Keeps the total to the right of what the selector shows.
+    void PlaceTotalValueView();
+    void SaveColumnWidths() const;
+
+    // --- portfolios ---
+    void LoadPortfolioList();
+    // Appends a portfolio to the selector, marks it and asks for it to be shown.
+    void AddPortfolioMenuItem(const char* name);
+    void AppendMarkedItem(const char* name);
+    void PostSelection(const char* name);
+    void SelectFirstPortfolioMenuItem();
+    // The selector's marked item; null when there is none.
+    [[nodiscard]] BMenuItem* MarkedPortfolio() const;
+    void OnPortfolioSelected(BMessage* message);
+    void OnPortfolioDelete();
+
+    // --- investments ---
+    void LoadInvestmentList();
+    void ClearInvestmentList();
+    // Shows total when it is 0 or more, else the current portfolio's.
+    void DisplayTotalValue(float total);
+    // Copies the selected investments to the clipboard; true when it now holds all of them.
+    bool CopySelection();
+    void RemoveSelectedRows();
+    void OnInvestmentDelete();
+    void OnInvestmentCopy();
+    void OnInvestmentCut();
+    void OnInvestmentPaste();
+
+    // --- other commands ---
+    void OnSettings();
+    void OnHelp();
+    // Where dialogs open.
+    [[nodiscard]] BPoint DialogCorner() const;
+
+    INI_FILEx settings_;
+    BMenuBar* menuBar_ = nullptr;
+    BMenuField* selector_ = nullptr;
+    BStringView* totalValueView_ = nullptr;
+    ColumnListView* investmentList_ = nullptr;
+    char currentPortfolio_[NameSize] = ""; // whose investments are shown; empty for none
+};
+
+// A new row for the investment, which belongs to the caller until a list takes it.
+[[nodiscard]] NorvelItem* CreateNewInvestmentItem(const INVESTMENT_DATA& record, int32 recordNumber);
+
+// How many of the list's rows are selected.
+[[nodiscard]] int32 CountSelectedItems(const ColumnListView* list);

@@ -1,0 +1,145 @@
+#include "app/NorvelWindow.h"
+
+#include <cstdlib>
+#include <string>
+#include <vector>
+
+#include "ColumnListView/ColumnListView.h"
+#include "app/AppState.h"
+#include "app/NorvelItem.h"
+#include "app/PortfolioRules.h"
+#include "platform/StringView.h"
+#include "util/InterfaceHelpers.h"
+#include "util/Numbers.h"
+
+namespace {
+
+// The selected rows from the top.
+std::vector<NorvelItem*> SelectedItems(const ColumnListView* list) {
+    std::vector<NorvelItem*> selected;
+    int32 index = 0;
+    for (int32 i = 0; (index = list->CurrentSelection(i)) >= 0; ++i)
+        selected.push_back(static_cast<NorvelItem*>(list->ItemAt(index)));
+    return selected;
+}
+
+} // namespace
+
+NorvelItem* CreateNewInvestmentItem(const INVESTMENT_DATA& record, int32 recordNumber) {
+    return new NorvelItem(record, recordNumber);
+}
+
+int32 CountSelectedItems(const ColumnListView* list) {
+    int32 count = 0;
+    while (list->CurrentSelection(count) >= 0)
+        ++count;
+    return count;
+}
+
+void NorvelWindow::LoadInvestmentList() {
+    ClearInvestmentList();
+    float total = 0;
+    BList rows;
+    ForEachInvestment(*app_state->investments, currentPortfolio_,
+                      [&](const INVESTMENT_DATA& record, long number) {
+                          total += record.Value;
+                          rows.AddItem(CreateNewInvestmentItem(record, static_cast<int32>(number)));
+                      });
+    investmentList_->AddList(&rows);
+    DisplayTotalValue(total);
+}
+
+void NorvelWindow::ClearInvestmentList() {
+    std::vector<BListItem*> rows;
+    rows.reserve(static_cast<std::size_t>(investmentList_->CountItems()));
+    for (int32 i = 0; i < investmentList_->CountItems(); ++i)
+        rows.push_back(investmentList_->ItemAt(i));
+    investmentList_->MakeEmpty();
+    for (const BListItem* row : rows)
+        delete row;
+}
+
+void NorvelWindow::DisplayTotalValue(float total) {
+    char number[FormatNumberSize];
+    FormatNumber(total >= 0 ? total : PortfolioTotalValue(), number, 2);
+    totalValueView_->SetText((std::string("Total Value: $") + number).c_str());
+}
+
+float NorvelWindow::PortfolioTotalValue() {
+    return TotalValue(*app_state->investments, currentPortfolio_);
+}
+
+bool NorvelWindow::IsInvestmentPresent() {
+    if (investmentList_->CountItems() > 0)
+        return true;
+    MessageBox("This command requires a portfolio with at least one investment.", B_STOP_ALERT);
+    return false;
+}
+
+void NorvelWindow::OnInvestmentDelete() {
+    const std::vector<NorvelItem*> selected = SelectedItems(investmentList_);
+    if (selected.empty()) {
+        MessageBox("You must select an investment to delete!", B_INFO_ALERT);
+        return;
+    }
+    for (const NorvelItem* row : selected)
+        app_state->investments->Delete(row->RecordNumber());
+    RemoveSelectedRows();
+    DisplayTotalValue(-1);
+}
+
+// Takes the rows out in runs, from below so that the runs above keep their places.
+void NorvelWindow::RemoveSelectedRows() {
+    int32 end = investmentList_->CountItems();
+    while (end > 0) {
+        int32 begin = end;
+        while (begin > 0 && investmentList_->IsItemSelected(begin - 1))
+            --begin;
+        std::vector<BListItem*> run;
+        for (int32 i = begin; i < end; ++i)
+            run.push_back(investmentList_->ItemAt(i));
+        investmentList_->RemoveItems(begin, end - begin);
+        for (const BListItem* row : run)
+            delete row;
+        end = begin - 1;
+    }
+}
+
+bool NorvelWindow::CopySelection() {
+    const std::vector<NorvelItem*> selected = SelectedItems(investmentList_);
+    if (selected.empty()) {
+        MessageBox("You must select a(n) investment(s) to cut or copy.", B_INFO_ALERT);
+        return false;
+    }
+    AppState& state = *app_state;
+    state.clipboardCount = 0;
+    state.clipboard.reset(
+        static_cast<INVESTMENT_DATA*>(std::calloc(selected.size(), sizeof(INVESTMENT_DATA))));
+    if (!state.clipboard) {
+        MessageBox("Clipboard memory error!", B_INFO_ALERT);
+        return false;
+    }
+    for (const NorvelItem* row : selected) {
+        if (ReadInvestment(*state.investments, row->RecordNumber(), &state.clipboard[state.clipboardCount]))
+            ++state.clipboardCount;
+    }
+    return state.clipboardCount == static_cast<int32>(selected.size());
+}
+
+void NorvelWindow::OnInvestmentCopy() {
+    CopySelection();
+}
+
+void NorvelWindow::OnInvestmentCut() {
+    if (CopySelection())
+        OnInvestmentDelete();
+}
+
+void NorvelWindow::OnInvestmentPaste() {
+    const AppState& state = *app_state;
+    if (state.clipboardCount <= 0 || currentPortfolio_[0] == '\0')
+        return;
+    AppendCopies(*state.investments, {state.clipboard.get(), static_cast<std::size_t>(state.clipboardCount)},
+                 currentPortfolio_);
+    LoadInvestmentList();
+}

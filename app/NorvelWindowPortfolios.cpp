@@ -1,0 +1,93 @@
+#include "app/NorvelWindow.h"
+
+#include <cstring>
+#include <string>
+
+#include "app/AppState.h"
+#include "app/MessageCodes.h"
+#include "app/PortfolioRules.h"
+#include "platform/MenuField.h"
+#include "util/CharacterBuffer.h"
+#include "util/InterfaceHelpers.h"
+
+void NorvelWindow::LoadPortfolioList() {
+    DATABASE& portfolios = *app_state->portfolios;
+    if (portfolios.Query(nullptr, QueryMode::New) > 0) {
+        for (const void* data = portfolios.QueryGetFirst(nullptr); data;
+             data = portfolios.QueryGetNext(nullptr)) {
+            PORTFOLIO_DATA record;
+            std::memcpy(&record, data, sizeof record);
+            // Without a message for each to be selected: the list would be loaded once for every portfolio,
+            // to end with the last one's investments, which the constructor loads in any case.
+            AppendMarkedItem(std::string(FieldText(record.Name)).c_str());
+        }
+    }
+    if (const BMenuItem* marked = MarkedPortfolio())
+        CopyTextZeroed(currentPortfolio_, marked->Label());
+}
+
+void NorvelWindow::AddPortfolioMenuItem(const char* name) {
+    AppendMarkedItem(name);
+    PostSelection(name);
+}
+
+void NorvelWindow::AppendMarkedItem(const char* name) {
+    auto* message = new BMessage(MessagePortfolioSelected);
+    message->AddString(PortfolioNameField, name);
+    auto* item = new BMenuItem(name, message);
+    item->SetTarget(this);
+    selector_->Menu()->AddItem(item);
+    item->SetMarked(true);
+}
+
+void NorvelWindow::PostSelection(const char* name) {
+    BMessage message(MessagePortfolioSelected);
+    message.AddString(PortfolioNameField, name);
+    PostMessage(&message);
+}
+
+void NorvelWindow::SelectFirstPortfolioMenuItem() {
+    BMenuItem* first = selector_->Menu()->ItemAt(0);
+    if (!first) {
+        currentPortfolio_[0] = '\0';
+        ClearInvestmentList();
+        DisplayTotalValue(0);
+        return;
+    }
+    first->SetMarked(true);
+    CopyTextZeroed(currentPortfolio_, first->Label());
+    PostSelection(currentPortfolio_);
+}
+
+BMenuItem* NorvelWindow::MarkedPortfolio() const {
+    return selector_->Menu()->FindMarked();
+}
+
+bool NorvelWindow::IsPortfolioPresent() {
+    if (selector_->Menu()->CountItems() > 0)
+        return true;
+    MessageBox("This command requires that a portfolio be created first.", B_STOP_ALERT);
+    return false;
+}
+
+void NorvelWindow::OnPortfolioSelected(BMessage* message) {
+    const char* name = nullptr;
+    if (message->FindString(PortfolioNameField, &name) != B_OK)
+        return;
+    CopyTextZeroed(currentPortfolio_, name);
+    LoadInvestmentList();
+}
+
+void NorvelWindow::OnPortfolioDelete() {
+    BMenuItem* marked = MarkedPortfolio();
+    if (!marked) {
+        MessageBox("There are no portfolios to delete!", B_INFO_ALERT);
+        return;
+    }
+    if (YesNoBox("Are you sure you want to delete this portfolio?") || YesNoBox("Are you really sure?"))
+        return;
+    DeletePortfolio(*app_state->portfolios, *app_state->investments, currentPortfolio_);
+    if (selector_->Menu()->RemoveItem(marked))
+        delete marked;
+    SelectFirstPortfolioMenuItem();
+}

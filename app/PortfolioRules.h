@@ -1,0 +1,55 @@
+#pragma once
+
+#include <algorithm>
+#include <cstring>
+#include <span>
+
+#include "app/RecordLayouts.h"
+#include "db/Database.h"
+
+// What the commands do to the data files, without a window. A portfolio is named by its name alone, in any
+// letter case. Results of single writes are not reported: after a failed one the file holds what it held.
+
+// Whether an open database has the layout of portfol.db, invest.db or misc.db, as far as the program relies
+// on it: the column that its queries name, and records that fit the program's structs. One that has not must
+// not be used.
+[[nodiscard]] bool HoldsPortfolios(DATABASE& database);
+[[nodiscard]] bool HoldsInvestments(DATABASE& database);
+[[nodiscard]] bool HoldsCategories(DATABASE& database);
+
+// Makes the portfolio records of that name, or the portfolio's investments, the result set of the database.
+// Returns how many there are; 0 or less when there are none, the query fails, or the name can be in no query
+// (it is empty or has a tab or line end in it): then the result set is not to be walked.
+[[nodiscard]] long SelectPortfolios(DATABASE& portfolios, const char* name);
+[[nodiscard]] long SelectInvestments(DATABASE& investments, const char* portfolio);
+
+// Calls visit(const INVESTMENT_DATA&, long recordNumber) for each of the portfolio's investments in record
+// order. visit must not change the database. The result set is left on the portfolio.
+template <class Visit>
+void ForEachInvestment(DATABASE& investments, const char* portfolio, Visit visit) {
+    if (SelectInvestments(investments, portfolio) <= 0)
+        return;
+    DATABASE_HEADER header;
+    investments.GetHeaderInfo(&header);
+    INVESTMENT_DATA record{};
+    const auto length = std::min(static_cast<std::size_t>(header.recordLength - 1), sizeof record);
+    long number = 0;
+    for (const void* data = investments.QueryGetFirst(&number); data;
+         data = investments.QueryGetNext(&number)) {
+        std::memcpy(&record, data, length);
+        visit(record, number);
+    }
+}
+
+// Reads a record into a zeroed struct; false when it cannot be read.
+[[nodiscard]] bool ReadInvestment(DATABASE& investments, long recordNumber, INVESTMENT_DATA* record);
+
+// The sum of the Value of the portfolio's investments, added up in single precision in record order; 0 for
+// none. The result set is left on the portfolio, where the report finds it.
+[[nodiscard]] float TotalValue(DATABASE& investments, const char* portfolio);
+
+// Deletes every portfolio record of that name and every investment of it.
+void DeletePortfolio(DATABASE& portfolios, DATABASE& investments, const char* name);
+
+// Appends copies of the records as investments of the portfolio; nothing but their Portfolio changes.
+void AppendCopies(DATABASE& investments, std::span<const INVESTMENT_DATA> records, const char* portfolio);
