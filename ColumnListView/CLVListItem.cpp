@@ -1,0 +1,53 @@
+#include "ColumnListView/CLVListItem.h"
+
+#include <algorithm>
+
+#include "ColumnListView/CLVColumn.h"
+#include "ColumnListView/ColumnListView.h"
+
+CLVListItem::CLVListItem(uint32 outlineLevel, bool superitem, bool expanded, float minHeight)
+    : BListItem(outlineLevel, expanded), superitem_(superitem), minHeight_(minHeight) {}
+
+CLVListItem::~CLVListItem() = default;
+
+void CLVListItem::DrawItem(BView* owner, BRect rowRect, bool complete) {
+    if (!list_)
+        return;
+    BRegion clipping;
+    owner->GetClippingRegion(&clipping);
+    const BRect area = clipping.Frame();
+    const auto draw = [&](const BRect& frame, int32 column) {
+        if (frame.Intersects(area))
+            DrawItemColumn(owner, frame, column, complete);
+    };
+    for (const CLVColumn* column : list_->ColumnsInDisplayOrder()) {
+        if (!column->IsShown())
+            continue;
+        const BRect frame = list_->ColumnFrame(*this, *column, rowRect);
+        draw(frame, list_->IndexOfColumn(column));
+        if ((column->Flags() & CLVF_EXPANDER) != 0)
+            DrawExpander(owner, frame);
+    }
+    draw({list_->ColumnsEnd() + 1, rowRect.top, std::max(rowRect.right, owner->Bounds().right),
+          rowRect.bottom},
+         -1);
+}
+
+void CLVListItem::DrawExpander(BView* owner, BRect frame) {
+    expanderRect_ = frame;
+    if (!superitem_)
+        return;
+    arrowRect_ = ArrowFrame(frame);
+    owner->SetDrawingMode(B_OP_OVER);
+    owner->DrawBitmap(list_->Arrow(IsExpanded()), arrowRect_.LeftTop());
+    owner->SetDrawingMode(B_OP_COPY);
+}
+
+void CLVListItem::Update(BView* owner, const BFont* font) {
+    BListItem::Update(owner, font);
+    SetHeight(std::max(Height(), minHeight_));
+}
+
+void CLVListItem::ColumnWidthChanged(int32, float, ColumnListView*) {}
+
+void CLVListItem::FrameChanged(int32, BRect, ColumnListView*) {}

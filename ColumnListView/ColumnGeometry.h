@@ -1,0 +1,63 @@
+// Where columns lie: arithmetic without a window. All measures are logical pixels; a column from begin to end
+// covers both edges, so that its width is end minus begin and the next column begins at end plus 1.
+#pragma once
+
+#include <vector>
+
+#include "ColumnListView/ColumnFlags.h"
+#include "platform/Rect.h"
+
+// How far one outline level moves the expander column and the pushed columns to the right.
+constexpr float kIndentPerLevel = 20;
+// Side length of the expander arrow, and its distance from the expander column's end.
+constexpr float kArrowSize = 10;
+constexpr float kArrowInset = 3;
+// How near to a border a press still takes hold of the border.
+constexpr float kBorderReach = 2;
+
+// What of a column decides where it lies.
+struct ColumnShape {
+    float width = 0;
+    uint32 flags = 0; // the CLVF_ family
+
+    [[nodiscard]] bool IsShown() const { return (flags & CLVF_HIDDEN) == 0; }
+};
+
+// Where a column lies; without meaning for a hidden one.
+struct ColumnPlace {
+    float begin = 0;
+    float end = 0;
+    bool pushed = false; // moved right by the outline indentation, because the expander column is before it
+};
+
+struct ColumnLayout {
+    std::vector<ColumnPlace> places; // as the shapes, in display order
+    float end = -1;                  // of the last shown column; -1 when none is shown
+    float pushEnd = -1;              // of the last pushed column, else of the expander column; -1 without one
+};
+
+// Places the columns given in display order: the first shown one begins at 0.
+[[nodiscard]] ColumnLayout LayOutColumns(const std::vector<ColumnShape>& shapes);
+
+// The part of a row's rectangle that belongs to a column. indentation is 0 save for the expander column and
+// the pushed ones, which move right by it but reach no further than pushEnd. Invalid when nothing is left.
+[[nodiscard]] BRect ColumnFrameInRow(const ColumnPlace& place, const BRect& row, float indentation,
+                                     float pushEnd);
+
+// Where the expander arrow lies in the (indented) frame of the expander column.
+[[nodiscard]] BRect ArrowFrame(const BRect& expanderFrame);
+
+// What a press at a place of the header takes hold of.
+struct HeaderHit {
+    enum class What { Nothing, Border, Header };
+    What what = What::Nothing;
+    int32 position = -1; // in display order: the column to resize, or the column whose header is pressed
+
+    bool operator==(const HeaderHit&) const = default;
+};
+
+// Within kBorderReach right of a column's begin lies the border of the shown column before it, within
+// kBorderReach left of its end its own; a border of a column with CLVF_FIXED_WIDTH is part of the header
+// around it.
+[[nodiscard]] HeaderHit HitHeader(const std::vector<ColumnShape>& shapes, const ColumnLayout& layout,
+                                  float x);
