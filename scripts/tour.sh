@@ -1,7 +1,7 @@
 #!/bin/bash
 # Takes the built program on a short tour on a virtual display and saves pictures of it.
 #
-#   scripts/tour.sh FOLDER PICTURES [QUORVAN]
+#   scripts/tour.sh FOLDER PICTURES
 #
 # FOLDER is a Quorvan folder (see quorvan-cli setup) with at least two portfolios; it must ask for no password.
 # Every step must change the screen; the tour ends with Quit and fails when the program does not end by itself.
@@ -9,7 +9,7 @@ set -eu
 here=$(cd "$(dirname "$0")" && pwd)
 . "$here/packages.sh"
 
-[ $# -ge 2 ] || fail "usage: scripts/tour.sh FOLDER PICTURES"
+[ $# -eq 2 ] || fail "usage: scripts/tour.sh FOLDER PICTURES"
 folder=$1
 pictures=$2
 mkdir -p "$pictures" || fail "the folder $pictures for the pictures cannot be made"
@@ -121,12 +121,17 @@ step "closing the File menu" xdotool key Escape
 step "sorting by Value" click "$value" $((bottom - 8))
 picture sorted-by-value
 # The selector stands above the list, its text behind the label.
+listed=$(screen)
 step "opening the portfolio selector" click 150 $((bottom - 32))
 picture portfolio-selector
-step "selecting another portfolio" xdotool key Home Return
+# The last portfolio is shown, so the next one down is the first.
+step "going to the first portfolio" xdotool key Down
+step "selecting it" xdotool key Return
+[ "$(screen)" != "$listed" ] || fail "selecting another portfolio showed the same one"
 picture other-portfolio
 step "opening the File menu again" click 15 10
-xdotool key End Return
+step "going to Quit" xdotool key Up
+xdotool key Return
 within 20 ended || fail "the program did not end after Quit"
 status=0
 wait "$program" || status=$?
