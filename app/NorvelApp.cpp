@@ -53,7 +53,7 @@ NorvelApp::NorvelApp() : BApplication(Signature) {
     if (!ready)
         MessageBox("Quorvan cannot start: the path of its folder is too long. Please move the folder to a "
                    "place with a "
-                   "path of at most 100 characters.",
+                   "path of at most 108 characters.",
                    B_STOP_ALERT);
     if (ready && PassPasswordGate())
         new NorvelWindow;

@@ -20,11 +20,11 @@ PasswordForm::PasswordForm(BPoint where, const char* title, uint16 flags)
     passwordControl_->SetDivider(TopView()->StringWidth("Password: "));
     passwordControl_->SetMaxBytes(PasswordSize - 1);
     TopView()->AddChild(passwordControl_);
-    passwordControl_->MakeFocus();
 }
 
 void PasswordForm::SetPassword(const char* password) {
     passwordControl_->SetText(password);
+    passwordControl_->MakeFocus();
 }
 
 const char* PasswordForm::Password() const {

@@ -16,6 +16,7 @@ class PasswordForm : public BDialog {
     // where is the form's left top in screen coordinates.
     PasswordForm(BPoint where, const char* title, uint16 flags);
 
+    // Puts the text into the field, selected, and the focus on it.
     void SetPassword(const char* password);
     // Valid until the text changes.
     [[nodiscard]] const char* Password() const;
