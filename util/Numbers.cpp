@@ -73,16 +73,24 @@ void FormatNumber(float value, char* out, int decimals) {
     *end = '\0';
 }
 
-double DecimalAtStart(const char* text) {
+bool ReadDecimal(const char* text, double* value) {
+    *value = 0;
     text += std::strspn(text, " \t\n\v\f\r");
     const bool negative = *text == '-';
     if (*text == '-' || *text == '+')
         ++text;
     // The reader below would take a second sign, "inf" and "nan" as well.
-    if (std::strchr("0123456789.", *text) == nullptr || *text == '\0')
-        return 0;
-    double value = 0;
-    if (std::from_chars(text, text + std::strlen(text), value).ec != std::errc())
-        return 0;
-    return negative ? -value : value;
+    if (*text == '\0' || std::strchr("0123456789.", *text) == nullptr)
+        return true;
+    double magnitude = 0;
+    const auto [end, error] = std::from_chars(text, text + std::strlen(text), magnitude);
+    if (error == std::errc::result_out_of_range) {
+        // Too small or too large: the reader does not say which.
+        const std::string_view number(text, static_cast<std::size_t>(end - text));
+        const std::size_t exponent = number.find_first_of("eE");
+        return exponent == number.npos ? number.front() == '.' || number.front() == '0'
+                                       : number[exponent + 1] == '-';
+    }
+    *value = negative ? -magnitude : magnitude;
+    return true;
 }

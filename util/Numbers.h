@@ -20,7 +20,7 @@ bool FormatFixed(double value, char* out, std::size_t size, int decimals);
 // infinities and NaN as "inf", "-inf" and "nan".
 void FormatNumber(float value, char* out, int decimals);
 
-// The decimal number at the start of `text`: leading white space, a sign, digits with an optional point and
-// exponent; what follows it is ignored. 0 when there is none (so for "inf" and "nan"), or when it is beyond a
-// double's range.
-[[nodiscard]] double DecimalAtStart(const char* text);
+// Reads the decimal number at the start of `text`: leading white space, a sign, digits with an optional point
+// and exponent; what follows it is ignored. Stores 0 when there is none (so for "inf" and "nan") and when it
+// is too small for a double. False, with 0 stored, when it is beyond a double's range.
+[[nodiscard]] bool ReadDecimal(const char* text, double* value);

@@ -63,10 +63,16 @@ TEST(Numbers, FixedTextIsCutAtTheBuffer) {
 TEST(Numbers, ReadsTheNumberAtTheStart) {
     const std::pair<const char*, double> cases[] = {
         {"12.50", 12.5}, {"1,234.50", 1}, {"N/A", 0}, {"", 0},     {" \t-3e2x", -300}, {"+4.", 4},
-        {".5", 0.5},     {"+-4", 0},      {"inf", 0}, {"-nan", 0}, {"1e999", 0},       {"0x10", 0},
+        {".5", 0.5},     {"+-4", 0},      {"inf", 0}, {"-nan", 0}, {"1e-999", 0},      {"0x10", 0},
         {"12 3/8", 12},  {"-", 0},        {"1e", 1},  {".", 0},    {"--1", 0}};
-    for (const auto& [text, value] : cases)
-        EXPECT_EQ(DecimalAtStart(text), value) << text;
+    for (const auto& [text, value] : cases) {
+        double read = -1;
+        EXPECT_TRUE(ReadDecimal(text, &read)) << text;
+        EXPECT_EQ(read, value) << text;
+    }
+    double read = -1;
+    EXPECT_FALSE(ReadDecimal("-0.5e999", &read));
+    EXPECT_EQ(read, 0);
 }
 
 TEST(Dates, KnowsTheCalendar) {
