@@ -14,7 +14,8 @@ namespace {
 
 std::string Changed(std::string text, const std::function<void(char*)>& change) {
     change(text.data());
-    return text.c_str();
+    text.resize(std::strlen(text.data()));
+    return text;
 }
 
 TEST(Strings, TrimTakesTrailingBlanksAndLineFeedsOnly) {
