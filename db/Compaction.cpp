@@ -67,7 +67,7 @@ int DATABASE::Compress(int /*ignored*/) {
         return Fail(DatabaseError::CompressDamaged);
     }
     COMPACTION_PATHS paths;
-    if (!FindCompactionPaths(path_, &paths)) {
+    if (readOnly_ || !FindCompactionPaths(path_, &paths)) {
         return Fail(DatabaseError::CompressOpenTemporary);
     }
     // After an earlier failure the data may still lie under the backup's name, from where it must not be

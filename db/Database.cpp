@@ -125,7 +125,8 @@ int DATABASE::OpenFile(const char* path) {
     }
     File file(operations_);
     int error = file.Open(path, FileMode::ReadWrite);
-    if (MayOnlyBeRead(error)) {
+    const bool readOnly = MayOnlyBeRead(error);
+    if (readOnly) {
         error = file.Open(path, FileMode::ReadOnly);
     }
     std::int64_t length = 0;
@@ -144,6 +145,7 @@ int DATABASE::OpenFile(const char* path) {
     const FileCounts counts = CheckRecordCount(&header, length);
     Adopt(std::move(file), path, header, std::move(columns), std::move(recordBuffer));
     fileCounts_ = counts;
+    readOnly_ = readOnly;
     const bool impossible = header.deletedCount < 0 || header.deletedCount > header.recordCount;
     if ((impossible || counts == FileCounts::TooFew) && !RecountDeleted()) {
         CloseFile();
@@ -201,6 +203,7 @@ void DATABASE::CloseFile() {
     currentRecord_ = -1;
     fileCounts_ = FileCounts::Agree;
     deletedCountWasWrong_ = false;
+    readOnly_ = false;
     cache_.Reset();
     DropResultSet();
     lastStatement_[0] = '\0';

@@ -62,6 +62,8 @@ class DATABASE {
     int Open(const char* path);
 
     [[nodiscard]] bool IsOpen() const { return file_.IsOpen(); }
+    /// Tells whether the file could be opened for reading only.
+    [[nodiscard]] bool IsReadOnly() const { return readOnly_; }
 
     /// Tells whether the counts in the header disagreed with the file when it was opened: records missing,
     /// more than one record too many, or an impossible deleted count. Compress refuses such a file, and with
@@ -240,4 +242,5 @@ class DATABASE {
     std::int32_t currentRecord_ = -1;
     FileCounts fileCounts_ = FileCounts::Agree;
     bool deletedCountWasWrong_ = false;
+    bool readOnly_ = false;
 };

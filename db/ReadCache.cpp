@@ -61,7 +61,8 @@ int ReadCache::Fill(const File& file, const RECORD_AREA& area, std::int32_t n) {
     }
     if (downwards) {
         const std::int32_t first = std::max(n - window_ + 1, 0);
-        return ReadRange(file, area, first, n - first + 1);
+        const int error = ReadRange(file, area, first, n - first + 1);
+        return error == 0 && !Holds(n) ? ENODATA : error;
     }
     return ReadRange(file, area, n, std::min(window_, area.recordCount - n));
 }

@@ -36,8 +36,7 @@ class ReadCache {
     }
 
     /// Reads a range of records that contains n, which must lie in the area. Returns 0 or an errno number
-    /// (ENODATA when the file has become shorter); after a failure the range is empty. In a file that has
-    /// become shorter the range may end before n.
+    /// (ENODATA when the file has become shorter); after a failure n is not held.
     [[nodiscard]] int Fill(const File& file, const RECORD_AREA& area, std::int32_t n);
     /// The same with a whole buffer from record n on, for a reader that wants them all.
     [[nodiscard]] int FillFrom(const File& file, const RECORD_AREA& area, std::int32_t n);

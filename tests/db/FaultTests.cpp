@@ -1,0 +1,163 @@
+#include <gtest/gtest.h>
+
+#include <functional>
+#include <memory>
+
+#include <sys/wait.h>
+
+#include "FaultyFiles.h"
+#include "SampleFile.h"
+#include "db/Compaction.h"
+
+namespace {
+
+// Each operation that changes a file, on a file of five records of which 1 is deleted and 3 locked.
+struct OPERATION {
+    const char* name;
+    std::function<long(DATABASE&)> run;
+};
+
+const ROW NewRow = Row("new", 1, 2, 3, 4);
+
+const OPERATION Operations[] = {
+    {"Append", [](DATABASE& database) { return database.Append(&NewRow); }},
+    {"Write", [](DATABASE& database) { return database.Write(3, &NewRow); }},
+    {"Delete", [](DATABASE& database) { return database.Delete(2); }},
+    {"UnDelete", [](DATABASE& database) { return database.UnDelete(1); }},
+    {"Lock", [](DATABASE& database) { return database.Lock(0); }},
+    {"UnLock", [](DATABASE& database) { return database.UnLock(3); }},
+    {"Compress", [](DATABASE& database) { return database.Compress(0); }},
+};
+
+class FaultTest : public testing::Test {
+  protected:
+    // A fresh file, opened through the operations that meet faults.
+    std::unique_ptr<DATABASE> Fresh() {
+        std::filesystem::remove_all(folder_.Path());
+        std::filesystem::create_directory(folder_.Path());
+        {
+            DATABASE database(nullptr);
+            EXPECT_EQ(CreateRows(database, path_), 0);
+            for (int i = 0; i < 5; ++i) {
+                const ROW row = Row("row " + std::to_string(i), i, i, i);
+                EXPECT_EQ(database.Append(&row), i);
+            }
+            EXPECT_EQ(database.Delete(1) + database.Lock(3), 0);
+        }
+        return std::make_unique<DATABASE>(path_.c_str(), files_);
+    }
+
+    CONTENT Reopened() const {
+        EXPECT_GE(RestoreCompactionBackup(path_.c_str()), 0);
+        DATABASE database(path_.c_str());
+        EXPECT_TRUE(database.IsOpen());
+        EXPECT_FALSE(database.IsDamaged());
+        return ContentOf(database);
+    }
+
+    CONTENT ContentAfter(const OPERATION& operation) {
+        EXPECT_GE(operation.run(*Fresh()), 0) << operation.name;
+        return Reopened();
+    }
+
+    TemporaryFolder folder_;
+    std::string path_ = folder_.File("rows.db");
+    FaultyFiles files_;
+};
+
+TEST_F(FaultTest, FailedCallLeavesTheOldContentOrTheNew) {
+    const CONTENT old = ContentOf(*Fresh());
+    for (const OPERATION& operation : Operations) {
+        const CONTENT changed = ContentAfter(operation);
+        for (Fault fault : {Fault::Error, Fault::HalfThenError, Fault::ShortWrite, Fault::Interrupted}) {
+            for (int at = 0;; ++at) {
+                SCOPED_TRACE(std::string(operation.name) + " call " + std::to_string(at) + " fault " +
+                             std::to_string(static_cast<int>(fault)));
+                auto database = Fresh();
+                files_.Arm(fault, at);
+                const bool succeeded = operation.run(*database) >= 0;
+                if (!files_.Disarm()) {
+                    EXPECT_TRUE(succeeded);
+                    ASSERT_GT(at, 0) << "no call was met";
+                    break;
+                }
+                EXPECT_EQ(database->GetLastError(nullptr) != 0, !succeeded);
+                EXPECT_TRUE(succeeded || fault == Fault::Error || fault == Fault::HalfThenError);
+                EXPECT_EQ(ContentOf(*database), succeeded ? changed : old) << "in the object";
+                EXPECT_EQ(Reopened(), succeeded ? changed : old) << "in the file";
+            }
+        }
+    }
+}
+
+TEST_F(FaultTest, KilledAtAnyCallLeavesTheOldContentOrTheNew) {
+    const CONTENT old = ContentOf(*Fresh());
+    for (const OPERATION& operation : Operations) {
+        const CONTENT changed = ContentAfter(operation);
+        for (Fault fault : {Fault::KilledBefore, Fault::KilledAfter}) {
+            bool killed = true;
+            for (int at = 0; killed; ++at) {
+                SCOPED_TRACE(std::string(operation.name) + " call " + std::to_string(at));
+                auto database = Fresh();
+                const pid_t child = fork();
+                ASSERT_GE(child, 0);
+                if (child == 0) {
+                    files_.Arm(fault, at);
+                    _exit(operation.run(*database) >= 0 ? 0 : 1);
+                }
+                int status = 0;
+                ASSERT_EQ(waitpid(child, &status, 0), child);
+                killed = WIFSIGNALED(status);
+                EXPECT_TRUE(killed || (at > 0 && WEXITSTATUS(status) == 0));
+                const CONTENT found = Reopened();
+                EXPECT_TRUE(found == changed || (killed && found == old));
+            }
+        }
+    }
+}
+
+TEST_F(FaultTest, CodesNameTheOperationThatFailed) {
+    const struct {
+        std::size_t operation;
+        int call;
+        int code;
+    } cases[] = {{0, 0, 2801}, {0, 1, 2901}, {1, 0, 1309}, {2, 0, 1409},
+                 {2, 1, 2901}, {3, 0, 1509}, {4, 0, 2309}, {5, 0, 2409}};
+    for (const auto& failure : cases) {
+        auto database = Fresh();
+        files_.Arm(Fault::HalfThenError, failure.call, EIO);
+        EXPECT_EQ(Operations[failure.operation].run(*database), -1);
+        EXPECT_TRUE(files_.Disarm());
+        EXPECT_EQ(database->GetLastError(nullptr), failure.code) << Operations[failure.operation].name;
+    }
+}
+
+TEST_F(FaultTest, CreateThatFailsLeavesNoFile) {
+    for (int call = 0; call < 3; ++call) {
+        DATABASE database(nullptr, files_);
+        files_.Arm(Fault::HalfThenError, call);
+        EXPECT_EQ(CreateRows(database, folder_.File("new.db")), -1);
+        EXPECT_TRUE(files_.Disarm());
+        EXPECT_EQ(database.GetLastError(nullptr), 1109);
+        EXPECT_FALSE(folder_.Has("new.db"));
+    }
+}
+
+TEST_F(FaultTest, FileThatMayOnlyBeReadIsRead) {
+    for (int error : {EACCES, EPERM, EROFS}) {
+        const CONTENT content = ContentOf(*Fresh());
+        files_.RefuseWriting(error);
+        DATABASE database(path_.c_str(), files_);
+        files_.RefuseWriting(0);
+        ASSERT_TRUE(database.IsReadOnly());
+        EXPECT_EQ(database.Query("Name contains row", QueryMode::New), 4);
+        for (const OPERATION& operation : Operations) {
+            EXPECT_EQ(operation.run(database), -1) << operation.name;
+            EXPECT_NE(database.GetLastError(nullptr), 0);
+        }
+        EXPECT_EQ(ContentOf(database), content);
+        EXPECT_EQ(Reopened(), content);
+    }
+}
+
+} // namespace

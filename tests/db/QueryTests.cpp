@@ -1,0 +1,311 @@
+#include <gtest/gtest.h>
+
+#include <random>
+
+#include "SampleFile.h"
+#include "db/Statement.h"
+#include "util/Strings.h"
+
+namespace {
+
+using Numbers = std::vector<long>;
+
+class QueryTest : public testing::Test {
+  protected:
+    void SetUp() override {
+        ASSERT_EQ(CreateRows(database_, folder_.File("rows.db")), 0);
+        const ROW rows[] = {
+            Row("My Fund", -5, 300, 70000, 1.5F, {31, 12, 1998}, {59, 59, 11}),
+            Row("growth stock", 7, -300, -70000, 10.25F, {1, 1, 1999}, {0, 0, 12}),
+            Row("GROWTH", 127, 0, 4, -2, {15, 6, 2001}, {30, 15, 23}),
+            Row("", 0, 1, 5, 0, {0, 0, 0}, {0, 0, 0}),
+            Row("Exactly 16 chars", 1, 2, 3, 4, {28, 2, 2000}, {1, 0, 0}), // no room for a terminator
+        };
+        for (const ROW& row : rows) {
+            ASSERT_GE(database_.Append(&row), 0);
+        }
+    }
+
+    Numbers Find(const char* statement, int mode = QueryMode::New) {
+        const long count = database_.Query(statement, mode);
+        EXPECT_GE(count, 0) << statement;
+        const Numbers found = Walked(database_);
+        EXPECT_EQ(count, static_cast<long>(found.size())) << statement;
+        return found;
+    }
+
+    TemporaryFolder folder_;
+    DATABASE database_{nullptr};
+};
+
+TEST_F(QueryTest, SelectsByEveryTypeAndOperator) {
+    const struct {
+        const char* statement;
+        Numbers found;
+    } cases[] = {
+        {"Name = my fund", {0}},
+        {"  Name\t=\nMY FUND", {0}},
+        {"Name != My Fund", {1, 2, 3, 4}},
+        {"Name < growth", {3, 4}},
+        {"Name <= growth", {2, 3, 4}},
+        {"Name > GROWTH", {0, 1}},
+        {"Name >= growth", {0, 1, 2}},
+        {"Name = growth ", {}},
+        {"Name = exactly 16 chars", {4}},
+        {"Name = exactly 16 charsx", {}},
+        {"Name > exactly 16 char", {0, 1, 2, 4}},
+        {"Name CONTAINS rowTH", {1, 2}},
+        {"Name contains 16 chars", {4}},
+        {"Name contains  stock", {1}}, // the second blank belongs to the value
+        {"Name contains x", {4}},
+        {"Tag = -5", {0}},
+        {"Tag > 6", {1, 2}},
+        {"Tag = 251", {0}}, // 8 bits of it
+        {"Small <= -300", {1}},
+        {"Small = 65836", {0}},
+        {"Count >= 70000", {0}},
+        {"Count < -1", {1}},
+        {"Count = 4294967300", {2}},
+        {"Price = 10.25", {1}},
+        {"Price = 1025e-2", {1}},
+        {"Price < -1.5", {2}},
+        {"Price > 1e300", {}},
+        {"Price = number", {3}},
+        {"Day >= 19990101", {1, 2, 4}},
+        {"Day = 19981231", {0}},
+        {"Day > 2000", {2, 4}}, // no month and no day come before all of them
+        {"Day = x", {3}},
+        {"At < 120000", {0, 3, 4}},
+        {"At = 23:15", {}},
+        {"At > 23", {2}},
+    };
+    for (int kilobytes : {256, 0}) {
+        ASSERT_EQ(database_.SetReadCache(kilobytes), 0);
+        for (const auto& query : cases) {
+            EXPECT_EQ(Find(query.statement), query.found) << query.statement;
+        }
+    }
+    database_.SetCaseSensitivity(1);
+    EXPECT_EQ(Find("Name = My Fund"), Numbers{0});
+    EXPECT_EQ(Find("Name = my fund"), Numbers{});
+    EXPECT_EQ(Find("Name contains GROW"), Numbers{2});
+    EXPECT_EQ(Find("Name < a"), (Numbers{0, 2, 3, 4}));
+}
+
+TEST_F(QueryTest, RefusesAndKeepsTheSet) {
+    const std::string token31(31, 'v');
+    const struct {
+        std::string statement;
+        int mode;
+        int code;
+    } cases[] = {
+        {"Name =", QueryMode::New, 1608},
+        {"Name = ", QueryMode::New, 1608},
+        {"Name=Fund", QueryMode::New, 1608},
+        {" \t", QueryMode::And, 1608},
+        {"Name = x", 3, 1608},
+        {"name = x", QueryMode::New, 1602},
+        {"Nam = x", QueryMode::New, 1602},
+        {token31 + " = x", QueryMode::New, 1602},
+        {token31 + "v = x", QueryMode::New, 1608},
+        {"Name == x", QueryMode::Or, 1603},
+        {"Price contains 1", QueryMode::New, 1606},
+        {"Name = " + token31 + "v", QueryMode::New, 1608},
+        {"Name = x" + std::string(120, '\t'), QueryMode::New, 1608},
+    };
+    ASSERT_EQ(Find("Name contains growth"), (Numbers{1, 2}));
+    for (const auto& refused : cases) {
+        EXPECT_EQ(database_.Query(refused.statement.c_str(), refused.mode), -1) << refused.statement;
+        EXPECT_EQ(database_.GetLastError(nullptr), refused.code) << refused.statement;
+        EXPECT_EQ(Walked(database_), (Numbers{1, 2}));
+    }
+    EXPECT_EQ(Find(("Name = " + token31).c_str()), Numbers{});
+    EXPECT_EQ(Find(("Name = x" + std::string(119, '\t')).c_str()), Numbers{});
+    DATABASE fresh(folder_.File("rows.db").c_str());
+    EXPECT_EQ(fresh.Query("Price > 1", QueryMode::And), -1);
+    EXPECT_EQ(fresh.GetLastError(nullptr), 1607);
+}
+
+TEST(Statement, IsSplitIntoTokens) {
+    DATABASE database(nullptr);
+    const struct {
+        const char* statement;
+        const char *column, *op, *value; // no column: refused
+    } cases[] = {
+        {"Name = My Fund", "Name", "=", "My Fund"},
+        {"\r\n Name \t = \t My Fund \tmore", "Name", "=", " My Fund "},
+        {"A b  c ", "A", "b", " c "},
+        {"A b\n\t\rc d\re", "A", "b", "c d"},
+        {"A b", nullptr, nullptr, nullptr},
+        {"A b \t", "A", "b", ""},
+        {"", nullptr, nullptr, nullptr},
+        {nullptr, nullptr, nullptr, nullptr},
+    };
+    for (const auto& split : cases) {
+        char column[32];
+        char op[32];
+        char value[32];
+        const bool refused = split.column == nullptr || *split.value == '\0';
+        ASSERT_EQ(database.ParseQueryStatement(split.statement, column, op, value), refused ? 1 : 0)
+            << split.statement;
+        if (!refused) {
+            EXPECT_STREQ(column, split.column);
+            EXPECT_STREQ(op, split.op);
+            EXPECT_STREQ(value, split.value);
+        }
+    }
+    EXPECT_EQ(PackedDate("1999"), 1999 * 65536);
+    EXPECT_EQ(PackedDate("199912319"), 1999 * 65536 + 12 * 256 + 31);
+    EXPECT_EQ(PackedTime("-12"), 0);
+    EXPECT_EQ(WholeNumber("99999999999999999999"), INT64_MAX);
+}
+
+TEST_F(QueryTest, AndNarrowsOrWidens) {
+    EXPECT_EQ(Find("Tag > 0"), (Numbers{1, 2, 4}));
+    EXPECT_EQ(Find("Price > 0", QueryMode::And), (Numbers{1, 4}));
+    EXPECT_EQ(Find("Name = my fund", QueryMode::Or), (Numbers{0, 1, 4}));
+    ASSERT_EQ(database_.Delete(1), 0);
+    const ROW late = Row("my fund", 1, 1, 1, 1);
+    ASSERT_EQ(database_.Append(&late), 5);
+    EXPECT_EQ(Find("Price > -9", QueryMode::Or), (Numbers{0, 2, 3, 4}))
+        << "deleted and later records stay out";
+    EXPECT_EQ(Find("Price > -9"), (Numbers{0, 2, 3, 4, 5}));
+    EXPECT_EQ(Find("", QueryMode::And), (Numbers{0, 2, 3, 4, 5})) << "an empty statement selects all";
+}
+
+TEST_F(QueryTest, WalkFollowsTheSet) {
+    long number = -1;
+    ASSERT_EQ(database_.Query("Name >= growth", QueryMode::New), 3); // 0, 1 and 2
+    ASSERT_NE(database_.QueryGetNext(&number), nullptr);
+    EXPECT_EQ(number, 1) << "without a first call the walk begins after slot 0";
+    ASSERT_NE(database_.QueryGetFirst(&number), nullptr);
+    EXPECT_EQ(database_.ConvertPhysToLogRecordNumber(2), 2);
+    ASSERT_EQ(database_.Delete(1), 0);
+    EXPECT_EQ(database_.ConvertPhysToLogRecordNumber(2), 1);
+    EXPECT_EQ(database_.ConvertPhysToLogRecordNumber(1), -1);
+    EXPECT_EQ(database_.ConvertPhysToLogRecordNumber(-1), -1);
+    auto* row = static_cast<ROW*>(database_.QueryGetNext(&number));
+    ASSERT_NE(row, nullptr);
+    EXPECT_EQ(number, 2);
+    row->price = 99;
+    EXPECT_EQ(database_.Update(row), 0) << "the walk makes its record the current one";
+    EXPECT_EQ(database_.QueryGetNext(nullptr), nullptr);
+    EXPECT_EQ(database_.QueryGetNext(nullptr), nullptr);
+    const ROW late = Row("late");
+    ASSERT_EQ(database_.Append(&late), 5);
+    ASSERT_NE(database_.QueryGetLast(&number), nullptr);
+    EXPECT_EQ(number, 2) << "a record appended since is outside the set";
+    ASSERT_NE(database_.QueryGetPrev(&number), nullptr);
+    EXPECT_EQ(number, 0);
+    EXPECT_EQ(database_.QueryGetPrev(nullptr), nullptr);
+    for (auto [start, step] : {std::pair<long, long>{1, 0}, {LONG_MAX, 1}, {-1, LONG_MAX}, {-1, LONG_MIN}}) {
+        EXPECT_EQ(database_.QueryGetXXX(start, step, nullptr), nullptr) << start << " " << step;
+    }
+    EXPECT_EQ(database_.Query("Price = 99", QueryMode::New), 1);
+}
+
+TEST_F(QueryTest, RecordsDeletedElsewhereDropOutOfTheWalk) {
+    ASSERT_EQ(database_.SetReadCache(0), 0);
+    ASSERT_EQ(database_.QueryReset(), 5);
+    DATABASE other(folder_.File("rows.db").c_str());
+    ASSERT_EQ(other.Delete(3), 0);
+    EXPECT_EQ(Walked(database_), (Numbers{0, 1, 2, 4}));
+    EXPECT_EQ(database_.ConvertPhysToLogRecordNumber(4), 3);
+}
+
+TEST_F(QueryTest, RefreshAndReset) {
+    EXPECT_EQ(database_.IsQueryActive(), 0);
+    ASSERT_EQ(database_.Delete(3), 0);
+    Find("Price >= -2");
+    EXPECT_EQ(database_.IsQueryActive(), 0) << "all active records match";
+    Find("Name contains growth", QueryMode::And);
+    EXPECT_EQ(database_.IsQueryActive(), 1);
+    const ROW late = Row("Growth too");
+    ASSERT_EQ(database_.Append(&late), 5);
+    database_.QueryRefresh();
+    EXPECT_EQ(Walked(database_), (Numbers{1, 2, 5}));
+    EXPECT_EQ(database_.Query(nullptr, QueryMode::New), 5);
+    EXPECT_EQ(database_.IsQueryActive(), 0);
+    database_.QueryRefresh();
+    EXPECT_EQ(Walked(database_), (Numbers{0, 1, 2, 4, 5}));
+    for (long n : {0, 1, 2, 4, 5}) {
+        ASSERT_EQ(database_.Delete(n), 0);
+    }
+    EXPECT_EQ(Find("Price > -9"), Numbers{});
+    EXPECT_EQ(database_.QueryGetFirst(nullptr), nullptr);
+}
+
+// Every way to compare texts agrees with the comparison of two plain strings, whatever the column's width and
+// wherever letters beyond ASCII stand.
+TEST(TextQuery, AgreesWithPlainComparison) {
+    const unsigned seed = std::random_device{}();
+    SCOPED_TRACE(seed);
+    std::mt19937 random(seed);
+    const auto text = [&](std::size_t longest) {
+        std::string result;
+        for (std::size_t length = random() % (longest + 1); result.size() < length;) {
+            result += "aAbBzZ@[`{\xC3\xA9"[random() % 12];
+        }
+        return result;
+    };
+    const char* operators[] = {"=", "!=", "<", "<=", ">", ">=", "contains"};
+    for (int width : {1, 3, 8, 16, 24, 31, 40}) {
+        TemporaryFolder folder;
+        DATABASE database(nullptr);
+        const COLUMN_ENTRY columns[] = {Column("T", ColumnType::String, width),
+                                        Column("After", ColumnType::String, 9)};
+        ASSERT_EQ(database.Create(folder.File("t.db").c_str(), "", 2, columns), 0);
+        std::vector<std::string> texts;
+        for (int i = 0; i < 300; ++i) {
+            texts.push_back(text(std::min<std::size_t>(static_cast<std::size_t>(width), 5)));
+            std::string data(static_cast<std::size_t>(width) + 9,
+                             'a'); // bytes behind the terminator are arbitrary
+            data.replace(0, texts.back().size() + 1, texts.back() + '\0');
+            ASSERT_EQ(database.Append(data.data()), i);
+        }
+        for (int i = 0; i < 300; ++i) {
+            const int op = static_cast<int>(random() % 7);
+            const std::string value =
+                i % 2 == 0 ? text(4) + "a" : texts[random() % 300] + (texts[0].empty() ? "B" : "");
+            if (value.empty()) {
+                continue;
+            }
+            database.SetCaseSensitivity(i % 3 == 0 ? 1 : 0);
+            ASSERT_GE(
+                database.Query(("T " + std::string(operators[op]) + " " + value).c_str(), QueryMode::New), 0);
+            for (long n = 0; n < 300; ++n) {
+                const std::string& field = texts[static_cast<std::size_t>(n)];
+                ASSERT_EQ(database.ConvertPhysToLogRecordNumber(n) >= 0,
+                          database.CompareStringVals(op, field.c_str(), value.c_str()) == 1)
+                    << field << " " << operators[op] << " " << value << " width " << width;
+            }
+        }
+    }
+}
+
+TEST(CompareStringVals, FollowsTheOneCaseRule) {
+    DATABASE database(nullptr);
+    for (const char* field : {"", "a", "Banana", "apple", "\xC3\x84PFEL", "Z\xC3\xA9Z"}) {
+        for (const char* value : {"", "A", "BANANA", "apples", "\xC3\x84pfel", "z\xC3\xA9z", "z\xC3\xA9Z"}) {
+            const int sign = strcmpi(field, value);
+            const bool expected[] = {sign == 0, sign != 0, sign<0, sign <= 0, sign> 0, sign >= 0};
+            for (int op = 0; op < 6; ++op) {
+                EXPECT_EQ(database.CompareStringVals(op, field, value), expected[op] ? 1 : 0);
+            }
+        }
+    }
+    EXPECT_EQ(database.CompareStringVals(6, "xAy", "aY"), 1);
+    EXPECT_EQ(database.CompareStringVals(6,
+                                         "x\xC3\xA9"
+                                         "A",
+                                         "a"),
+              0)
+        << "behind the first byte beyond ASCII case counts";
+    EXPECT_EQ(database.CompareStringVals(6, "x", ""), 1);
+    EXPECT_EQ(database.CompareStringVals(7, "x", "x"), 0);
+    EXPECT_EQ(database.CompareVals(4, 2.5F, 2.0F), 1);
+    EXPECT_EQ(database.CompareVals(6, 1, 1), 0);
+    EXPECT_EQ(database.CompareVals(-1, 1L, 1L), 0);
+}
+
+} // namespace
