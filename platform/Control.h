@@ -13,7 +13,8 @@ class BInvoker {
 
     void SetMessage(BMessage* message) { message_.reset(message); }
     [[nodiscard]] BMessage* Message() const { return message_.get(); }
-    // Where messages go from now on; null goes back to the default (a control's window).
+    // Where messages go from now on; null goes back to the default (a control's window). B_BAD_VALUE, with
+    // nothing to send to, when target belongs to no looper yet.
     virtual status_t SetTarget(const BHandler* target);
     // Queues a copy of message, or of the invoker's own when null. B_BAD_VALUE when there is no message or no
     // target.
@@ -21,7 +22,7 @@ class BInvoker {
 
   protected:
     // Where messages go while no target was set.
-    [[nodiscard]] virtual const BHandler* DefaultTarget() const { return nullptr; }
+    [[nodiscard]] virtual BMessenger DefaultTarget() const { return {}; }
 
   private:
     std::unique_ptr<BMessage> message_;
@@ -45,10 +46,13 @@ class BControl : public BView, public BInvoker {
     virtual void SetValue(int32 value) { value_ = value; }
     [[nodiscard]] int32 Value() const { return value_; }
 
+    void SetFont(const BFont* font, uint32 properties = B_FONT_ALL) override;
+    void GetPreferredSize(float* width, float* height) const override;
+
   protected:
     BControl(BRect frame, const char* name, const char* label, BMessage* message, uint32 resizingMode,
              uint32 flags, std::unique_ptr<ViewPeer> peer);
-    [[nodiscard]] const BHandler* DefaultTarget() const override;
+    [[nodiscard]] BMessenger DefaultTarget() const override;
     // For a control whose value the person has just changed.
     void TakeValue(int32 value) { value_ = value; }
 

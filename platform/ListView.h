@@ -27,20 +27,20 @@ class BListItem {
 
     [[nodiscard]] float Height() const { return height_; }
     void SetHeight(float height) { height_ = height; }
-    [[nodiscard]] bool IsSelected() const;
+    [[nodiscard]] bool IsSelected() const { return selected_; }
     [[nodiscard]] uint32 OutlineLevel() const { return outlineLevel_; }
     void SetOutlineLevel(uint32 level) { outlineLevel_ = level; }
     [[nodiscard]] bool IsExpanded() const { return expanded_; }
     void SetExpanded(bool expanded) { expanded_ = expanded; }
 
   private:
-    friend class BListView;
     friend struct ListAccess;
 
     float height_ = 0;
     uint32 outlineLevel_;
-    int32 index_ = -1; // place in the list as of the list's last renumbering; a hint, checked before use
+    int32 index_ = -1; // place in the list when the row came or was sorted; a hint, checked before use
     BListView* list_ = nullptr; // the list that shows the row
+    bool selected_ = false;
     bool expanded_;
 };
 
@@ -48,7 +48,7 @@ enum list_view_type { B_SINGLE_SELECTION_LIST, B_MULTIPLE_SELECTION_LIST };
 
 // A list of rows, drawn for the visible ones only, so that its size costs nothing but memory. Rows are
 // borrowed. Selection and keys are the toolkit's own: arrows, Home, End, Page keys, Shift and Control clicks,
-// typed letters. A double click or Enter sends the invocation message.
+// typed letters; Left and Right scroll. A double click or Enter sends the invocation message.
 class BListView : public BView, public BInvoker {
   public:
     BListView(BRect frame, const char* name, list_view_type type = B_SINGLE_SELECTION_LIST,
@@ -59,10 +59,11 @@ class BListView : public BView, public BInvoker {
     // --- rows; an index from 0 to CountItems() ---
     virtual bool AddItem(BListItem* item);
     virtual bool AddItem(BListItem* item, int32 index);
-    // Many rows at once, in the cost of one; newItems holds BListItem pointers.
+    // Many rows at once, at the cost of one change; newItems holds BListItem pointers. All or none are added:
+    // a null, or a row that is in a list already, refuses them all.
     virtual bool AddList(BList* newItems);
     virtual bool AddList(BList* newItems, int32 index);
-    // Hand the row back to the caller; false or null when it is not there.
+    // Hand rows back to the caller; false or null, with nothing changed, when they are not there.
     virtual bool RemoveItem(BListItem* item);
     virtual BListItem* RemoveItem(int32 index);
     virtual bool RemoveItems(int32 index, int32 count);
@@ -111,17 +112,12 @@ class BListView : public BView, public BInvoker {
     void ScrollTo(BPoint where) override;
     [[nodiscard]] BRect Bounds() const override;
     void SetFont(const BFont* font, uint32 properties = B_FONT_ALL) override;
-    void Invalidate() override;
-    void Invalidate(BRect rect) override;
-    void MakeFocus(bool focus = true) override;
-    [[nodiscard]] bool IsFocus() const override;
 
   protected:
-    [[nodiscard]] const BHandler* DefaultTarget() const override;
+    [[nodiscard]] BMessenger DefaultTarget() const override;
 
   private:
-    friend class BListItem;
-    friend class BScrollBar;
-    friend class BScrollView;
     friend struct ListAccess;
+
+    bool AddRows(std::vector<BListItem*> rows, int32 index);
 };

@@ -14,13 +14,14 @@ class BMenu {
     BMenu(const BMenu&) = delete;
     BMenu& operator=(const BMenu&) = delete;
 
-    // Takes ownership of the item.
+    // Takes ownership of the item; false, and it stays the caller's, when it is in a menu already or the
+    // index lies outside 0 to CountItems().
     bool AddItem(BMenuItem* item);
     bool AddItem(BMenuItem* item, int32 index);
     // A submenu under its own title; takes ownership of it.
     bool AddItem(BMenu* submenu);
     bool AddSeparatorItem();
-    // Hands the item back to the caller.
+    // Hand the item back to the caller; false or null when it is not there.
     bool RemoveItem(BMenuItem* item);
     BMenuItem* RemoveItem(int32 index);
 
@@ -35,14 +36,15 @@ class BMenu {
     [[nodiscard]] BMenuItem* FindMarked() const;
 
     // In radio mode, choosing an item marks it and unmarks the others.
-    void SetRadioMode(bool on) { radioMode_ = on; }
+    void SetRadioMode(bool on);
     [[nodiscard]] bool IsRadioMode() const { return radioMode_; }
     // Whether a menu field shows the marked item's label instead of the menu's title.
     void SetLabelFromMarked(bool on);
     [[nodiscard]] bool IsLabelFromMarked() const { return labelFromMarked_; }
 
     [[nodiscard]] const char* Name() const { return title_.c_str(); }
-    // Where items without a target of their own send their messages.
+    // Where items without a target of their own send their messages, submenus' items included; null goes back
+    // to the window of the menu bar or menu field.
     void SetTargetForItems(const BHandler* target);
 
   protected:
@@ -55,11 +57,11 @@ class BMenu {
     friend class BMenuField;
     friend struct MenuAccess;
 
-    [[nodiscard]] const BHandler* TargetForItems() const;
-    void MarkChanged(BMenuItem* item);
+    [[nodiscard]] BMessenger TargetForItems() const;
+    // An item's mark or label has changed.
+    void ItemChanged(BMenuItem* item);
 
     std::string title_;
-    menu_layout layout_;
     bool radioMode_ = false;
     bool labelFromMarked_ = false;
     std::vector<std::unique_ptr<BMenuItem>> items_;

@@ -16,5 +16,7 @@ class BMenuBar : public BView, public BMenu {
     void GetPreferredSize(float* width, float* height) const override;
 
   private:
+    void FitHeight();
+
     bool resizeToFit_;
 };

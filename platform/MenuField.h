@@ -26,14 +26,12 @@ class BMenuField : public BView {
     // Called after the shown text, and with it VisibleRight, has changed.
     void SetTextChangedHook(std::function<void()> hook);
 
-    void MakeFocus(bool focus = true) override;
-    [[nodiscard]] bool IsFocus() const override;
-
   private:
-    friend struct MenuAccess;
     void ShowMarked();
+    void PrepareMenu();
 
     std::string label_;
+    std::string shownText_;
     std::unique_ptr<BMenu> menu_;
     std::function<void()> textChanged_;
 };

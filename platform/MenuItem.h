@@ -27,7 +27,7 @@ class BMenuItem : public BInvoker {
     [[nodiscard]] BMenu* Submenu() const { return submenu_.get(); }
 
   protected:
-    [[nodiscard]] const BHandler* DefaultTarget() const override;
+    [[nodiscard]] BMessenger DefaultTarget() const override;
 
   private:
     friend class BMenu;

@@ -10,6 +10,11 @@ struct PrintJobPeer;
 // One job for a printer or a PDF file, page by page, through the toolkit's own page and job dialogs. Units on
 // the page are points (1/72 inch). Order of use: ConfigPage and ConfigJob (or SetSettings with what Settings
 // gave earlier), BeginJob, then for each page DrawView and SpoolPage, then CommitJob. Interface thread.
+//
+// A set-up is a message with the fields "page size" (string, the toolkit's key, such as "A4"), "page width",
+// "page height" and "left margin", "top margin", "right margin", "bottom margin" (floats, points, of the page
+// held upright), "landscape" (bool), "printer" (string, empty for a file), "output file" (string), "copies"
+// and "resolution" (int32), "colour" (bool).
 class BPrintJob {
   public:
     explicit BPrintJob(const char* name);
@@ -30,15 +35,18 @@ class BPrintJob {
     // False when the printer or file cannot be opened.
     [[nodiscard]] bool BeginJob();
     [[nodiscard]] bool CanContinue() const;
+    // The whole sheet, from the printable part's left top.
     [[nodiscard]] BRect PaperRect() const;
     // The part of the page that can be printed; its left top is (0, 0).
     [[nodiscard]] BRect PrintableRect() const;
-    // Draws that part of the view, and of what lies in it, at the given place of the page, in the view's own
-    // code.
+    // Draws that part of the view, and of the views and controls in it that are not hidden, at the given
+    // place of the page, in the view's own code. The view itself may be hidden.
     void DrawView(BView* view, BRect rect, BPoint where);
     // Ends the page; what is drawn next goes on a new one.
     void SpoolPage();
+    // Hands the pages over, or ends the file.
     void CommitJob();
+    // Drops the pages; a file begun is removed.
     void CancelJob();
 
   private:

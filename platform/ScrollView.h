@@ -3,7 +3,6 @@
 #include "platform/View.h"
 
 class BListView;
-struct ScrollBarPeer;
 
 constexpr float B_V_SCROLL_BAR_WIDTH = 14;
 constexpr float B_H_SCROLL_BAR_HEIGHT = 14;

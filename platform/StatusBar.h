@@ -4,9 +4,10 @@
 
 #include "platform/View.h"
 
-// A progress bar with a line of text above it: the label followed by the text. The value runs from 0 to the
-// maximum (100 at first). Update, Reset and SetText may be called from any thread that holds the window's
-// lock; what they change is on screen a moment later.
+// A progress bar with a line of text above it: to the left the label followed by the text, to the right the
+// trailing text followed by the trailing label. The value runs from 0 to the maximum (100 at first).
+// Everything may be called from any thread that holds the window's lock; what is changed is on screen a
+// moment later.
 class BStatusBar : public BView {
   public:
     BStatusBar(BRect frame, const char* name, const char* label = nullptr,
@@ -29,6 +30,8 @@ class BStatusBar : public BView {
     std::string label_;
     std::string text_;
     std::string trailing_;
+    std::string trailingLabel_;
     float value_ = 0;
     float maximum_ = 100;
+    bool refreshPending_ = false;
 };

@@ -2,6 +2,8 @@
 
 #include "platform/Control.h"
 
+class TextControlFilter;
+
 // A line of text with a label to its left. Its message, if any, goes out when the person leaves a changed
 // text or presses Enter in it.
 class BTextControl : public BControl {
@@ -19,14 +21,18 @@ class BTextControl : public BControl {
     void SetDivider(float divider);
     [[nodiscard]] float Divider() const;
 
-    // Limits the text to a number of bytes of UTF-8, typed, pasted or set: what is put in is cut, between
-    // whole characters, and what was there stays. Line ends and tabs are turned into blanks.
+    // Limits the text to a number of bytes of UTF-8, typed, pasted, dropped or set: what is put in is cut,
+    // between whole characters, and what was there stays (a text too long when the limit is set is cut at its
+    // end). With or without a limit, line ends, tabs and other control characters are turned into blanks.
     void SetMaxBytes(int32 bytes);
 
     void MakeFocus(bool focus = true) override;
     [[nodiscard]] bool IsFocus() const override;
-    void GetPreferredSize(float* width, float* height) const override;
 
   private:
+    void Send();
+
+    TextControlFilter* filter_; // belongs to the line
     mutable std::string text_;
+    std::string sent_; // the text as of the last message or as set
 };

@@ -41,6 +41,7 @@ struct ViewAccess {
     // The frame changed on the toolkit's side or by a control's own adjustment: takes it over without moving
     // widgets.
     static void SetFrame(BView* view, const BRect& frame);
+    static void SetResizingMode(BView* view, uint32 mode) { view->resizingMode_ = mode; }
     // The painter of the paint pass under way; null, with a paint pass asked for, when there is none.
     static QPainter* Painter(BView* view);
     // Notes where the pointer is and which buttons are held, for GetMouse.

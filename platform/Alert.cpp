@@ -1,0 +1,121 @@
+#include "platform/Alert.h"
+
+#include <algorithm>
+#include <atomic>
+#include <memory>
+
+#include <QApplication>
+#include <QMessageBox>
+#include <QPushButton>
+#include <QScreen>
+#include <QWindow>
+
+#include "platform/private/Loop.h"
+#include "platform/private/Mnemonics.h"
+
+namespace {
+
+// What an alert shows; owned by the interface thread's work, which may outlast a caller that was stopped.
+struct AlertText {
+    std::string title;
+    std::string text;
+    std::vector<std::string> buttons;
+    alert_type type;
+
+    [[nodiscard]] int32 LastButton() const { return static_cast<int32>(buttons.size()) - 1; }
+};
+
+QMessageBox::Icon IconOf(alert_type type) {
+    switch (type) {
+    case B_EMPTY_ALERT:
+        return QMessageBox::NoIcon;
+    case B_WARNING_ALERT:
+        return QMessageBox::Warning;
+    case B_STOP_ALERT:
+        return QMessageBox::Critical;
+    default:
+        return QMessageBox::Information;
+    }
+}
+
+// In every desktop's order of buttons, those of the action role stand as they were added.
+std::vector<QPushButton*> AddButtons(QMessageBox& box, const AlertText& alert) {
+    std::vector<QPushButton*> buttons;
+    for (const std::string& label : alert.buttons) {
+        QPushButton* button = box.addButton(QString(), QMessageBox::ActionRole);
+        button->setObjectName(QString::fromStdString(label));
+        button->setAccessibleName(QString::fromStdString(label));
+        ShowLabel(button, label.c_str());
+        buttons.push_back(button);
+    }
+    box.setDefaultButton(buttons.back());
+    box.setEscapeButton(buttons.back());
+    AssignMnemonics(&box);
+    return buttons;
+}
+
+// Above the window it interrupts, yet not its child: that window may go while the alert stands.
+void PlaceAbove(QMessageBox& box, const QWidget* window) {
+    if (!window)
+        return;
+    box.winId();
+    box.windowHandle()->setTransientParent(window->windowHandle());
+    const QRect screen = window->screen()->availableGeometry();
+    const QSize size = box.sizeHint();
+    const QPoint middle = window->frameGeometry().center();
+    box.move(
+        std::max(screen.left(), std::min(middle.x() - size.width() / 2, screen.right() - size.width())),
+        std::max(screen.top(), std::min(middle.y() - size.height() / 2, screen.bottom() - size.height())));
+}
+
+int32 ShowAlert(const AlertText& alert, const std::function<bool()>& cancelled) {
+    QMessageBox box;
+    box.setObjectName(QStringLiteral("alert"));
+    box.setWindowTitle(QString::fromStdString(alert.title));
+    box.setWindowModality(Qt::ApplicationModal);
+    box.setTextFormat(Qt::PlainText);
+    box.setText(QString::fromStdString(alert.text));
+    box.setIcon(IconOf(alert.type));
+    const std::vector<QPushButton*> buttons = AddButtons(box, alert);
+    PlaceAbove(box, QApplication::activeWindow());
+    RunDialog(box, cancelled);
+    for (std::size_t index = 0; index < buttons.size(); index++)
+        if (box.clickedButton() == buttons[index])
+            return static_cast<int32>(index);
+    return alert.LastButton();
+}
+
+int32 ShowAlertAndWait(const AlertText& alert) {
+    if (OnInterfaceThread())
+        return ShowAlert(alert, nullptr);
+    struct Exchange {
+        std::atomic<int32> result;
+        std::atomic<bool> cancelled{false};
+    };
+    const auto exchange = std::make_shared<Exchange>();
+    exchange->result = alert.LastButton();
+    const bool answered = CallOnInterfaceThread([alert, exchange] {
+        if (!exchange->cancelled)
+            exchange->result = ShowAlert(alert, [exchange] { return exchange->cancelled.load(); });
+    });
+    exchange->cancelled = !answered;
+    return answered ? exchange->result.load() : alert.LastButton();
+}
+
+} // namespace
+
+BAlert::BAlert(const char* title, const char* text, const char* button1, const char* button2,
+               const char* button3, button_width, alert_type type)
+    : title_(title ? title : ""), text_(text ? text : ""), type_(type) {
+    for (const char* button : {button1, button2, button3})
+        if (button)
+            buttons_.emplace_back(button);
+    if (buttons_.empty())
+        buttons_.emplace_back("Ok");
+}
+
+int32 BAlert::Go() {
+    const AlertText alert{std::move(title_), std::move(text_), std::move(buttons_), type_};
+    delete this;
+    return ShowAlertAndWait(alert);
+}

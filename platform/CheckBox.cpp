@@ -1,0 +1,35 @@
+#include "platform/CheckBox.h"
+
+#include <QCheckBox>
+
+#include "platform/private/Mnemonics.h"
+#include "platform/private/ViewPeer.h"
+
+namespace {
+
+QCheckBox* Widget(const BCheckBox* box) {
+    return static_cast<QCheckBox*>(ViewAccess::Widget(box));
+}
+
+} // namespace
+
+BCheckBox::BCheckBox(BRect frame, const char* name, const char* label, BMessage* message, uint32 resizingMode,
+                     uint32 flags)
+    : BControl(frame, name, label, message, resizingMode, flags, std::make_unique<ViewPeer>(new QCheckBox)) {
+    BCheckBox::SetLabel(label);
+    QObject::connect(Widget(this), &QCheckBox::clicked, Widget(this), [this](bool checked) {
+        TakeValue(checked ? B_CONTROL_ON : B_CONTROL_OFF);
+        Invoke();
+    });
+}
+
+void BCheckBox::SetLabel(const char* label) {
+    BControl::SetLabel(label);
+    ShowLabel(Widget(this), Label());
+}
+
+void BCheckBox::SetValue(int32 value) {
+    const bool on = value != B_CONTROL_OFF;
+    BControl::SetValue(on ? B_CONTROL_ON : B_CONTROL_OFF);
+    Widget(this)->setChecked(on);
+}

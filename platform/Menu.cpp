@@ -1,0 +1,172 @@
+#include "platform/Menu.h"
+
+#include <algorithm>
+
+#include "platform/Window.h"
+#include "platform/private/Loop.h"
+#include "platform/private/MenuPeer.h"
+#include "platform/private/Mnemonics.h"
+
+BMenu::BMenu(const char* title, menu_layout layout) : BMenu(title, layout, std::make_unique<MenuPeer>()) {
+    QObject::connect(peer_->menu.get(), &QMenu::aboutToShow, peer_->menu.get(),
+                     [this] { MenuAccess::Opening(*this); });
+}
+
+BMenu::BMenu(const char* title, menu_layout, std::unique_ptr<MenuPeer> peer)
+    : title_(title ? title : ""), peer_(std::move(peer)) {
+    if (!peer_->menu)
+        return;
+    peer_->menu->setObjectName(QString::fromUtf8(title_));
+    peer_->menu->setAccessibleName(QString::fromUtf8(title_).trimmed());
+}
+
+// The items take their actions out of the widget before it goes.
+BMenu::~BMenu() {
+    peer_->itemsChanged = nullptr;
+    items_.clear();
+}
+
+bool BMenu::AddItem(BMenuItem* item) {
+    return AddItem(item, CountItems());
+}
+
+bool BMenu::AddItem(BMenuItem* item, int32 index) {
+    if (!item || item->menu_ || index < 0 || index > CountItems())
+        return false;
+    const BMenuItem* next = ItemAt(index);
+    items_.emplace(items_.begin() + index, item);
+    item->menu_ = this;
+    QAction* action = item->peer_->action;
+    peer_->host->insertAction(next ? next->peer_->action : nullptr, action);
+    if (radioMode_ && !action->isSeparator()) {
+        action->setCheckable(true);
+        peer_->radioLook.addAction(action);
+    }
+    ItemChanged(item);
+    return true;
+}
+
+bool BMenu::AddItem(BMenu* submenu) {
+    return submenu && AddItem(new BMenuItem(submenu));
+}
+
+bool BMenu::AddSeparatorItem() {
+    return AddItem(new BSeparatorItem);
+}
+
+bool BMenu::RemoveItem(BMenuItem* item) {
+    return RemoveItem(IndexOf(item)) != nullptr;
+}
+
+BMenuItem* BMenu::RemoveItem(int32 index) {
+    BMenuItem* item = ItemAt(index);
+    if (!item)
+        return nullptr;
+    QAction* action = item->peer_->action;
+    peer_->radioLook.removeAction(action);
+    if (peer_->host)
+        peer_->host->removeAction(action);
+    item->menu_ = nullptr;
+    [[maybe_unused]] const BMenuItem* released = items_[static_cast<std::size_t>(index)].release();
+    items_.erase(items_.begin() + index);
+    if (peer_->itemsChanged)
+        peer_->itemsChanged();
+    return item;
+}
+
+BMenuItem* BMenu::ItemAt(int32 index) const {
+    return index >= 0 && index < CountItems() ? items_[static_cast<std::size_t>(index)].get() : nullptr;
+}
+
+int32 BMenu::IndexOf(const BMenuItem* item) const {
+    const auto found =
+        std::find_if(items_.begin(), items_.end(), [&](const auto& owned) { return owned.get() == item; });
+    return found == items_.end() ? -1 : static_cast<int32>(found - items_.begin());
+}
+
+BMenuItem* BMenu::FindItem(const char* label) const {
+    for (const auto& item : items_)
+        if (item->label_ == label)
+            return item.get();
+    return nullptr;
+}
+
+BMenuItem* BMenu::FindItem(uint32 code) const {
+    for (const auto& item : items_) {
+        if (item->Message() && item->Message()->what == code)
+            return item.get();
+        if (BMenuItem* found = item->Submenu() ? item->Submenu()->FindItem(code) : nullptr)
+            return found;
+    }
+    return nullptr;
+}
+
+BMenuItem* BMenu::FindMarked() const {
+    for (const auto& item : items_)
+        if (item->IsMarked())
+            return item.get();
+    return nullptr;
+}
+
+void BMenu::SetRadioMode(bool on) {
+    radioMode_ = on;
+    for (const auto& item : items_) {
+        QAction* action = item->peer_->action;
+        if (action->isSeparator())
+            continue;
+        action->setCheckable(on || item->IsMarked());
+        if (on)
+            peer_->radioLook.addAction(action);
+        else
+            peer_->radioLook.removeAction(action);
+    }
+}
+
+void BMenu::SetLabelFromMarked(bool on) {
+    labelFromMarked_ = on;
+    if (peer_->itemsChanged)
+        peer_->itemsChanged();
+}
+
+void BMenu::SetTargetForItems(const BHandler* target) {
+    peer_->target = BMessenger(target);
+    peer_->hasTarget = target != nullptr;
+}
+
+BMessenger BMenu::TargetForItems() const {
+    if (peer_->hasTarget)
+        return peer_->target;
+    if (peer_->superitem)
+        return peer_->superitem->DefaultTarget();
+    return BMessenger(peer_->shower ? peer_->shower->Window() : nullptr);
+}
+
+void BMenu::ItemChanged(BMenuItem* item) {
+    if (radioMode_ && item->IsMarked())
+        for (const auto& other : items_)
+            if (other.get() != item && other->IsMarked()) {
+                other->peer_->marked = false;
+                other->peer_->action->setChecked(false);
+            }
+    if (peer_->itemsChanged)
+        peer_->itemsChanged();
+}
+
+// The window enables and marks the items of its bar's menus; it is not asked while a worker has its lock.
+void MenuAccess::Opening(BMenu& menu) {
+    const BMenuItem* superitem = menu.peer_->superitem;
+    const BMenu* bar = superitem ? superitem->menu_ : nullptr;
+    BWindow* window = bar && !bar->peer_->menu && bar->peer_->shower ? bar->peer_->shower->Window() : nullptr;
+    if (window) {
+        const InterfaceLock lock(window);
+        if (lock.IsHeld())
+            window->MenusBeginning();
+    }
+    AssignMnemonics(menu.peer_->menu.get());
+}
+
+BPopUpMenu::BPopUpMenu(const char* title, bool radioMode, bool labelFromMarked, menu_layout layout)
+    : BMenu(title, layout) {
+    SetRadioMode(radioMode);
+    SetLabelFromMarked(labelFromMarked);
+}

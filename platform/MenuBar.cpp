@@ -1,0 +1,47 @@
+#include "platform/MenuBar.h"
+
+#include <QMenuBar>
+
+#include "platform/private/MenuPeer.h"
+#include "platform/private/ViewPeer.h"
+
+namespace {
+
+QMenuBar* Widget(const BMenuBar* bar) {
+    return static_cast<QMenuBar*>(ViewAccess::Widget(bar));
+}
+
+} // namespace
+
+BMenuBar::BMenuBar(BRect frame, const char* name, uint32 resizingMode, menu_layout layout, bool resizeToFit)
+    : BView(frame, name, resizingMode, B_WILL_DRAW, std::make_unique<ViewPeer>(new QMenuBar)),
+      BMenu(name, layout, std::make_unique<MenuPeer>(ViewAccess::Widget(this))),
+      resizeToFit_(resizeToFit) {
+    Widget(this)->setNativeMenuBar(false);
+    MenuPeer& peer = MenuAccess::Peer(*this);
+    peer.shower = this;
+    peer.itemsChanged = [this] { FitHeight(); };
+    FitHeight();
+}
+
+BMenuBar::~BMenuBar() = default;
+
+void BMenuBar::AttachedToWindow() {
+    if (resizeToFit_ && Parent())
+        ResizeTo(Parent()->Bounds().Width(), Frame().Height());
+    FitHeight();
+}
+
+void BMenuBar::GetPreferredSize(float* width, float* height) const {
+    const QSize size = Widget(this)->sizeHint();
+    *width = static_cast<float>(size.width() - 1);
+    *height = static_cast<float>(size.height() - 1);
+}
+
+void BMenuBar::FitHeight() {
+    float width = 0;
+    float height = 0;
+    GetPreferredSize(&width, &height);
+    if (resizeToFit_)
+        ResizeTo(Frame().Width(), height);
+}

@@ -1,0 +1,93 @@
+#include "platform/MenuField.h"
+
+#include <cmath>
+
+#include <QTimer>
+
+#include "platform/private/FieldButton.h"
+#include "platform/private/LabelledBox.h"
+#include "platform/private/MenuPeer.h"
+#include "platform/private/ViewPeer.h"
+
+namespace {
+
+LabelledBox* Box(const BMenuField* field) {
+    return static_cast<LabelledBox*>(ViewAccess::Widget(field));
+}
+
+FieldButton* Button(const BMenuField* field) {
+    return static_cast<FieldButton*>(Box(field)->Field());
+}
+
+} // namespace
+
+BMenuField::BMenuField(BRect frame, const char* name, const char* label, BMenu* menu, uint32 resizingMode,
+                       uint32 flags)
+    : BView(frame, name, resizingMode, flags, std::make_unique<ViewPeer>(new LabelledBox(new FieldButton))),
+      label_(label ? label : ""),
+      menu_(menu) {
+    Box(this)->SetNames(Name());
+    Box(this)->SetLabel(Label());
+    Box(this)->LimitFieldToHint();
+    SetDivider(label_.empty() ? 0 : std::floor(frame.Width() / 2));
+    Button(this)->setMenu(MenuAccess::Peer(*menu_).menu.get());
+    MenuPeer& peer = MenuAccess::Peer(*menu_);
+    peer.shower = this;
+    peer.itemsChanged = [this] { ShowMarked(); };
+    QObject::connect(peer.menu.get(), &QMenu::aboutToShow, Box(this), [this] { PrepareMenu(); });
+    ShowMarked();
+    ResizeTo(frame.Width(), static_cast<float>(Button(this)->sizeHint().height() - 1));
+}
+
+BMenuField::~BMenuField() {
+    Button(this)->setMenu(nullptr);
+}
+
+// The menu is at least as wide as its button, and the keyboard starts at the marked item.
+void BMenuField::PrepareMenu() {
+    QMenu* menu = MenuAccess::Peer(*menu_).menu.get();
+    menu->setMinimumWidth(Button(this)->width());
+    QTimer::singleShot(0, menu, [this, menu] {
+        const BMenuItem* marked = MenuItem();
+        if (marked && menu->isVisible() && !menu->activeAction())
+            menu->setActiveAction(MenuAccess::Peer(*marked).action);
+    });
+}
+
+void BMenuField::SetDivider(float divider) {
+    Box(this)->SetDivider(static_cast<int>(std::lround(divider)));
+}
+
+float BMenuField::Divider() const {
+    return static_cast<float>(Box(this)->Divider());
+}
+
+void BMenuField::SetEnabled(bool enabled) {
+    Box(this)->setEnabled(enabled);
+}
+
+bool BMenuField::IsEnabled() const {
+    return !Box(this)->testAttribute(Qt::WA_ForceDisabled);
+}
+
+// The layout is done first: a widget that is not shown hears of its new size only later.
+float BMenuField::VisibleRight() const {
+    Box(this)->LayOut();
+    return Frame().left + static_cast<float>(Button(this)->geometry().right());
+}
+
+void BMenuField::SetTextChangedHook(std::function<void()> hook) {
+    textChanged_ = std::move(hook);
+}
+
+void BMenuField::ShowMarked() {
+    const BMenuItem* marked = menu_->IsLabelFromMarked() ? MenuItem() : nullptr;
+    const std::string shown = marked ? marked->Label() : menu_->Name();
+    if (shown == shownText_)
+        return;
+    shownText_ = shown;
+    Button(this)->SetFullText(QString::fromStdString(shown));
+    Box(this)->LayOut();
+    if (textChanged_)
+        textChanged_();
+}

@@ -1,0 +1,87 @@
+#include "platform/MenuItem.h"
+
+#include <QKeySequence>
+
+#include "platform/View.h"
+#include "platform/private/MenuPeer.h"
+#include "platform/private/Mnemonics.h"
+
+namespace {
+
+QKeySequence Shortcut(char letter, uint32 modifierKeys) {
+    if (!letter)
+        return {};
+    QString keys = QStringLiteral("Ctrl+");
+    if (modifierKeys & B_CONTROL_KEY)
+        keys += QStringLiteral("Alt+");
+    if (modifierKeys & B_SHIFT_KEY)
+        keys += QStringLiteral("Shift+");
+    return QKeySequence(keys + QLatin1Char(letter));
+}
+
+} // namespace
+
+BMenuItem::BMenuItem(const char* label, BMessage* message, char shortcut, uint32 modifierKeys)
+    : BInvoker(message, nullptr), peer_(std::make_unique<MenuItemPeer>()) {
+    peer_->own = std::make_unique<QAction>();
+    peer_->action = peer_->own.get();
+    peer_->action->setShortcut(Shortcut(shortcut, modifierKeys));
+    peer_->action->setMenuRole(QAction::NoRole);
+    SetLabel(label);
+    QObject::connect(peer_->action, &QAction::triggered, peer_->action,
+                     [this] { MenuAccess::Chosen(*this); });
+}
+
+BMenuItem::BMenuItem(BMenu* submenu)
+    : BInvoker(nullptr, nullptr), submenu_(submenu), peer_(std::make_unique<MenuItemPeer>()) {
+    peer_->action = MenuAccess::Peer(*submenu).menu->menuAction();
+    MenuAccess::Peer(*submenu).superitem = this;
+    SetLabel(submenu->Name());
+}
+
+BMenuItem::~BMenuItem() = default;
+
+void BMenuItem::SetLabel(const char* label) {
+    label_ = label ? label : "";
+    ShowLabel(peer_->action, Label());
+    if (menu_)
+        menu_->ItemChanged(this);
+}
+
+void BMenuItem::SetEnabled(bool enabled) {
+    peer_->action->setEnabled(enabled);
+}
+
+bool BMenuItem::IsEnabled() const {
+    return peer_->action->isEnabled();
+}
+
+void BMenuItem::SetMarked(bool marked) {
+    peer_->marked = marked;
+    if (marked)
+        peer_->action->setCheckable(true);
+    peer_->action->setChecked(marked);
+    if (menu_)
+        menu_->ItemChanged(this);
+}
+
+bool BMenuItem::IsMarked() const {
+    return peer_->marked;
+}
+
+BMessenger BMenuItem::DefaultTarget() const {
+    return menu_ ? menu_->TargetForItems() : BMessenger();
+}
+
+// The toolkit has turned the mark over by itself; outside radio mode marks are the program's to change.
+void MenuAccess::Chosen(BMenuItem& item) {
+    if (item.menu_ && item.menu_->IsRadioMode())
+        item.SetMarked(true);
+    else
+        item.peer_->action->setChecked(item.peer_->marked);
+    item.Invoke();
+}
+
+BSeparatorItem::BSeparatorItem() : BMenuItem("", nullptr) {
+    MenuAccess::Peer(*this).action->setSeparator(true);
+}

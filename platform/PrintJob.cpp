@@ -1,0 +1,237 @@
+#include "platform/PrintJob.h"
+
+#include <algorithm>
+#include <string>
+
+#include <QFile>
+#include <QPageSetupDialog>
+#include <QPainter>
+#include <QPrintDialog>
+#include <QPrinter>
+#include <QPrinterInfo>
+
+#include "platform/View.h"
+#include "platform/private/Convert.h"
+#include "platform/private/Loop.h"
+#include "platform/private/ViewPeer.h"
+#include "platform/private/ViewWidget.h"
+
+namespace {
+
+constexpr double kPointsPerInch = 72;
+constexpr int32 kMaxCopies = 999;
+constexpr int32 kMinResolution = 72;
+constexpr int32 kMaxResolution = 4800;
+constexpr float kMaxPagePoints = 14400; // what a PDF page may measure
+
+std::string Text(const BMessage& settings, const char* name) {
+    const char* text = "";
+    settings.FindString(name, &text);
+    return text;
+}
+
+float Number(const BMessage& settings, const char* name, double fallback) {
+    auto value = static_cast<float>(fallback);
+    settings.FindFloat(name, &value);
+    return value;
+}
+
+int32 Whole(const BMessage& settings, const char* name, int32 fallback, int32 least, int32 most) {
+    int32 value = fallback;
+    settings.FindInt32(name, &value);
+    return value < least || value > most ? fallback : value;
+}
+
+// The size with the given key, else the one with the given measures, else the present one.
+QPageSize PageSizeOf(const BMessage& settings, const QPageSize& present) {
+    const QString key = QString::fromStdString(Text(settings, "page size"));
+    for (int id = 0; id <= QPageSize::LastPageSize; id++)
+        if (id != QPageSize::Custom && QPageSize::key(static_cast<QPageSize::PageSizeId>(id)) == key)
+            return QPageSize(static_cast<QPageSize::PageSizeId>(id));
+    const QSizeF size(Number(settings, "page width", 0), Number(settings, "page height", 0));
+    const bool sensible = size.width() >= 1 && size.height() >= 1 && size.width() <= kMaxPagePoints &&
+                          size.height() <= kMaxPagePoints;
+    return sensible ? QPageSize(size, QPageSize::Point) : present;
+}
+
+// Margins that leave no page are not taken.
+QPageLayout LayoutOf(const BMessage& settings, QPageLayout layout) {
+    layout.setUnits(QPageLayout::Point);
+    layout.setPageSize(PageSizeOf(settings, layout.pageSize()));
+    bool landscape = layout.orientation() == QPageLayout::Landscape;
+    settings.FindBool("landscape", &landscape);
+    layout.setOrientation(landscape ? QPageLayout::Landscape : QPageLayout::Portrait);
+    const QMarginsF now = layout.margins();
+    const QMarginsF wanted(
+        Number(settings, "left margin", now.left()), Number(settings, "top margin", now.top()),
+        Number(settings, "right margin", now.right()), Number(settings, "bottom margin", now.bottom()));
+    const QSizeF page = layout.fullRect().size();
+    if (wanted.left() + wanted.right() < page.width() && wanted.top() + wanted.bottom() < page.height())
+        layout.setMargins(wanted);
+    return layout;
+}
+
+// Draws view, whose (0, 0) is the painter's origin, and what lies in it. Controls draw themselves.
+void DrawTree(BView* view, QPainter& painter, const BRect& part) {
+    auto* plain = dynamic_cast<ViewWidget*>(ViewAccess::Widget(view));
+    if (!plain) {
+        const BPoint origin = view->Bounds().LeftTop();
+        ViewAccess::Widget(view)->render(&painter,
+                                         QPoint(static_cast<int>(origin.x), static_cast<int>(origin.y)),
+                                         QRegion(), QWidget::DrawChildren);
+        return;
+    }
+    painter.fillRect(ToQt(part), ToQt(view->ViewColor()));
+    {
+        const PaintPass pass(view, &painter);
+        view->Draw(part);
+    }
+    for (int32 index = 0; BView* child = view->ChildAt(index); index++) {
+        const BPoint shift = child->Frame().LeftTop() - child->Bounds().LeftTop();
+        BRect inner = part & child->Frame();
+        if (child->IsHidden() || !inner.IsValid())
+            continue;
+        painter.save();
+        painter.setClipRect(ToQt(inner), Qt::IntersectClip);
+        painter.translate(ToQt(shift));
+        inner.OffsetBy(-shift.x, -shift.y);
+        DrawTree(child, painter, inner);
+        painter.restore();
+    }
+}
+
+} // namespace
+
+struct PrintJobPeer {
+    QPrinter printer{QPrinter::HighResolution};
+    QPainter painter;
+    bool pageWanted = false; // the next drawing begins a new page
+
+    [[nodiscard]] bool IsUsable() const {
+        return painter.isActive() && printer.printerState() != QPrinter::Aborted &&
+               printer.printerState() != QPrinter::Error;
+    }
+};
+
+BPrintJob::BPrintJob(const char* name) : peer_(std::make_unique<PrintJobPeer>()) {
+    peer_->printer.setDocName(QString::fromUtf8(name));
+    peer_->printer.setCreator(QStringLiteral("Quorvan"));
+}
+
+BPrintJob::~BPrintJob() {
+    CancelJob();
+}
+
+status_t BPrintJob::ConfigPage() {
+    QPageSetupDialog dialog(&peer_->printer);
+    dialog.setObjectName(QStringLiteral("page setup dialog"));
+    return RunDialog(dialog) == QDialog::Accepted ? B_OK : B_ERROR;
+}
+
+status_t BPrintJob::ConfigJob() {
+    QPrintDialog dialog(&peer_->printer);
+    dialog.setObjectName(QStringLiteral("print dialog"));
+    dialog.setOptions(QAbstractPrintDialog::PrintToFile | QAbstractPrintDialog::PrintShowPageSize);
+    return RunDialog(dialog) == QDialog::Accepted ? B_OK : B_ERROR;
+}
+
+BMessage* BPrintJob::Settings() const {
+    const QPrinter& printer = peer_->printer;
+    QPageLayout layout = printer.pageLayout();
+    layout.setUnits(QPageLayout::Point);
+    const QSizeF size = layout.pageSize().size(QPageSize::Point);
+    const QMarginsF margins = layout.margins();
+    auto settings = std::make_unique<BMessage>();
+    settings->AddString("page size", layout.pageSize().key().toUtf8().constData());
+    settings->AddFloat("page width", static_cast<float>(size.width()));
+    settings->AddFloat("page height", static_cast<float>(size.height()));
+    settings->AddFloat("left margin", static_cast<float>(margins.left()));
+    settings->AddFloat("top margin", static_cast<float>(margins.top()));
+    settings->AddFloat("right margin", static_cast<float>(margins.right()));
+    settings->AddFloat("bottom margin", static_cast<float>(margins.bottom()));
+    settings->AddBool("landscape", layout.orientation() == QPageLayout::Landscape);
+    settings->AddString("printer", printer.printerName().toUtf8().constData());
+    settings->AddString("output file", printer.outputFileName().toUtf8().constData());
+    settings->AddInt32("copies", printer.copyCount());
+    settings->AddInt32("resolution", printer.resolution());
+    settings->AddBool("colour", printer.colorMode() == QPrinter::Color);
+    return settings.release();
+}
+
+void BPrintJob::SetSettings(const BMessage* message) {
+    QPrinter& printer = peer_->printer;
+    if (!message || peer_->painter.isActive())
+        return;
+    const QString name = QString::fromStdString(Text(*message, "printer"));
+    const QString file = QString::fromStdString(Text(*message, "output file"));
+    if (!name.isEmpty() && !QPrinterInfo::printerInfo(name).isNull())
+        printer.setPrinterName(name);
+    if (!file.isEmpty())
+        printer.setOutputFileName(file);
+    printer.setPageLayout(LayoutOf(*message, printer.pageLayout()));
+    printer.setCopyCount(Whole(*message, "copies", printer.copyCount(), 1, kMaxCopies));
+    printer.setResolution(
+        Whole(*message, "resolution", printer.resolution(), kMinResolution, kMaxResolution));
+    bool colour = printer.colorMode() == QPrinter::Color;
+    message->FindBool("colour", &colour);
+    printer.setColorMode(colour ? QPrinter::Color : QPrinter::GrayScale);
+}
+
+bool BPrintJob::BeginJob() {
+    const QPrinter& printer = peer_->printer;
+    const bool nowhere = printer.outputFormat() == QPrinter::PdfFormat && printer.outputFileName().isEmpty();
+    return !nowhere && !peer_->painter.isActive() && peer_->painter.begin(&peer_->printer);
+}
+
+bool BPrintJob::CanContinue() const {
+    return peer_->IsUsable();
+}
+
+BRect BPrintJob::PaperRect() const {
+    BRect paper = FromQt(peer_->printer.pageLayout().fullRect(QPageLayout::Point));
+    const QRectF printable = peer_->printer.pageLayout().paintRect(QPageLayout::Point);
+    paper.OffsetBy(static_cast<float>(-printable.left()), static_cast<float>(-printable.top()));
+    return paper;
+}
+
+BRect BPrintJob::PrintableRect() const {
+    BRect printable = FromQt(peer_->printer.pageLayout().paintRect(QPageLayout::Point));
+    printable.OffsetTo(0, 0);
+    return printable;
+}
+
+void BPrintJob::DrawView(BView* view, BRect rect, BPoint where) {
+    if (!peer_->IsUsable() || !rect.IsValid())
+        return;
+    if (peer_->pageWanted)
+        peer_->printer.newPage();
+    peer_->pageWanted = false;
+    QPainter& painter = peer_->painter;
+    const double scale = peer_->printer.resolution() / kPointsPerInch;
+    painter.save();
+    painter.scale(scale, scale);
+    painter.translate(ToQt(where - rect.LeftTop()));
+    painter.setClipRect(ToQt(rect));
+    DrawTree(view, painter, rect);
+    painter.restore();
+}
+
+void BPrintJob::SpoolPage() {
+    if (peer_->IsUsable() && peer_->pageWanted)
+        peer_->printer.newPage();
+    peer_->pageWanted = true;
+}
+
+void BPrintJob::CommitJob() {
+    if (peer_->painter.isActive())
+        peer_->painter.end();
+}
+
+void BPrintJob::CancelJob() {
+    if (!peer_->painter.isActive())
+        return;
+    peer_->printer.abort();
+    peer_->painter.end();
+    if (!peer_->printer.outputFileName().isEmpty())
+        QFile::remove(peer_->printer.outputFileName());
+}

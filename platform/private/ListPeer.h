@@ -1,0 +1,44 @@
+// What a list view has on the toolkit's side. Only for the layer's own sources.
+#pragma once
+
+#include "platform/private/RowModel.h"
+#include "platform/private/RowSelection.h"
+#include "platform/private/RowsWidget.h"
+#include "platform/private/ViewPeer.h"
+
+struct ListPeer : ViewPeer {
+    ListPeer(BListView* owner, std::function<void()> selectionChanged)
+        : ViewPeer(new RowsWidget(owner)), selection(model, *Rows(), std::move(selectionChanged)) {}
+    // The widget looks at the model to its end.
+    ~ListPeer() override { delete widget; }
+
+    [[nodiscard]] RowsWidget* Rows() const { return static_cast<RowsWidget*>(widget.data()); }
+    [[nodiscard]] QWidget* Canvas() const override { return Rows()->viewport(); }
+
+    // -1 when the row is not in the list.
+    [[nodiscard]] int32 IndexOf(const BListItem* row) const;
+    // Has the toolkit ask one row only for its height as long as all are alike.
+    void TakeHeights(const std::vector<BListItem*>& rows);
+    void LayOutAgain();
+
+    RowModel model;
+    RowSelection selection;
+    float dataWidth = 0;
+    bool frameEvents = false;
+
+  private:
+    int rowHeight_ = 0;       // of every row while the sizes are uniform
+    mutable int32 drift_ = 0; // how far the row looked up last had moved from where it came
+};
+
+// The layer's own way into lists and rows.
+struct ListAccess {
+    static ListPeer& Peer(const BListView& list);
+    static BListView* List(const BListItem& row) { return row.list_; }
+    static void SetList(BListItem& row, BListView* list) { row.list_ = list; }
+    static int32 Index(const BListItem& row) { return row.index_; }
+    static void SetIndex(BListItem& row, int32 index) { row.index_ = index; }
+    static void SetSelected(BListItem& row, bool selected) { row.selected_ = selected; }
+    // Whole pixels; at least one, so that every row has its place.
+    static int Pixels(const BListItem& row);
+};

@@ -1,0 +1,47 @@
+// What menus and their items have on the toolkit's side. Only for the layer's own sources.
+#pragma once
+
+#include <functional>
+#include <memory>
+
+#include <QAction>
+#include <QActionGroup>
+#include <QMenu>
+#include <QPointer>
+
+#include "platform/Menu.h"
+
+// A menu's peer: the widget that shows the items, which is a toolkit menu of its own or, for the menu bar,
+// the bar's widget, which belongs to the bar's view.
+struct MenuPeer {
+    MenuPeer() : menu(std::make_unique<QMenu>()), host(menu.get()) {}
+    explicit MenuPeer(QWidget* bar) : host(bar) {}
+
+    std::unique_ptr<QMenu> menu;
+    QPointer<QWidget> host;
+    // Marks in radio mode look like radio marks; who is marked is the layer's own business.
+    QActionGroup radioLook{nullptr};
+    BMenuItem* superitem = nullptr; // the item that opens this menu
+    // The bar or field that shows this menu, with what it does when items or marks change.
+    BView* shower = nullptr;
+    std::function<void()> itemsChanged;
+    BMessenger target;
+    bool hasTarget = false;
+};
+
+// An item's peer. An ordinary item owns its action; one that opens a submenu uses the submenu's.
+struct MenuItemPeer {
+    std::unique_ptr<QAction> own;
+    QPointer<QAction> action;
+    bool marked = false;
+};
+
+// The layer's own way into menus.
+struct MenuAccess {
+    static MenuPeer& Peer(const BMenu& menu) { return *menu.peer_; }
+    static MenuItemPeer& Peer(const BMenuItem& item) { return *item.peer_; }
+    // The person chose the item.
+    static void Chosen(BMenuItem& item);
+    // The toolkit is about to open the menu.
+    static void Opening(BMenu& menu);
+};

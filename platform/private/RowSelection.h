@@ -1,0 +1,56 @@
+// Which rows of a list are selected. Only for the layer's own sources.
+#pragma once
+
+#include <functional>
+
+#include <QItemSelectionModel>
+
+#include "platform/ListView.h"
+
+class RowModel;
+class RowsWidget;
+
+// The rows' own marks say what is selected; the toolkit's selection follows them, and sets them when a person
+// selects. While rows come, go and change places the two are apart: the toolkit keeps a scattered selection
+// as thousands of positions that each change would have to move, so it is emptied before the change and
+// filled again from the marks before anything uses it. Belongs to its list; interface thread.
+class RowSelection {
+  public:
+    RowSelection(RowModel& model, RowsWidget& view, std::function<void()> changed);
+    RowSelection(const RowSelection&) = delete;
+    RowSelection& operator=(const RowSelection&) = delete;
+
+    // The index of the nth selected row from the top, or -1.
+    [[nodiscard]] int32 Nth(int32 n) const;
+
+    // Rows from first to last, both inside.
+    void Select(int32 first, int32 last, bool extend);
+    void Deselect(int32 index);
+    void Clear();
+
+    // To be called before rows change.
+    void Detach();
+    // Brings the toolkit's selection and current row in line again; nothing when it is.
+    void Attach();
+    // To be called when rows have been taken out, with what they were; after Detach.
+    void RowsRemoved(int32 index, const std::vector<BListItem*>& rows);
+    // To be called when rows came or changed places.
+    void RowsMoved() { orderKnown_ = false; }
+
+  private:
+    void TakeOver(const QItemSelection& selected, const QItemSelection& deselected);
+    void Mark(const QItemSelection& ranges, bool selected);
+    void Order() const;
+
+    RowModel& model_;
+    RowsWidget& view_;
+    std::function<void()> changed_;
+    bool attached_ = true;
+    BListItem* current_ = nullptr; // while not attached
+
+    // The selected rows' indexes in order: those of order_ from head_ on, each less shift_.
+    mutable std::vector<int32> order_;
+    mutable std::size_t head_ = 0;
+    mutable int32 shift_ = 0;
+    mutable bool orderKnown_ = false;
+};

@@ -1,0 +1,296 @@
+#include "platform/private/RowsWidget.h"
+
+#include <algorithm>
+#include <cmath>
+
+#include <QAbstractItemDelegate>
+#include <QMouseEvent>
+#include <QPainter>
+#include <QScrollBar>
+#include <QTimer>
+
+#include "platform/private/Convert.h"
+#include "platform/private/ListPeer.h"
+#include "platform/private/Loop.h"
+#include "platform/private/ViewWidget.h"
+
+namespace {
+
+constexpr int kRetryMilliseconds = 5;
+
+class RowDelegate : public QAbstractItemDelegate {
+    Q_DISABLE_COPY_MOVE(RowDelegate)
+
+  public:
+    explicit RowDelegate(RowsWidget* view) : QAbstractItemDelegate(view), view_(view) {}
+
+    void paint(QPainter* painter, const QStyleOptionViewItem& option,
+               const QModelIndex& index) const override {
+        view_->DrawRow(*painter, index.row(), option.rect, option.state.testFlag(QStyle::State_HasFocus));
+    }
+    // How wide the rows are the list says itself.
+    QSize sizeHint(const QStyleOptionViewItem&, const QModelIndex& index) const override {
+        const auto* model = static_cast<const RowModel*>(index.model());
+        const BListItem* row = model->At(index.row());
+        return {1, row ? ListAccess::Pixels(*row) : 1};
+    }
+
+  private:
+    RowsWidget* view_;
+};
+
+// Dark dots on a light line: seen on every row, and only at its edge.
+void DrawFocus(QPainter& painter, const BRect& row) {
+    const QRectF edge = ToQt(row).adjusted(0.5, 0.5, -0.5, -0.5);
+    painter.setRenderHint(QPainter::Antialiasing, false);
+    painter.setBrush(Qt::NoBrush);
+    painter.setPen(QPen(Qt::white, 1));
+    painter.drawRect(edge);
+    painter.setPen(QPen(Qt::black, 1, Qt::DotLine));
+    painter.drawRect(edge);
+}
+
+} // namespace
+
+// Columns and scrolling keep their direction whatever the language of the desktop.
+RowsWidget::RowsWidget(BListView* owner) : owner_(owner) {
+    setItemDelegate(new RowDelegate(this));
+    setLayoutDirection(Qt::LeftToRight);
+    setVerticalScrollMode(ScrollPerPixel);
+    setHorizontalScrollMode(ScrollPerPixel);
+    setHorizontalScrollBarPolicy(Qt::ScrollBarAlwaysOff);
+    setVerticalScrollBarPolicy(Qt::ScrollBarAlwaysOff);
+    setEditTriggers(NoEditTriggers);
+    setUniformItemSizes(true);
+    setFrameShape(NoFrame);
+    viewport()->setAttribute(Qt::WA_OpaquePaintEvent);
+}
+
+RowsWidget::~RowsWidget() = default;
+
+int32 RowsWidget::IndexOf(const BListItem* row) const {
+    return peer_ ? peer_->IndexOf(row) : -1;
+}
+
+void RowsWidget::SetBars(bool horizontal, bool vertical) {
+    mayScrollSideways_ = horizontal;
+    setVerticalScrollBarPolicy(vertical ? Qt::ScrollBarAsNeeded : Qt::ScrollBarAlwaysOff);
+    ShowBarIfNeeded();
+}
+
+BPoint RowsWidget::Offset() const {
+    return {static_cast<float>(horizontalOffset()), static_cast<float>(verticalOffset())};
+}
+
+void RowsWidget::SetOffset(BPoint offset) {
+    settingOffset_ = true;
+    horizontalScrollBar()->setValue(static_cast<int>(std::lround(offset.x)));
+    verticalScrollBar()->setValue(static_cast<int>(std::lround(offset.y)));
+    settingOffset_ = false;
+}
+
+// A widget that is not shown yet hears of its size only later.
+QSize RowsWidget::VisibleSize() const {
+    return testAttribute(Qt::WA_PendingResizeEvent) ? maximumViewportSize() : viewport()->size();
+}
+
+int RowsWidget::ContentWidth() const {
+    const int rows = peer_ ? static_cast<int>(std::ceil(peer_->dataWidth)) : 0;
+    return std::max(rows, viewport()->width());
+}
+
+void RowsWidget::DataWidthChanged() {
+    ShowBarIfNeeded();
+    updateGeometries();
+    viewport()->update();
+}
+
+void RowsWidget::ShowBarIfNeeded() {
+    const bool wanted = mayScrollSideways_ && ContentWidth() > viewport()->width();
+    setHorizontalScrollBarPolicy(wanted ? Qt::ScrollBarAlwaysOn : Qt::ScrollBarAlwaysOff);
+}
+
+// The toolkit works out the sideways range from the widths of rows, which it would have to lay out again for
+// every change; ours is known. The range that it sets on the way must not be noticed.
+void RowsWidget::updateGeometries() {
+    QScrollBar* bar = horizontalScrollBar();
+    const int maximum = bar->maximum();
+    const int value = bar->value();
+    {
+        const QSignalBlocker silent(bar);
+        QListView::updateGeometries();
+        bar->setRange(0, maximum);
+        bar->setValue(value);
+    }
+    ShowBarIfNeeded();
+    bar->setSingleStep(3 * fontMetrics().averageCharWidth());
+    bar->setPageStep(viewport()->width());
+    bar->setRange(0, mayScrollSideways_ ? ContentWidth() - viewport()->width() : 0);
+}
+
+void RowsWidget::resizeEvent(QResizeEvent* event) {
+    QListView::resizeEvent(event);
+    ShowBarIfNeeded();
+    viewport()->update();
+    if (!peer_ || !peer_->frameEvents)
+        return;
+    const InterfaceLock lock(owner_->Looper());
+    owner_->FrameResized(static_cast<float>(viewport()->width() - 1),
+                         static_cast<float>(viewport()->height() - 1));
+}
+
+void RowsWidget::scrollContentsBy(int dx, int dy) {
+    QListView::scrollContentsBy(dx, dy);
+    if (!peer_ || settingOffset_)
+        return;
+    const InterfaceLock lock(owner_->Looper());
+    owner_->ScrollTo(Offset());
+}
+
+QRect RowsWidget::visualRect(const QModelIndex& index) const {
+    QRect place = QListView::visualRect(index);
+    if (place.isValid())
+        place.setWidth(ContentWidth());
+    return place;
+}
+
+void RowsWidget::paintEvent(QPaintEvent* event) {
+    if (!peer_)
+        return;
+    peer_->selection.Attach();
+    QPainter(viewport()).fillRect(event->rect(), ToQt(owner_->ViewColor()));
+    const InterfaceLock lock(owner_->Looper());
+    if (lock.IsHeld())
+        QListView::paintEvent(event);
+    else
+        QTimer::singleShot(kRetryMilliseconds, viewport(), [this] { viewport()->update(); });
+}
+
+void RowsWidget::DrawRow(QPainter& painter, int32 index, const QRect& place, bool focus) const {
+    BListItem* row = peer_ ? peer_->model.At(index) : nullptr;
+    if (!row)
+        return;
+    const BPoint offset = Offset();
+    BRect frame = FromQt(QRectF(place));
+    frame.OffsetBy(offset.x, offset.y);
+    painter.save();
+    painter.translate(-offset.x, -offset.y);
+    {
+        const PaintPass pass(owner_, &painter);
+        row->DrawItem(owner_, frame, true);
+    }
+    if (focus)
+        DrawFocus(painter, frame);
+    painter.restore();
+}
+
+void RowsWidget::focusInEvent(QFocusEvent* event) {
+    if (peer_)
+        peer_->selection.Attach();
+    QListView::focusInEvent(event);
+}
+
+void RowsWidget::Input(QInputEvent* event) {
+    if (!peer_)
+        return;
+    if (heldBack_.empty()) {
+        const InterfaceLock lock(owner_->Looper());
+        if (lock.IsHeld()) {
+            Handle(event);
+            return;
+        }
+        QTimer::singleShot(kRetryMilliseconds, this, [this] { ReplayHeldBack(); });
+    }
+    heldBack_.emplace_back(static_cast<QInputEvent*>(event->clone()));
+}
+
+void RowsWidget::ReplayHeldBack() {
+    const InterfaceLock lock(peer_ ? owner_->Looper() : nullptr);
+    if (!lock.IsHeld()) {
+        QTimer::singleShot(kRetryMilliseconds, this, [this] { ReplayHeldBack(); });
+        return;
+    }
+    while (peer_ && !heldBack_.empty()) {
+        const std::unique_ptr<QInputEvent> event = std::move(heldBack_.front());
+        heldBack_.pop_front();
+        Handle(event.get());
+    }
+}
+
+void RowsWidget::Handle(QInputEvent* event) {
+    peer_->selection.Attach();
+    if (event->type() == QEvent::KeyPress) {
+        HandleKey(static_cast<QKeyEvent*>(event));
+        return;
+    }
+    auto* mouse = static_cast<QMouseEvent*>(event);
+    ViewAccess::NotePointer(owner_, Where(*mouse), ButtonBits(mouse->buttons()));
+    if (event->type() == QEvent::MouseMove) {
+        if (pressForwarded_ || mouse->buttons() == Qt::NoButton)
+            QListView::mouseMoveEvent(mouse);
+    } else if (event->type() == QEvent::MouseButtonRelease) {
+        if (pressForwarded_)
+            QListView::mouseReleaseEvent(mouse);
+        owner_->MouseUp(Where(*mouse));
+    } else {
+        HandlePress(mouse);
+    }
+}
+
+BPoint RowsWidget::Where(const QMouseEvent& event) const {
+    return FromQt(event.position()) + Offset();
+}
+
+void RowsWidget::HandlePress(QMouseEvent* event) {
+    BMessage message(kMouseDownCode);
+    message.AddPoint("where", Where(*event));
+    message.AddInt32("buttons", static_cast<int32>(ButtonBits(event->buttons())));
+    message.AddInt32("modifiers", static_cast<int32>(ModifierBits(event->modifiers())));
+    message.AddInt32("clicks", event->type() == QEvent::MouseButtonDblClick ? 2 : 1);
+    const CurrentMessageScope scope(owner_->Looper(), &message);
+    pressForwarded_ = false;
+    press_ = event;
+    owner_->MouseDown(Where(*event));
+    press_ = nullptr;
+}
+
+// The second press of a double click on one row invokes and does nothing else: it must not turn over what a
+// press with the command key has just selected.
+bool RowsWidget::ForwardPress() {
+    if (!press_)
+        return false;
+    QMouseEvent* event = std::exchange(press_, nullptr);
+    const QModelIndex row = indexAt(event->position().toPoint());
+    if (event->type() == QEvent::MouseButtonDblClick && event->button() == Qt::LeftButton && row.isValid() &&
+        pressedRow_ == row) {
+        InvokeCurrent();
+        return true;
+    }
+    pressForwarded_ = true;
+    pressedRow_ = row;
+    QListView::mousePressEvent(event);
+    return true;
+}
+
+void RowsWidget::HandleKey(QKeyEvent* event) {
+    const bool plain = !(event->modifiers() & ~Qt::KeypadModifier);
+    const int key = event->key();
+    if (plain && (key == Qt::Key_Left || key == Qt::Key_Right)) {
+        horizontalScrollBar()->triggerAction(key == Qt::Key_Left ? QScrollBar::SliderSingleStepSub
+                                                                 : QScrollBar::SliderSingleStepAdd);
+    } else if (plain && (key == Qt::Key_Return || key == Qt::Key_Enter)) {
+        event->setAccepted(owner_->InvocationMessage() != nullptr);
+        if (event->isAccepted() && !event->isAutoRepeat())
+            InvokeCurrent();
+    } else {
+        QListView::keyPressEvent(event);
+    }
+}
+
+// What is invoked is what is selected; a row that only has the keyboard's mark is selected first.
+void RowsWidget::InvokeCurrent() {
+    if (peer_->selection.Nth(0) < 0 && currentIndex().isValid())
+        peer_->selection.Select(currentIndex().row(), currentIndex().row(), false);
+    if (peer_->selection.Nth(0) >= 0)
+        owner_->Invoke();
+}

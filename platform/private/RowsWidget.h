@@ -1,0 +1,77 @@
+// The widget of a list view. Only for the layer's own sources.
+#pragma once
+
+#include <deque>
+#include <memory>
+
+#include <QInputEvent>
+#include <QListView>
+
+#include "platform/ListView.h"
+
+struct ListPeer;
+
+// The toolkit's list over our rows: it lays out, scrolls and selects; a row draws itself, when visible,
+// through the delegate. Presses go through the view's MouseDown. Input that comes while another thread has
+// the window's lock is held back, in its order, until the lock is free. Belongs to its view's peer.
+class RowsWidget : public QListView {
+    Q_DISABLE_COPY_MOVE(RowsWidget)
+
+  public:
+    explicit RowsWidget(BListView* owner);
+    ~RowsWidget() override;
+
+    void SetPeer(ListPeer* peer) { peer_ = peer; }
+    // No hook of the view is called from now on.
+    void Orphan() { peer_ = nullptr; }
+    [[nodiscard]] int32 IndexOf(const BListItem* row) const;
+
+    // The bars that the list may show.
+    void SetBars(bool horizontal, bool vertical);
+    [[nodiscard]] BPoint Offset() const;
+    void SetOffset(BPoint offset);
+    // The part of the content that is seen.
+    [[nodiscard]] QSize VisibleSize() const;
+    void DataWidthChanged();
+    // Row heights have changed.
+    void LayOutSoon() { scheduleDelayedItemsLayout(); }
+
+    // Handles the press that MouseDown is being called for as the toolkit does; false when there is none.
+    bool ForwardPress();
+    // Draws a row, in the content's coordinates.
+    void DrawRow(QPainter& painter, int32 index, const QRect& place, bool focus) const;
+
+    [[nodiscard]] QRect visualRect(const QModelIndex& index) const override;
+
+  protected:
+    void paintEvent(QPaintEvent* event) override;
+    void resizeEvent(QResizeEvent* event) override;
+    void scrollContentsBy(int dx, int dy) override;
+    void updateGeometries() override;
+    void focusInEvent(QFocusEvent* event) override;
+    void keyPressEvent(QKeyEvent* event) override { Input(event); }
+    void mousePressEvent(QMouseEvent* event) override { Input(event); }
+    void mouseDoubleClickEvent(QMouseEvent* event) override { Input(event); }
+    void mouseMoveEvent(QMouseEvent* event) override { Input(event); }
+    void mouseReleaseEvent(QMouseEvent* event) override { Input(event); }
+
+  private:
+    void Input(QInputEvent* event);
+    void ReplayHeldBack();
+    void Handle(QInputEvent* event);
+    void HandlePress(QMouseEvent* event);
+    void HandleKey(QKeyEvent* event);
+    void InvokeCurrent();
+    void ShowBarIfNeeded();
+    [[nodiscard]] int ContentWidth() const;
+    [[nodiscard]] BPoint Where(const QMouseEvent& event) const;
+
+    BListView* owner_;
+    ListPeer* peer_ = nullptr;
+    std::deque<std::unique_ptr<QInputEvent>> heldBack_;
+    QMouseEvent* press_ = nullptr;     // while MouseDown runs
+    QPersistentModelIndex pressedRow_; // by the last press that was forwarded
+    bool pressForwarded_ = false;
+    bool mayScrollSideways_ = false;
+    bool settingOffset_ = false;
+};
