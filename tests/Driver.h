@@ -1,0 +1,118 @@
+#pragma once
+
+#include <deque>
+#include <functional>
+#include <string>
+#include <utility>
+
+#include <QAbstractButton>
+#include <QApplication>
+#include <QDeadlineTimer>
+#include <QMessageBox>
+#include <QTest>
+#include <QTimer>
+#include <gtest/gtest.h>
+
+#include "platform/Application.h"
+
+// Works the program as a person would, while the test's own code waits in a modal dialog or in the
+// application's loop: each step waits for its condition and then does its action, with real events on
+// widgets. Steps begin as soon as there is an application object. A condition that does not come true within
+// a time limit fails the test and quits the application.
+class Driver {
+  public:
+    using Condition = std::function<bool()>;
+    using Action = std::function<void()>;
+
+    Driver() {
+        self_ = this;
+        if (QCoreApplication::instance())
+            Begin();
+        else
+            qAddPreRoutine([] { self_->Begin(); });
+    }
+    Driver(const Driver&) = delete;
+    Driver& operator=(const Driver&) = delete;
+    ~Driver() {
+        for (const Step& step : steps_)
+            ADD_FAILURE() << "never came to: " << step.what;
+        self_ = nullptr;
+    }
+
+    Driver& When(std::string what, Condition condition, Action action) {
+        steps_.push_back({std::move(what), std::move(condition), std::move(action)});
+        return *this;
+    }
+
+    // Waits for an alert with this text and presses one of its buttons.
+    Driver& Answer(const char* text, const char* button) {
+        return When(
+            std::string("alert: ") + text,
+            [text] { return Alert() && Alert()->text() == QString::fromUtf8(text); },
+            [button] { Press(Alert(), button); });
+    }
+
+    // The alert that is shown; null when there is none.
+    static QMessageBox* Alert() { return qobject_cast<QMessageBox*>(QApplication::activeModalWidget()); }
+    // The visible window with this title; null when there is none.
+    static QWidget* Window(const char* title) {
+        for (QWidget* window : QApplication::topLevelWidgets()) {
+            if (window->isVisible() && window->windowTitle() == QString::fromUtf8(title))
+                return window;
+        }
+        return nullptr;
+    }
+    static Condition WindowShown(const char* title) {
+        return [title] { return Window(title) != nullptr; };
+    }
+    // Clicks a button found by its name.
+    static void Press(QWidget* window, const char* button) {
+        auto* found = window->findChild<QAbstractButton*>(QString::fromUtf8(button));
+        ASSERT_TRUE(found) << button;
+        QTest::mouseClick(found, Qt::LeftButton);
+    }
+
+  private:
+    struct Step {
+        std::string what;
+        Condition condition;
+        Action action;
+    };
+
+    static constexpr int PollMilliseconds = 5;
+    static constexpr int PatienceMilliseconds = 60000;
+
+    void Begin() {
+        deadline_.setRemainingTime(PatienceMilliseconds);
+        PollSoon();
+    }
+    static void PollSoon() {
+        QTimer::singleShot(PollMilliseconds, qApp, [] {
+            if (self_)
+                self_->Poll();
+        });
+    }
+    void Poll() {
+        if (steps_.empty()) {
+            PollSoon();
+            return;
+        }
+        if (steps_.front().condition()) {
+            const Action action = std::move(steps_.front().action);
+            steps_.pop_front();
+            deadline_.setRemainingTime(PatienceMilliseconds);
+            PollSoon(); // before the action, which may wait in a loop of its own
+            action();
+        } else if (deadline_.hasExpired()) {
+            ADD_FAILURE() << "waited in vain for: " << steps_.front().what;
+            steps_.clear();
+            be_app->PostMessage(B_QUIT_REQUESTED);
+        } else {
+            PollSoon();
+        }
+    }
+
+    static inline Driver* self_ = nullptr;
+    std::deque<Step> steps_;
+    QDeadlineTimer deadline_;
+};
