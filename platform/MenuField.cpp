@@ -30,7 +30,7 @@ BMenuField::BMenuField(BRect frame, const char* name, const char* label, BMenu* 
     Box(this)->SetLabel(Label());
     Box(this)->LimitFieldToHint();
     SetDivider(label_.empty() ? 0 : std::floor(frame.Width() / 2));
-    Button(this)->setMenu(MenuAccess::Peer(*menu_).menu.get());
+    Button(this)->SetMenu(MenuAccess::Peer(*menu_).menu.get());
     MenuPeer& peer = MenuAccess::Peer(*menu_);
     peer.shower = this;
     peer.itemsChanged = [this] { ShowMarked(); };
@@ -40,13 +40,12 @@ BMenuField::BMenuField(BRect frame, const char* name, const char* label, BMenu* 
 }
 
 BMenuField::~BMenuField() {
-    Button(this)->setMenu(nullptr);
+    Button(this)->SetMenu(nullptr);
 }
 
-// The menu is at least as wide as its button, and the keyboard starts at the marked item.
+// The keyboard starts at the marked item.
 void BMenuField::PrepareMenu() {
     QMenu* menu = MenuAccess::Peer(*menu_).menu.get();
-    menu->setMinimumWidth(Button(this)->width());
     QTimer::singleShot(0, menu, [this, menu] {
         const BMenuItem* marked = MenuItem();
         if (marked && menu->isVisible() && !menu->activeAction())

@@ -53,6 +53,16 @@ void FollowEdges(float& low, float& high, float delta, bool followsLow, bool fol
     }
 }
 
+// What lies on a view without a background of its own (labels, check boxes) stands out from the view's
+// colour, whatever the desktop's theme.
+void ContrastWith(rgb_color background, QWidget* widget) {
+    const bool light = 2 * background.red + 5 * background.green + background.blue > 4 * 255;
+    QPalette palette;
+    palette.setColor(QPalette::WindowText, light ? Qt::black : Qt::white);
+    palette.setColor(QPalette::Disabled, QPalette::WindowText, light ? Qt::darkGray : Qt::lightGray);
+    widget->setPalette(palette);
+}
+
 } // namespace
 
 uint32 modifiers() {
@@ -88,6 +98,7 @@ BView::BView(BRect frame, const char* name, uint32 resizingMode, uint32 flags)
     : BView(frame, name, resizingMode, flags, std::make_unique<ViewPeer>(new ViewWidget(this))) {
     peer_->widget->setAccessibleName(QString::fromUtf8(Name()));
     peer_->widget->setFocusPolicy(flags & B_NAVIGABLE ? Qt::StrongFocus : Qt::NoFocus);
+    ContrastWith(viewColor_, peer_->widget);
 }
 
 BView::BView(BRect frame, const char* name, uint32 resizingMode, uint32 flags, std::unique_ptr<ViewPeer> peer)
@@ -300,6 +311,8 @@ void BView::GetMouse(BPoint* where, uint32* buttons, bool) const {
 
 void BView::SetViewColor(rgb_color color) {
     viewColor_ = color;
+    if (dynamic_cast<ViewWidget*>(peer_->widget.data()))
+        ContrastWith(color, peer_->widget);
     Invalidate();
 }
 

@@ -2,12 +2,41 @@
 
 #include <QKeyEvent>
 #include <QMenu>
+#include <QScreen>
 #include <QStyleOptionButton>
+#include <QWindow>
 
 #include "platform/private/Mnemonics.h"
 
 FieldButton::FieldButton() {
     setAutoDefault(false);
+}
+
+// The toolkit's own way to open it would not return before the menu is closed.
+void FieldButton::SetMenu(QMenu* menu) {
+    setMenu(menu);
+    if (!menu)
+        return;
+    disconnect(this, &QPushButton::pressed, this, nullptr);
+    connect(this, &QPushButton::pressed, this, [this] { Open(); });
+    connect(menu, &QMenu::aboutToHide, this, [this] { setDown(false); });
+}
+
+// Below the button, or above it where the screen ends. A press outside only closes the menu.
+void FieldButton::Open() {
+    QMenu* opened = menu();
+    if (!opened || opened->isVisible())
+        return;
+    opened->setMinimumWidth(width());
+    const int height = opened->sizeHint().height();
+    QPoint place = mapToGlobal(rect().bottomLeft() + QPoint(0, 1));
+    if (place.y() + height > screen()->availableGeometry().bottom())
+        place = mapToGlobal(QPoint(0, -height));
+    opened->setAttribute(Qt::WA_NoMouseReplay);
+    opened->winId();
+    opened->windowHandle()->setTransientParent(window()->windowHandle());
+    opened->popup(place);
+    setDown(true);
 }
 
 void FieldButton::SetFullText(const QString& text) {
@@ -76,7 +105,7 @@ void FieldButton::keyPressEvent(QKeyEvent* event) {
     case Qt::Key_Space:
     case Qt::Key_Enter:
     case Qt::Key_Return:
-        showMenu();
+        Open();
         break;
     default:
         QPushButton::keyPressEvent(event);
