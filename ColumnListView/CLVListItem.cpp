@@ -8,7 +8,10 @@
 CLVListItem::CLVListItem(uint32 outlineLevel, bool superitem, bool expanded, float minHeight)
     : BListItem(outlineLevel, expanded), superitem_(superitem), minHeight_(minHeight) {}
 
-CLVListItem::~CLVListItem() = default;
+CLVListItem::~CLVListItem() {
+    if (list_)
+        list_->RemoveItem(this);
+}
 
 void CLVListItem::DrawItem(BView* owner, BRect rowRect, bool complete) {
     if (!list_)

@@ -13,6 +13,7 @@ class CLVListItem : public BListItem {
     // outlineLevel: 0 at the top. superitem: has rows below it in the outline, and an arrow. expanded: these
     // are to be seen. minHeight is in points.
     CLVListItem(uint32 outlineLevel, bool superitem, bool expanded, float minHeight);
+    // Leaves the list, if it is in one.
     ~CLVListItem() override;
 
     // Has every shown column that overlaps owner's clipping region drawn, then the strip behind the last one.

@@ -110,6 +110,10 @@ ColumnListView::ColumnListView(BRect frame, BetterScrollView** container, const 
 }
 
 ColumnListView::~ColumnListView() {
+    FullListDoForEach([](CLVListItem* row) {
+        ReleaseRow(*row);
+        return false;
+    });
     while (!columns_.empty())
         columns_.pop_back();
 }
@@ -261,7 +265,7 @@ void ColumnListView::PlaceColumns() {
         displayOrder_[i]->end_ = layout_.places[i].end;
         displayOrder_[i]->pushed_ = layout_.places[i].pushed;
     }
-    SetDataWidth(layout_.end);
+    SetDataWidth(layout_.end + 1); // the content takes in the last column's edge
 }
 
 void ColumnListView::ColumnsChanged() {
