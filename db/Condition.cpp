@@ -300,7 +300,7 @@ bool Condition::Prepare(const COLUMN_ENTRY& column, int op, const char* value, b
         matcher_ = Matchers::OfTexts(op, exact, width_);
         return PrepareText(value, op == CompareOperator::Contains, exact);
     case ColumnType::Byte:
-        whole_ = static_cast<std::int8_t>(WholeNumber(value));
+        whole_ = std::int32_t{static_cast<std::int8_t>(WholeNumber(value))};
         matcher_ = Matchers::OfNumbers<ByteField>(op);
         break;
     case ColumnType::Short:

@@ -5,7 +5,9 @@
 
 #include "db/Condition.h"
 #include "db/DataFile.h"
+#include "db/DatesTimes.h"
 #include "db/Errors.h"
+#include "db/FieldChange.h"
 #include "db/File.h"
 #include "db/ReadCache.h"
 #include "db/RecordTypes.h"
@@ -168,6 +170,47 @@ class DATABASE {
         return CompareValues(op, field, value);
     }
 
+    // Set statements
+
+    /// Changes one column of every record in the result set by a set statement such as "Shares * 2"; without
+    /// a set, or with no query since the last reset, of all active records. A value for a date or time is a
+    /// packed number. Returns the number of records rewritten; each loses its lock, the last one becomes
+    /// current, and the set stays as it is. -1 on failure: 2201 empty statement or unknown operator, 2202
+    /// column, 2203 strings can only be set, 2204 memory, 2205 statement; then nothing has changed. 2206 read
+    /// error, 1309 write error: records before that stay changed, every record is whole.
+    long QueryUpdate(const char* statement);
+    /// Applies a SetOperator to a number in place; integers wrap, and dividing one by 0 leaves it as it is.
+    /// Any other operator changes nothing.
+    template <class T>
+    void QueryUpdateFunction(int op, T* field, T value) const {
+        ChangeNumber(op, field, value);
+    }
+    /// Apply =, + or - to a date or time part by part, the parts of the packed value being its bytes. There
+    /// is no carry; any other operator changes nothing.
+    void QueryUpdateDateFunction(int op, dbDATE* field, const long* value) const;
+    void QueryUpdateTimeFunction(int op, dbTIME* field, const long* value) const;
+
+    // Dates and times; none of these touches the file
+
+    /// Brings an out-of-range month into 1 to 12, then a day outside its month by one month into range.
+    void MakeDateValid(dbDATE* date) const;
+    /// Carries seconds and minutes, and moves an hour outside 0 to 23 by one day.
+    void MakeTimeValid(dbTIME* time) const;
+    /// Writes a date to `out`, which has FormattedDateSize bytes: style 1 "Jan 05, 1999", 2 "January 05,
+    /// 1999", 3 "01-05-1999"; "Invalid date" without a day or month. Other styles write nothing.
+    void GetFormattedDateString(const dbDATE* date, char* out, int style) const;
+    /// Writes a time as "09:05:07" to `out`, which has FormattedTimeSize bytes; on a 12-hour clock unless the
+    /// style is 2.
+    void GetFormattedTimeString(const dbTIME* time, char* out, int style) const;
+    /// Today's date and the time of day, local.
+    void SetToCurrentDate(dbDATE* date) const;
+    void SetToCurrentTime(dbTIME* time) const;
+    /// 0 when equal, 1 when `a` is later, -1 when it is earlier.
+    [[nodiscard]] int CompareDates(const dbDATE* a, const dbDATE* b) const;
+    [[nodiscard]] int CompareTimes(const dbTIME* a, const dbTIME* b) const;
+    /// Copies a time with its hour on a 12-hour clock: 13 to 23 become 1 to 11, 0 becomes 12.
+    void ConvertTo12HourTime(const dbTIME* in, dbTIME* out) const;
+
     // Compaction
 
     /// Rewrites the file without its deleted records, through a temporary file (extension .new) and a backup
@@ -216,6 +259,14 @@ class DATABASE {
     [[nodiscard]] int RunQuery(const Condition& condition, int mode);
     void MergeMatches(const Condition& condition, int mode, std::int32_t first, std::int32_t count,
                       const std::uint8_t* records);
+
+    // Set statements
+    [[nodiscard]] int PrepareChange(const char* statement, FieldChange* change) const;
+    [[nodiscard]] int ChangeRecords(const FieldChange& change, long* changed);
+    [[nodiscard]] static std::size_t RunLength(const ReadCache& reader, const std::int32_t* numbers,
+                                               std::size_t most);
+    [[nodiscard]] bool ChangeRun(const FieldChange& change, ReadCache& reader, std::int32_t first,
+                                 std::size_t count, std::uint8_t* before);
 
     // Compaction
     [[nodiscard]] int WriteCompacted(File& target);

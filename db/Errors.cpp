@@ -65,6 +65,7 @@ constexpr Entry ErrorMessages[] = {
     {2203, "QueryUpdate error - can only SET strings"},
     {2204, "QueryUpdate error - out of memory"},
     {2205, "QueryUpdate error - invalid statement"},
+    {2206, "QueryUpdate error - unable to read records"},
     {2301, "Lock error - record is deleted"},
     {2302, "Lock error - invalid record number"},
     {2303, "Lock error - record is already locked"},

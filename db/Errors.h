@@ -67,6 +67,7 @@ enum Code : int {
     SetStringsOnly = 2203,
     SetNoMemory = 2204,
     SetInvalidStatement = 2205,
+    SetReadFailed = 2206,
 
     LockDeleted = 2301,
     LockInvalidRecord = 2302,

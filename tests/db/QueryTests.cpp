@@ -29,7 +29,7 @@ class QueryTest : public testing::Test {
     Numbers Find(const char* statement, int mode = QueryMode::New) {
         const long count = database_.Query(statement, mode);
         EXPECT_GE(count, 0) << statement;
-        const Numbers found = Walked(database_);
+        Numbers found = Walked(database_);
         EXPECT_EQ(count, static_cast<long>(found.size())) << statement;
         return found;
     }

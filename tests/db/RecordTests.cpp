@@ -262,7 +262,7 @@ void CompareWithModel(DATABASE& database, const MODEL& model) {
         ROW got{};
         ASSERT_EQ(database.Read(static_cast<long>(i), &got), model.records[i].deleted ? -1 : 1);
         if (!model.records[i].deleted) {
-            ASSERT_EQ(std::memcmp(&got, &model.records[i].row, sizeof(got)), 0) << i;
+            ASSERT_EQ(BytesOf(got), BytesOf(model.records[i].row)) << i;
         }
     }
     ASSERT_EQ(database.QueryReset(), static_cast<long>(model.Active().size()));

@@ -53,6 +53,10 @@ inline int CreateRows(DATABASE& database, const std::string& path) {
     return database.Create(path.c_str(), "rows", static_cast<int>(columns.size()), columns.data());
 }
 
+inline std::string BytesOf(const ROW& row) {
+    return {reinterpret_cast<const char*>(&row), sizeof(row)};
+}
+
 // What can be read of a file: the records' bytes, nothing where one is deleted.
 using CONTENT = std::vector<std::optional<std::string>>;
 

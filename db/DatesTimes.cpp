@@ -1,0 +1,147 @@
+#include "db/DatesTimes.h"
+
+#include <array>
+#include <compare>
+#include <cstdio>
+#include <ctime>
+#include <tuple>
+
+#include "db/Database.h"
+#include "util/Dates.h"
+
+namespace {
+
+constexpr int MonthsPerYear = 12;
+constexpr int SecondsPerMinute = 60;
+constexpr int MinutesPerHour = 60;
+constexpr int HoursPerDay = 24;
+constexpr int February = 2;
+
+constexpr std::array<const char*, MonthsPerYear> ShortMonths = {"Jan", "Feb", "Mar", "Apr", "May", "Jun",
+                                                                "Jul", "Aug", "Sep", "Oct", "Nov", "Dec"};
+constexpr std::array<const char*, MonthsPerYear> LongMonths = {
+    "January", "February", "March",     "April",   "May",      "June",
+    "July",    "August",   "September", "October", "November", "December"};
+
+struct DIVISION {
+    int quotient; // rounded down
+    int rest;     // 0 or above
+};
+
+constexpr DIVISION DivideDown(int number, int divisor) {
+    const int rest = (number % divisor + divisor) % divisor;
+    return {(number - rest) / divisor, rest};
+}
+
+int MonthLength(int year, int month) {
+    constexpr std::array<int, MonthsPerYear> lengths = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
+    const int length = lengths[static_cast<std::size_t>(month - 1)];
+    return month == February && IsLeapYear(year) != 0 ? length + 1 : length;
+}
+
+// Carries what is too much for one part of a time into the next.
+void Carry(std::int8_t* part, std::int8_t* next, int perNext) {
+    const auto [quotient, rest] = DivideDown(*part, perNext);
+    *part = static_cast<std::int8_t>(rest);
+    *next = static_cast<std::int8_t>(*next + quotient);
+}
+
+void CarryMonth(dbDATE* date) {
+    const auto [years, month] = DivideDown(date->month - 1, MonthsPerYear);
+    date->year = static_cast<std::int16_t>(date->year + years);
+    date->month = static_cast<std::int8_t>(month + 1);
+}
+
+int Sign(std::strong_ordering order) {
+    return order < 0 ? -1 : (order > 0 ? 1 : 0);
+}
+
+} // namespace
+
+void NormaliseDate(dbDATE* date) {
+    CarryMonth(date);
+    const int length = MonthLength(date->year, date->month);
+    if (date->day > length) {
+        date->day = static_cast<std::int8_t>(date->day - length);
+        ++date->month;
+        CarryMonth(date);
+    } else if (date->day < 1) {
+        --date->month;
+        CarryMonth(date);
+        date->day = static_cast<std::int8_t>(date->day + MonthLength(date->year, date->month));
+    }
+}
+
+void NormaliseTime(dbTIME* time) {
+    Carry(&time->second, &time->minute, SecondsPerMinute);
+    Carry(&time->minute, &time->hour, MinutesPerHour);
+    if (time->hour >= HoursPerDay) {
+        time->hour = static_cast<std::int8_t>(time->hour - HoursPerDay);
+    } else if (time->hour < 0) {
+        time->hour = static_cast<std::int8_t>(time->hour + HoursPerDay);
+    }
+}
+
+void DATABASE::MakeDateValid(dbDATE* date) const {
+    NormaliseDate(date);
+}
+
+void DATABASE::MakeTimeValid(dbTIME* time) const {
+    NormaliseTime(time);
+}
+
+void DATABASE::GetFormattedDateString(const dbDATE* date, char* out, int style) const {
+    if (style < 1 || style > 3) {
+        return;
+    }
+    if (date->month < 1 || date->day < 1 || (style != 3 && date->month > MonthsPerYear)) {
+        std::snprintf(out, FormattedDateSize, "Invalid date");
+    } else if (style == 3) {
+        std::snprintf(out, FormattedDateSize, "%02d-%02d-%d", date->month, date->day, date->year);
+    } else {
+        const auto& names = style == 1 ? ShortMonths : LongMonths;
+        const char* name = names[static_cast<std::size_t>(date->month - 1)];
+        std::snprintf(out, FormattedDateSize, "%s %02d, %d", name, date->day, date->year);
+    }
+}
+
+void DATABASE::GetFormattedTimeString(const dbTIME* time, char* out, int style) const {
+    dbTIME shown = *time;
+    if (style != 2) {
+        ConvertTo12HourTime(time, &shown);
+    }
+    std::snprintf(out, FormattedTimeSize, "%.2d:%.2d:%.2d", shown.hour, shown.minute, shown.second);
+}
+
+void DATABASE::SetToCurrentDate(dbDATE* date) const {
+    int year = 0;
+    int month = 0;
+    int day = 0;
+    GetDate(&year, &month, &day);
+    *date = {static_cast<std::int8_t>(day), static_cast<std::int8_t>(month), static_cast<std::int16_t>(year)};
+}
+
+void DATABASE::SetToCurrentTime(dbTIME* time) const {
+    const std::time_t now = std::time(nullptr);
+    std::tm local{};
+    localtime_r(&now, &local);
+    *time = {static_cast<std::int8_t>(local.tm_sec), static_cast<std::int8_t>(local.tm_min),
+             static_cast<std::int8_t>(local.tm_hour)};
+}
+
+int DATABASE::CompareDates(const dbDATE* a, const dbDATE* b) const {
+    return Sign(std::tie(a->year, a->month, a->day) <=> std::tie(b->year, b->month, b->day));
+}
+
+int DATABASE::CompareTimes(const dbTIME* a, const dbTIME* b) const {
+    return Sign(std::tie(a->hour, a->minute, a->second) <=> std::tie(b->hour, b->minute, b->second));
+}
+
+void DATABASE::ConvertTo12HourTime(const dbTIME* in, dbTIME* out) const {
+    *out = *in;
+    if (in->hour > 12 && in->hour < HoursPerDay) {
+        out->hour = static_cast<std::int8_t>(in->hour - 12);
+    } else if (in->hour == 0) {
+        out->hour = 12;
+    }
+}
