@@ -169,9 +169,10 @@ void BWindow::Show() {
     WindowWidget* widget = peer_->widget;
     if (!peer_->shownBefore) {
         AssignMnemonics(widget);
-        if (const QWidget* active = peer_->modal ? QApplication::activeWindow() : nullptr) {
+        peer_->activeBefore = peer_->modal ? QApplication::activeWindow() : nullptr;
+        if (peer_->activeBefore) {
             widget->winId(); // a modal window stays above the one it belongs to
-            widget->windowHandle()->setTransientParent(active->windowHandle());
+            widget->windowHandle()->setTransientParent(peer_->activeBefore->windowHandle());
         }
     }
     widget->show();
@@ -209,7 +210,8 @@ void BWindow::UpdateIfNeeded() {
 void BWindow::FrameResized(float, float) {}
 
 void BWindow::Quit() {
-    peer_->widget->hide();
+    if (!IsHidden())
+        Hide();
     BLooper::Quit();
 }
 

@@ -8,8 +8,10 @@
 #include <thread>
 #include <vector>
 
+#include <QApplication>
 #include <QDialog>
 #include <QEventLoop>
+#include <QPointer>
 #include <QTimer>
 
 #include "platform/Kernel.h"
@@ -151,11 +153,15 @@ int RunDialog(QDialog& dialog, const std::function<bool()>& cancelled) {
         });
         poll.start(kCancelPollMilliseconds);
     }
+    // Not every window manager gives the keyboard back to where it was.
+    const QPointer<QWidget> before = QApplication::activeWindow();
     gOpenDialogs.push_back(&dialog);
     gWaitDepth++;
     const int result = dialog.exec();
     gWaitDepth--;
     gOpenDialogs.pop_back();
+    if (before)
+        before->activateWindow();
     return result;
 }
 

@@ -29,6 +29,7 @@ struct WindowPeer {
     WindowPeer& operator=(const WindowPeer&) = delete;
 
     QPointer<WindowWidget> widget;
+    QPointer<QWidget> activeBefore; // for a modal window: where the keyboard was
     BButton* defaultButton = nullptr;
     bool modal = false;
     bool resizable = true;
