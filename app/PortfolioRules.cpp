@@ -21,14 +21,19 @@ bool HasLayout(DATABASE& database, std::string_view firstColumn, std::size_t lea
            column.size == NameSize && data >= leastData && data <= mostData;
 }
 
+// What a statement may hold at most, its NUL included.
+constexpr std::size_t StatementSize = 128;
+
+// "column = name"; false for a name that no statement can hold. The language ends a value at a tab or a line
+// end, and would go on with another portfolio.
+bool MakeStatement(char (&statement)[StatementSize], const char* column, const char* name) {
+    return *name != '\0' && !std::strpbrk(name, "\t\r\n") &&
+           FormatInto(statement, sizeof statement, "%s = %s", column, name);
+}
+
 long Select(DATABASE& database, const char* column, const char* name) {
-    // The query language ends a value at such a character, and would select another portfolio.
-    if (*name == '\0' || std::strpbrk(name, "\t\r\n"))
-        return 0;
-    char statement[128];
-    if (!FormatInto(statement, sizeof statement, "%s = %s", column, name))
-        return 0;
-    return database.Query(statement, QueryMode::New);
+    char statement[StatementSize];
+    return MakeStatement(statement, column, name) ? database.Query(statement, QueryMode::New) : 0;
 }
 
 // Deletes the records of the result set. The walk comes first: reading between two deletions would read the
@@ -64,6 +69,10 @@ long SelectInvestments(DATABASE& investments, const char* portfolio) {
     return Select(investments, "Portfolio", portfolio);
 }
 
+long SelectCategory(DATABASE& categories, const char* category) {
+    return Select(categories, "Category", category);
+}
+
 bool ReadInvestment(DATABASE& investments, long recordNumber, INVESTMENT_DATA* record) {
     *record = {};
     return investments.Read(recordNumber, record) == 1;
@@ -74,6 +83,28 @@ float TotalValue(DATABASE& investments, const char* portfolio) {
     ForEachInvestment(investments, portfolio,
                       [&](const INVESTMENT_DATA& record, long) { total += record.Value; });
     return total;
+}
+
+void AddPortfolio(DATABASE& portfolios, const char* name) {
+    PORTFOLIO_DATA record;
+    CopyTextZeroed(record.Name, name);
+    portfolios.Append(&record);
+}
+
+bool RenamePortfolio(DATABASE& portfolios, DATABASE& investments, const char* oldName, const char* newName) {
+    if (SelectPortfolios(portfolios, oldName) <= 0)
+        return false;
+    long number = 0;
+    PORTFOLIO_DATA record;
+    if (!portfolios.QueryGetFirst(&number) || portfolios.Read(number, &record) != 1)
+        return false;
+    CopyTextZeroed(record.Name, newName);
+    if (portfolios.Update(&record) != 0)
+        return false;
+    char statement[StatementSize];
+    if (SelectInvestments(investments, oldName) > 0 && MakeStatement(statement, "Portfolio", newName))
+        investments.QueryUpdate(statement);
+    return true;
 }
 
 void DeletePortfolio(DATABASE& portfolios, DATABASE& investments, const char* name) {

@@ -3,9 +3,11 @@
 #include <algorithm>
 #include <cstring>
 #include <span>
+#include <string>
 
 #include "app/RecordLayouts.h"
 #include "db/Database.h"
+#include "util/CharacterBuffer.h"
 
 // What the commands do to the data files, without a window. A portfolio is named by its name alone, in any
 // letter case. Results of single writes are not reported: after a failed one the file holds what it held.
@@ -22,6 +24,8 @@
 // (it is empty or has a tab or line end in it): then the result set is not to be walked.
 [[nodiscard]] long SelectPortfolios(DATABASE& portfolios, const char* name);
 [[nodiscard]] long SelectInvestments(DATABASE& investments, const char* portfolio);
+// The same for the entries of a pick list.
+[[nodiscard]] long SelectCategory(DATABASE& categories, const char* category);
 
 // Calls visit(const INVESTMENT_DATA&, long recordNumber) for each of the portfolio's investments in record
 // order. visit must not change the database. The result set is left on the portfolio.
@@ -47,6 +51,28 @@ void ForEachInvestment(DATABASE& investments, const char* portfolio, Visit visit
 // The sum of the Value of the portfolio's investments, added up in single precision in record order; 0 for
 // none. The result set is left on the portfolio, where the report finds it.
 [[nodiscard]] float TotalValue(DATABASE& investments, const char* portfolio);
+
+// Calls visit(const char* entry) for each entry of a pick list ("Type" or "Agent"), in file order.
+template <class Visit>
+void ForEachCategoryEntry(DATABASE& categories, const char* category, Visit visit) {
+    if (SelectCategory(categories, category) <= 0)
+        return;
+    for (const void* data = categories.QueryGetFirst(nullptr); data;
+         data = categories.QueryGetNext(nullptr)) {
+        CATEGORY_DATA record;
+        std::memcpy(&record, data, sizeof record);
+        visit(std::string(FieldText(record.Entry)).c_str());
+    }
+}
+
+// Adds a portfolio without investments. The name must be one that CheckPortfolioName accepts.
+void AddPortfolio(DATABASE& portfolios, const char* name);
+
+// Gives the portfolio and all its investments a new name. False, with nothing changed, when there is no
+// portfolio of the old name. The portfolio's own record changes first; each record is wholly old or wholly
+// new whenever the program is killed.
+[[nodiscard]] bool RenamePortfolio(DATABASE& portfolios, DATABASE& investments, const char* oldName,
+                                   const char* newName);
 
 // Deletes every portfolio record of that name and every investment of it.
 void DeletePortfolio(DATABASE& portfolios, DATABASE& investments, const char* name);

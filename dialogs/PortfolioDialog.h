@@ -1,0 +1,35 @@
+#pragma once
+
+#include "app/RecordLayouts.h"
+#include "dialogs/BDialog.h"
+
+class BTextControl;
+class DATABASE;
+
+// What a portfolio's name may turn out to be.
+enum class PortfolioNameCheck { Accepted, Empty, Taken };
+
+// Whether a portfolio may have this name: not an empty one, and none that a portfolio has in any letter case.
+// Replaces the database's result set.
+[[nodiscard]] PortfolioNameCheck CheckPortfolioName(DATABASE& portfolios, const char* name);
+
+// Asks for a portfolio's name: one field, which cannot grow beyond what a record holds. It writes nothing to
+// the database; the caller adds or renames when the dialog has ended with DialogOk.
+class PortfolioDialog : public BDialog {
+  public:
+    int OnOK() override = 0;
+
+  protected:
+    // The left top is in screen coordinates. name holds the first text and receives the accepted one; it and
+    // the database must last until DoModal returns.
+    PortfolioDialog(float x, float y, const char* title, char (&name)[NameSize], DATABASE* portfolios,
+                    uint16 flags);
+
+    // Hands the typed name to the caller and returns 1, or tells the person why not and returns 0.
+    int AcceptName();
+
+  private:
+    DATABASE* portfolios_;
+    char (&name_)[NameSize];
+    BTextControl* nameControl_;
+};

@@ -1,0 +1,228 @@
+// The dialogs for portfolios and investments, worked by keyboard and mouse on real data files.
+#include "Driver.h"
+
+#include <limits>
+
+#include <QCheckBox>
+#include <QLineEdit>
+#include <QMenu>
+#include <QPushButton>
+
+#include "DataFolder.h"
+#include "app/AppState.h"
+#include "app/PortfolioRules.h"
+#include "dialogs/InvestmentDialog.h"
+#include "dialogs/InvestmentInput.h"
+#include "dialogs/PortfolioAddDialog.h"
+#include "dialogs/PortfolioEditDialog.h"
+#include "util/Dates.h"
+
+namespace {
+
+constexpr uint16 Both = DialogHasOk | DialogHasCancel;
+
+void TypeInto(QWidget* field, const char* text) {
+    for (const QChar letter : QString::fromUtf8(text))
+        QTest::sendKeyEvent(QTest::Click, field, Qt::Key_unknown, QString(letter), Qt::NoModifier);
+}
+
+// Types over the whole of the field that has the focus.
+void TypeOver(const char* text) {
+    auto* field = qobject_cast<QLineEdit*>(QApplication::focusWidget());
+    ASSERT_TRUE(field);
+    field->selectAll();
+    QTest::keyClick(field, Qt::Key_Backspace);
+    TypeInto(field, text);
+}
+
+void Key(Qt::Key key) {
+    QTest::keyClick(QApplication::focusWidget(), key);
+}
+
+class FormTest : public testing::Test {
+  protected:
+    FormTest() {
+        state_.portfolios = std::make_unique<DATABASE>(folder_.File("portfol.db").c_str());
+        state_.categories = std::make_unique<DATABASE>(folder_.File("misc.db").c_str());
+        app_state = &state_;
+    }
+    ~FormTest() override { app_state = nullptr; }
+
+    void AddEntry(const char* category, const char* text) const {
+        CATEGORY_DATA record{};
+        CopyText(record.Category, category);
+        CopyText(record.Entry, text);
+        state_.categories->Append(&record);
+    }
+
+    BApplication application_{"test"};
+    DataFolder folder_;
+    AppState state_;
+};
+
+Driver::Condition FocusIn(const char* title) {
+    return [title] {
+        return QApplication::activeModalWidget() == Driver::Window(title) && Driver::Window(title) &&
+               qobject_cast<QLineEdit*>(QApplication::focusWidget());
+    };
+}
+
+TEST_F(FormTest, APortfolioNameIsNewAndFitsItsRecord) {
+    AddPortfolio(*state_.portfolios, "growth");
+    char name[NameSize] = "";
+    Driver driver;
+    const char* title = "Add a Portfolio";
+    driver.When("the empty form", FocusIn(title), [] { Key(Qt::Key_Return); })
+        .Answer("Invalid portfolio name!", "Ok")
+        .When("a taken name", FocusIn(title),
+              [] {
+                  TypeOver("Growth");
+                  Key(Qt::Key_Return);
+              })
+        .Answer("Portfolio name already exists!", "Ok")
+        .When("a long name", FocusIn(title), [] {
+            TypeOver("Growth Fund 0123456789012345678\xC3\xBC");
+            Key(Qt::Key_Return);
+        });
+    EXPECT_EQ((new PortfolioAddDialog(50, 50, title, name, state_.portfolios.get()))->DoModal(), DialogOk);
+    EXPECT_STREQ(name, "Growth Fund 0123456789012345678");
+
+    char present[NameSize] = "growth";
+    driver.When("unchanged", FocusIn("Edit Portfolio"), [] { Key(Qt::Key_Return); })
+        .Answer("Portfolio name already exists!", "Ok")
+        .When("cancelled", FocusIn("Edit Portfolio"), [] {
+            TypeOver("Else");
+            Key(Qt::Key_Escape);
+        });
+    EXPECT_EQ(
+        (new PortfolioEditDialog(50, 50, "Edit Portfolio", present, state_.portfolios.get()))->DoModal(),
+        DialogCancel);
+    EXPECT_STREQ(present, "growth");
+}
+
+TEST_F(FormTest, AnInvestmentIsEnteredByKeyboardAlone) {
+    AddEntry("Type", "Stock");
+    AddEntry("Agent", "Bank");
+    AddEntry("Type", "Fund");
+    INVESTMENT_DATA record{};
+    Driver driver;
+    const char* title = "Add an Investment";
+    driver.When("no name", FocusIn(title), [] { Key(Qt::Key_Return); })
+        .Answer("You must enter a Name!", "Ok")
+        .When("the form", FocusIn(title),
+              [] {
+                  TypeOver("M\xC3\xBCller & Co");
+                  for (const char* text : {"LONGTICKER", "my type"}) {
+                      Key(Qt::Key_Tab);
+                      TypeOver(text);
+                  }
+                  Key(Qt::Key_Tab); // to the types, left alone
+                  for (const char* text : {"1e39", "10"}) {
+                      Key(Qt::Key_Tab);
+                      TypeOver(text);
+                  }
+                  Key(Qt::Key_Return);
+              })
+        .Answer("Shares or price is too large!", "Ok")
+        .When("corrected", FocusIn(title), [title] {
+            Driver::Window(title)->findChild<QLineEdit*>("shares control")->setFocus();
+            TypeOver("2.5 and more");
+            auto* retirement = Driver::Window(title)->findChild<QCheckBox*>("retirement check");
+            retirement->setFocus();
+            Key(Qt::Key_Space);
+            Key(Qt::Key_Return);
+        });
+    EXPECT_EQ((new InvestmentDialog(50, 50, title, &record, Both))->DoModal(), DialogOk);
+    EXPECT_STREQ(record.Name, "M\xC3\xBCller & Co");
+    EXPECT_STREQ(record.Ticker, "LONGTIC");
+    EXPECT_STREQ(record.Type, "my type");
+    EXPECT_STREQ(record.Risk, "Med");
+    EXPECT_STREQ(record.Agent, "");
+    EXPECT_EQ(record.Shares, 2.5F);
+    EXPECT_EQ(record.Price, 10.F);
+    EXPECT_EQ(record.Value, 25.F);
+    EXPECT_EQ(record.Retire, 1);
+    EXPECT_STREQ(record.Portfolio, "");
+}
+
+TEST_F(FormTest, TheFormShowsTheRecordAndPickListsFillTheirFields) {
+    for (const char* type : {"Stock", "Fund"})
+        AddEntry("Type", type);
+    for (const char* agent : {"Bank", "Broker"})
+        AddEntry("Agent", agent);
+    INVESTMENT_DATA record = MakeInvestment("P", "Acme", 12.5F, 3, "stock");
+    CopyText(record.Risk, "High");
+    CopyText(record.Agent, "Broker");
+    record.QuoteError = 1;
+    const char* title = "Edit this Investment";
+    std::vector<std::string> shown;
+    Driver driver;
+    const auto field = [title](const char* name) {
+        return Driver::Window(title)->findChild<QLineEdit*>(name);
+    };
+    driver.When("the form", FocusIn(title), [&] {
+        for (const char* name : {"name control", "ticker control", "type control", "shares control",
+                                 "price control", "agent control"})
+            shown.push_back(field(name)->text().toStdString());
+        for (const QPushButton* button : Driver::Window(title)->findChildren<QPushButton*>())
+            if (button->menu())
+                for (QAction* action : button->menu()->actions())
+                    if (action->isChecked())
+                        shown.push_back(action->objectName().toStdString());
+        for (const QPushButton* button : Driver::Window(title)->findChildren<QPushButton*>())
+            if (button->menu() && button->menu()->actions().back()->objectName() == "Fund")
+                button->menu()->actions().back()->trigger();
+    });
+    driver.When(
+        "the picked type", [&] { return Driver::Window(title) && field("type control")->text() == "Fund"; },
+        [] { Key(Qt::Key_Return); });
+    EXPECT_EQ((new InvestmentDialog(50, 50, title, &record, Both))->DoModal(), DialogOk);
+    // No type is "stock" to the letter, so the first one stays marked.
+    EXPECT_EQ(shown, (std::vector<std::string>{"Acme", "TICK", "stock", "12.500", "3.00", "Broker", "Stock",
+                                               "High", "Broker"}));
+    EXPECT_STREQ(record.Type, "Fund");
+    EXPECT_STREQ(record.Portfolio, "P");
+    EXPECT_EQ(record.PrevPrice, NoPreviousPrice);
+    EXPECT_EQ(record.QuoteError, 1);
+}
+
+TEST(InvestmentInput, AmountsAreNumbersARecordCanHold) {
+    const struct {
+        const char* shares;
+        const char* price;
+        InvestmentCheck check;
+        float value;
+    } cases[] = {
+        {"12.5", "2", InvestmentCheck::Accepted, 25},   {"abc", "10", InvestmentCheck::Accepted, 0},
+        {"inf", "nan", InvestmentCheck::Accepted, 0},   {"", "3", InvestmentCheck::Accepted, 0},
+        {" -2x", "1.5", InvestmentCheck::Accepted, -3}, {"1e-60", "1e30", InvestmentCheck::Accepted, 0},
+        {"1e39", "1", InvestmentCheck::TooLarge, 7},    {"1", "-1e999", InvestmentCheck::TooLarge, 7},
+        {"1e30", "1e30", InvestmentCheck::TooLarge, 7},
+    };
+    for (const auto& each : cases) {
+        INVESTMENT_DATA record{};
+        record.Value = 7;
+        InvestmentInput input;
+        input.name = "N";
+        input.shares = each.shares;
+        input.price = each.price;
+        EXPECT_EQ(FillInvestment(input, &record), each.check) << each.shares;
+        EXPECT_EQ(record.Value, each.value) << each.shares;
+    }
+}
+
+TEST(InvestmentInput, TextsAreCutToTheirFieldsBetweenWholeCharacters) {
+    INVESTMENT_DATA record = MakeInvestment("P", "old");
+    InvestmentInput input;
+    input.name = std::string(30, 'n') + "\xC3\xBC";
+    input.ticker = "TICKERS1";
+    EXPECT_EQ(FillInvestment(input, &record), InvestmentCheck::Accepted);
+    EXPECT_EQ(record.Name, std::string(30, 'n'));
+    EXPECT_STREQ(record.Ticker, "TICKERS");
+    EXPECT_STREQ(record.Risk, "Med") << "no choice leaves the risk as it was";
+    int year = 0;
+    GetDate(&year, nullptr, nullptr);
+    EXPECT_EQ(record.Date.year, year);
+}
+
+} // namespace
