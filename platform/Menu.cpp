@@ -37,6 +37,7 @@ bool BMenu::AddItem(BMenuItem* item, int32 index) {
     items_.emplace(items_.begin() + index, item);
     item->menu_ = this;
     QAction* action = item->peer_->action;
+    item->peer_->SetHost(peer_->host);
     peer_->host->insertAction(next ? next->peer_->action : nullptr, action);
     if (radioMode_ && !action->isSeparator()) {
         action->setCheckable(true);
@@ -66,6 +67,7 @@ BMenuItem* BMenu::RemoveItem(int32 index) {
     peer_->radioLook.removeAction(action);
     if (peer_->host)
         peer_->host->removeAction(action);
+    item->peer_->SetHost(nullptr);
     item->menu_ = nullptr;
     [[maybe_unused]] const BMenuItem* released = items_[static_cast<std::size_t>(index)].release();
     items_.erase(items_.begin() + index);

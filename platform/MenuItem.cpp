@@ -23,8 +23,6 @@ QKeySequence Shortcut(char letter, uint32 modifierKeys) {
 
 BMenuItem::BMenuItem(const char* label, BMessage* message, char shortcut, uint32 modifierKeys)
     : BInvoker(message, nullptr), peer_(std::make_unique<MenuItemPeer>()) {
-    peer_->own = std::make_unique<QAction>();
-    peer_->action = peer_->own.get();
     peer_->action->setShortcut(Shortcut(shortcut, modifierKeys));
     peer_->action->setMenuRole(QAction::NoRole);
     SetLabel(label);
@@ -33,8 +31,9 @@ BMenuItem::BMenuItem(const char* label, BMessage* message, char shortcut, uint32
 }
 
 BMenuItem::BMenuItem(BMenu* submenu)
-    : BInvoker(nullptr, nullptr), submenu_(submenu), peer_(std::make_unique<MenuItemPeer>()) {
-    peer_->action = MenuAccess::Peer(*submenu).menu->menuAction();
+    : BInvoker(nullptr, nullptr),
+      submenu_(submenu),
+      peer_(std::make_unique<MenuItemPeer>(MenuAccess::Peer(*submenu).menu->menuAction())) {
     MenuAccess::Peer(*submenu).superitem = this;
     SetLabel(submenu->Name());
 }

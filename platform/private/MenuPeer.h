@@ -29,10 +29,25 @@ struct MenuPeer {
     bool hasTarget = false;
 };
 
-// An item's peer. An ordinary item owns its action; one that opens a submenu uses the submenu's.
+// An item's peer. An ordinary item owns its action, which is a child of the widget that shows it; one that
+// opens a submenu uses the submenu's.
 struct MenuItemPeer {
-    std::unique_ptr<QAction> own;
+    MenuItemPeer() : action(new QAction), own(true) {}
+    explicit MenuItemPeer(QAction* submenu) : action(submenu), own(false) {}
+    ~MenuItemPeer() {
+        if (own)
+            delete action;
+    }
+    MenuItemPeer(const MenuItemPeer&) = delete;
+    MenuItemPeer& operator=(const MenuItemPeer&) = delete;
+
+    void SetHost(QWidget* host) {
+        if (own)
+            action->setParent(host);
+    }
+
     QPointer<QAction> action;
+    const bool own;
     bool marked = false;
 };
 

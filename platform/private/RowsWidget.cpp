@@ -171,8 +171,10 @@ void RowsWidget::DrawRow(QPainter& painter, int32 index, const QRect& place, boo
     if (!row)
         return;
     const BPoint offset = Offset();
-    BRect frame = FromQt(QRectF(place));
-    frame.OffsetBy(offset.x, offset.y);
+    // The toolkit cuts the place to what it takes for the rows' width.
+    const auto top = static_cast<float>(place.top()) + offset.y;
+    const BRect frame(0, top, static_cast<float>(ContentWidth() - 1),
+                      top + static_cast<float>(place.height() - 1));
     painter.save();
     painter.translate(-offset.x, -offset.y);
     {

@@ -1,0 +1,228 @@
+// Menu bars, pop-up fields and alerts, opened and worked as a person does.
+#include <QAction>
+#include <QMenu>
+#include <QMenuBar>
+#include <QMessageBox>
+#include <QPushButton>
+
+#include "Driver.h"
+#include "Stage.h"
+#include "platform/Alert.h"
+#include "platform/Kernel.h"
+#include "platform/MenuBar.h"
+#include "platform/MenuField.h"
+#include "platform/TextControl.h"
+
+using Codes = std::vector<uint32>;
+
+namespace {
+
+QMenu* OpenMenu() {
+    EXPECT_TRUE(QTest::qWaitFor([] { return QApplication::activePopupWidget() != nullptr; }));
+    return qobject_cast<QMenu*>(QApplication::activePopupWidget());
+}
+
+// Two items, the second one marked.
+BPopUpMenu* Portfolios() {
+    auto* menu = new BPopUpMenu("        ");
+    menu->AddItem(new BMenuItem("First", new BMessage(1)));
+    auto* second = new BMenuItem("Second & last", new BMessage(2));
+    second->SetMarked(true);
+    menu->AddItem(second);
+    return menu;
+}
+
+class Looper : public BLooper {
+  public:
+    void MessageReceived(BMessage* message) override { last = message->what; }
+    uint32 last = 0;
+};
+
+} // namespace
+
+TEST(MenuBars, AskTheirWindowAndSendToTheItemsTarget) {
+    Stage stage;
+    auto* looper = new Looper;
+    auto* file = new BMenu("File");
+    file->AddItem(new BMenuItem("Save & <b>go</b>", new BMessage(1)));
+    file->AddSeparatorItem();
+    auto* quit = new BMenuItem("Quit", new BMessage(2), 'Q');
+    quit->SetTarget(looper);
+    file->AddItem(quit);
+    auto* more = new BMenu("More");
+    more->AddItem(new BMenuItem("Deep", new BMessage(3)));
+    file->AddItem(more);
+    auto* bar = stage.Add(new BMenuBar(BRect(0, 0, 0, 0), "menu bar"));
+    const float emptyHeight = bar->Frame().Height();
+    bar->AddItem(file);
+    EXPECT_GT(bar->Frame().Height(), emptyHeight);
+    EXPECT_EQ(bar->Frame().Width(), 399);
+    EXPECT_EQ(bar->FindItem(3), more->ItemAt(0));
+    EXPECT_EQ(bar->FindItem("File")->Submenu(), file);
+    EXPECT_FALSE(file->AddItem(quit)); // is in a menu
+    stage.Show();
+
+    auto* widget = stage.Find<QMenuBar>("menu bar");
+    QTest::keyClick(stage.Toolkit(), Qt::Key_F, Qt::AltModifier);
+    QMenu* open = OpenMenu();
+    ASSERT_TRUE(open);
+    EXPECT_EQ(stage.window->menusBegun, 1);
+    EXPECT_EQ(widget->actions().first()->text(), "&File");
+    auto* first = open->findChild<QAction*>("Save & <b>go</b>");
+    ASSERT_TRUE(first);
+    EXPECT_EQ(first->text(), "&Save && <b>go</b>");
+    QTest::mouseClick(open, Qt::LeftButton, {}, open->actionGeometry(first).center());
+    EXPECT_EQ(stage.Received(1), Codes{1});
+
+    stage.Activate(); // the test platform takes the menu for the active window
+    QTest::keyClick(stage.Toolkit(), Qt::Key_Q, Qt::ControlModifier);
+    EXPECT_TRUE(QTest::qWaitFor([&] { return looper->last == 2; }));
+    file->SetTargetForItems(looper);
+    open->actions().last()->menu()->actions().first()->trigger();
+    EXPECT_TRUE(QTest::qWaitFor([&] { return looper->last == 3; }));
+    file->SetTargetForItems(nullptr);
+    file->ItemAt(0)->SetEnabled(false);
+    EXPECT_FALSE(first->isEnabled());
+    const std::unique_ptr<BMenuItem> removed(file->RemoveItem(0));
+    EXPECT_EQ(file->CountItems(), 3);
+    EXPECT_EQ(open->actions().size(), 3);
+    looper->Quit();
+}
+
+TEST(MenuFields, ShowTheMarkedItem) {
+    Stage stage;
+    auto* menu = Portfolios();
+    auto* field = stage.Add(new BMenuField(BRect(0, 20, 300, 22), "portfolio", "Portfolio:", menu));
+    field->SetDivider(80);
+    int changes = 0;
+    field->SetTextChangedHook([&] { changes++; });
+    stage.Show();
+    auto* button = stage.Find<QPushButton>("portfolio");
+    EXPECT_EQ(button->text(), "Second && last");
+    EXPECT_EQ(field->MenuItem(), menu->ItemAt(1));
+    EXPECT_LT(field->VisibleRight(), 300);
+    EXPECT_GT(field->VisibleRight(), 80 + field->StringWidth("Second & last"));
+    EXPECT_GE(field->Frame().Height(), QFontMetrics(QApplication::font()).height());
+
+    const float before = field->VisibleRight();
+    auto* longer = new BMenuItem("A portfolio that has a rather long name of its own", nullptr);
+    longer->SetMarked(true);
+    menu->AddItem(longer); // a marked item unmarks the others as it comes
+    EXPECT_FALSE(menu->ItemAt(1)->IsMarked());
+    EXPECT_EQ(changes, 1);
+    EXPECT_EQ(field->VisibleRight(), 300);
+    EXPECT_GT(field->VisibleRight(), before);
+    EXPECT_TRUE(button->text().startsWith("A p") && button->text().endsWith("own"))
+        << button->text().toStdString();
+    EXPECT_EQ(button->toolTip(), longer->Label());
+    longer->SetLabel("Short");
+    EXPECT_EQ(button->text(), "Short");
+    EXPECT_EQ(button->toolTip(), "");
+    EXPECT_EQ(button->accessibleName(), "Portfolio:");
+    EXPECT_EQ(button->accessibleDescription(), "Short");
+    delete menu->RemoveItem(2);
+    EXPECT_EQ(button->text(), "        "); // nothing is marked
+    EXPECT_EQ(changes, 3);
+}
+
+TEST(MenuFields, AreOpenedAndChosenFromByKeyAndPointer) {
+    Stage stage;
+    auto* menu = Portfolios();
+    auto* field = stage.Add(new BMenuField(BRect(0, 20, 300, 22), "portfolio", "Portfolio:", menu));
+    field->MakeFocus();
+    stage.Show();
+    EXPECT_TRUE(field->IsFocus());
+    auto* button = stage.Find<QPushButton>("portfolio");
+    for (const Qt::Key key : {Qt::Key_Down, Qt::Key_Up, Qt::Key_Space, Qt::Key_Return}) {
+        menu->ItemAt(1)->SetMarked(true);
+        QTest::keyClick(QApplication::focusWidget(), key);
+        QMenu* open = OpenMenu();
+        ASSERT_TRUE(open) << key;
+        EXPECT_TRUE(QTest::qWaitFor([&] { return open->activeAction() == open->actions()[1]; }));
+        QTest::keyClick(open, Qt::Key_Up);
+        QTest::keyClick(open, Qt::Key_Return);
+        EXPECT_TRUE(menu->ItemAt(0)->IsMarked());
+        EXPECT_FALSE(menu->ItemAt(1)->IsMarked());
+        EXPECT_EQ(button->text(), "First");
+        EXPECT_EQ(stage.Received(1), Codes{1});
+    }
+    QTest::mousePress(button, Qt::LeftButton);
+    QMenu* open = OpenMenu();
+    ASSERT_TRUE(open);
+    QTest::mouseClick(open, Qt::LeftButton, {}, open->actionGeometry(open->actions()[0]).center());
+    EXPECT_EQ(stage.Received(1), Codes{1}); // choosing the marked one again
+    EXPECT_TRUE(menu->ItemAt(0)->IsMarked());
+    field->SetEnabled(false);
+    QTest::mousePress(button, Qt::LeftButton);
+    EXPECT_EQ(QApplication::activePopupWidget(), nullptr);
+}
+
+TEST(MenuFields, WithoutRoomForATextShowAnArrowAndAreCalledAfterTheirNeighbour) {
+    Stage stage;
+    stage.Add(new BTextControl(BRect(10, 50, 279, 60), "type", "Type", "", nullptr));
+    stage.Add(new BMenuField(BRect(280, 48, 300, 60), "choices", "", Portfolios()));
+    stage.Show();
+    const auto* button = stage.Find<QPushButton>("choices");
+    EXPECT_EQ(button->geometry().left(), 0);
+    EXPECT_LE(button->width(), 21);
+    EXPECT_EQ(button->text(), "");
+    EXPECT_EQ(button->accessibleName(), "Type choices");
+}
+
+namespace {
+
+struct Asked {
+    const char* press; // a button's name; empty for Escape
+    int32 answer;
+};
+
+} // namespace
+
+TEST(Alerts, AnswerWithTheButtonPressed) {
+    const BApplication application("test");
+    for (const Asked& asked : {Asked{"Yes", 0}, Asked{"Perhaps", 1}, Asked{"No", 2}, Asked{"", 2}}) {
+        auto* alert =
+            new BAlert("", "Go <b>on</b> & on?", "Yes", "Perhaps", "No", B_WIDTH_AS_USUAL, B_STOP_ALERT);
+        Driver driver;
+        driver.When(
+            "alert", [] { return Driver::Alert() != nullptr; },
+            [&] {
+                const QMessageBox* box = Driver::Alert();
+                EXPECT_EQ(box->objectName(), "alert");
+                EXPECT_EQ(box->icon(), QMessageBox::Critical);
+                EXPECT_EQ(box->textFormat(), Qt::PlainText);
+                const auto place = [&](const char* name) { return box->findChild<QPushButton*>(name)->x(); };
+                EXPECT_LT(place("Yes"), place("Perhaps"));
+                EXPECT_LT(place("Perhaps"), place("No"));
+                EXPECT_TRUE(box->findChild<QPushButton*>("No")->isDefault());
+                if (*asked.press)
+                    Driver::Press(Driver::Alert(), asked.press);
+                else
+                    QTest::keyClick(Driver::Alert(), Qt::Key_Escape);
+            });
+        EXPECT_EQ(alert->Go(), asked.answer);
+    }
+}
+
+TEST(Alerts, BlockTheirCallerAloneAndEndWithItsStop) {
+    Stage stage;
+    stage.Show();
+    const auto ask = [](void*) { return (new BAlert("", "From a worker", "Yes", "No"))->Go(); };
+    const auto shown = [] { return Driver::Alert() != nullptr; };
+    const thread_id answered = spawn_thread(ask, "worker", B_NORMAL_PRIORITY, nullptr);
+    const thread_id stopped = spawn_thread(ask, "worker", B_NORMAL_PRIORITY, nullptr);
+    Driver driver;
+    driver.When("alert", shown, [&] { stage.window->PostMessage(5); });
+    driver.When(
+        "message", [&] { return !stage.window->received.empty(); },
+        [] { Driver::Press(Driver::Alert(), "Yes"); });
+    resume_thread(answered);
+    int32 answer = -1;
+    EXPECT_EQ(wait_for_thread(answered, &answer), B_OK);
+    EXPECT_EQ(answer, 0);
+    EXPECT_EQ(stage.Received(1), Codes{5});
+    bool ended = false;
+    driver.When("alert", shown, [&] { ended = kill_thread(stopped) == B_OK; });
+    resume_thread(stopped);
+    EXPECT_TRUE(QTest::qWaitFor([&] { return ended && !shown(); }));
+}

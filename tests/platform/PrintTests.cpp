@@ -1,0 +1,205 @@
+// Print jobs into PDF files, read back with a PDF reader.
+#include <array>
+#include <cstdio>
+#include <filesystem>
+#include <memory>
+
+#include <QDialog>
+#include <QImage>
+#include <QTimer>
+
+#include "Stage.h"
+#include "TemporaryFolder.h"
+#include "platform/PrintJob.h"
+#include "platform/StringView.h"
+
+namespace {
+
+// A view with a text at a known place and one further down.
+class Page : public BView {
+  public:
+    Page(BRect frame, const char* name) : BView(frame, name, B_FOLLOW_NONE, B_WILL_DRAW) {
+        BFont font;
+        font.SetSize(12);
+        SetFont(&font);
+    }
+    void Draw(BRect) override {
+        DrawString(Name(), BPoint(36, 72));
+        DrawString("Outside", BPoint(36, 700));
+    }
+};
+
+struct Job {
+    explicit Job(const std::string& file) : job("Quorvan") {
+        BMessage settings;
+        settings.AddString("page size", "A4");
+        settings.AddString("output file", file.c_str());
+        for (const char* margin : {"left margin", "top margin", "right margin", "bottom margin"})
+            settings.AddFloat(margin, 36);
+        job.SetSettings(&settings);
+    }
+    BPrintJob job;
+};
+
+std::string Output(const std::string& command) {
+    const std::unique_ptr<FILE, int (*)(FILE*)> pipe(popen(command.c_str(), "r"), pclose);
+    std::string output;
+    std::array<char, 4096> part;
+    while (pipe && std::fgets(part.data(), part.size(), pipe.get()))
+        output += part.data();
+    return output;
+}
+
+// Left and bottom edge of a word in the reader's list of words, in points from the sheet's left top.
+BPoint PlaceOf(const std::string& words, const std::string& word) {
+    const std::size_t end = words.find(">" + word + "<");
+    if (end == std::string::npos)
+        return {-1, -1};
+    const std::string tag = words.substr(words.rfind("<word", end), end);
+    BPoint place;
+    float top = 0;
+    float right = 0;
+    EXPECT_EQ(std::sscanf(tag.c_str(), "<word xMin=\"%f\" yMin=\"%f\" xMax=\"%f\" yMax=\"%f\"", &place.x,
+                          &top, &right, &place.y),
+              4);
+    return place;
+}
+
+} // namespace
+
+TEST(PrintJobs, DrawViewsAndControlsInPoints) {
+    Stage stage;
+    const TemporaryFolder folder;
+    const std::string file = folder.Path() + "/report.pdf";
+    auto* page = stage.Add(new Page(BRect(0, 0, 522, 769), "Report"));
+    page->Hide();
+    page->AddChild(new Page(BRect(100, 200, 300, 300), "Inner"));
+    auto* hidden = new Page(BRect(100, 300, 300, 400), "Hidden");
+    hidden->Hide();
+    page->AddChild(hidden);
+    page->AddChild(new BStringView(BRect(100, 500, 300, 520), "control", "Control"));
+    Job job(file);
+    EXPECT_FALSE(job.job.CanContinue());
+    ASSERT_TRUE(job.job.BeginJob());
+    EXPECT_TRUE(job.job.CanContinue());
+    EXPECT_EQ(job.job.PrintableRect().LeftTop(), BPoint(0, 0));
+    EXPECT_NEAR(job.job.PrintableRect().Width() + 1, 595 - 72, 1);
+    EXPECT_NEAR(job.job.PaperRect().left, -36, 1);
+    EXPECT_NEAR(job.job.PaperRect().Height() + 1, 842, 1);
+    job.job.DrawView(page, BRect(0, 0, 522, 600), BPoint(0, 0));
+    job.job.SpoolPage();
+    job.job.DrawView(page, BRect(0, 50, 522, 600), BPoint(0, 100));
+    job.job.SpoolPage();
+    job.job.CommitJob();
+    EXPECT_FALSE(job.job.CanContinue());
+
+    EXPECT_NE(Output("pdfinfo " + file).find(" 2\nEncrypted"), std::string::npos)
+        << Output("pdfinfo " + file);
+    const std::string first = Output("pdftotext -f 1 -l 1 -bbox " + file + " -");
+    EXPECT_NEAR(PlaceOf(first, "Report").x, 36 + 36, 2);
+    EXPECT_NEAR(PlaceOf(first, "Report").y, 36 + 72, 5);
+    EXPECT_NEAR(PlaceOf(first, "Inner").x, 36 + 100 + 36, 2);
+    EXPECT_NEAR(PlaceOf(first, "Inner").y, 36 + 200 + 72, 5);
+    EXPECT_NE(Output("pdfimages -f 1 -l 1 -list " + file).find("image"), std::string::npos); // the control
+    EXPECT_EQ(PlaceOf(first, "Hidden"), BPoint(-1, -1));
+    Output("pdftoppm -r 72 -png -singlefile " + file + " " + folder.File("first"));
+    const QImage picture(QString::fromStdString(folder.File("first.png")));
+    const auto inked = [&](QRect place) {
+        int dark = 0;
+        for (int y = place.top(); y <= place.bottom(); y++)
+            for (int x = place.left(); x <= place.right(); x++)
+                dark += qGray(picture.pixel(x, y)) < 128;
+        return dark > 0;
+    };
+    EXPECT_TRUE(inked(QRect(72, 36 + 60, 40, 14)));
+    EXPECT_FALSE(inked(QRect(72, 36 + 688, 40, 14))); // outside what was to be drawn
+    const std::string second = Output("pdftotext -f 2 -l 2 -bbox " + file + " -");
+    EXPECT_NEAR(PlaceOf(second, "Report").y, 36 + 72 - 50 + 100, 5);
+}
+
+TEST(PrintJobs, KeepTheirSetUpInAMessageAndRefuseNonsense) {
+    const BApplication application("test");
+    const auto settingsOf = [](const BPrintJob& job) { return std::unique_ptr<BMessage>(job.Settings()); };
+    BMessage wanted;
+    wanted.AddString("page size", "A5");
+    wanted.AddString("output file", "/tmp/x.pdf");
+    wanted.AddBool("landscape", true);
+    wanted.AddFloat("left margin", 50);
+    wanted.AddInt32("copies", 3);
+    wanted.AddInt32("resolution", 300);
+    wanted.AddBool("colour", false);
+    BPrintJob first("first");
+    first.SetSettings(&wanted);
+    BPrintJob second("second");
+    second.SetSettings(settingsOf(first).get());
+    const auto kept = settingsOf(second);
+    const char* size = "";
+    int32 copies = 0;
+    int32 resolution = 0;
+    bool landscape = false;
+    bool colour = true;
+    float margin = 0;
+    EXPECT_EQ(kept->FindString("page size", &size), B_OK);
+    EXPECT_STREQ(size, "A5");
+    kept->FindInt32("copies", &copies);
+    kept->FindInt32("resolution", &resolution);
+    kept->FindBool("landscape", &landscape);
+    kept->FindBool("colour", &colour);
+    kept->FindFloat("left margin", &margin);
+    EXPECT_EQ(copies, 3);
+    EXPECT_EQ(resolution, 300);
+    EXPECT_TRUE(landscape);
+    EXPECT_FALSE(colour);
+    EXPECT_NEAR(margin, 50, 0.5);
+    EXPECT_GT(second.PaperRect().Width(), second.PaperRect().Height());
+
+    BMessage nonsense;
+    nonsense.AddString("page size", "elephant");
+    nonsense.AddFloat("page width", -5);
+    nonsense.AddFloat("left margin", 1e9F);
+    nonsense.AddInt32("copies", -1);
+    nonsense.AddInt32("resolution", 1 << 30);
+    second.SetSettings(&nonsense);
+    second.SetSettings(nullptr);
+    EXPECT_NEAR(second.PrintableRect().Width(), first.PrintableRect().Width(), 1);
+}
+
+TEST(PrintJobs, ThatCannotBeginOrAreCancelledLeaveNothing) {
+    Stage stage;
+    const TemporaryFolder folder;
+    auto* page = stage.Add(new Page(BRect(0, 0, 500, 700), "Page"));
+    {
+        Job nowhere(folder.Path() + "/missing/report.pdf");
+        EXPECT_FALSE(nowhere.job.BeginJob());
+        nowhere.job.DrawView(page, page->Bounds(), BPoint(0, 0));
+        nowhere.job.SpoolPage();
+        nowhere.job.CommitJob();
+    }
+    const std::string file = folder.Path() + "/report.pdf";
+    {
+        Job dropped(file);
+        ASSERT_TRUE(dropped.job.BeginJob());
+        EXPECT_FALSE(dropped.job.BeginJob());
+        dropped.job.DrawView(page, page->Bounds(), BPoint(0, 0));
+    }
+    EXPECT_FALSE(std::filesystem::exists(file));
+}
+
+TEST(PrintJobs, AskThroughTheToolkitsDialogs) {
+    const BApplication application("test");
+    for (const bool accepted : {true, false}) {
+        BPrintJob job("Quorvan");
+        const auto answer = [&](const char* name) {
+            QTimer::singleShot(50, qApp, [accepted, name] {
+                auto* dialog = qobject_cast<QDialog*>(QApplication::activeModalWidget());
+                ASSERT_TRUE(dialog);
+                EXPECT_EQ(dialog->objectName(), name);
+                accepted ? dialog->accept() : dialog->reject();
+            });
+        };
+        answer("page setup dialog");
+        EXPECT_EQ(job.ConfigPage(), accepted ? B_OK : B_ERROR);
+        answer("print dialog");
+        EXPECT_EQ(job.ConfigJob(), accepted ? B_OK : B_ERROR);
+    }
+}
