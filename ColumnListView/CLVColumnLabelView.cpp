@@ -112,12 +112,13 @@ void CLVColumnLabelView::MessageReceived(BMessage* message) {
         CancelPress();
 }
 
+// On dense screens the pointer has fractions of a pixel; edges keep to whole ones, so that they stay sharp.
 void CLVColumnLabelView::Move(BPoint where) {
     press_.lastAt = where;
     if (press_.action == Action::Press && std::fabs(where.x - press_.pressedAt.x) > kDragReach)
         StartDrag();
     if (press_.action == Action::Resize)
-        press_.column->SetWidth(where.x - press_.grabOffset - press_.column->Begin());
+        press_.column->SetWidth(std::round(where.x - press_.grabOffset - press_.column->Begin()));
     else if (press_.action == Action::Drag)
         DragTo(where.x);
 }

@@ -485,7 +485,10 @@ bool ColumnListView::AddItem(BListItem* item, int32 index) {
         AddToOutline({row}, index);
         return true;
     }
-    return BListView::AddItem(item, index);
+    if (BListView::AddItem(item, index))
+        return true;
+    ReleaseRow(*row);
+    return false;
 }
 
 bool ColumnListView::AddList(BList* newItems) {
@@ -500,18 +503,21 @@ bool ColumnListView::AddList(BList* newItems, int32 index) {
     rows.reserve(static_cast<std::size_t>(newItems->CountItems()));
     for (int32 i = 0; i < newItems->CountItems(); i++) {
         auto* row = dynamic_cast<CLVListItem*>(static_cast<BListItem*>(newItems->ItemAt(i)));
-        if (!row || row->list_) {
-            for (CLVListItem* taken : rows)
-                taken->list_ = nullptr;
-            return false;
-        }
+        if (!row || row->list_)
+            break;
         row->list_ = this;
         rows.push_back(row);
     }
-    if (!hierarchical_)
-        return BListView::AddList(newItems, index);
-    AddToOutline(rows, index);
-    return true;
+    const bool allNew = static_cast<int32>(rows.size()) == newItems->CountItems();
+    if (allNew && hierarchical_) {
+        AddToOutline(rows, index);
+        return true;
+    }
+    if (allNew && BListView::AddList(newItems, index))
+        return true;
+    for (CLVListItem* row : rows)
+        ReleaseRow(*row);
+    return false;
 }
 
 void ColumnListView::AddToOutline(const OutlineSequence& rows, int32 index) {

@@ -140,6 +140,11 @@ TEST(List, BorrowsItsRows) {
     EXPECT_TRUE(f.list->AddList(&both));
     EXPECT_FALSE(f.list->AddList(&both) || f.list->AddItem(a) || f.list->AddItem(nullptr) ||
                  f.list->AddItem(f.NewRow({}), 3));
+    BListView other({0, 0, 9, 9}, "other");
+    TextRow* elsewhere = f.NewRow({});
+    EXPECT_TRUE(other.AddItem(elsewhere));
+    EXPECT_FALSE(f.list->AddItem(elsewhere));
+    EXPECT_EQ(elsewhere->List(), nullptr);
     EXPECT_EQ(f.Shown(), "ba");
     EXPECT_EQ(f.list->FullListIndexOf(a), 1);
     EXPECT_TRUE(f.list->RemoveItem(b));
@@ -151,7 +156,8 @@ TEST(List, BorrowsItsRows) {
     EXPECT_EQ(b->List(), nullptr);
     EXPECT_TRUE(f.list->FullListIsEmpty());
     EXPECT_TRUE(f.list->AddList(&both, 0));
-    f.list->MakeEmpty();
+    f.rows.erase(f.rows.begin()); // a row that dies leaves its list
+    EXPECT_EQ(f.Shown(), "b");
 }
 
 TEST(List, TellsRowsOfWidthsOnlyWhenAsked) {
