@@ -2,6 +2,7 @@
 
 #include <cstdint>
 #include <memory>
+#include <span>
 
 #include "db/Condition.h"
 #include "db/DataFile.h"
@@ -263,10 +264,10 @@ class DATABASE {
     // Set statements
     [[nodiscard]] int PrepareChange(const char* statement, FieldChange* change) const;
     [[nodiscard]] int ChangeRecords(const FieldChange& change, long* changed);
-    [[nodiscard]] static std::size_t RunLength(const ReadCache& reader, const std::int32_t* numbers,
-                                               std::size_t most);
-    [[nodiscard]] bool ChangeRun(const FieldChange& change, ReadCache& reader, std::int32_t first,
-                                 std::size_t count, std::uint8_t* before);
+    [[nodiscard]] const std::int32_t* EndOfSpan(const ReadCache& reader, const std::int32_t* numbers,
+                                                const std::int32_t* end) const;
+    [[nodiscard]] int ChangeSpan(const FieldChange& change, ReadCache& reader,
+                                 std::span<const std::int32_t> numbers, std::uint8_t* before);
 
     // Compaction
     [[nodiscard]] int WriteCompacted(File& target);

@@ -26,8 +26,8 @@ constexpr void ChangeNumber(int op, T* field, T value) {
     const auto wrapped = [](auto number) { return static_cast<T>(number); };
     if constexpr (std::is_integral_v<T>) {
         // Unsigned arithmetic wraps where signed arithmetic must not overflow.
-        const auto a = static_cast<std::uint64_t>(*field);
-        const auto b = static_cast<std::uint64_t>(value);
+        const auto a = static_cast<std::uint64_t>(std::int64_t{*field});
+        const auto b = static_cast<std::uint64_t>(std::int64_t{value});
         switch (op) {
         case SetOperator::Assign:
             *field = value;

@@ -6,7 +6,8 @@
 
 namespace {
 constexpr std::int32_t NotInSet = -1;
-constexpr std::size_t RunBytes = 64 * 1024; // neighbouring records that are written in one go
+constexpr std::size_t SpanBytes = 256 * 1024; // the most that is written in one go
+constexpr int MostGapBytes = 4096;            // between two changed records of it
 } // namespace
 
 long DATABASE::QueryUpdate(const char* statement) {
@@ -49,19 +50,19 @@ int DATABASE::PrepareChange(const char* statement, FieldChange* change) const {
 int DATABASE::ChangeRecords(const FieldChange& change, long* changed) {
     ReadCache own;
     ReadCache* reader = ScanCache(&own);
-    const std::size_t most = std::max<std::size_t>(RunBytes / (DataSize() + 1), 1);
-    const auto before = TryAllocate<std::uint8_t>(most * (DataSize() + 1));
-    const auto numbers = TryAllocate<std::int32_t>(sorted_ ? static_cast<std::size_t>(slotCount_) : 0);
-    if (reader == nullptr || !before || !numbers) {
+    const auto before = TryAllocate<std::uint8_t>(SpanBytes + DataSize() + 1);
+    const auto sorted = TryAllocate<std::int32_t>(sorted_ ? static_cast<std::size_t>(slotCount_) : 0);
+    if (reader == nullptr || !before || !sorted) {
         return DatabaseError::SetNoMemory;
     }
     const std::int32_t* next = slots_.get();
     const std::int32_t* end = next + slotCount_;
     if (sorted_) {
-        end = std::copy(next, end, numbers.get());
-        std::sort(numbers.get(), numbers.get() + slotCount_);
-        next = numbers.get();
+        std::partial_sort_copy(next, end, sorted.get(), sorted.get() + slotCount_);
+        next = sorted.get();
+        end = next + slotCount_;
     }
+    reader->Reset(); // what is written beside a changed record has just been read
     while (next != end) {
         if (*next == NotInSet) {
             ++next;
@@ -70,47 +71,72 @@ int DATABASE::ChangeRecords(const FieldChange& change, long* changed) {
         if (!reader->Holds(*next) && reader->Fill(file_, Area(), *next) != 0) {
             return DatabaseError::SetReadFailed;
         }
-        const std::size_t run =
-            RunLength(*reader, next, std::min(most, static_cast<std::size_t>(end - next)));
-        if (run > 0 && !ChangeRun(change, *reader, *next, run, before.get())) {
+        const std::int32_t* spanEnd = EndOfSpan(*reader, next, end);
+        const int count = ChangeSpan(change, *reader, {next, spanEnd}, before.get());
+        if (count < 0) {
             return DatabaseError::WriteFailed;
         }
-        *changed += static_cast<long>(run);
-        next += std::max<std::size_t>(run, 1);
+        *changed += count;
+        next = spanEnd;
     }
     return DatabaseError::None;
 }
 
-// How many of the records listed from `numbers` on follow one another, are held by the reader and are not
-// deleted.
-std::size_t DATABASE::RunLength(const ReadCache& reader, const std::int32_t* numbers, std::size_t most) {
-    std::size_t run = 0;
-    while (run < most && numbers[run] == *numbers + static_cast<std::int32_t>(run) &&
-           reader.Holds(numbers[run]) && *reader.Record(numbers[run]) != RecordStatus::Deleted) {
-        ++run;
+// Where the records that are written together with the first one listed end: they are held by the reader and
+// no further than a page from each other, so that writing what lies between costs less than one more call.
+const std::int32_t* DATABASE::EndOfSpan(const ReadCache& reader, const std::int32_t* numbers,
+                                        const std::int32_t* end) const {
+    const std::int32_t mostGap = MostGapBytes / header_.recordLength + 1;
+    const std::int32_t last = *numbers + static_cast<std::int32_t>(SpanBytes) / header_.recordLength;
+    const std::int32_t* spanEnd = numbers + 1;
+    std::int32_t previous = *numbers;
+    for (const std::int32_t* number = spanEnd; number != end; ++number) {
+        if (*number == NotInSet) {
+            continue;
+        }
+        if (!reader.Holds(*number) || *number > last || *number - previous > mostGap) {
+            break;
+        }
+        previous = *number;
+        spanEnd = number + 1;
     }
-    return run;
+    return spanEnd;
 }
 
-// Changes neighbouring records in the reader and in the file. After a failed write the file has the records
-// as they were, kept in `before`, or as they should be, none of them in parts, as far as it can still be
+// Changes the listed records in the reader and in the file; returns how many, -1 when they could not be
+// written. Then each is as it was or as it should be, none of them in parts, as far as the file can still be
 // written.
-bool DATABASE::ChangeRun(const FieldChange& change, ReadCache& reader, std::int32_t first, std::size_t count,
+int DATABASE::ChangeSpan(const FieldChange& change, ReadCache& reader, std::span<const std::int32_t> numbers,
                          std::uint8_t* before) {
     const std::size_t length = DataSize() + 1;
-    std::uint8_t* records = reader.Record(first);
-    std::memcpy(before, records, count * length);
-    for (std::size_t i = 0; i < count; ++i) {
-        records[i * length] = RecordStatus::Active;
-        change.Apply(records + i * length + 1);
+    std::int32_t first = NotInSet;
+    std::int32_t last = NotInSet;
+    int count = 0;
+    for (const std::int32_t number : numbers) {
+        if (number == NotInSet || *reader.Record(number) == RecordStatus::Deleted) {
+            continue;
+        }
+        std::uint8_t* record = reader.Record(number);
+        std::memcpy(before + static_cast<std::size_t>(count) * length, record, length);
+        *record = RecordStatus::Active;
+        change.Apply(record + 1);
+        first = count == 0 ? number : first;
+        last = number;
+        ++count;
     }
-    if (file_.WriteAt(Area().OffsetOf(first), records, count * length) != 0) {
-        reader.Clear();
-        static_cast<void>(file_.WriteAt(Area().OffsetOf(first), before, count * length));
-        return false;
+    const std::size_t bytes = static_cast<std::size_t>(last - first + 1) * length;
+    if (count == 0 || file_.WriteAt(Area().OffsetOf(first), reader.Record(first), bytes) == 0) {
+        currentRecord_ = count == 0 ? currentRecord_ : last;
+        return count;
     }
-    currentRecord_ = first + static_cast<std::int32_t>(count) - 1;
-    return true;
+    for (const std::int32_t number : numbers) {
+        if (number != NotInSet && *reader.Record(number) != RecordStatus::Deleted) {
+            std::memcpy(reader.Record(number), before, length);
+            before += length;
+        }
+    }
+    static_cast<void>(file_.WriteAt(Area().OffsetOf(first), reader.Record(first), bytes));
+    return -1;
 }
 
 void DATABASE::QueryUpdateDateFunction(int op, dbDATE* field, const long* value) const {

@@ -111,11 +111,11 @@ TEST(DatesAndTimes, AreReadFromTheClock) {
         Rules.SetToCurrentDate(&dateAfter);
     } while (Rules.CompareDates(&date, &dateAfter) != 0);
     now.tm_year = date.year - 1900;
-    now.tm_mon = date.month - 1;
-    now.tm_mday = date.day;
-    now.tm_hour = time.hour;
-    now.tm_min = time.minute;
-    now.tm_sec = time.second;
+    now.tm_mon = int{date.month} - 1;
+    now.tm_mday = int{date.day};
+    now.tm_hour = int{time.hour};
+    now.tm_min = int{time.minute};
+    now.tm_sec = int{time.second};
     now.tm_isdst = -1;
     const double late = std::difftime(std::mktime(&now), before);
     EXPECT_TRUE(late >= 0 && late < 100) << late;
