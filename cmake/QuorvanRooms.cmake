@@ -58,9 +58,15 @@ function(quorvan_test)
   else()
     target_link_libraries(${target} PRIVATE GTest::gtest GTest::gtest_main)
   endif()
-  set(properties ENVIRONMENT "${environment}" TIMEOUT 300)
+  set(properties "TIMEOUT 300")
   if(TEST_THREADS)
-    list(APPEND properties LABELS threads)
+    string(APPEND properties " LABELS threads")
   endif()
-  gtest_discover_tests(${target} TEST_PREFIX ${TEST_NAME}. DISCOVERY_TIMEOUT 120 PROPERTIES ${properties})
+  gtest_discover_tests(${target} TEST_PREFIX ${TEST_NAME}. TEST_LIST ${target}_TESTS DISCOVERY_TIMEOUT 120)
+  # Discovery takes properties apart at every semicolon, and the environment is a list: it is set when ctest reads
+  # the tests.
+  set(script ${CMAKE_CURRENT_BINARY_DIR}/${target}_properties.cmake)
+  file(CONFIGURE OUTPUT ${script} @ONLY CONTENT
+    "if(@target@_TESTS)\n  set_tests_properties(\${@target@_TESTS} PROPERTIES @properties@ ENVIRONMENT \"@environment@\")\nendif()\n")
+  set_property(DIRECTORY APPEND PROPERTY TEST_INCLUDE_FILES ${script})
 endfunction()
