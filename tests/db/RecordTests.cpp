@@ -164,25 +164,6 @@ TEST_F(RecordTest, HeaderIsWrittenAtOnceUnlessSwitchedOff) {
     EXPECT_EQ(HeaderOnDisk().deletedCount, 1);
 }
 
-TEST_F(RecordTest, WriteKeepsCacheTrue) {
-    for (int i = 0; i < 10; ++i) {
-        const ROW row = Row("old");
-        ASSERT_EQ(database_.Append(&row), i);
-    }
-    ROW got{};
-    ASSERT_EQ(database_.Read(0, &got), 1); // all ten are in the cache now
-    std::string bytes = folder_.Read("rows.db");
-    const ROW unseen = Row("unseen");
-    std::memcpy(bytes.data() + bytes.size() - 35 * 10 + 1, &unseen, sizeof(unseen));
-    folder_.Write("rows.db", bytes);
-    const ROW row = Row("new");
-    ASSERT_EQ(database_.Write(5, &row), 0);
-    EXPECT_EQ(database_.Read(5, &got), 1);
-    EXPECT_STREQ(got.name, "new");
-    EXPECT_EQ(database_.UnBufferedRead(0, &got), 1);
-    EXPECT_STREQ(got.name, "unseen");
-}
-
 TEST_F(RecordTest, ErrorsStayUntilAsked) {
     char message[ErrorMessageSize];
     EXPECT_EQ(database_.GetLastError(message), 0);
