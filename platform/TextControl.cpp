@@ -129,6 +129,11 @@ BTextControl::BTextControl(BRect frame, const char* name, const char* label, con
     });
 }
 
+// A line that loses the focus as it goes must not call back.
+BTextControl::~BTextControl() {
+    Line(this)->disconnect();
+}
+
 void BTextControl::Send() {
     sent_ = Text();
     Invoke();

@@ -12,6 +12,7 @@ class BTextControl : public BControl {
     BTextControl(BRect frame, const char* name, const char* label, const char* text, BMessage* message,
                  uint32 resizingMode = B_FOLLOW_LEFT | B_FOLLOW_TOP,
                  uint32 flags = B_WILL_DRAW | B_NAVIGABLE);
+    ~BTextControl() override;
 
     void SetLabel(const char* label) override;
     void SetText(const char* text);
