@@ -53,7 +53,7 @@ int ReadCache::Fill(const File& file, const RECORD_AREA& area, std::int32_t n) {
     const std::int32_t capacity = Capacity(area);
     const std::int32_t scattered = std::clamp(ScatteredBytes / area.recordLength, 1, capacity);
     const bool downwards = n == first_ - 1;
-    const bool goesOn = downwards || (n > last_ && n - last_ <= std::max(window_, 1));
+    const bool goesOn = downwards || (n > last_ && n - last_ <= scattered);
     if (window_ == 0 || (goesOn && window_ > capacity / 2)) {
         window_ = capacity;
     } else {
