@@ -90,7 +90,9 @@ NorvelWindow::~NorvelWindow() {
 }
 
 void NorvelWindow::Quit() {
+    Lock(); // the application quits its windows from outside their handlers
     ClearInvestmentList();
+    Unlock();
     BWindow::Quit();
 }
 

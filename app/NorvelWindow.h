@@ -73,6 +73,7 @@ class NorvelWindow : public BWindow {
     void SelectFirstPortfolioMenuItem();
     // The selector's marked item; null when there is none.
     [[nodiscard]] BMenuItem* MarkedPortfolio() const;
+    void MarkCurrentPortfolio();
     void OnPortfolioSelected(BMessage* message);
     void OnPortfolioDelete();
 

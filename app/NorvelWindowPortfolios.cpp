@@ -70,11 +70,21 @@ bool NorvelWindow::IsPortfolioPresent() {
     return false;
 }
 
+// The selector has marked the item already when the message is its own.
+void NorvelWindow::MarkCurrentPortfolio() {
+    const BMenuItem* marked = MarkedPortfolio();
+    if (marked && std::strcmp(marked->Label(), currentPortfolio_) == 0)
+        return;
+    if (BMenuItem* item = selector_->Menu()->FindItem(currentPortfolio_))
+        item->SetMarked(true);
+}
+
 void NorvelWindow::OnPortfolioSelected(BMessage* message) {
     const char* name = nullptr;
     if (message->FindString(PortfolioNameField, &name) != B_OK)
         return;
     CopyTextZeroed(currentPortfolio_, name);
+    MarkCurrentPortfolio();
     LoadInvestmentList();
 }
 

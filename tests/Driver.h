@@ -93,18 +93,14 @@ class Driver {
         });
     }
     void Poll() {
-        if (steps_.empty()) {
-            PollSoon();
-            return;
-        }
-        if (steps_.front().condition()) {
+        if (!steps_.empty() && steps_.front().condition()) {
             const Action action = std::move(steps_.front().action);
             steps_.pop_front();
             deadline_.setRemainingTime(PatienceMilliseconds);
             PollSoon(); // before the action, which may wait in a loop of its own
             action();
         } else if (deadline_.hasExpired()) {
-            ADD_FAILURE() << "waited in vain for: " << steps_.front().what;
+            ADD_FAILURE() << "waited in vain for: " << (steps_.empty() ? "the end" : steps_.front().what);
             steps_.clear();
             be_app->PostMessage(B_QUIT_REQUESTED);
         } else {

@@ -1,0 +1,110 @@
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include <QAbstractItemView>
+#include <QMenuBar>
+#include <QScrollBar>
+
+#include "ColumnListView/BetterScrollView.h"
+#include "ColumnListView/ColumnListView.h"
+#include "DataFolder.h"
+#include "Driver.h"
+#include "app/AppState.h"
+#include "app/NorvelApp.h"
+#include "app/NorvelItem.h"
+#include "app/NorvelWindow.h"
+#include "platform/MenuBar.h"
+#include "platform/MenuField.h"
+#include "platform/StringView.h"
+#include "util/InterfaceHelpers.h"
+
+using Texts = std::vector<std::string>;
+
+// The program in a folder of the test's own: fill the folder, give the driver its steps, and Run.
+class Program : public DataFolder, public Driver {
+  public:
+    Program() { BApplication::SetExecutablePath(File("quorvan").c_str()); }
+
+    // From start to end, as main does it. The last step is to end the program.
+    void Run() {
+        NorvelApp application;
+        application.Run();
+    }
+    // A step as soon as the main window is shown and nothing keeps the person out of it.
+    Program& Then(std::string what, Action action) {
+        When(
+            std::move(what),
+            [] { return Main() && !QApplication::activeModalWidget() && !QApplication::activePopupWidget(); },
+            std::move(action));
+        return *this;
+    }
+    Program& Close() {
+        Then("close box", [] { Main()->close(); });
+        return *this;
+    }
+    // A step that sends a command and waits for what it led to.
+    Program& Send(uint32 code) {
+        Then("command " + std::to_string(code), [code] { Window()->PostMessage(code); });
+        return *this;
+    }
+    Program& Select(const std::string& portfolio) {
+        Then("select " + portfolio, [portfolio] {
+            BMessage message(1015);
+            message.AddString("PortfolioName", portfolio.c_str());
+            Window()->PostMessage(&message);
+        });
+        return *this;
+    }
+    // A step that waits until the list shows these investments, by name and in this order.
+    Program& Expect(const Texts& names) {
+        std::string what = "rows:";
+        for (const std::string& name : names)
+            what += " " + name;
+        When(
+            what, [names] { return Main() && Names() == names; }, [] {});
+        return *this;
+    }
+
+    static QWidget* Main() { return Driver::Window("Quorvan"); }
+    static NorvelWindow* Window() { return static_cast<NorvelWindow*>(GetAppWindow(be_app, "Quorvan")); }
+    template <class View>
+    static View* Find() {
+        return FindBelow<View>(Window()->FindView("top view"));
+    }
+    static ColumnListView* List() { return Find<ColumnListView>(); }
+    static BMenu* Selector() { return Find<BMenuField>()->Menu(); }
+    static std::string Total() { return Find<BStringView>()->Text(); }
+    static NorvelItem* Row(int32 index) { return static_cast<NorvelItem*>(List()->ItemAt(index)); }
+    static Texts Names() {
+        Texts names;
+        for (int32 i = 0; i < List()->CountItems(); ++i)
+            names.emplace_back(Row(i)->Text(1));
+        return names;
+    }
+    static QAbstractItemView* RowsWidget() { return Main()->findChild<QAbstractItemView*>(); }
+    static void ClickRow(int32 index, Qt::KeyboardModifiers keys = {}) {
+        const BRect frame = List()->ItemFrame(index);
+        QTest::mouseClick(RowsWidget()->viewport(), Qt::LeftButton, keys,
+                          QPoint(30, static_cast<int>((frame.top + frame.bottom) / 2)));
+    }
+    // Changes to the list want its window's lock.
+    static void Locked(const Action& change) {
+        ASSERT_TRUE(Window()->Lock());
+        change();
+        Window()->Unlock();
+    }
+
+  private:
+    template <class View>
+    static View* FindBelow(BView* view) {
+        if (auto* found = dynamic_cast<View*>(view))
+            return found;
+        for (int32 i = 0; i < view->CountChildren(); ++i) {
+            if (View* found = FindBelow<View>(view->ChildAt(i)))
+                return found;
+        }
+        return nullptr;
+    }
+};
