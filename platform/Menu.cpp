@@ -48,11 +48,15 @@ bool BMenu::AddItem(BMenuItem* item, int32 index) {
 }
 
 bool BMenu::AddItem(BMenu* submenu) {
-    return submenu && AddItem(new BMenuItem(submenu));
+    if (!submenu)
+        return false;
+    auto item = std::make_unique<BMenuItem>(submenu);
+    return AddItem(item.get()) && item.release();
 }
 
 bool BMenu::AddSeparatorItem() {
-    return AddItem(new BSeparatorItem);
+    auto item = std::make_unique<BSeparatorItem>();
+    return AddItem(item.get()) && item.release();
 }
 
 bool BMenu::RemoveItem(BMenuItem* item) {

@@ -41,7 +41,7 @@ void BMenuBar::GetPreferredSize(float* width, float* height) const {
 void BMenuBar::FitHeight() {
     float width = 0;
     float height = 0;
-    GetPreferredSize(&width, &height);
+    BMenuBar::GetPreferredSize(&width, &height);
     if (resizeToFit_)
         ResizeTo(Frame().Width(), height);
 }

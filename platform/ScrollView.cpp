@@ -36,8 +36,6 @@ QScrollBar* Bar(BListView* target, orientation direction) {
 
 BScrollBar::BScrollBar(BListView* target, orientation direction) : target_(target), orientation_(direction) {}
 
-BScrollBar::~BScrollBar() = default;
-
 float BScrollBar::Value() const {
     return static_cast<float>(Bar(target_, orientation_)->value());
 }

@@ -10,7 +10,7 @@ constexpr float B_H_SCROLL_BAR_HEIGHT = 14;
 // One scroll bar of a scroll view, which owns it. A handle on the toolkit's own scroll bar.
 class BScrollBar {
   public:
-    ~BScrollBar();
+    ~BScrollBar() = default;
     BScrollBar(const BScrollBar&) = delete;
     BScrollBar& operator=(const BScrollBar&) = delete;
 

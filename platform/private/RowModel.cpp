@@ -41,6 +41,13 @@ void RowModel::Reorder(std::vector<BListItem*> order) {
     emit layoutChanged({}, QAbstractItemModel::VerticalSortHint);
 }
 
+// To reset unheard: the rows have not changed for anyone.
+void RowModel::ForgetHeldPlaces() {
+    const QSignalBlocker silent(this);
+    beginResetModel();
+    endResetModel();
+}
+
 int RowModel::rowCount(const QModelIndex& parent) const {
     return parent.isValid() ? 0 : rows_.Count();
 }

@@ -24,6 +24,9 @@ class RowModel : public QAbstractListModel {
     void Clear();
     // order holds the same rows. What the toolkit holds on to stays with its row.
     void Reorder(std::vector<BListItem*> order);
+    // Lets go of every place that the toolkit holds on to. Its table of them grows with a scattered
+    // selection, never shrinks by itself, and is gone through at every change.
+    void ForgetHeldPlaces();
 
     [[nodiscard]] int rowCount(const QModelIndex& parent) const override;
     [[nodiscard]] QVariant data(const QModelIndex& index, int role) const override;

@@ -104,6 +104,9 @@ void RowSelection::Detach() {
     attached_ = false;
     current_ = model_.At(view_.currentIndex().row());
     view_.selectionModel()->reset();
+    if (manyPlacesHeld_)
+        model_.ForgetHeldPlaces();
+    manyPlacesHeld_ = false;
     QTimer::singleShot(0, view_.selectionModel(), [this] { Attach(); });
 }
 
@@ -121,6 +124,7 @@ void RowSelection::Attach() {
         ranges.append(QItemSelectionRange(model_.index(index), model_.index(end)));
         index = end;
     }
+    manyPlacesHeld_ = ranges.size() > kManyRanges;
     QItemSelectionModel* toolkit = view_.selectionModel();
     const QSignalBlocker silent(toolkit);
     if (current_)

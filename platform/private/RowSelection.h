@@ -46,6 +46,7 @@ class RowSelection {
     RowsWidget& view_;
     std::function<void()> changed_;
     bool attached_ = true;
+    bool manyPlacesHeld_ = false;
     BListItem* current_ = nullptr; // while not attached
 
     // The selected rows' indexes in order: those of order_ from head_ on, each less shift_.
