@@ -75,7 +75,11 @@ class NorvelWindow : public BWindow {
     [[nodiscard]] BMenuItem* MarkedPortfolio() const;
     void MarkCurrentPortfolio();
     void OnPortfolioSelected(BMessage* message);
+    void OnPortfolioAdd();
+    void OnPortfolioEdit();
     void OnPortfolioDelete();
+    // Takes the marked item out of the selector.
+    void RemoveMarkedItem();
 
     // --- investments ---
     void LoadInvestmentList();
@@ -85,12 +89,19 @@ class NorvelWindow : public BWindow {
     // Copies the selected investments to the clipboard; true when it now holds all of them.
     bool CopySelection();
     void RemoveSelectedRows();
+    // Runs the investment form on the record; true when the person confirmed it.
+    bool RunInvestmentDialog(const char* title, INVESTMENT_DATA* record);
+    void OnInvestmentAdd();
+    // Edits the first selected investment; its row keeps its place.
+    void OnInvestmentEdit();
     void OnInvestmentDelete();
     void OnInvestmentCopy();
     void OnInvestmentCut();
     void OnInvestmentPaste();
 
     // --- other commands ---
+    // Tells the person that a change could not be written.
+    static void TellNotSaved();
     void OnSettings();
     void OnHelp();
     // Where dialogs open.

@@ -8,7 +8,10 @@
 #include "app/AppState.h"
 #include "app/NorvelItem.h"
 #include "app/PortfolioRules.h"
+#include "dialogs/InvestmentDialog.h"
+#include "platform/MenuField.h"
 #include "platform/StringView.h"
+#include "util/CharacterBuffer.h"
 #include "util/InterfaceHelpers.h"
 #include "util/Numbers.h"
 
@@ -26,7 +29,7 @@ std::vector<NorvelItem*> SelectedItems(const ColumnListView* list) {
 } // namespace
 
 NorvelItem* CreateNewInvestmentItem(const INVESTMENT_DATA& record, int32 recordNumber) {
-    return new NorvelItem(record, recordNumber);
+    return NorvelItem::Make(record, recordNumber).release();
 }
 
 int32 CountSelectedItems(const ColumnListView* list) {
@@ -76,14 +79,69 @@ bool NorvelWindow::IsInvestmentPresent() {
     return false;
 }
 
+bool NorvelWindow::RunInvestmentDialog(const char* title, INVESTMENT_DATA* record) {
+    const BPoint corner = DialogCorner();
+    auto* dialog = new InvestmentDialog(corner.x, corner.y, title, record, DialogHasOk | DialogHasCancel);
+    return dialog->DoModal() == DialogOk;
+}
+
+void NorvelWindow::OnInvestmentAdd() {
+    INVESTMENT_DATA record{};
+    if (!IsPortfolioPresent() || !RunInvestmentDialog("Add an Investment", &record))
+        return;
+    const BMenuItem* marked = MarkedPortfolio();
+    if (!marked)
+        return;
+    CopyTextZeroed(record.Portfolio, marked->Label());
+    record.QuoteError = 0;
+    record.PrevPrice = NoPreviousPrice;
+    const long number = app_state->investments->Append(&record);
+    if (number < 0) {
+        TellNotSaved();
+        return;
+    }
+    investmentList_->AddItem(CreateNewInvestmentItem(record, static_cast<int32>(number)));
+    DisplayTotalValue(-1);
+}
+
+void NorvelWindow::OnInvestmentEdit() {
+    const int32 index = investmentList_->CurrentSelection();
+    auto* row = static_cast<NorvelItem*>(investmentList_->ItemAt(index));
+    if (!row) {
+        MessageBox("You must select an investment to edit!", B_INFO_ALERT);
+        return;
+    }
+    INVESTMENT_DATA record;
+    const int32 number = row->RecordNumber();
+    if (!ReadInvestment(*app_state->investments, number, &record) ||
+        !RunInvestmentDialog("Edit this Investment", &record))
+        return;
+    if (app_state->investments->Write(number, &record) != 0) {
+        TellNotSaved();
+        return;
+    }
+    investmentList_->RemoveItem(index);
+    delete row;
+    investmentList_->AddItem(CreateNewInvestmentItem(record, number), index);
+    investmentList_->Select(index);
+    DisplayTotalValue(-1);
+}
+
+// A record that could not be deleted keeps its row.
 void NorvelWindow::OnInvestmentDelete() {
     const std::vector<NorvelItem*> selected = SelectedItems(investmentList_);
     if (selected.empty()) {
         MessageBox("You must select an investment to delete!", B_INFO_ALERT);
         return;
     }
+    bool all = true;
     for (const NorvelItem* row : selected)
-        app_state->investments->Delete(row->RecordNumber());
+        all = app_state->investments->Delete(row->RecordNumber()) == 0 && all;
+    if (!all) {
+        TellNotSaved();
+        LoadInvestmentList();
+        return;
+    }
     RemoveSelectedRows();
     DisplayTotalValue(-1);
 }
@@ -139,7 +197,9 @@ void NorvelWindow::OnInvestmentPaste() {
     const AppState& state = *app_state;
     if (state.clipboardCount <= 0 || currentPortfolio_[0] == '\0')
         return;
-    AppendCopies(*state.investments, {state.clipboard.get(), static_cast<std::size_t>(state.clipboardCount)},
-                 currentPortfolio_);
+    if (!AppendCopies(*state.investments,
+                      {state.clipboard.get(), static_cast<std::size_t>(state.clipboardCount)},
+                      currentPortfolio_))
+        TellNotSaved();
     LoadInvestmentList();
 }

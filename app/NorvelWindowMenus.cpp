@@ -11,6 +11,7 @@
 #include "platform/Application.h"
 #include "platform/MenuBar.h"
 #include "platform/Roster.h"
+#include "util/InterfaceHelpers.h"
 
 namespace {
 
@@ -74,7 +75,12 @@ BMenuItem* NewItem(const ItemInfo& info) {
 
 const NorvelWindow::Command NorvelWindow::Commands[] = {
     {MessageSettings, Needs::Nothing, &NorvelWindow::OnSettings},
+    {MessagePortfolioAdd, Needs::Nothing, &NorvelWindow::OnPortfolioAdd},
+    {MessagePortfolioEdit, Needs::Portfolio, &NorvelWindow::OnPortfolioEdit},
     {MessagePortfolioDelete, Needs::Portfolio, &NorvelWindow::OnPortfolioDelete},
+    {MessageInvestmentAdd, Needs::Portfolio, &NorvelWindow::OnInvestmentAdd},
+    {MessageInvestmentEdit, Needs::Investment, &NorvelWindow::OnInvestmentEdit},
+    {MessageInvestmentInvoked, Needs::Investment, &NorvelWindow::OnInvestmentEdit},
     {MessageInvestmentDelete, Needs::Investment, &NorvelWindow::OnInvestmentDelete},
     {MessageInvestmentCut, Needs::Investment, &NorvelWindow::OnInvestmentCut},
     {MessageInvestmentCopy, Needs::Investment, &NorvelWindow::OnInvestmentCopy},
@@ -117,6 +123,10 @@ void NorvelWindow::MenusBeginning() {
             menuBar_->FindItem(item.code)->SetEnabled(command && CanRun(*command));
         }
     }
+}
+
+void NorvelWindow::TellNotSaved() {
+    MessageBox("The change could not be saved! Is the disk full, or the file protected?", B_STOP_ALERT);
 }
 
 BPoint NorvelWindow::DialogCorner() const {

@@ -6,6 +6,8 @@
 #include "app/AppState.h"
 #include "app/MessageCodes.h"
 #include "app/PortfolioRules.h"
+#include "dialogs/PortfolioAddDialog.h"
+#include "dialogs/PortfolioEditDialog.h"
 #include "platform/MenuField.h"
 #include "util/CharacterBuffer.h"
 #include "util/InterfaceHelpers.h"
@@ -88,16 +90,57 @@ void NorvelWindow::OnPortfolioSelected(BMessage* message) {
     LoadInvestmentList();
 }
 
+void NorvelWindow::OnPortfolioAdd() {
+    char name[NameSize] = "";
+    const BPoint corner = DialogCorner();
+    auto* dialog =
+        new PortfolioAddDialog(corner.x, corner.y, "Add a Portfolio", name, app_state->portfolios.get());
+    if (dialog->DoModal() != DialogOk)
+        return;
+    if (AddPortfolio(*app_state->portfolios, name))
+        AddPortfolioMenuItem(name);
+    else
+        TellNotSaved();
+}
+
+void NorvelWindow::OnPortfolioEdit() {
+    const BMenuItem* marked = MarkedPortfolio();
+    if (!marked)
+        return;
+    char name[NameSize];
+    CopyTextZeroed(name, marked->Label());
+    const BPoint corner = DialogCorner();
+    auto* dialog =
+        new PortfolioEditDialog(corner.x, corner.y, "Edit Portfolio", name, app_state->portfolios.get());
+    if (dialog->DoModal() != DialogOk)
+        return;
+    if (!RenamePortfolio(*app_state->portfolios, *app_state->investments, currentPortfolio_, name)) {
+        TellNotSaved();
+        return;
+    }
+    RemoveMarkedItem();
+    CopyTextZeroed(currentPortfolio_, name);
+    AddPortfolioMenuItem(name);
+}
+
 void NorvelWindow::OnPortfolioDelete() {
-    BMenuItem* marked = MarkedPortfolio();
-    if (!marked) {
+    if (!MarkedPortfolio()) {
         MessageBox("There are no portfolios to delete!", B_INFO_ALERT);
         return;
     }
     if (YesNoBox("Are you sure you want to delete this portfolio?") || YesNoBox("Are you really sure?"))
         return;
-    DeletePortfolio(*app_state->portfolios, *app_state->investments, currentPortfolio_);
-    if (selector_->Menu()->RemoveItem(marked))
-        delete marked;
+    if (!DeletePortfolio(*app_state->portfolios, *app_state->investments, currentPortfolio_)) {
+        TellNotSaved();
+        LoadInvestmentList();
+        return;
+    }
+    RemoveMarkedItem();
     SelectFirstPortfolioMenuItem();
+}
+
+void NorvelWindow::RemoveMarkedItem() {
+    BMenuItem* marked = MarkedPortfolio();
+    if (marked && selector_->Menu()->RemoveItem(marked))
+        delete marked;
 }

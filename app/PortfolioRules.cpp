@@ -38,13 +38,15 @@ long Select(DATABASE& database, const char* column, const char* name) {
 
 // Deletes the records of the result set. The walk comes first: reading between two deletions would read the
 // file anew each time.
-void DeleteSelected(DATABASE& database) {
+bool DeleteSelected(DATABASE& database) {
     std::vector<long> numbers;
     long number = 0;
     for (const void* data = database.QueryGetFirst(&number); data; data = database.QueryGetNext(&number))
         numbers.push_back(number);
+    bool all = true;
     for (const long each : numbers)
-        database.Delete(each);
+        all = database.Delete(each) == 0 && all;
+    return all;
 }
 
 } // namespace
@@ -85,10 +87,10 @@ float TotalValue(DATABASE& investments, const char* portfolio) {
     return total;
 }
 
-void AddPortfolio(DATABASE& portfolios, const char* name) {
+bool AddPortfolio(DATABASE& portfolios, const char* name) {
     PORTFOLIO_DATA record;
     CopyTextZeroed(record.Name, name);
-    portfolios.Append(&record);
+    return portfolios.Append(&record) >= 0;
 }
 
 bool RenamePortfolio(DATABASE& portfolios, DATABASE& investments, const char* oldName, const char* newName) {
@@ -102,21 +104,22 @@ bool RenamePortfolio(DATABASE& portfolios, DATABASE& investments, const char* ol
     if (portfolios.Update(&record) != 0)
         return false;
     char statement[StatementSize];
-    if (SelectInvestments(investments, oldName) > 0 && MakeStatement(statement, "Portfolio", newName))
-        investments.QueryUpdate(statement);
-    return true;
+    return SelectInvestments(investments, oldName) <= 0 ||
+           (MakeStatement(statement, "Portfolio", newName) && investments.QueryUpdate(statement) >= 0);
 }
 
-void DeletePortfolio(DATABASE& portfolios, DATABASE& investments, const char* name) {
-    if (SelectPortfolios(portfolios, name) > 0)
-        DeleteSelected(portfolios);
+bool DeletePortfolio(DATABASE& portfolios, DATABASE& investments, const char* name) {
+    bool all = SelectPortfolios(portfolios, name) <= 0 || DeleteSelected(portfolios);
     if (SelectInvestments(investments, name) > 0)
-        DeleteSelected(investments);
+        all = DeleteSelected(investments) && all;
+    return all;
 }
 
-void AppendCopies(DATABASE& investments, std::span<const INVESTMENT_DATA> records, const char* portfolio) {
+bool AppendCopies(DATABASE& investments, std::span<const INVESTMENT_DATA> records, const char* portfolio) {
     for (INVESTMENT_DATA record : records) {
         CopyTextZeroed(record.Portfolio, portfolio);
-        investments.Append(&record);
+        if (investments.Append(&record) < 0)
+            return false;
     }
+    return true;
 }

@@ -10,7 +10,7 @@
 #include "util/CharacterBuffer.h"
 
 // What the commands do to the data files, without a window. A portfolio is named by its name alone, in any
-// letter case. Results of single writes are not reported: after a failed one the file holds what it held.
+// letter case. After a write that failed, the file holds what it held.
 
 // Whether an open database has the layout of portfol.db, invest.db or misc.db, as far as the program relies
 // on it: the column that its queries name, and records that fit the program's structs. One that has not must
@@ -65,8 +65,9 @@ void ForEachCategoryEntry(DATABASE& categories, const char* category, Visit visi
     }
 }
 
-// Adds a portfolio without investments. The name must be one that CheckPortfolioName accepts.
-void AddPortfolio(DATABASE& portfolios, const char* name);
+// Adds a portfolio without investments. The name must be one that CheckPortfolioName accepts. False when it
+// could not be written.
+[[nodiscard]] bool AddPortfolio(DATABASE& portfolios, const char* name);
 
 // Gives the portfolio and all its investments a new name. False, with nothing changed, when there is no
 // portfolio of the old name. The portfolio's own record changes first; each record is wholly old or wholly
@@ -74,8 +75,11 @@ void AddPortfolio(DATABASE& portfolios, const char* name);
 [[nodiscard]] bool RenamePortfolio(DATABASE& portfolios, DATABASE& investments, const char* oldName,
                                    const char* newName);
 
-// Deletes every portfolio record of that name and every investment of it.
-void DeletePortfolio(DATABASE& portfolios, DATABASE& investments, const char* name);
+// Deletes every portfolio record of that name and every investment of it. False when one of them could not be
+// deleted.
+[[nodiscard]] bool DeletePortfolio(DATABASE& portfolios, DATABASE& investments, const char* name);
 
-// Appends copies of the records as investments of the portfolio; nothing but their Portfolio changes.
-void AppendCopies(DATABASE& investments, std::span<const INVESTMENT_DATA> records, const char* portfolio);
+// Appends copies of the records as investments of the portfolio; nothing but their Portfolio changes. False
+// when they could not all be written; those before are there.
+[[nodiscard]] bool AppendCopies(DATABASE& investments, std::span<const INVESTMENT_DATA> records,
+                                const char* portfolio);

@@ -165,13 +165,30 @@ TEST(PortfolioRules, DeletingTakesAllOfThatNameAndNothingElse) {
 
     // A name that no query can hold must not be taken for the part of it that one can.
     for (const char* name : {"A\tx", "A\n", "", "none"})
-        DeletePortfolio(portfolios, investments, name);
+        EXPECT_TRUE(DeletePortfolio(portfolios, investments, name));
     EXPECT_EQ(portfolios.GetNumberOfActiveRecords(), 4);
     EXPECT_EQ(investments.GetNumberOfActiveRecords(), 5);
 
-    DeletePortfolio(portfolios, investments, "A");
+    EXPECT_TRUE(DeletePortfolio(portfolios, investments, "A"));
     EXPECT_EQ(folder.Portfolios(), (Texts{"b c", "A\tx"}));
     EXPECT_EQ(folder.Investments(), (Texts{"b c/n", "AA/n"}));
+}
+
+TEST(PortfolioRules, ARenameTakesEveryInvestmentAlong) {
+    const DataFolder folder;
+    for (const char* name : {"Old", "Other"})
+        folder.AddPortfolio(name);
+    for (const char* portfolio : {"old", "Other", "Old", "Old one"})
+        folder.AddInvestment(MakeInvestment(portfolio, "n"));
+    DATABASE portfolios(folder.File("portfol.db").c_str());
+    DATABASE investments(folder.File("invest.db").c_str());
+    EXPECT_TRUE(RenamePortfolio(portfolios, investments, "Old", "  New name"));
+    EXPECT_EQ(folder.Portfolios(), (Texts{"  New name", "Other"}));
+    EXPECT_EQ(folder.Investments(), (Texts{"  New name/n", "Other/n", "  New name/n", "Old one/n"}));
+    EXPECT_TRUE(RenamePortfolio(portfolios, investments, "Other", "Alone"));
+    EXPECT_FALSE(RenamePortfolio(portfolios, investments, "Old", "x"));
+    EXPECT_FALSE(RenamePortfolio(portfolios, investments, "A\tx", "x"));
+    EXPECT_EQ(folder.Portfolios(), (Texts{"  New name", "Alone"}));
 }
 
 TEST(PortfolioRules, CopiesDifferInTheirPortfolioAlone) {
@@ -181,7 +198,7 @@ TEST(PortfolioRules, CopiesDifferInTheirPortfolioAlone) {
     copied.QuoteError = 1;
     const INVESTMENT_DATA both[] = {copied, MakeInvestment("Other", "Second")};
     DATABASE file(folder.File("invest.db").c_str());
-    AppendCopies(file, both, "New one");
+    EXPECT_TRUE(AppendCopies(file, both, "New one"));
 
     INVESTMENT_DATA record;
     ASSERT_TRUE(ReadInvestment(file, 0, &record));

@@ -16,14 +16,14 @@ struct MenuState {
 // Commands that the window does not have yet are disabled in every state.
 constexpr MenuState MenuStates[] = {
     {1000, true, true, true},    // Settings
-    {1010, false, false, false}, // Portfolio Add
-    {1011, false, false, false}, // Edit
+    {1010, true, true, true},    // Portfolio Add
+    {1011, false, true, true},   // Edit
     {1012, false, true, true},   // Del
     {1013, false, false, false}, // Chart
     {1014, false, false, false}, // Print
     {1016, false, false, false}, // Update prices
-    {1020, false, false, false}, // Investment Add
-    {1021, false, false, false}, // Edit
+    {1020, false, true, true},   // Investment Add
+    {1021, false, false, true},  // Edit
     {1022, false, false, true},  // Del
     {1023, false, false, true},  // Cut
     {1024, false, false, true},  // Copy
@@ -79,10 +79,12 @@ TEST(NorvelWindow, WithoutPortfoliosLittleIsEnabled) {
                   ExpectMenus(&MenuState::noPortfolio);
                   EXPECT_EQ(Program::Selector()->FindMarked(), nullptr);
                   EXPECT_STREQ(Program::Selector()->Name(), "        ");
-                  for (const char* name : {"add button", "print button", "chart button", "Update button"})
+                  for (const char* name : {"print button", "chart button", "Update button"})
                       EXPECT_FALSE(Program::Main()->findChild<QAbstractButton*>(name)->isEnabled()) << name;
+                  Driver::Press(Program::Main(), "add button");
               })
-        .Close();
+        .Answer("This command requires that a portfolio be created first.", "Ok");
+    program.Close();
     program.Run();
 }
 

@@ -68,7 +68,7 @@ Driver::Condition FocusIn(const char* title) {
 }
 
 TEST_F(FormTest, APortfolioNameIsNewAndFitsItsRecord) {
-    AddPortfolio(*state_.portfolios, "growth");
+    ASSERT_TRUE(AddPortfolio(*state_.portfolios, "growth"));
     char name[NameSize] = "";
     Driver driver;
     const char* title = "Add a Portfolio";
