@@ -25,7 +25,7 @@ void FormatValue(float value, FigureText& out);
 void FormatDay(const dbDATE& date, FigureText& out);
 
 // What the last price update did to an investment.
-enum class PriceMove {
+enum class PriceMove : std::uint8_t {
     NotFound, // it found no price
     Unknown,  // there is no earlier price to compare with
     Up,

@@ -1,8 +1,10 @@
 #include "app/NorvelItem.h"
 
+#include <algorithm>
 #include <array>
 #include <cmath>
 #include <cstring>
+#include <string_view>
 
 #include "app/AppState.h"
 #include "platform/View.h"
@@ -21,12 +23,6 @@ constexpr std::array<unsigned char, 256> MakeUpperTable() {
     return table;
 }
 constexpr std::array<unsigned char, 256> Upper = MakeUpperTable();
-
-template <std::size_t Size>
-void CopyField(char (&target)[Size], const char (&field)[Size]) {
-    std::memcpy(target, field, Size);
-    target[Size - 1] = '\0'; // a field of a foreign file may lack its end
-}
 
 struct MoveLook {
     BBitmap* bitmap;
@@ -51,39 +47,65 @@ MoveLook LookOf(PriceMove movement) {
 
 } // namespace
 
-NorvelItem::Shown::Shown(const INVESTMENT_DATA& record)
-    : shares(record.Shares),
-      price(record.Price),
-      value(record.Value),
-      date(record.Date),
-      retire(record.Retire != 0) {
-    CopyField(name, record.Name);
-    CopyField(ticker, record.Ticker);
-    CopyField(type, record.Type);
-    CopyField(agent, record.Agent);
-    CopyField(risk, record.Risk);
+// The texts of a record's fields, which may lack their ends in a foreign file.
+struct NorvelItem::Fields {
+    explicit Fields(const INVESTMENT_DATA& record)
+        : texts{Cut(record.Name), Cut(record.Ticker), Cut(record.Type), Cut(record.Agent), Cut(record.Risk)} {
+    }
+
+    template <std::size_t Size>
+    static std::string_view Cut(const char (&field)[Size]) {
+        return {field, strnlen(field, Size - 1)};
+    }
+    [[nodiscard]] std::size_t Bytes() const {
+        std::size_t bytes = FieldCount; // the terminators
+        for (const std::string_view text : texts)
+            bytes += text.size();
+        return bytes;
+    }
+
+    std::string_view texts[FieldCount];
+};
+
+std::unique_ptr<NorvelItem> NorvelItem::Make(const INVESTMENT_DATA& record, int32 recordNumber) {
+    const Fields fields(record);
+    return std::unique_ptr<NorvelItem>(new (TextBytes{fields.Bytes()})
+                                           NorvelItem(record, recordNumber, fields));
 }
 
-NorvelItem::NorvelItem(const INVESTMENT_DATA& record, int32 recordNumber)
+NorvelItem::NorvelItem(const INVESTMENT_DATA& record, int32 recordNumber, const Fields& fields)
     : CLVListItem(0, false, false, LeastHeight),
       recordNumber_(recordNumber),
+      shares_(record.Shares),
+      price_(record.Price),
+      value_(record.Value),
+      date_(record.Date),
       movement_(MoveOf(record)),
-      shown_(record) {}
+      retire_(record.Retire != 0) {
+    char* const first = reinterpret_cast<char*>(this + 1);
+    char* end = first;
+    for (int field = 0; field < FieldCount; ++field) {
+        const std::string_view text = fields.texts[field];
+        begins_[field] = static_cast<uint8>(end - first);
+        end = std::copy(text.begin(), text.end(), end);
+        *end++ = '\0';
+    }
+}
 
 const char* NorvelItem::Text(int32 column) const {
     switch (static_cast<InvestmentColumn>(column)) {
     case InvestmentColumn::Name:
-        return shown_.name;
+        return FieldText(Name);
     case InvestmentColumn::Ticker:
-        return shown_.ticker;
+        return FieldText(Ticker);
     case InvestmentColumn::Type:
-        return shown_.type;
+        return FieldText(Type);
     case InvestmentColumn::Retire:
-        return shown_.retire ? "yes" : "no";
+        return retire_ ? "yes" : "no";
     case InvestmentColumn::Risk:
-        return shown_.risk;
+        return FieldText(Risk);
     case InvestmentColumn::Agent:
-        return shown_.agent;
+        return FieldText(Agent);
     default:
         return FigureOf(static_cast<InvestmentColumn>(column));
     }
@@ -95,19 +117,19 @@ const char* NorvelItem::FigureOf(InvestmentColumn column) const {
     switch (column) {
     case InvestmentColumn::Shares:
         if (figures_->shares[0] == '\0')
-            FormatShares(shown_.shares, figures_->shares);
+            FormatShares(shares_, figures_->shares);
         return figures_->shares;
     case InvestmentColumn::Price:
         if (figures_->price[0] == '\0')
-            FormatPrice(shown_.price, shown_.type, figures_->price);
+            FormatPrice(price_, FieldText(Type), figures_->price);
         return figures_->price;
     case InvestmentColumn::Value:
         if (figures_->value[0] == '\0')
-            FormatValue(shown_.value, figures_->value);
+            FormatValue(value_, figures_->value);
         return figures_->value;
     case InvestmentColumn::Date:
         if (figures_->date[0] == '\0')
-            FormatDay(shown_.date, figures_->date);
+            FormatDay(date_, figures_->date);
         return figures_->date;
     default:
         return "";

@@ -29,7 +29,7 @@ inline constexpr int32 InvestmentColumnCount = 11;
 // Who takes a row out of the list deletes it. Interface thread.
 class NorvelItem : public CLVListItem {
   public:
-    NorvelItem(const INVESTMENT_DATA& record, int32 recordNumber);
+    [[nodiscard]] static std::unique_ptr<NorvelItem> Make(const INVESTMENT_DATA& record, int32 recordNumber);
 
     // The number of the investment's record in invest.db.
     [[nodiscard]] int32 RecordNumber() const { return recordNumber_; }
@@ -47,23 +47,15 @@ class NorvelItem : public CLVListItem {
     // else byte by byte: below 0 when a comes first.
     [[nodiscard]] static int MyCompare(const CLVListItem* a, const CLVListItem* b, int32 column);
 
-  private:
-    // What the texts are made of.
-    struct Shown {
-        explicit Shown(const INVESTMENT_DATA& record);
+    // A row and its texts are one block of memory: a large portfolio has a hundred thousand of them.
+    static void operator delete(void* row) { ::operator delete(row); }
 
-        char name[NameSize];
-        char ticker[TickerSize];
-        char type[NameSize];
-        char agent[NameSize];
-        char risk[RiskSize];
-        float shares;
-        float price;
-        float value;
-        dbDATE date;
-        bool retire;
-    };
-    // The texts of the figures, each empty until it is asked for.
+  private:
+    // The fields of a record that are shown as they are stored, one behind the other at the row's end.
+    enum Field { Name, Ticker, Type, Agent, Risk, FieldCount };
+    struct Fields;
+    // The texts of the figures, each empty until it is asked for. Formatting every figure of every row would
+    // take longer than reading the file, and most rows are never seen.
     struct Figures {
         FigureText shares = "";
         FigureText price = "";
@@ -71,14 +63,29 @@ class NorvelItem : public CLVListItem {
         FigureText date = "";
     };
 
+    struct TextBytes {
+        std::size_t count;
+    };
+    static void* operator new(std::size_t size, TextBytes texts) {
+        return ::operator new(size + texts.count);
+    }
+    static void operator delete(void* row, TextBytes) { ::operator delete(row); }
+
+    NorvelItem(const INVESTMENT_DATA& record, int32 recordNumber, const Fields& fields);
+    [[nodiscard]] const char* FieldText(Field field) const {
+        return reinterpret_cast<const char*>(this + 1) + begins_[field];
+    }
     [[nodiscard]] const char* FigureOf(InvestmentColumn column) const;
     void DrawStatus(BView* owner, BRect columnRect) const;
 
     int32 recordNumber_;
-    PriceMove movement_;
     float textOffset_ = 0; // from a column's top to the baseline
-    Shown shown_;
-    // Formatting every figure of every row would take longer than reading the file, and most rows are never
-    // seen.
     mutable std::unique_ptr<Figures> figures_;
+    float shares_;
+    float price_;
+    float value_;
+    dbDATE date_;
+    PriceMove movement_;
+    bool retire_;
+    uint8 begins_[FieldCount]; // of the texts behind the row
 };

@@ -17,28 +17,28 @@ TEST(NorvelItem, ShowsTheRecordAsItWas) {
     record.Retire = 1;
     record.Date = {25, 12, 1999};
     record.QuoteError = 1;
-    const NorvelItem item(record, 42);
-    const std::string first = item.AccessibleText();
+    const auto item = NorvelItem::Make(record, 42);
+    const std::string first = item->AccessibleText();
     EXPECT_EQ(
         first,
         "Alder, Inc., TICK, Stock, 1250.500, 12 3/8, 15,474.94, 12-25-1999, yes, Med, Bank, no price found");
     record = MakeInvestment("A", "Other");
-    EXPECT_EQ(item.AccessibleText(), first);
-    EXPECT_EQ(item.RecordNumber(), 42);
+    EXPECT_EQ(item->AccessibleText(), first);
+    EXPECT_EQ(item->RecordNumber(), 42);
     for (const int32 column : {-1, 0, 11, 100})
-        EXPECT_STREQ(item.Text(column), "");
+        EXPECT_STREQ(item->Text(column), "");
 }
 
 TEST(NorvelItem, FieldsWithoutAnEndAreShownToTheirs) {
     INVESTMENT_DATA record;
     std::memset(&record, 'x', sizeof record);
-    const NorvelItem item(record, 0);
+    const auto item = NorvelItem::Make(record, 0);
     const std::pair<InvestmentColumn, std::size_t> lengths[] = {
         {InvestmentColumn::Name, 31},  {InvestmentColumn::Ticker, 7}, {InvestmentColumn::Type, 31},
         {InvestmentColumn::Agent, 31}, {InvestmentColumn::Risk, 71},  {InvestmentColumn::Price, 15},
     };
     for (const auto& [column, length] : lengths)
-        EXPECT_EQ(std::strlen(item.Text(static_cast<int32>(column))), length);
+        EXPECT_EQ(std::strlen(item->Text(static_cast<int32>(column))), length);
 }
 
 // The order is that of upper-case copies, byte by byte.
@@ -49,18 +49,18 @@ TEST(NorvelItem, ComparesByTextWithoutRegardToLetterCase) {
     const auto sign = [](int number) { return (number > 0) - (number < 0); };
     for (const char* x : names) {
         for (const char* y : names) {
-            const NorvelItem a(MakeInvestment("A", x), 0);
-            const NorvelItem b(MakeInvestment("A", y), 1);
+            const auto a = NorvelItem::Make(MakeInvestment("A", x), 0);
+            const auto b = NorvelItem::Make(MakeInvestment("A", y), 1);
             const std::unique_ptr<char[]> upperX(ToUpperStr(x));
             const std::unique_ptr<char[]> upperY(ToUpperStr(y));
-            EXPECT_EQ(sign(NorvelItem::MyCompare(&a, &b, column)),
+            EXPECT_EQ(sign(NorvelItem::MyCompare(a.get(), b.get(), column)),
                       sign(std::strcmp(upperX.get(), upperY.get())))
                 << x << " : " << y;
         }
     }
-    const NorvelItem low(MakeInvestment("A", "low", 1, 980), 0);
-    const NorvelItem high(MakeInvestment("A", "high", 1, 12500), 1);
-    EXPECT_LT(NorvelItem::MyCompare(&high, &low, static_cast<int32>(InvestmentColumn::Value)), 0);
+    const auto low = NorvelItem::Make(MakeInvestment("A", "low", 1, 980), 0);
+    const auto high = NorvelItem::Make(MakeInvestment("A", "high", 1, 12500), 1);
+    EXPECT_LT(NorvelItem::MyCompare(high.get(), low.get(), static_cast<int32>(InvestmentColumn::Value)), 0);
 }
 
 TEST(NorvelItem, EachMoveHasItsPicture) {

@@ -1,0 +1,206 @@
+// Prints how long the main window takes to fill its list with a portfolio beside a walk of the same records,
+// and to sort it as a click on a header does beside a sort of the same texts. The window is the program's
+// own, on the toolkit's offscreen platform unless QT_QPA_PLATFORM says otherwise.
+//
+//   list_bench [--records N] [--rounds N] [--folder PATH]
+
+#include <algorithm>
+#include <chrono>
+#include <cstdio>
+#include <cstdlib>
+#include <filesystem>
+#include <random>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "ColumnListView/ColumnListView.h"
+#include "app/AppState.h"
+#include "app/MessageCodes.h"
+#include "app/NorvelApp.h"
+#include "app/NorvelItem.h"
+#include "app/NorvelWindow.h"
+#include "app/PortfolioRules.h"
+#include "util/CharacterBuffer.h"
+#include "util/InterfaceHelpers.h"
+
+namespace {
+
+struct OPTIONS {
+    long records = 100'000;
+    int rounds = 7;
+    std::string folder = std::filesystem::temp_directory_path();
+};
+
+INVESTMENT_DATA MakeInvestment(long i, unsigned random) {
+    INVESTMENT_DATA record{};
+    CopyText(record.Portfolio, "Full");
+    FormatInto(record.Name, sizeof record.Name, "Investment %u", random % 1'000'000);
+    FormatInto(record.Ticker, sizeof record.Ticker, "T%ld", i % 100'000);
+    CopyText(record.Type, i % 3 == 0 ? "Mutual Fund" : "Common Stock");
+    CopyText(record.Agent, "Broker & Sons");
+    CopyText(record.Risk, i % 10 == 3 ? "Med" : "Low");
+    record.Shares = static_cast<float>(random % 1000);
+    record.Price = static_cast<float>(random % 20'000) / 8;
+    record.PrevPrice = record.Price;
+    record.Value = record.Shares * record.Price;
+    record.Date = {3, 3, 2001};
+    return record;
+}
+
+template <std::size_t Count>
+bool Create(DATABASE& database, const std::string& path, const std::array<COLUMN_ENTRY, Count>& columns) {
+    return database.Create(path.c_str(), "benchmark", Count, columns.data()) == 0;
+}
+
+bool MakeFolder(const std::string& folder, long records) {
+    DATABASE portfolios(nullptr);
+    DATABASE investments(nullptr);
+    if (!Create(portfolios, folder + "/portfol.db", PortfolioColumns) ||
+        !Create(investments, folder + "/invest.db", InvestmentColumns))
+        return false;
+    for (const char* name : {"Full", "Empty"}) {
+        PORTFOLIO_DATA portfolio{};
+        CopyText(portfolio.Name, name);
+        portfolios.Append(&portfolio);
+    }
+    investments.SetImmediateHeaderWrite(0);
+    std::minstd_rand random;
+    for (long i = 0; i < records; ++i) {
+        const INVESTMENT_DATA record = MakeInvestment(i, static_cast<unsigned>(random()));
+        if (investments.Append(&record) != i)
+            return false;
+    }
+    return investments.SetImmediateHeaderWrite(1) == 0;
+}
+
+template <class Work>
+double Seconds(Work work) {
+    const auto start = std::chrono::steady_clock::now();
+    work();
+    return std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
+}
+
+ColumnListView* FindList(BView* view) {
+    if (auto* list = dynamic_cast<ColumnListView*>(view))
+        return list;
+    for (int32 i = 0; i < view->CountChildren(); ++i) {
+        if (ColumnListView* list = FindList(view->ChildAt(i)))
+            return list;
+    }
+    return nullptr;
+}
+
+void Show(NorvelWindow& window, const char* portfolio) {
+    BMessage message(MessagePortfolioSelected);
+    message.AddString(PortfolioNameField, portfolio);
+    window.MessageReceived(&message);
+}
+
+double SumOfValues() {
+    double sum = 0;
+    ForEachInvestment(*app_state->investments, "Full",
+                      [&](const INVESTMENT_DATA& record, long) { sum += static_cast<double>(record.Value); });
+    return sum;
+}
+
+void Print(const char* what, const char* peer, double ours, double theirs, long records,
+           const char* limit = "") {
+    std::printf("%-18s %8.2f ms %6.0f ns a row   %-26s %8.2f ms   ratio %5.2f%s\n", what, ours * 1e3,
+                ours * 1e9 / static_cast<double>(records), peer, theirs * 1e3, ours / theirs, limit);
+}
+
+void MeasureFill(NorvelWindow& window, const OPTIONS& options) {
+    double fill = 1e9;
+    double fillAndPaint = 1e9;
+    double walk = 1e9;
+    double sum = 0;
+    for (int i = 0; i < options.rounds; ++i) {
+        walk = std::min(walk, Seconds([&] { sum += SumOfValues(); }));
+        Show(window, "Empty");
+        const double filled = Seconds([&] { Show(window, "Full"); });
+        fill = std::min(fill, filled);
+        fillAndPaint = std::min(fillAndPaint, filled + Seconds([&] { window.UpdateIfNeeded(); }));
+    }
+    Print("fill the list", "query and walk the records", fill, walk, options.records, " (at most 4)");
+    Print("fill and paint it", "query and walk the records", fillAndPaint, walk, options.records);
+    std::printf("(sum %.0f)\n", sum / options.rounds);
+}
+
+// The texts of a column as a sort of nothing but them would have them.
+std::vector<std::string> Texts(const ColumnListView& list, int32 column) {
+    std::vector<std::string> texts;
+    for (int32 i = 0; i < list.CountItems(); ++i) {
+        std::string text = static_cast<const NorvelItem*>(list.ItemAt(i))->Text(column);
+        for (char& letter : text)
+            letter = letter >= 'a' && letter <= 'z' ? static_cast<char>(letter - 'a' + 'A') : letter;
+        texts.push_back(std::move(text));
+    }
+    return texts;
+}
+
+void MeasureSort(NorvelWindow& window, const OPTIONS& options, InvestmentColumn by, const char* name) {
+    const auto column = static_cast<int32>(by);
+    double sort = 1e9;
+    double peer = 1e9;
+    for (int i = 0; i < options.rounds; ++i) {
+        Show(window, "Full"); // new rows, none of which has formatted its figures
+        ColumnListView* list = FindList(window.FindView("top view"));
+        list->SetSortKey(-1);
+        sort = std::min(sort, Seconds([&] { list->SetSortKey(column); }));
+        Show(window, "Full");
+        std::vector<std::string> texts = Texts(*list, column);
+        peer = std::min(peer, Seconds([&] { std::stable_sort(texts.begin(), texts.end()); }));
+    }
+    Print(name, "sort its upper-case texts", sort, peer, options.records);
+}
+
+bool ReadOptions(int argc, char** argv, OPTIONS* options) {
+    for (int i = 1; i + 1 < argc; i += 2) {
+        const std::string_view name = argv[i];
+        if (name == "--records")
+            options->records = std::max(std::atol(argv[i + 1]), 1L);
+        else if (name == "--rounds")
+            options->rounds = std::max(std::atoi(argv[i + 1]), 1);
+        else if (name == "--folder")
+            options->folder = argv[i + 1];
+        else
+            return false;
+    }
+    return argc % 2 == 1;
+}
+
+int Measure(const OPTIONS& options, const std::string& folder) {
+    setenv("QT_QPA_PLATFORM", "offscreen", 0);
+    BApplication::SetExecutablePath((folder + "/quorvan").c_str());
+    NorvelApp application;
+    auto* window = static_cast<NorvelWindow*>(GetAppWindow(be_app, "Quorvan"));
+    if (!window)
+        return 1;
+    window->Lock();
+    MeasureFill(*window, options);
+    MeasureSort(*window, options, InvestmentColumn::Name, "sort by Name");
+    MeasureSort(*window, options, InvestmentColumn::Value, "sort by Value");
+    window->Unlock();
+    application.PostMessage(B_QUIT_REQUESTED);
+    application.Run();
+    return 0;
+}
+
+} // namespace
+
+int main(int argc, char** argv) {
+    OPTIONS options;
+    if (!ReadOptions(argc, argv, &options)) {
+        std::fprintf(stderr, "usage: list_bench [--records N] [--rounds N] [--folder PATH]\n");
+        return 2;
+    }
+    std::string folder = options.folder + "/list_bench.XXXXXX";
+    if (mkdtemp(folder.data()) == nullptr) {
+        std::perror(folder.c_str());
+        return 1;
+    }
+    const int result = MakeFolder(folder, options.records) ? Measure(options, folder) : 1;
+    std::filesystem::remove_all(folder);
+    return result;
+}
