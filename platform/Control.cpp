@@ -2,7 +2,6 @@
 
 #include "platform/Window.h"
 #include "platform/private/Convert.h"
-#include "platform/private/Mnemonics.h"
 #include "platform/private/ViewPeer.h"
 
 BInvoker::BInvoker(BMessage* message, const BHandler* target) : message_(message) {

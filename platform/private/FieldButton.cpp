@@ -51,7 +51,8 @@ QSize FieldButton::SizeFor(const QString& text) const {
     initStyleOption(&option);
     option.text = text;
     QSize content = fontMetrics().size(Qt::TextSingleLine, text.isEmpty() ? QStringLiteral(" ") : text);
-    content.rwidth() += style()->pixelMetric(QStyle::PM_MenuButtonIndicator, &option, this);
+    content.rwidth() += style()->pixelMetric(QStyle::PM_MenuButtonIndicator, &option, this) +
+                        fontMetrics().averageCharWidth();
     return style()->sizeFromContents(QStyle::CT_PushButton, &option, content, this);
 }
 
