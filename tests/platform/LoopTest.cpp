@@ -106,6 +106,7 @@ TEST(Loopers, LockIsRecursiveAndTimesOutForOthers) {
         whileHeld = looper->LockWithTimeout(2000);
         tried = 1;
         afterwards = looper->LockWithTimeout(10 * kSecond);
+        looper->Unlock();
         tried = 2;
         return 0;
     });
@@ -117,6 +118,7 @@ TEST(Loopers, LockIsRecursiveAndTimesOutForOthers) {
     EXPECT_FALSE(looper->IsLocked());
     ASSERT_TRUE(QTest::qWaitFor([&] { return tried == 2; }));
     EXPECT_EQ(afterwards, B_OK);
+    looper->Quit();
 }
 
 TEST(Loopers, AMessageWaitsWhileAWorkerHoldsTheLockAndTheInterfaceGoesOn) {
@@ -142,6 +144,8 @@ TEST(Loopers, AMessageWaitsWhileAWorkerHoldsTheLockAndTheInterfaceGoesOn) {
     release_sem(release);
     EXPECT_TRUE(QTest::qWaitFor([&] { return log.size() == 1; }));
     delete_sem(release);
+    held->Quit();
+    other->Quit();
 }
 
 TEST(Loopers, MessagesToWhatIsGoneAreDropped) {
