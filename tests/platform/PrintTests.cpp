@@ -6,6 +6,7 @@
 
 #include <QDialog>
 #include <QImage>
+#include <QRadioButton>
 #include <QTimer>
 
 #include "Stage.h"
@@ -194,11 +195,14 @@ TEST(PrintJobs, AskThroughTheToolkitsDialogs) {
                 auto* dialog = qobject_cast<QDialog*>(QApplication::activeModalWidget());
                 ASSERT_TRUE(dialog);
                 EXPECT_EQ(dialog->objectName(), name);
+                if (auto* landscape = dialog->findChild<QRadioButton*>("landscape"))
+                    landscape->click();
                 accepted ? dialog->accept() : dialog->reject();
             });
         };
         answer("page setup dialog");
         EXPECT_EQ(job.ConfigPage(), accepted ? B_OK : B_ERROR);
+        EXPECT_EQ(job.PaperRect().Width() > job.PaperRect().Height(), accepted);
         answer("print dialog");
         EXPECT_EQ(job.ConfigJob(), accepted ? B_OK : B_ERROR);
     }
