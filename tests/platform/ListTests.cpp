@@ -1,6 +1,7 @@
 // List views: rows, selection, keys, pointer, scrolling and drawing, against a plain model of what a list is.
 #include <algorithm>
 #include <cmath>
+#include <functional>
 #include <memory>
 #include <random>
 
@@ -110,97 +111,93 @@ struct ListStage : Stage {
 
 using Indexes = std::vector<int32>;
 
-// What a list holds, in the plainest way.
-struct PlainList {
-    std::vector<Row*> rows;
-    std::vector<Row*> selected;
-
-    bool IsSelected(Row* row) const {
-        return std::find(selected.begin(), selected.end(), row) != selected.end();
+// A list and, beside it, what it should hold in the plainest way; every step changes both.
+struct Twins {
+    Twins() : stage(0) {
+        stage.Show();
+        for (int32 number = 0; number < 60; number++)
+            stage.rows.push_back(std::make_unique<Row>(number));
     }
-    void ExpectSame(const ListStage& stage, const std::vector<std::unique_ptr<Row>>& all) const {
+
+    std::size_t Pick(std::size_t count) { return random() % count; }
+    static bool In(const std::vector<Row*>& some, const Row* row) {
+        return std::find(some.begin(), some.end(), row) != some.end();
+    }
+
+    void Add(Row* row) {
+        const auto at = static_cast<int32>(Pick(rows.size() + 1));
+        EXPECT_EQ(stage.list->AddItem(row, at), !In(rows, row));
+        if (!In(rows, row))
+            rows.insert(rows.begin() + at, row);
+    }
+    void Remove(Row* row) {
+        EXPECT_EQ(stage.list->RemoveItem(row), In(rows, row));
+        std::erase(rows, row);
+        std::erase(selected, row);
+    }
+    void RemoveSomeOfTheFirstSelected() {
+        for (int32 first = stage.list->CurrentSelection(); first >= 0 && Pick(3) > 0;
+             first = stage.list->CurrentSelection()) {
+            Row* gone = rows[static_cast<std::size_t>(first)];
+            EXPECT_EQ(stage.list->RemoveItem(first), gone);
+            std::erase(rows, gone);
+            std::erase(selected, gone);
+        }
+    }
+    void Select(Row* row) {
+        stage.list->Select(stage.list->IndexOf(row), true);
+        if (In(rows, row) && !In(selected, row))
+            selected.push_back(row);
+    }
+    void Deselect(Row* row) {
+        stage.list->Deselect(stage.list->IndexOf(row));
+        std::erase(selected, row);
+    }
+    void Sort() {
+        const int sign = Pick(2) == 0 ? 1 : -1;
+        const auto order = [&](const BListItem* a, const BListItem* b) {
+            return sign * (static_cast<const Row*>(a)->number % 7 - static_cast<const Row*>(b)->number % 7);
+        };
+        stage.list->SortItems(order);
+        std::stable_sort(rows.begin(), rows.end(),
+                         [&](const Row* a, const Row* b) { return order(a, b) < 0; });
+    }
+
+    void ExpectAlike() const {
         ASSERT_EQ(stage.list->CountItems(), static_cast<int32>(rows.size()));
         Indexes expected;
         for (std::size_t at = 0; at < rows.size(); at++) {
             const auto index = static_cast<int32>(at);
             ASSERT_EQ(stage.list->ItemAt(index), rows[at]);
             ASSERT_EQ(stage.list->IndexOf(rows[at]), index);
-            ASSERT_EQ(stage.list->IsItemSelected(index), IsSelected(rows[at]));
-            if (IsSelected(rows[at]))
+            ASSERT_EQ(stage.list->IsItemSelected(index), In(selected, rows[at]));
+            if (In(selected, rows[at]))
                 expected.push_back(index);
         }
         ASSERT_EQ(stage.Selected(), expected);
-        for (const auto& row : all)
-            ASSERT_EQ(stage.list->IndexOf(row.get()) < 0,
-                      std::find(rows.begin(), rows.end(), row.get()) == rows.end());
+        for (const auto& row : stage.rows)
+            ASSERT_EQ(stage.list->IndexOf(row.get()) < 0, !In(rows, row.get()));
     }
+
+    ListStage stage;
+    std::vector<Row*> rows;
+    std::vector<Row*> selected;
+    std::mt19937 random{7};
 };
 
 } // namespace
 
 TEST(Lists, HoldTheirRowsAndSelectionThroughAnyChange) {
-    ListStage stage(0);
-    stage.Show();
-    for (int32 number = 0; number < 60; number++)
-        stage.rows.push_back(std::make_unique<Row>(number));
-    PlainList plain;
-    std::mt19937 random(7);
-    const auto pick = [&](std::size_t count) { return static_cast<int32>(random() % count); };
+    Twins twins;
+    const std::vector<std::function<void(Row*)>> steps = {
+        [&](Row* row) { twins.Add(row); },    [&](Row* row) { twins.Add(row); },
+        [&](Row* row) { twins.Remove(row); }, [&](Row*) { twins.RemoveSomeOfTheFirstSelected(); },
+        [&](Row* row) { twins.Select(row); }, [&](Row* row) { twins.Deselect(row); },
+        [&](Row*) { twins.Sort(); },          [](Row*) { QTest::qWait(0); }, // what the list puts off is done
+    };
     for (int step = 0; step < 1500; step++) {
-        Row* row = stage.rows[static_cast<std::size_t>(pick(60))].get();
-        const int32 size = stage.list->CountItems();
-        const bool inside = std::find(plain.rows.begin(), plain.rows.end(), row) != plain.rows.end();
-        const int32 at = pick(static_cast<std::size_t>(size) + 1);
-        switch (pick(8)) {
-        case 0:
-        case 1: {
-            EXPECT_EQ(stage.list->AddItem(row, at), !inside);
-            if (!inside)
-                plain.rows.insert(plain.rows.begin() + at, row);
-            break;
-        }
-        case 2:
-            EXPECT_EQ(stage.list->RemoveItem(row), inside);
-            std::erase(plain.rows, row);
-            std::erase(plain.selected, row);
-            break;
-        case 3: // the first selected one goes, again and again
-            for (int32 first = stage.list->CurrentSelection(); first >= 0 && pick(3) > 0;
-                 first = stage.list->CurrentSelection()) {
-                Row* gone = plain.rows[static_cast<std::size_t>(first)];
-                EXPECT_EQ(stage.list->RemoveItem(first), gone);
-                std::erase(plain.rows, gone);
-                std::erase(plain.selected, gone);
-            }
-            break;
-        case 4:
-            if (at < size) {
-                stage.list->Select(at, true);
-                if (!plain.IsSelected(plain.rows[static_cast<std::size_t>(at)]))
-                    plain.selected.push_back(plain.rows[static_cast<std::size_t>(at)]);
-            }
-            break;
-        case 5:
-            if (at < size) {
-                stage.list->Deselect(at);
-                std::erase(plain.selected, plain.rows[static_cast<std::size_t>(at)]);
-            }
-            break;
-        case 6: {
-            const int32 sign = pick(2) == 0 ? 1 : -1;
-            const auto order = [&](const BListItem* a, const BListItem* b) {
-                return sign *
-                       (static_cast<const Row*>(a)->number % 7 - static_cast<const Row*>(b)->number % 7);
-            };
-            stage.list->SortItems(order);
-            std::stable_sort(plain.rows.begin(), plain.rows.end(),
-                             [&](const Row* a, const Row* b) { return order(a, b) < 0; });
-            break;
-        }
-        default:
-            QTest::qWait(0); // what the list puts off is done
-        }
-        plain.ExpectSame(stage, stage.rows);
+        steps[twins.Pick(steps.size())](twins.stage.rows[twins.Pick(60)].get());
+        twins.ExpectAlike();
         if (testing::Test::HasFatalFailure())
             FAIL() << "in step " << step;
     }
