@@ -12,6 +12,7 @@
 #include "util/CharacterBuffer.h"
 #include "util/IniFile.h"
 #include "util/InterfaceHelpers.h"
+#include "util/Strings.h"
 
 namespace {
 
@@ -56,7 +57,7 @@ NorvelApp::NorvelApp() : BApplication(Signature) {
                    "path of at most 108 characters.",
                    B_STOP_ALERT);
     if (ready && PassPasswordGate())
-        new NorvelWindow;
+        static_cast<void>(std::make_unique<NorvelWindow>().release()); // deletes itself when it quits
     else
         PostMessage(B_QUIT_REQUESTED);
 }
@@ -112,6 +113,7 @@ bool NorvelApp::PassPasswordGate() {
     char typed[PasswordSize] = "";
     if ((new PasswordDialog(center, typed, DialogHasOk | DialogHasCancel))->DoModal() != DialogOk)
         return false;
+    Trim(typed); // as the settings keep it
     if (std::strcmp(typed, password) == 0)
         return true;
     MessageBox("Invalid password", B_INFO_ALERT);

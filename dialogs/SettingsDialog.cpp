@@ -1,6 +1,8 @@
 #include "dialogs/SettingsDialog.h"
 
 #include "app/AppState.h"
+#include "util/CharacterBuffer.h"
+#include "util/Strings.h"
 
 namespace {
 
@@ -17,6 +19,11 @@ SettingsDialog::SettingsDialog(BPoint where, uint16 flags)
 }
 
 int SettingsDialog::OnOK() {
-    static_cast<void>(settings_.WriteString(Section, Key, Password()));
+    // The settings file keeps no blanks at a value's end; a password that ended in one would never be right
+    // again.
+    char password[PasswordSize];
+    CopyText(password, Password());
+    Trim(password);
+    static_cast<void>(settings_.WriteString(Section, Key, password));
     return 1;
 }

@@ -57,6 +57,7 @@ class SettingsDialogTest : public testing::Test {
 
 TEST_F(SettingsDialogTest, OkWritesAndCancelDoesNot) {
     EXPECT_EQ(After("[GENERAL]\nPassword=abc\n", "new one", Qt::Key_Return), "[GENERAL]\nPassword=new one\n");
+    EXPECT_EQ(After("[GENERAL]\n", "blank ", Qt::Key_Return), "[GENERAL]\nPassword=blank\n");
     EXPECT_EQ(After("[GENERAL]\nPassword=abc\n", "", Qt::Key_Return), "[GENERAL]\nPassword=\n");
     EXPECT_EQ(After("[GENERAL]\nPassword=abc\n", "new", Qt::Key_Escape), "[GENERAL]\nPassword=abc\n");
     EXPECT_EQ(After("[DISPLAY]\n", "abc", Qt::Key_Return), "[DISPLAY]\n[GENERAL]\nPassword=abc\n");
