@@ -502,7 +502,7 @@ bool ColumnListView::AddList(BList* newItems, int32 index) {
     OutlineSequence rows;
     rows.reserve(static_cast<std::size_t>(newItems->CountItems()));
     for (int32 i = 0; i < newItems->CountItems(); i++) {
-        auto* row = dynamic_cast<CLVListItem*>(static_cast<BListItem*>(newItems->ItemAt(i)));
+        auto* row = static_cast<CLVListItem*>(static_cast<BListItem*>(newItems->ItemAt(i)));
         if (!row || row->list_)
             break;
         row->list_ = this;

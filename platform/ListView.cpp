@@ -107,9 +107,12 @@ bool BListView::AddList(BList* newItems, int32 index) {
     return AddRows(std::move(rows), index);
 }
 
+// One pass over the rows: with many of them, each is a wait for memory.
 bool BListView::AddRows(std::vector<BListItem*> rows, int32 index) {
     if (index < 0 || index > CountItems())
         return false;
+    BFont font;
+    GetFont(&font);
     for (std::size_t place = 0; place < rows.size(); place++) {
         BListItem* row = rows[place];
         if (!row || ListAccess::List(*row)) {
@@ -118,18 +121,13 @@ bool BListView::AddRows(std::vector<BListItem*> rows, int32 index) {
             return false;
         }
         ListAccess::SetList(*row, this);
+        ListAccess::SetSelected(*row, false);
+        ListAccess::SetIndex(*row, index + static_cast<int32>(place));
+        row->Update(this, &font);
     }
     if (rows.empty())
         return true;
-    BFont font;
-    GetFont(&font);
-    for (BListItem* row : rows) {
-        ListAccess::SetSelected(*row, false);
-        row->Update(this, &font);
-    }
     ListPeer& peer = ListAccess::Peer(*this);
-    for (std::size_t place = 0; place < rows.size(); place++)
-        ListAccess::SetIndex(*rows[place], index + static_cast<int32>(place));
     peer.TakeHeights(rows);
     peer.selection.Detach();
     peer.model.Insert(index, rows);
