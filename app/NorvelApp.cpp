@@ -64,8 +64,7 @@ NorvelApp::NorvelApp() : BApplication(Signature) {
     const bool ready = Initialize() == 0;
     if (!ready)
         MessageBox("Quorvan cannot start: the path of its folder is too long. Please move the folder to a "
-                   "place with a "
-                   "path of at most 108 characters.",
+                   "place with a path of at most 108 characters.",
                    B_STOP_ALERT);
     if (ready && PassPasswordGate())
         (new NorvelWindow)->Activate(); // above what stood there while the password was asked for

@@ -78,7 +78,7 @@ NorvelWindow::NorvelWindow()
     AddButtons(topView);
     LoadPortfolioList();
     LoadInvestmentList();
-    MenusBeginning();
+    NorvelWindow::MenusBeginning();
     investmentList_->MakeFocus();
     Show();
 }

@@ -10,7 +10,6 @@
 #include <QDeadlineTimer>
 #include <QMessageBox>
 #include <QTest>
-#include <QTimer>
 #include <gtest/gtest.h>
 
 #include "platform/Application.h"
@@ -19,7 +18,9 @@
 // application's loop: each step waits for its condition and then does its action, with real events on
 // widgets. Steps begin as soon as there is an application object. A condition that does not come true within
 // a time limit fails the test and quits the application.
-class Driver {
+class Driver : public QObject {
+    Q_DISABLE_COPY_MOVE(Driver)
+
   public:
     using Condition = std::function<bool()>;
     using Action = std::function<void()>;
@@ -31,9 +32,7 @@ class Driver {
         else
             qAddPreRoutine([] { self_->Begin(); });
     }
-    Driver(const Driver&) = delete;
-    Driver& operator=(const Driver&) = delete;
-    ~Driver() {
+    ~Driver() override {
         for (const Step& step : steps_)
             ADD_FAILURE() << "never came to: " << step.what;
         self_ = nullptr;
@@ -84,31 +83,28 @@ class Driver {
 
     void Begin() {
         deadline_.setRemainingTime(PatienceMilliseconds);
-        PollSoon();
+        timer_ = startTimer(PollMilliseconds);
     }
-    static void PollSoon() {
-        QTimer::singleShot(PollMilliseconds, qApp, [] {
-            if (self_)
-                self_->Poll();
-        });
-    }
-    void Poll() {
+    void timerEvent(QTimerEvent*) override {
+        // A timer of its own for each poll: the toolkit holds one back while its event is handled, and an
+        // action may wait in a loop of its own.
+        killTimer(timer_);
+        timer_ = startTimer(PollMilliseconds);
         if (!steps_.empty() && steps_.front().condition()) {
             const Action action = std::move(steps_.front().action);
             steps_.pop_front();
             deadline_.setRemainingTime(PatienceMilliseconds);
-            PollSoon(); // before the action, which may wait in a loop of its own
             action();
         } else if (deadline_.hasExpired()) {
             ADD_FAILURE() << "waited in vain for: " << (steps_.empty() ? "the end" : steps_.front().what);
             steps_.clear();
+            killTimer(timer_);
             be_app->PostMessage(B_QUIT_REQUESTED);
-        } else {
-            PollSoon();
         }
     }
 
     static inline Driver* self_ = nullptr;
     std::deque<Step> steps_;
     QDeadlineTimer deadline_;
+    int timer_ = 0;
 };

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstdlib>
 #include <string>
 #include <vector>
 
@@ -68,7 +69,12 @@ class Program : public DataFolder, public Driver {
     }
 
     static QWidget* Main() { return Driver::Window("Quorvan"); }
-    static NorvelWindow* Window() { return static_cast<NorvelWindow*>(GetAppWindow(be_app, "Quorvan")); }
+    static NorvelWindow* Window() {
+        auto* window = static_cast<NorvelWindow*>(GetAppWindow(be_app, "Quorvan"));
+        if (!window)
+            std::abort(); // a step that comes without a window
+        return window;
+    }
     template <class View>
     static View* Find() {
         return FindBelow<View>(Window()->FindView("top view"));
@@ -101,7 +107,7 @@ class Program : public DataFolder, public Driver {
     static View* FindBelow(BView* view) {
         if (auto* found = dynamic_cast<View*>(view))
             return found;
-        for (int32 i = 0; i < view->CountChildren(); ++i) {
+        for (int32 i = 0; view && i < view->CountChildren(); ++i) {
             if (View* found = FindBelow<View>(view->ChildAt(i)))
                 return found;
         }

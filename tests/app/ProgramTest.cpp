@@ -37,6 +37,7 @@ class Process {
         if (id_ != 0)
             return;
         std::vector<char*> arguments;
+        arguments.reserve(command.size() + 1);
         for (const std::string& each : command)
             arguments.push_back(const_cast<char*>(each.c_str()));
         arguments.push_back(nullptr);
@@ -78,9 +79,7 @@ class Display {
         close(ends[1]);
         std::array<char, 16> number{};
         std::size_t length = 0;
-        ssize_t got = 0;
-        while (length < number.size() - 1 && (got = read(ends[0], &number[length], 1)) == 1 &&
-               number[length] != '\n')
+        while (length < number.size() - 1 && read(ends[0], &number[length], 1) == 1 && number[length] != '\n')
             ++length;
         close(ends[0]);
         number[length] = '\0';
