@@ -16,6 +16,7 @@
 #include <string_view>
 #include <vector>
 
+#include "BenchOptions.h"
 #include "ColumnListView/ColumnListView.h"
 #include "app/AppState.h"
 #include "app/MessageCodes.h"
@@ -27,12 +28,6 @@
 #include "util/InterfaceHelpers.h"
 
 namespace {
-
-struct OPTIONS {
-    long records = 100'000;
-    int rounds = 7;
-    std::string folder = std::filesystem::temp_directory_path();
-};
 
 INVESTMENT_DATA MakeInvestment(long i, unsigned random) {
     INVESTMENT_DATA record{};
@@ -172,21 +167,6 @@ void MeasureSort(NorvelWindow& window, const OPTIONS& options, InvestmentColumn 
     Print(name, "sort its upper-case texts", sort, peer, options.records);
 }
 
-bool ReadOptions(int argc, char** argv, OPTIONS* options) {
-    for (int i = 1; i + 1 < argc; i += 2) {
-        const std::string_view name = argv[i];
-        if (name == "--records")
-            options->records = std::max(std::atol(argv[i + 1]), 1L);
-        else if (name == "--rounds")
-            options->rounds = std::max(std::atoi(argv[i + 1]), 1);
-        else if (name == "--folder")
-            options->folder = argv[i + 1];
-        else
-            return false;
-    }
-    return argc % 2 == 1;
-}
-
 int Measure(const OPTIONS& options, const std::string& folder) {
     setenv("QT_QPA_PLATFORM", "offscreen", 0);
     BApplication::SetExecutablePath((folder + "/quorvan").c_str());
@@ -207,7 +187,7 @@ int Measure(const OPTIONS& options, const std::string& folder) {
 } // namespace
 
 int main(int argc, char** argv) {
-    OPTIONS options;
+    OPTIONS options(100'000);
     if (!ReadOptions(argc, argv, &options)) {
         std::fprintf(stderr, "usage: list_bench [--records N] [--rounds N] [--folder PATH]\n");
         return 2;
