@@ -94,18 +94,14 @@ bool AddPortfolio(DATABASE& portfolios, const char* name) {
 }
 
 bool RenamePortfolio(DATABASE& portfolios, DATABASE& investments, const char* oldName, const char* newName) {
-    if (SelectPortfolios(portfolios, oldName) <= 0)
-        return false;
-    long number = 0;
-    PORTFOLIO_DATA record;
-    if (!portfolios.QueryGetFirst(&number) || portfolios.Read(number, &record) != 1)
-        return false;
-    CopyTextZeroed(record.Name, newName);
-    if (portfolios.Update(&record) != 0)
-        return false;
+    // Before anything changes: a name that the investments could not take must not leave them behind.
     char statement[StatementSize];
-    return SelectInvestments(investments, oldName) <= 0 ||
-           (MakeStatement(statement, "Portfolio", newName) && investments.QueryUpdate(statement) >= 0);
+    PORTFOLIO_DATA record;
+    if (!CopyTextZeroed(record.Name, newName) || !MakeStatement(statement, "Portfolio", newName) ||
+        SelectPortfolios(portfolios, oldName) <= 0 || !portfolios.QueryGetFirst(nullptr))
+        return false;
+    return portfolios.Update(&record) == 0 &&
+           (SelectInvestments(investments, oldName) <= 0 || investments.QueryUpdate(statement) >= 0);
 }
 
 bool DeletePortfolio(DATABASE& portfolios, DATABASE& investments, const char* name) {

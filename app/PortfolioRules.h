@@ -10,7 +10,7 @@
 #include "util/CharacterBuffer.h"
 
 // What the commands do to the data files, without a window. A portfolio is named by its name alone, in any
-// letter case. After a write that failed, the file holds what it held.
+// letter case. A record that could not be written is what it was.
 
 // Whether an open database has the layout of portfol.db, invest.db or misc.db, as far as the program relies
 // on it: the column that its queries name, and records that fit the program's structs. One that has not must
@@ -70,8 +70,9 @@ void ForEachCategoryEntry(DATABASE& categories, const char* category, Visit visi
 [[nodiscard]] bool AddPortfolio(DATABASE& portfolios, const char* name);
 
 // Gives the portfolio and all its investments a new name. False, with nothing changed, when there is no
-// portfolio of the old name. The portfolio's own record changes first; each record is wholly old or wholly
-// new whenever the program is killed.
+// portfolio of the old name, or when the new one is empty, longer than 31 bytes or has a tab or line end in
+// it. The portfolio's own record changes first, then each investment: should one not be written, or the
+// program be killed, every record is wholly old or wholly new, and those not reached keep the old name.
 [[nodiscard]] bool RenamePortfolio(DATABASE& portfolios, DATABASE& investments, const char* oldName,
                                    const char* newName);
 

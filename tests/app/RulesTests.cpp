@@ -188,6 +188,9 @@ TEST(PortfolioRules, ARenameTakesEveryInvestmentAlong) {
     EXPECT_TRUE(RenamePortfolio(portfolios, investments, "Other", "Alone"));
     EXPECT_FALSE(RenamePortfolio(portfolios, investments, "Old", "x"));
     EXPECT_FALSE(RenamePortfolio(portfolios, investments, "A\tx", "x"));
+    // A name that the investments could not take must not be given to the portfolio alone.
+    for (const char* name : {"", "a\tb", "a name of more than 31 characters"})
+        EXPECT_FALSE(RenamePortfolio(portfolios, investments, "Alone", name)) << name;
     EXPECT_EQ(folder.Portfolios(), (Texts{"  New name", "Alone"}));
 }
 
