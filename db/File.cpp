@@ -31,6 +31,7 @@ int FlagsOf(FileMode mode) {
     case FileMode::ReadOnly:
         return O_RDONLY | common;
     case FileMode::CreateNew:
+    case FileMode::CreatePrivate:
         return O_RDWR | O_CREAT | O_EXCL | common;
     case FileMode::ReadWrite:
         break;
@@ -113,7 +114,7 @@ File::~File() {
 
 int File::Open(const std::string& path, FileMode mode) {
     Close();
-    constexpr mode_t permissions = 0666; // less the user's mask
+    const mode_t permissions = mode == FileMode::CreatePrivate ? 0600 : 0666; // less the user's mask
     int opened = Retry([&] { return operations_->Open(path.c_str(), FlagsOf(mode), permissions); });
     if (opened < 0) {
         return errno;

@@ -35,9 +35,10 @@ FileOperations& SystemFiles();
 
 /// How File::Open treats the file.
 enum class FileMode {
-    ReadWrite, ///< it must exist
-    ReadOnly,  ///< it must exist
-    CreateNew, ///< it must not exist (not even as a symbolic link); opened for reading and writing
+    ReadWrite,     ///< it must exist
+    ReadOnly,      ///< it must exist
+    CreateNew,     ///< it must not exist (not even as a symbolic link); opened for reading and writing
+    CreatePrivate, ///< the same, for its owner's eyes only
 };
 
 /// One open file, read and written by position. It is the only place where the engine touches files.

@@ -59,8 +59,26 @@ TEST_F(CompactionTest, DropsDeletedRecordsAndLocks) {
     ASSERT_EQ(stat(path_.c_str(), &status), 0);
     EXPECT_EQ(status.st_mode & 07777U, 0640U);
     const std::string compacted = folder_.Read("rows.db");
+    folder_.Write("precious", "untouched");
+    std::filesystem::create_symlink("precious", folder_.File("rows.new"));
     EXPECT_EQ(database.Compress(0), 0);
     EXPECT_EQ(folder_.Read("rows.db"), compacted);
+    EXPECT_EQ(folder_.Read("precious"), "untouched") << "a leftover link is not written through";
+}
+
+TEST_F(CompactionTest, CopyOfAPrivateFileIsPrivateFromTheStart) {
+    struct : FileOperations {
+        mode_t seen = 0;
+        ssize_t WriteAt(int file, const void* data, std::size_t size, off_t offset) override {
+            struct stat status {};
+            seen |= Status(file, &status) == 0 ? status.st_mode : 077U;
+            return FileOperations::WriteAt(file, data, size, offset);
+        }
+    } watched;
+    ASSERT_EQ(chmod(path_.c_str(), 0600), 0);
+    DATABASE database(path_.c_str(), watched);
+    ASSERT_EQ(database.Compress(0), 0);
+    EXPECT_EQ(watched.seen & 0777U, 0600U);
 }
 
 // What each failing step leaves on disk. Whatever it is, the object goes on working with complete data.
@@ -129,7 +147,9 @@ TEST_F(CompactionTest, WorksOnTheTargetOfALink) {
 }
 
 TEST_F(CompactionTest, RefusesWhereItWouldLoseData) {
-    for (const char* name : {"rows.new", "rows.bak"}) { // their derived names would be their own
+    // Their derived names would be their own, or one byte too long.
+    const std::string longest = std::string(PathBufferSize - 1 - folder_.File(".db").size(), 'x') + ".db";
+    for (const std::string& name : {std::string("rows.new"), std::string("rows.bak"), longest}) {
         const std::string path = folder_.File(name);
         std::filesystem::rename(path_, path);
         const std::string before = folder_.Read(name);
@@ -146,14 +166,6 @@ TEST_F(CompactionTest, RefusesWhereItWouldLoseData) {
     EXPECT_EQ(database.Compress(0), -1);
     EXPECT_EQ(database.GetLastError(nullptr), 2702);
     EXPECT_TRUE(HasOnly({"rows.db"}));
-}
-
-TEST_F(CompactionTest, LeftoverLinkIsNotWrittenThrough) {
-    folder_.Write("precious", "untouched");
-    std::filesystem::create_symlink("precious", folder_.File("rows.new"));
-    DATABASE database(path_.c_str());
-    EXPECT_EQ(database.Compress(0), 0);
-    EXPECT_EQ(folder_.Read("precious"), "untouched");
 }
 
 TEST_F(CompactionTest, BackupIsRestoredOnlyInPlaceOfNothing) {
