@@ -257,7 +257,7 @@ class DATABASE {
     [[nodiscard]] bool NewSlots();
     [[nodiscard]] ReadCache* ScanCache(ReadCache* own);
     [[nodiscard]] int TakeOutDeleted();
-    [[nodiscard]] int RunQuery(const Condition& condition, int mode);
+    [[nodiscard]] int RunQuery(const Condition& condition, int mode, ReadCache& reader);
     void MergeMatches(const Condition& condition, int mode, std::int32_t first, std::int32_t count,
                       const std::uint8_t* records);
 

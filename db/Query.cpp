@@ -33,6 +33,11 @@ long DATABASE::Query(const char* statement, int mode) {
     if (int code = PrepareCondition(statement, &condition); code != DatabaseError::None) {
         return Fail(code);
     }
+    ReadCache own;
+    ReadCache* reader = ScanCache(&own);
+    if (reader == nullptr) {
+        return Fail(DatabaseError::QueryNoMemoryForRecord);
+    }
     if (mode == QueryMode::New) {
         if (!NewSlots()) {
             return Fail(DatabaseError::QueryNoMemoryForSlots);
@@ -41,7 +46,7 @@ long DATABASE::Query(const char* statement, int mode) {
         resultCount_ = 0;
         sorted_ = false;
     }
-    if (int code = RunQuery(condition, mode); code != DatabaseError::None) {
+    if (int code = RunQuery(condition, mode, *reader); code != DatabaseError::None) {
         DropResultSet();
         return Fail(code);
     }
@@ -93,12 +98,7 @@ void DATABASE::DropResultSet() {
 
 // Goes through the records in order, a cache at a time. In the other modes than a new query, those that
 // cannot change are not read unless they lie between others.
-int DATABASE::RunQuery(const Condition& condition, int mode) {
-    ReadCache own;
-    ReadCache* reader = ScanCache(&own);
-    if (reader == nullptr) {
-        return DatabaseError::QueryNoMemoryForRecord;
-    }
+int DATABASE::RunQuery(const Condition& condition, int mode, ReadCache& reader) {
     const auto canChange = [mode](std::int32_t slot) {
         return (slot == NotInSet) == (mode != QueryMode::And);
     };
@@ -111,11 +111,11 @@ int DATABASE::RunQuery(const Condition& condition, int mode) {
         if (i >= slotCount_) {
             return DatabaseError::None;
         }
-        if (!reader->Holds(i) && reader->FillFrom(file_, Area(), i) != 0) {
+        if (!reader.Holds(i) && reader.FillFrom(file_, Area(), i) != 0) {
             return DatabaseError::QueryFailed;
         }
-        const std::int32_t count = std::min({reader->Last() + 1, slotCount_, i + BlockSize}) - i;
-        MergeMatches(condition, mode, i, count, reader->Record(i));
+        const std::int32_t count = std::min({reader.Last() + 1 - i, slotCount_ - i, BlockSize});
+        MergeMatches(condition, mode, i, count, reader.Record(i));
         i += count;
     }
 }

@@ -87,14 +87,14 @@ int DATABASE::ChangeRecords(const FieldChange& change, long* changed) {
 const std::int32_t* DATABASE::EndOfSpan(const ReadCache& reader, const std::int32_t* numbers,
                                         const std::int32_t* end) const {
     const std::int32_t mostGap = MostGapBytes / header_.recordLength + 1;
-    const std::int32_t last = *numbers + static_cast<std::int32_t>(SpanBytes) / header_.recordLength;
+    const std::int32_t most = static_cast<std::int32_t>(SpanBytes) / header_.recordLength;
     const std::int32_t* spanEnd = numbers + 1;
     std::int32_t previous = *numbers;
     for (const std::int32_t* number = spanEnd; number != end; ++number) {
         if (*number == NotInSet) {
             continue;
         }
-        if (!reader.Holds(*number) || *number > last || *number - previous > mostGap) {
+        if (!reader.Holds(*number) || *number - *numbers > most || *number - previous > mostGap) {
             break;
         }
         previous = *number;
@@ -135,7 +135,9 @@ int DATABASE::ChangeSpan(const FieldChange& change, ReadCache& reader, std::span
             before += length;
         }
     }
-    static_cast<void>(file_.WriteAt(Area().OffsetOf(first), reader.Record(first), bytes));
+    if (file_.WriteAt(Area().OffsetOf(first), reader.Record(first), bytes) != 0) {
+        reader.Reset(); // nobody knows what the file holds there
+    }
     return -1;
 }
 

@@ -12,6 +12,7 @@ enum class Fault {
     Error,         // the call does nothing and fails
     HalfThenError, // a write takes half of its bytes, then fails
     ShortWrite,    // a write takes half of its bytes and says so
+    Broken,        // the same, and every later call fails
     Interrupted,   // the call is to be made again
     KilledBefore,  // the process ends before the call
     KilledAfter,   // the process ends after the call
@@ -46,7 +47,8 @@ class FaultyFiles : public FileOperations {
     }
     ssize_t WriteAt(int file, const void* data, std::size_t size, off_t offset) override {
         const bool now = calls_ == at_;
-        if (now && size > 1 && (fault_ == Fault::ShortWrite || fault_ == Fault::HalfThenError)) {
+        if (now && size > 1 &&
+            (fault_ == Fault::ShortWrite || fault_ == Fault::HalfThenError || fault_ == Fault::Broken)) {
             if (fault_ == Fault::ShortWrite) {
                 ++calls_;
             }
@@ -77,10 +79,12 @@ class FaultyFiles : public FileOperations {
   private:
     template <class Result>
     Result Meet(const std::function<Result()>& call) {
-        if (calls_++ != at_) {
+        const int number = calls_++;
+        if (at_ < 0 || number < at_ || (number > at_ && fault_ != Fault::Broken)) {
             return call();
         }
         switch (fault_) {
+        case Fault::Broken:
         case Fault::Error:
         case Fault::HalfThenError:
             errno = error_;
