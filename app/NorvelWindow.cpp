@@ -144,8 +144,7 @@ void NorvelWindow::AddInvestmentList(BView* topView, float top) {
     investmentList_->SetViewColor(colors::light_gray);
     investmentList_->SetFont(be_fixed_font);
     investmentList_->SetSortFunction(NorvelItem::MyCompare);
-    if (FindCommand(MessageInvestmentInvoked))
-        investmentList_->SetInvocationMessage(new BMessage(MessageInvestmentInvoked));
+    investmentList_->SetInvocationMessage(new BMessage(MessageInvestmentInvoked));
     topView->AddChild(container);
 }
 
@@ -174,7 +173,7 @@ void NorvelWindow::AddButtons(BView* topView) {
     for (const ButtonInfo& info : Buttons) {
         auto* button = new BButton(frame, info.name, info.label, new BMessage(info.code),
                                    B_FOLLOW_LEFT | B_FOLLOW_BOTTOM);
-        button->SetEnabled(FindCommand(info.code) != nullptr);
+        button->SetEnabled(IsAvailable(info.code));
         topView->AddChild(button);
         frame.OffsetBy(ButtonStep, 0);
     }
@@ -184,7 +183,7 @@ void NorvelWindow::MessageReceived(BMessage* message) {
     if (message->what == MessagePortfolioSelected)
         OnPortfolioSelected(message);
     else if (const Command* command = FindCommand(message->what))
-        (this->*command->run)();
+        Execute(*command);
     else
         BWindow::MessageReceived(message);
 }

@@ -37,6 +37,8 @@ class NorvelWindow : public BWindow {
     // False, after telling the person so, when there is no portfolio, or no row in the list.
     [[nodiscard]] bool IsPortfolioPresent();
     [[nodiscard]] bool IsInvestmentPresent();
+    // Also false, after telling the person so, when all investments together are worth nothing.
+    [[nodiscard]] bool IsValuePresent();
 
   private:
     // What a command needs before its menu item can be chosen.
@@ -45,11 +47,14 @@ class NorvelWindow : public BWindow {
         uint32 code;
         Needs needs;
         void (NorvelWindow::*run)();
+        bool (NorvelWindow::*check)() = nullptr; // tells the person what is missing, and answers false then
     };
-    // The commands there are. A menu item or button whose code is not here is disabled.
+    // What messages lead to. The menu item and button of a command without a run are disabled.
     static const Command Commands[];
     [[nodiscard]] static const Command* FindCommand(uint32 code);
+    [[nodiscard]] static bool IsAvailable(uint32 code);
     [[nodiscard]] bool CanRun(const Command& command) const;
+    void Execute(const Command& command);
 
     // --- building ---
     BView* AddTopView();

@@ -49,6 +49,8 @@ void NorvelWindow::LoadInvestmentList() {
                           rows.AddItem(CreateNewInvestmentItem(record, static_cast<int32>(number)));
                       });
     investmentList_->AddList(&rows);
+    if (investmentList_->PrimarySortKey() >= 0)
+        investmentList_->SortItems(); // as the underlined header says
     DisplayTotalValue(total);
 }
 
@@ -79,6 +81,15 @@ bool NorvelWindow::IsInvestmentPresent() {
     return false;
 }
 
+bool NorvelWindow::IsValuePresent() {
+    if (!IsInvestmentPresent())
+        return false;
+    if (PortfolioTotalValue() > 0)
+        return true;
+    MessageBox("Unable to chart. Total value of portfolio equals zero!", B_INFO_ALERT);
+    return false;
+}
+
 bool NorvelWindow::RunInvestmentDialog(const char* title, INVESTMENT_DATA* record) {
     const BPoint corner = DialogCorner();
     auto* dialog = new InvestmentDialog(corner.x, corner.y, title, record, DialogHasOk | DialogHasCancel);
@@ -87,7 +98,7 @@ bool NorvelWindow::RunInvestmentDialog(const char* title, INVESTMENT_DATA* recor
 
 void NorvelWindow::OnInvestmentAdd() {
     INVESTMENT_DATA record{};
-    if (!IsPortfolioPresent() || !RunInvestmentDialog("Add an Investment", &record))
+    if (!RunInvestmentDialog("Add an Investment", &record))
         return;
     const BMenuItem* marked = MarkedPortfolio();
     if (!marked)

@@ -78,7 +78,11 @@ const NorvelWindow::Command NorvelWindow::Commands[] = {
     {MessagePortfolioAdd, Needs::Nothing, &NorvelWindow::OnPortfolioAdd},
     {MessagePortfolioEdit, Needs::Portfolio, &NorvelWindow::OnPortfolioEdit},
     {MessagePortfolioDelete, Needs::Portfolio, &NorvelWindow::OnPortfolioDelete},
-    {MessageInvestmentAdd, Needs::Portfolio, &NorvelWindow::OnInvestmentAdd},
+    {MessagePortfolioChart, Needs::Investment, nullptr, &NorvelWindow::IsValuePresent},
+    {MessagePortfolioPrint, Needs::Investment, nullptr, &NorvelWindow::IsPortfolioPresent},
+    {MessagePortfolioUpdate, Needs::Investment, nullptr, &NorvelWindow::IsPortfolioPresent},
+    {MessageInvestmentAdd, Needs::Portfolio, &NorvelWindow::OnInvestmentAdd,
+     &NorvelWindow::IsPortfolioPresent},
     {MessageInvestmentEdit, Needs::Investment, &NorvelWindow::OnInvestmentEdit},
     {MessageInvestmentInvoked, Needs::Investment, &NorvelWindow::OnInvestmentEdit},
     {MessageInvestmentDelete, Needs::Investment, &NorvelWindow::OnInvestmentDelete},
@@ -92,6 +96,18 @@ const NorvelWindow::Command* NorvelWindow::FindCommand(uint32 code) {
     const auto* found = std::find_if(std::begin(Commands), std::end(Commands),
                                      [code](const Command& command) { return command.code == code; });
     return found == std::end(Commands) ? nullptr : found;
+}
+
+bool NorvelWindow::IsAvailable(uint32 code) {
+    const Command* command = FindCommand(code);
+    return command && command->run;
+}
+
+void NorvelWindow::Execute(const Command& command) {
+    if (command.check && !(this->*command.check)())
+        return;
+    if (command.run)
+        (this->*command.run)();
 }
 
 bool NorvelWindow::CanRun(const Command& command) const {
@@ -120,7 +136,7 @@ void NorvelWindow::MenusBeginning() {
             if (!item.label || item.goes == Goes::ToApplication)
                 continue;
             const Command* command = FindCommand(item.code);
-            menuBar_->FindItem(item.code)->SetEnabled(command && CanRun(*command));
+            menuBar_->FindItem(item.code)->SetEnabled(command && command->run && CanRun(*command));
         }
     }
 }

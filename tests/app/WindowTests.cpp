@@ -163,8 +163,9 @@ TEST(NorvelWindow, AClickOnAHeaderSortsByText) {
         .Then("Name", click(static_cast<int32>(InvestmentColumn::Name)))
         .Expect({"a", "b", "C", "d"})
         .Then("Name again", click(static_cast<int32>(InvestmentColumn::Name)))
-        .Expect({"d", "C", "b", "a"})
-        .Close();
+        .Expect({"d", "C", "b", "a"});
+    program.Select("A").Expect({"d", "C", "b", "a"}); // loaded anew, and still as the header says
+    program.Close();
     program.Run();
 }
 
@@ -271,15 +272,17 @@ TEST(NorvelWindow, DeletesAPortfolioAfterTwoQuestions) {
 
 TEST(NorvelWindow, CommandsThatNeedSomethingSaySo) {
     Program program;
-    program
-        .Then("checks",
-              [] {
-                  EXPECT_FALSE(Program::Window()->IsPortfolioPresent());
-                  EXPECT_FALSE(Program::Window()->IsInvestmentPresent());
-                  EXPECT_EQ(Program::Window()->PortfolioTotalValue(), 0);
-              })
-        .Answer("This command requires that a portfolio be created first.", "Ok")
-        .Answer("This command requires a portfolio with at least one investment.", "Ok");
+    const char* const noPortfolio = "This command requires that a portfolio be created first.";
+    for (const uint32 code : {1014U, 1016U, 1020U})
+        program.Send(code).Answer(noPortfolio, "Ok");
+    program.Send(1013).Answer("This command requires a portfolio with at least one investment.", "Ok");
+    program.Send(1021).Answer("You must select an investment to edit!", "Ok");
+    program.Close();
+    program.Run();
+
+    program.AddPortfolio("Worthless");
+    program.AddInvestment(MakeInvestment("Worthless", "a", 0, 10));
+    program.Expect({"a"}).Send(1013).Answer("Unable to chart. Total value of portfolio equals zero!", "Ok");
     program.Close();
     program.Run();
 }
