@@ -39,13 +39,6 @@ int MonthLength(int year, int month) {
     return month == February && IsLeapYear(year) != 0 ? length + 1 : length;
 }
 
-// Carries what is too much for one part of a time into the next.
-void Carry(std::int8_t* part, std::int8_t* next, int perNext) {
-    const auto [quotient, rest] = DivideDown(*part, perNext);
-    *part = static_cast<std::int8_t>(rest);
-    *next = static_cast<std::int8_t>(*next + quotient);
-}
-
 void CarryMonth(dbDATE* date) {
     const auto [years, month] = DivideDown(date->month - 1, MonthsPerYear);
     date->year = static_cast<std::int16_t>(date->year + years);
@@ -73,13 +66,16 @@ void NormaliseDate(dbDATE* date) {
 }
 
 void NormaliseTime(dbTIME* time) {
-    Carry(&time->second, &time->minute, SecondsPerMinute);
-    Carry(&time->minute, &time->hour, MinutesPerHour);
-    if (time->hour >= HoursPerDay) {
-        time->hour = static_cast<std::int8_t>(time->hour - HoursPerDay);
-    } else if (time->hour < 0) {
-        time->hour = static_cast<std::int8_t>(time->hour + HoursPerDay);
-    }
+    // In full numbers: a carry may take a minute beyond what its byte holds.
+    const auto [minutes, second] = DivideDown(time->second, SecondsPerMinute);
+    const auto [hours, minute] = DivideDown(time->minute + minutes, MinutesPerHour);
+    int hour = time->hour + hours;
+    if (hour >= HoursPerDay)
+        hour -= HoursPerDay;
+    else if (hour < 0)
+        hour += HoursPerDay;
+    *time = {static_cast<std::int8_t>(second), static_cast<std::int8_t>(minute),
+             static_cast<std::int8_t>(hour)};
 }
 
 void DATABASE::MakeDateValid(dbDATE* date) const {
