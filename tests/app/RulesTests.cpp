@@ -1,12 +1,17 @@
 // The rules of the commands and the texts of a row, on real data files and without a window.
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 #include <limits>
+
+#include <sys/wait.h>
+#include <unistd.h>
 
 #include "DataFolder.h"
 #include "app/InvestmentTexts.h"
 #include "app/PortfolioRules.h"
+#include "db/FaultyFiles.h"
 
 namespace {
 
@@ -192,6 +197,59 @@ TEST(PortfolioRules, ARenameTakesEveryInvestmentAlong) {
     for (const char* name : {"", "a\tb", "a name of more than 31 characters"})
         EXPECT_FALSE(RenamePortfolio(portfolios, investments, "Alone", name)) << name;
     EXPECT_EQ(folder.Portfolios(), (Texts{"  New name", "Alone"}));
+}
+
+// Runs the command in a child that is killed before its at-th change of a file; false when it came to its
+// end.
+template <class Command>
+bool KilledAt(const DataFolder& folder, int at, Command command) {
+    const pid_t child = fork();
+    if (child == 0) {
+        FaultyFiles files;
+        DATABASE portfolios(folder.File("portfol.db").c_str(), files);
+        DATABASE investments(folder.File("invest.db").c_str(), files);
+        files.Arm(Fault::KilledBefore, at);
+        _exit(command(portfolios, investments) ? 0 : 1);
+    }
+    int status = 0;
+    waitpid(child, &status, 0);
+    return WIFSIGNALED(status);
+}
+
+TEST(PortfolioRules, KilledAnywhereARenameLosesNoInvestmentAndADeleteNoOther) {
+    const auto fill = [](const DataFolder& folder) {
+        for (const char* name : {"Other", "Old"})
+            folder.AddPortfolio(name);
+        // Far enough apart that they are written one by one.
+        for (int i = 0; i < 120; ++i)
+            folder.AddInvestment(MakeInvestment(i % 40 == 0 ? "Old" : "Other", "n"));
+    };
+    bool killed = true;
+    for (int at = 0; killed; ++at) {
+        const DataFolder folder;
+        fill(folder);
+        killed = KilledAt(folder, at, [](DATABASE& portfolios, DATABASE& investments) {
+            return RenamePortfolio(portfolios, investments, "Old", "New");
+        });
+        const Texts all = folder.Investments();
+        const auto count = [&](const char* text) { return std::count(all.begin(), all.end(), text); };
+        EXPECT_EQ(count("Other/n"), 117) << at;
+        EXPECT_EQ(count("Old/n") + count("New/n"), 3) << at;
+        EXPECT_TRUE(killed || (at > 3 && count("New/n") == 3));
+        EXPECT_EQ(folder.Portfolios().front(), "Other");
+        EXPECT_EQ(folder.Portfolios().back(), at == 0 ? "Old" : "New");
+    }
+    killed = true;
+    for (int at = 0; killed; ++at) {
+        const DataFolder folder;
+        fill(folder);
+        killed = KilledAt(folder, at, [](DATABASE& portfolios, DATABASE& investments) {
+            return DeletePortfolio(portfolios, investments, "old");
+        });
+        const Texts all = folder.Investments();
+        EXPECT_EQ(std::count(all.begin(), all.end(), "Other/n"), 117) << at;
+        EXPECT_TRUE(killed || (at > 3 && all.size() == 117));
+    }
 }
 
 TEST(PortfolioRules, CopiesDifferInTheirPortfolioAlone) {
