@@ -1,6 +1,8 @@
 #include "dialogs/BDialog.h"
 
+#include <algorithm>
 #include <atomic>
+#include <cmath>
 
 #include "platform/Application.h"
 #include "platform/Button.h"
@@ -14,6 +16,9 @@ constexpr uint32 MessageShow = 2000;
 
 constexpr float BottomMargin = 20;
 constexpr float RightMargin = 10;
+constexpr const char* WidestLabel = "  Cancel  ";
+// How wide that label may be before forms grow with it.
+constexpr float UsualLabelWidth = 64;
 
 } // namespace
 
@@ -45,9 +50,14 @@ BDialog::~BDialog() {
     outcome_->End(DialogCancel);
 }
 
+float BDialog::FormWidth(float usual) {
+    const float label = be_plain_font->StringWidth(WidestLabel);
+    return std::ceil(usual * std::max(label / UsualLabelWidth, 1.0F));
+}
+
 void BDialog::AddButtons(uint16 flags) {
     const BRect bounds = Bounds();
-    const float width = topView_->StringWidth("  Cancel  ");
+    const float width = topView_->StringWidth(WidestLabel);
     const float step = width + RightMargin;
     const float bottom = bounds.bottom - BottomMargin;
     BRect frame(bounds.right - 2 * step, bottom - 1.5F * fontHeight_, bounds.right - 2 * step + width,

@@ -48,6 +48,9 @@ class BDialog : public BWindow {
   protected:
     // The background that fills the dialog; subclasses add their controls to it.
     [[nodiscard]] BView* TopView() const { return topView_; }
+    // The width of a form that is usual wide: more when the person's font is so large that buttons and fields
+    // would not find room.
+    [[nodiscard]] static float FormWidth(float usual);
     // Height of the bold font, the unit of the dialogs' layouts.
     [[nodiscard]] float FontHeight() const { return fontHeight_; }
 

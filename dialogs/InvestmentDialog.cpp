@@ -48,8 +48,10 @@ void Warn(const char* text) {
 
 InvestmentDialog::InvestmentDialog(float x, float y, const char* title, INVESTMENT_DATA* investment,
                                    uint16 flags)
-    : BDialog({x, y, x + Width, y + FirstHeight}, title, flags), investment_(investment), rowTop_(Margin) {
-    ResizeTo(Width, 20 * FontHeight());
+    : BDialog({x, y, x + FormWidth(Width), y + FirstHeight}, title, flags),
+      investment_(investment),
+      rowTop_(Margin) {
+    ResizeTo(Bounds().Width(), 20 * FontHeight());
     rowWidth_ = Bounds().Width() - 2 * Margin;
     divider_ = TopView()->StringWidth("Share price   ");
     AddRows();

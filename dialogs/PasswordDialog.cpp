@@ -5,7 +5,7 @@
 PasswordDialog::PasswordDialog(BPoint center, char (&answer)[PasswordSize], uint16 flags)
     : PasswordForm(center, "Enter Password", flags), answer_(answer) {
     SetPassword(answer_);
-    MoveBy(-100, -3 * FontHeight());
+    MoveBy(-Bounds().Width() / 2, -3 * FontHeight());
 }
 
 int PasswordDialog::OnOK() {

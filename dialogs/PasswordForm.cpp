@@ -12,8 +12,8 @@ constexpr float Margin = 10;
 } // namespace
 
 PasswordForm::PasswordForm(BPoint where, const char* title, uint16 flags)
-    : BDialog({where.x, where.y, where.x + Width, where.y + FirstHeight}, title, flags) {
-    ResizeTo(Width, 7 * FontHeight());
+    : BDialog({where.x, where.y, where.x + FormWidth(Width), where.y + FirstHeight}, title, flags) {
+    ResizeTo(Bounds().Width(), 7 * FontHeight());
     const BRect frame(Margin, Margin, Bounds().right - Margin, Margin + 1.5F * FontHeight());
     passwordControl_ = new BTextControl(frame, "text control", "Password:", "", nullptr,
                                         B_FOLLOW_LEFT | B_FOLLOW_TOP, B_WILL_DRAW | B_NAVIGABLE);

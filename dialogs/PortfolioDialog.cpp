@@ -21,8 +21,10 @@ PortfolioNameCheck CheckPortfolioName(DATABASE& portfolios, const char* name) {
 
 PortfolioDialog::PortfolioDialog(float x, float y, const char* title, char (&name)[NameSize],
                                  DATABASE* portfolios, uint16 flags)
-    : BDialog({x, y, x + Width, y + FirstHeight}, title, flags), portfolios_(portfolios), name_(name) {
-    ResizeTo(Width, 7 * FontHeight());
+    : BDialog({x, y, x + FormWidth(Width), y + FirstHeight}, title, flags),
+      portfolios_(portfolios),
+      name_(name) {
+    ResizeTo(Bounds().Width(), 7 * FontHeight());
     const BRect frame(Margin, Margin, Bounds().right - Margin, Margin + 1.5F * FontHeight());
     nameControl_ = new BTextControl(frame, "text control", "Name:", "", nullptr, B_FOLLOW_LEFT | B_FOLLOW_TOP,
                                     B_WILL_DRAW | B_NAVIGABLE);

@@ -15,6 +15,7 @@
 #include "dialogs/InvestmentInput.h"
 #include "dialogs/PortfolioAddDialog.h"
 #include "dialogs/PortfolioEditDialog.h"
+#include "platform/TextControl.h"
 #include "util/Dates.h"
 
 namespace {
@@ -65,6 +66,23 @@ Driver::Condition FocusIn(const char* title) {
         return QApplication::activeModalWidget() == Driver::Window(title) && Driver::Window(title) &&
                qobject_cast<QLineEdit*>(QApplication::focusWidget());
     };
+}
+
+TEST_F(FormTest, ALargeFontLeavesRoomForButtonsAndFields) {
+    const BFont* usual = be_plain_font;
+    BFont large;
+    large.SetSize(3 * large.Size());
+    be_plain_font = &large;
+    char name[NameSize] = "";
+    INVESTMENT_DATA record{};
+    auto* small = new PortfolioAddDialog(0, 0, "small", name, state_.portfolios.get());
+    EXPECT_GE(small->FindView("Ok button")->Frame().left, 0);
+    small->Quit();
+    auto* form = new InvestmentDialog(0, 0, "form", &record, Both);
+    const auto* field = dynamic_cast<BTextControl*>(form->FindView("ticker control"));
+    EXPECT_GE(field->Frame().Width() - field->Divider(), large.StringWidth("123456"));
+    form->Quit();
+    be_plain_font = usual;
 }
 
 TEST_F(FormTest, APortfolioNameIsNewAndFitsItsRecord) {
