@@ -24,7 +24,6 @@ class BList {
     }
     // -1 when the item is not in the list.
     [[nodiscard]] int32 IndexOf(const void* item) const;
-    [[nodiscard]] bool HasItem(const void* item) const { return IndexOf(item) >= 0; }
     [[nodiscard]] int32 CountItems() const { return static_cast<int32>(items_.size()); }
     [[nodiscard]] bool IsEmpty() const { return items_.empty(); }
 

@@ -73,8 +73,6 @@ class BListView : public BView, public BInvoker {
     [[nodiscard]] int32 IndexOf(const BListItem* item) const;
     // The row at this point of the view's coordinates; -1 when there is none.
     [[nodiscard]] int32 IndexOf(BPoint point) const;
-    [[nodiscard]] BListItem* FirstItem() const { return ItemAt(0); }
-    [[nodiscard]] BListItem* LastItem() const { return ItemAt(CountItems() - 1); }
     [[nodiscard]] int32 CountItems() const;
     [[nodiscard]] bool IsEmpty() const { return CountItems() == 0; }
 

@@ -59,14 +59,6 @@ status_t BMessage::FindPoint(const char* name, BPoint* value, int32 index) const
     return FindValue(name, index, value);
 }
 
-status_t BMessage::FindRect(const char* name, BRect* value, int32 index) const {
-    return FindValue(name, index, value);
-}
-
-status_t BMessage::FindPointer(const char* name, const void** value, int32 index) const {
-    return FindValue(name, index, value);
-}
-
 status_t BMessage::RemoveName(const char* name) {
     const auto field = fields_.find(name);
     if (field == fields_.end())

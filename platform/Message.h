@@ -38,8 +38,6 @@ class BMessage {
     status_t AddFloat(const char* name, float value) { return Add(name, value); }
     status_t AddBool(const char* name, bool value) { return Add(name, value); }
     status_t AddPoint(const char* name, BPoint value) { return Add(name, value); }
-    status_t AddRect(const char* name, BRect value) { return Add(name, value); }
-    status_t AddPointer(const char* name, const void* value) { return Add(name, value); }
 
     // The text stays valid until the message is changed or destroyed.
     status_t FindString(const char* name, const char** value, int32 index = 0) const;
@@ -48,8 +46,6 @@ class BMessage {
     status_t FindFloat(const char* name, float* value, int32 index = 0) const;
     status_t FindBool(const char* name, bool* value, int32 index = 0) const;
     status_t FindPoint(const char* name, BPoint* value, int32 index = 0) const;
-    status_t FindRect(const char* name, BRect* value, int32 index = 0) const;
-    status_t FindPointer(const char* name, const void** value, int32 index = 0) const;
 
     // Drops a field with all its values; B_NAME_NOT_FOUND when there is none.
     status_t RemoveName(const char* name);
@@ -57,7 +53,7 @@ class BMessage {
     [[nodiscard]] bool IsEmpty() const { return fields_.empty(); }
 
   private:
-    using Value = std::variant<std::string, int32, int64, float, bool, BPoint, BRect, const void*>;
+    using Value = std::variant<std::string, int32, int64, float, bool, BPoint>;
 
     status_t Add(const char* name, Value value);
     template <class T>

@@ -32,7 +32,6 @@ struct BRect {
     [[nodiscard]] float Width() const { return right - left; }
     [[nodiscard]] float Height() const { return bottom - top; }
     [[nodiscard]] BPoint LeftTop() const { return {left, top}; }
-    [[nodiscard]] BPoint RightBottom() const { return {right, bottom}; }
     [[nodiscard]] bool Contains(BPoint point) const {
         return point.x >= left && point.x <= right && point.y >= top && point.y <= bottom;
     }
@@ -48,12 +47,6 @@ struct BRect {
         bottom += dy;
     }
     void OffsetTo(float x, float y) { OffsetBy(x - left, y - top); }
-    void InsetBy(float dx, float dy) {
-        left += dx;
-        right -= dx;
-        top += dy;
-        bottom -= dy;
-    }
 
     // The common part; invalid when there is none.
     BRect operator&(const BRect& other) const {

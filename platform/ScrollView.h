@@ -18,7 +18,6 @@ class BScrollBar {
     // Scrolls the target; clamped to the range.
     void SetValue(float value);
     void GetRange(float* minimum, float* maximum) const;
-    [[nodiscard]] orientation Orientation() const { return orientation_; }
 
   private:
     friend class BScrollView;

@@ -255,13 +255,6 @@ void BView::GetPreferredSize(float* width, float* height) const {
     *height = frame_.Height();
 }
 
-void BView::ResizeToPreferred() {
-    float width = 0;
-    float height = 0;
-    GetPreferredSize(&width, &height);
-    ResizeTo(width, height);
-}
-
 void BView::ScrollTo(BPoint where) {
     if (where == origin_)
         return;
@@ -269,14 +262,6 @@ void BView::ScrollTo(BPoint where) {
     for (const auto& child : children_)
         child->PlaceWidget();
     Invalidate();
-}
-
-BPoint BView::ConvertToScreen(BPoint point) const {
-    return FromQt(peer_->Canvas()->mapToGlobal(ToQt(point - Bounds().LeftTop())));
-}
-
-BPoint BView::ConvertFromScreen(BPoint point) const {
-    return FromQt(peer_->Canvas()->mapFromGlobal(ToQt(point))) + Bounds().LeftTop();
 }
 
 void BView::Show() {
@@ -325,12 +310,6 @@ void BView::SetFont(const BFont* font, uint32 properties) {
         font_.SetSize(font->Size());
     else
         font_ = *font;
-}
-
-void BView::SetFontSize(float size) {
-    BFont font = font_;
-    font.SetSize(size);
-    SetFont(&font);
 }
 
 void BView::Invalidate() {

@@ -29,8 +29,6 @@ constexpr uint32 B_FOLLOW_ALL = B_FOLLOW_ALL_SIDES;
 constexpr uint32 B_WILL_DRAW = 0x01;
 constexpr uint32 B_FRAME_EVENTS = 0x02;
 constexpr uint32 B_NAVIGABLE = 0x04;
-constexpr uint32 B_PULSE_NEEDED = 0x08;
-constexpr uint32 B_FULL_UPDATE_ON_RESIZE = 0x10;
 
 enum drawing_mode { B_OP_COPY, B_OP_OVER };
 
@@ -97,12 +95,8 @@ class BView : public BHandler {
     void ResizeBy(float dx, float dy);
     // The size at which a control shows all of itself; the base answers with the present one.
     virtual void GetPreferredSize(float* width, float* height) const;
-    void ResizeToPreferred();
     virtual void ScrollTo(BPoint where);
-    [[nodiscard]] uint32 ResizingMode() const { return resizingMode_; }
     [[nodiscard]] uint32 Flags() const { return flags_; }
-    [[nodiscard]] BPoint ConvertToScreen(BPoint point) const;
-    [[nodiscard]] BPoint ConvertFromScreen(BPoint point) const;
 
     // Hiding nests: a view hidden twice must be shown twice.
     void Show();
@@ -127,17 +121,14 @@ class BView : public BHandler {
     void SetLowColor(uint8 red, uint8 green, uint8 blue) { lowColor_ = {red, green, blue, 255}; }
     [[nodiscard]] rgb_color LowColor() const { return lowColor_; }
     void SetDrawingMode(drawing_mode mode) { drawingMode_ = mode; }
-    [[nodiscard]] drawing_mode DrawingMode() const { return drawingMode_; }
     // Width of lines and outlines; 1 at first.
     void SetPenSize(float size) { penSize_ = size; }
     [[nodiscard]] float PenSize() const { return penSize_; }
     void MovePenTo(BPoint point) { pen_ = point; }
     void MovePenTo(float x, float y) { pen_ = {x, y}; }
-    [[nodiscard]] BPoint PenLocation() const { return pen_; }
 
     virtual void SetFont(const BFont* font, uint32 properties = B_FONT_ALL);
     void GetFont(BFont* font) const { *font = font_; }
-    void SetFontSize(float size);
     [[nodiscard]] float StringWidth(const char* text) const { return font_.StringWidth(text); }
     void GetFontHeight(font_height* height) const { font_.GetHeight(height); }
 

@@ -221,7 +221,7 @@ TEST(Lists, RefuseWhatIsNotTheirs) {
         Row passing(10);
         EXPECT_TRUE(stage.list->AddItem(&passing, 0));
     } // a row that goes leaves its list
-    EXPECT_EQ(stage.list->FirstItem(), stage.rows[0].get());
+    EXPECT_EQ(stage.list->ItemAt(0), stage.rows[0].get());
     EXPECT_TRUE(stage.list->RemoveItems(1, 3));
     EXPECT_EQ(stage.list->CountItems(), 1);
     EXPECT_FALSE(stage.list->IsItemSelected(-1));
