@@ -47,6 +47,13 @@ struct BRect {
         bottom += dy;
     }
     void OffsetTo(float x, float y) { OffsetBy(x - left, y - top); }
+    // Moves every edge inwards.
+    void InsetBy(float dx, float dy) {
+        left += dx;
+        right -= dx;
+        top += dy;
+        bottom -= dy;
+    }
 
     // The common part; invalid when there is none.
     BRect operator&(const BRect& other) const {

@@ -312,6 +312,12 @@ void BView::SetFont(const BFont* font, uint32 properties) {
         font_ = *font;
 }
 
+void BView::SetFontSize(float size) {
+    BFont font = font_;
+    font.SetSize(size);
+    SetFont(&font);
+}
+
 void BView::Invalidate() {
     if (peer_->widget)
         peer_->Canvas()->update();

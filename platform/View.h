@@ -128,6 +128,7 @@ class BView : public BHandler {
     void MovePenTo(float x, float y) { pen_ = {x, y}; }
 
     virtual void SetFont(const BFont* font, uint32 properties = B_FONT_ALL);
+    void SetFontSize(float size);
     void GetFont(BFont* font) const { *font = font_; }
     [[nodiscard]] float StringWidth(const char* text) const { return font_.StringWidth(text); }
     void GetFontHeight(font_height* height) const { font_.GetHeight(height); }
