@@ -124,6 +124,7 @@ bool NorvelApp::PassPasswordGate() {
     if ((new PasswordDialog(center, typed, DialogHasOk | DialogHasCancel))->DoModal() != DialogOk)
         return false;
     Trim(typed); // as the settings keep it
+    Trim(password);
     if (std::strcmp(typed, password) == 0)
         return true;
     MessageBox("Invalid password", B_INFO_ALERT);

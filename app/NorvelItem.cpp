@@ -181,6 +181,10 @@ std::string NorvelItem::AccessibleText() const {
     return all + LookOf(movement_).words;
 }
 
+std::string NorvelItem::SearchText() const {
+    return FieldText(Name);
+}
+
 int NorvelItem::MyCompare(const CLVListItem* a, const CLVListItem* b, int32 column) {
     const auto* x = reinterpret_cast<const unsigned char*>(static_cast<const NorvelItem*>(a)->Text(column));
     const auto* y = reinterpret_cast<const unsigned char*>(static_cast<const NorvelItem*>(b)->Text(column));

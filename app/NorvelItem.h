@@ -42,6 +42,8 @@ class NorvelItem : public CLVListItem {
     void Update(BView* owner, const BFont* font) override;
     // Every column's text in the order of the columns, and what the picture tells in words.
     [[nodiscard]] std::string AccessibleText() const override;
+    // The name.
+    [[nodiscard]] std::string SearchText() const override;
 
     // Orders two rows of the list by the text of a column, ASCII letters in either case being equal and all
     // else byte by byte: below 0 when a comes first.

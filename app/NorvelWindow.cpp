@@ -140,6 +140,7 @@ void NorvelWindow::AddInvestmentList(BView* topView, float top) {
     investmentList_ = new ColumnListView(
         frame, &container, nullptr, B_FOLLOW_ALL_SIDES, B_WILL_DRAW | B_FRAME_EVENTS | B_NAVIGABLE,
         B_MULTIPLE_SELECTION_LIST, false, true, true, true, B_NO_BORDER, be_plain_font);
+    investmentList_->SetAccessibleName("Investments");
     AddColumns();
     investmentList_->SetViewColor(colors::light_gray);
     investmentList_->SetFont(be_fixed_font);

@@ -105,8 +105,9 @@ class NorvelWindow : public BWindow {
     void OnInvestmentPaste();
 
     // --- other commands ---
-    // Tells the person that a change could not be written.
+    // Tell the person that a change could not be written, or an investment not read.
     static void TellNotSaved();
+    static void TellNotRead();
     void OnSettings();
     void OnHelp();
     // Where dialogs open.

@@ -124,8 +124,11 @@ void NorvelWindow::OnInvestmentEdit() {
     }
     INVESTMENT_DATA record;
     const int32 number = row->RecordNumber();
-    if (!ReadInvestment(*app_state->investments, number, &record) ||
-        !RunInvestmentDialog("Edit this Investment", &record))
+    if (!ReadInvestment(*app_state->investments, number, &record)) {
+        TellNotRead();
+        return;
+    }
+    if (!RunInvestmentDialog("Edit this Investment", &record))
         return;
     if (app_state->investments->Write(number, &record) != 0) {
         TellNotSaved();
@@ -134,7 +137,7 @@ void NorvelWindow::OnInvestmentEdit() {
     investmentList_->RemoveItem(index);
     delete row;
     investmentList_->AddItem(CreateNewInvestmentItem(record, number), index);
-    investmentList_->Select(index);
+    investmentList_->Select(index, true);
     DisplayTotalValue(-1);
 }
 
@@ -192,7 +195,10 @@ bool NorvelWindow::CopySelection() {
         if (ReadInvestment(*state.investments, row->RecordNumber(), &state.clipboard[state.clipboardCount]))
             ++state.clipboardCount;
     }
-    return state.clipboardCount == static_cast<int32>(selected.size());
+    if (state.clipboardCount == static_cast<int32>(selected.size()))
+        return true;
+    TellNotRead();
+    return false;
 }
 
 void NorvelWindow::OnInvestmentCopy() {

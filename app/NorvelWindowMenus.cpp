@@ -145,6 +145,10 @@ void NorvelWindow::TellNotSaved() {
     MessageBox("The change could not be saved! Is the disk full, or the file protected?", B_STOP_ALERT);
 }
 
+void NorvelWindow::TellNotRead() {
+    MessageBox("An investment could not be read from its file!", B_STOP_ALERT);
+}
+
 BPoint NorvelWindow::DialogCorner() const {
     return Frame().LeftTop() + BPoint(50, 50);
 }

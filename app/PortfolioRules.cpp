@@ -93,13 +93,19 @@ bool AddPortfolio(DATABASE& portfolios, const char* name) {
     return portfolios.Append(&record) >= 0;
 }
 
+bool CanBePortfolioName(const char* name) {
+    const std::size_t length = std::strlen(name);
+    return length > 0 && length < NameSize && !std::strpbrk(name, "\t\r\n");
+}
+
 bool RenamePortfolio(DATABASE& portfolios, DATABASE& investments, const char* oldName, const char* newName) {
     // Before anything changes: a name that the investments could not take must not leave them behind.
     char statement[StatementSize];
-    PORTFOLIO_DATA record;
-    if (!CopyTextZeroed(record.Name, newName) || !MakeStatement(statement, "Portfolio", newName) ||
+    if (!CanBePortfolioName(newName) || !MakeStatement(statement, "Portfolio", newName) ||
         SelectPortfolios(portfolios, oldName) <= 0 || !portfolios.QueryGetFirst(nullptr))
         return false;
+    PORTFOLIO_DATA record;
+    CopyTextZeroed(record.Name, newName);
     return portfolios.Update(&record) == 0 &&
            (SelectInvestments(investments, oldName) <= 0 || investments.QueryUpdate(statement) >= 0);
 }

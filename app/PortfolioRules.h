@@ -65,14 +65,17 @@ void ForEachCategoryEntry(DATABASE& categories, const char* category, Visit visi
     }
 }
 
+// Whether a record and a query can hold the name: 1 to 31 bytes without a tab or line end.
+[[nodiscard]] bool CanBePortfolioName(const char* name);
+
 // Adds a portfolio without investments. The name must be one that CheckPortfolioName accepts. False when it
 // could not be written.
 [[nodiscard]] bool AddPortfolio(DATABASE& portfolios, const char* name);
 
 // Gives the portfolio and all its investments a new name. False, with nothing changed, when there is no
-// portfolio of the old name, or when the new one is empty, longer than 31 bytes or has a tab or line end in
-// it. The portfolio's own record changes first, then each investment: should one not be written, or the
-// program be killed, every record is wholly old or wholly new, and those not reached keep the old name.
+// portfolio of the old name, or the new one cannot be one (CanBePortfolioName). The portfolio's own record
+// changes first, then each investment: should one not be written, or the program be killed, every record is
+// wholly old or wholly new, and those not reached keep the old name.
 [[nodiscard]] bool RenamePortfolio(DATABASE& portfolios, DATABASE& investments, const char* oldName,
                                    const char* newName);
 

@@ -14,8 +14,8 @@ constexpr float Margin = 10;
 } // namespace
 
 PortfolioNameCheck CheckPortfolioName(DATABASE& portfolios, const char* name) {
-    if (*name == '\0')
-        return PortfolioNameCheck::Empty;
+    if (!CanBePortfolioName(name))
+        return PortfolioNameCheck::Invalid;
     return SelectPortfolios(portfolios, name) > 0 ? PortfolioNameCheck::Taken : PortfolioNameCheck::Accepted;
 }
 
@@ -37,7 +37,7 @@ PortfolioDialog::PortfolioDialog(float x, float y, const char* title, char (&nam
 
 int PortfolioDialog::AcceptName() {
     switch (CheckPortfolioName(*portfolios_, nameControl_->Text())) {
-    case PortfolioNameCheck::Empty:
+    case PortfolioNameCheck::Invalid:
         MessageBox("Invalid portfolio name!", B_INFO_ALERT);
         return 0;
     case PortfolioNameCheck::Taken:

@@ -7,10 +7,10 @@ class BTextControl;
 class DATABASE;
 
 // What a portfolio's name may turn out to be.
-enum class PortfolioNameCheck { Accepted, Empty, Taken };
+enum class PortfolioNameCheck { Accepted, Invalid, Taken };
 
-// Whether a portfolio may have this name: not an empty one, and none that a portfolio has in any letter case.
-// Replaces the database's result set.
+// Whether a portfolio may have this name: one that a record and a query can hold (CanBePortfolioName), and
+// none that a portfolio has in any letter case. Replaces the database's result set.
 [[nodiscard]] PortfolioNameCheck CheckPortfolioName(DATABASE& portfolios, const char* name);
 
 // Asks for a portfolio's name: one field, which cannot grow beyond what a record holds. It writes nothing to

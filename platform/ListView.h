@@ -24,6 +24,9 @@ class BListItem {
     virtual void Update(BView* owner, const BFont* font);
     // What assistive technology reads for the row; UTF-8.
     [[nodiscard]] virtual std::string AccessibleText() const { return {}; }
+    // What typed letters are looked for at the beginning of; UTF-8. Every row may be asked. The base takes
+    // the accessible text.
+    [[nodiscard]] virtual std::string SearchText() const { return AccessibleText(); }
 
     [[nodiscard]] float Height() const { return height_; }
     void SetHeight(float height) { height_ = height; }

@@ -121,6 +121,10 @@ void BView::SetName(const char* name) {
         peer_->widget->setObjectName(QString::fromUtf8(Name()));
 }
 
+void BView::SetAccessibleName(const char* name) {
+    peer_->widget->setAccessibleName(QString::fromUtf8(name));
+}
+
 BLooper* BView::Looper() const {
     return window_;
 }

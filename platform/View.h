@@ -82,6 +82,8 @@ class BView : public BHandler {
     virtual void FrameResized(float width, float height);
     virtual void MouseDown(BPoint where);
     virtual void MouseUp(BPoint where);
+    // What assistive technology calls the view; UTF-8. At first its name, or a control's label.
+    void SetAccessibleName(const char* name);
     // The text that assistive technology reads for this view beside its name; UTF-8. The base has none.
     [[nodiscard]] virtual std::string AccessibleDescription() const { return {}; }
 

@@ -54,7 +54,9 @@ int RowModel::rowCount(const QModelIndex& parent) const {
 
 QVariant RowModel::data(const QModelIndex& index, int role) const {
     const BListItem* row = index.isValid() ? At(index.row()) : nullptr;
-    if (!row || (role != Qt::DisplayRole && role != Qt::AccessibleTextRole))
-        return {};
-    return QString::fromStdString(row->AccessibleText());
+    if (row && role == Qt::AccessibleTextRole)
+        return QString::fromStdString(row->AccessibleText());
+    if (row && role == Qt::DisplayRole)
+        return QString::fromStdString(row->SearchText());
+    return {};
 }
