@@ -118,10 +118,9 @@ bool DeletePortfolio(DATABASE& portfolios, DATABASE& investments, const char* na
 }
 
 bool AppendCopies(DATABASE& investments, std::span<const INVESTMENT_DATA> records, const char* portfolio) {
-    for (INVESTMENT_DATA record : records) {
-        CopyTextZeroed(record.Portfolio, portfolio);
-        if (investments.Append(&record) < 0)
-            return false;
-    }
-    return true;
+    std::vector<INVESTMENT_DATA> copies(records.begin(), records.end());
+    for (INVESTMENT_DATA& copy : copies)
+        CopyTextZeroed(copy.Portfolio, portfolio);
+    return investments.AppendAll(copies.data(), sizeof(INVESTMENT_DATA),
+                                 static_cast<std::int32_t>(copies.size())) >= 0;
 }

@@ -84,6 +84,6 @@ void ForEachCategoryEntry(DATABASE& categories, const char* category, Visit visi
 [[nodiscard]] bool DeletePortfolio(DATABASE& portfolios, DATABASE& investments, const char* name);
 
 // Appends copies of the records as investments of the portfolio; nothing but their Portfolio changes. False
-// when they could not all be written; those before are there.
+// when they could not be written; then none of them is there.
 [[nodiscard]] bool AppendCopies(DATABASE& investments, std::span<const INVESTMENT_DATA> records,
                                 const char* portfolio);

@@ -1,5 +1,6 @@
 #include "db/DataFile.h"
 
+#include <algorithm>
 #include <bit>
 #include <cstring>
 
@@ -110,5 +111,6 @@ FileCounts CheckRecordCount(DATABASE_HEADER* header, std::int64_t fileLength) {
         header->recordCount = static_cast<std::int32_t>(bytes / header->recordLength);
         return FileCounts::TooFew;
     }
-    return bytes - counted > header->recordLength ? FileCounts::TooMany : FileCounts::Agree;
+    const std::int64_t announced = std::max(header->reserved, 1);
+    return bytes - counted > announced * header->recordLength ? FileCounts::TooMany : FileCounts::Agree;
 }

@@ -33,7 +33,8 @@ struct RECORD_AREA {
 
 /// What a file's length says about the counts in its header.
 enum class FileCounts {
-    Agree,   ///< at most one record more than counted: what an interrupted append leaves behind
+    Agree,   ///< no more behind the counted records than an interrupted append leaves: one record, or those
+             ///< that AppendAll announced
     TooFew,  ///< records are missing at the end; the count was lowered to the whole records that are there
     TooMany, ///< the file goes on behind the last counted record
 };

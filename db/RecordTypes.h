@@ -27,7 +27,7 @@ struct DATABASE_HEADER {
     std::int32_t deletedCount;  ///< records that are marked as deleted
     std::int16_t columnCount;   ///< entries of the column table
     std::int16_t recordLength;  ///< bytes of one record: its status byte and its data
-    std::int32_t reserved;      ///< 0
+    std::int32_t reserved;      ///< 0, save while AppendAll runs: the records it adds
 };
 static_assert(sizeof(DATABASE_HEADER) == 52);
 

@@ -2,23 +2,103 @@
 #include <cstring>
 #include <limits>
 
+#include "db/Allocate.h"
 #include "db/Database.h"
 
 namespace {
 constexpr std::size_t LongestRecord = std::numeric_limits<std::int16_t>::max();
 }
 
-long DATABASE::Append(const void* data) {
+int DATABASE::PrepareAppend(std::int32_t count) {
     if (!IsOpen()) {
-        return Fail(DatabaseError::AppendNoFile);
+        return DatabaseError::AppendNoFile;
     }
     if (fileCounts_ == FileCounts::TooMany) {
-        return Fail(DatabaseError::AppendDamaged);
+        return DatabaseError::AppendDamaged;
+    }
+    if (count > std::numeric_limits<std::int32_t>::max() - header_.recordCount) {
+        return DatabaseError::AppendFull;
+    }
+    // What an AppendAll that was killed left behind the counted records is cut off while the header tells of
+    // it.
+    if (header_.reserved != 0) {
+        if (file_.Truncate(Area().OffsetOf(header_.recordCount)) != 0) {
+            return DatabaseError::AppendFailed;
+        }
+        header_.reserved = 0;
+    }
+    return DatabaseError::None;
+}
+
+long DATABASE::AppendAll(const void* data, std::size_t stride, std::int32_t count) {
+    if (const int code = PrepareAppend(count); code != DatabaseError::None) {
+        return Fail(code);
     }
     const std::int32_t number = header_.recordCount;
-    if (number == std::numeric_limits<std::int32_t>::max()) {
-        return Fail(DatabaseError::AppendFull);
+    if (count <= 0) {
+        return number;
     }
+    header_.reserved = count;
+    int code = WriteDbHeader() == 0 ? DatabaseError::None : DatabaseError::HeaderFailed;
+    if (code == DatabaseError::None &&
+        WriteNewRecords(static_cast<const std::uint8_t*>(data), stride, count) != 0) {
+        code = DatabaseError::AppendFailed;
+    }
+    if (code == DatabaseError::None) {
+        code = CountNewRecords(count);
+    }
+    if (code != DatabaseError::None) {
+        // While the header still announces them.
+        static_cast<void>(file_.Truncate(Area().OffsetOf(number)));
+        header_.reserved = 0;
+        static_cast<void>(WriteHeaderBytes());
+        return Fail(code);
+    }
+    currentRecord_ = number + count - 1;
+    return number;
+}
+
+int DATABASE::CountNewRecords(std::int32_t count) {
+    const DATABASE_HEADER before = header_;
+    header_.recordCount += count;
+    header_.reserved = 0;
+    if (WriteDbHeader() == 0) {
+        return DatabaseError::None;
+    }
+    header_ = before;
+    static_cast<void>(WriteHeaderBytes()); // part of the new header may have been written
+    return DatabaseError::HeaderFailed;
+}
+
+int DATABASE::WriteNewRecords(const std::uint8_t* data, std::size_t stride, std::int32_t count) {
+    constexpr std::size_t blockSize = 256 * 1024;
+    const std::size_t length = DataSize() + 1;
+    const auto perBlock = static_cast<std::int32_t>(std::max<std::size_t>(blockSize / length, 1));
+    const auto block =
+        TryAllocate<std::uint8_t>(length * static_cast<std::size_t>(std::min(perBlock, count)));
+    if (!block) {
+        return -1;
+    }
+    for (std::int32_t first = 0; first < count; first += perBlock) {
+        const std::int32_t records = std::min(perBlock, count - first);
+        std::uint8_t* end = block.get();
+        for (std::int32_t i = 0; i < records; ++i, data += stride, end += length) {
+            *end = RecordStatus::Active;
+            std::memcpy(end + 1, data, DataSize());
+        }
+        if (file_.WriteAt(Area().OffsetOf(header_.recordCount + first), block.get(),
+                          static_cast<std::size_t>(end - block.get())) != 0) {
+            return -1;
+        }
+    }
+    return 0;
+}
+
+long DATABASE::Append(const void* data) {
+    if (const int code = PrepareAppend(1); code != DatabaseError::None) {
+        return Fail(code);
+    }
+    const std::int32_t number = header_.recordCount;
     std::uint8_t record[LongestRecord];
     record[0] = RecordStatus::Active;
     std::memcpy(record + 1, data, DataSize());

@@ -33,6 +33,11 @@ const OPERATION Operations[] = {
          return database.Query("Small < 2", QueryMode::New) < 0 ? -1 : database.QueryUpdate("Name = other");
      },
      true},
+    {"AppendAll",
+     [](DATABASE& database) {
+         const ROW rows[] = {NewRow, Row("newer", 5, 6, 7, 8), NewRow};
+         return database.AppendAll(rows, sizeof(ROW), 3);
+     }},
 };
 
 // Tells whether the content is the old one or, where an operation works record by record, that of some moment
