@@ -141,6 +141,9 @@ TEST_F(FaultTest, KilledAtAnyCallLeavesTheOldContentOrTheNew) {
                 EXPECT_TRUE(killed || (at > 0 && WEXITSTATUS(status) == 0));
                 const CONTENT found = Reopened();
                 EXPECT_TRUE(found == changed || (killed && IsUnfinished(found, old, changed, operation)));
+                // What was left behind the counted records is no obstacle, and does not come back.
+                EXPECT_GE(DATABASE(path_.c_str()).Append(&NewRow), 0);
+                EXPECT_EQ(Reopened().size(), found.size() + 1);
             }
         }
     }
