@@ -2,7 +2,7 @@
 # Sourced by the other scripts: which Debian packages the work needs, and how they get there.
 
 # To build the program.
-build_packages=(g++ cmake ninja-build qt6-base-dev libgl-dev libcli11-dev)
+build_packages=(g++ cmake ninja-build qt6-base-dev libqt6svg6-dev libgl-dev libcli11-dev libcurl4-openssl-dev nlohmann-json3-dev)
 # To show it, with letters.
 run_packages=(fonts-dejavu-core)
 # To show it on a virtual display and take pictures.
@@ -11,6 +11,8 @@ display_packages=(xvfb xauth xdotool x11-utils imagemagick)
 test_packages=(libgtest-dev libgmock-dev libbenchmark-dev libsqlite3-dev poppler-utils clang-format)
 # For scripts/tidy.sh.
 tidy_packages=(clang-tidy clang-tools)
+# For scripts/fuzz.sh.
+fuzz_packages=(clang)
 
 # fail SENTENCE: ends the script with one clear sentence.
 fail() {
