@@ -1,110 +1,14 @@
 #pragma once
 
-#include <deque>
-#include <functional>
-#include <string>
-#include <utility>
-
-#include <QAbstractButton>
-#include <QApplication>
-#include <QDeadlineTimer>
-#include <QMessageBox>
-#include <QTest>
 #include <gtest/gtest.h>
 
-#include "platform/Application.h"
+#include "StepDriver.h"
 
-// Works the program as a person would, while the test's own code waits in a modal dialog or in the
-// application's loop: each step waits for its condition and then does its action, with real events on
-// widgets. Steps begin as soon as there is an application object. A condition that does not come true within
-// a time limit fails the test and quits the application.
-class Driver : public QObject {
-    Q_DISABLE_COPY_MOVE(Driver)
-
+// The steps of a test: what goes wrong in one fails it.
+class Driver : public StepDriver {
   public:
-    using Condition = std::function<bool()>;
-    using Action = std::function<void()>;
+    ~Driver() override { FailForStepsLeft(); }
 
-    Driver() {
-        self_ = this;
-        if (QCoreApplication::instance())
-            Begin();
-        else
-            qAddPreRoutine([] { self_->Begin(); });
-    }
-    ~Driver() override {
-        for (const Step& step : steps_)
-            ADD_FAILURE() << "never came to: " << step.what;
-        self_ = nullptr;
-    }
-
-    Driver& When(std::string what, Condition condition, Action action) {
-        steps_.push_back({std::move(what), std::move(condition), std::move(action)});
-        return *this;
-    }
-
-    // Waits for an alert with this text and presses one of its buttons.
-    Driver& Answer(const char* text, const char* button) {
-        return When(
-            std::string("alert: ") + text,
-            [text] { return Alert() && Alert()->text() == QString::fromUtf8(text); },
-            [button] { Press(Alert(), button); });
-    }
-
-    // The alert that is shown; null when there is none.
-    static QMessageBox* Alert() { return qobject_cast<QMessageBox*>(QApplication::activeModalWidget()); }
-    // The visible window with this title; null when there is none.
-    static QWidget* Window(const char* title) {
-        for (QWidget* window : QApplication::topLevelWidgets()) {
-            if (window->isVisible() && window->windowTitle() == QString::fromUtf8(title))
-                return window;
-        }
-        return nullptr;
-    }
-    static Condition WindowShown(const char* title) {
-        return [title] { return Window(title) != nullptr; };
-    }
-    // Clicks a button found by its name.
-    static void Press(QWidget* window, const char* button) {
-        auto* found = window->findChild<QAbstractButton*>(QString::fromUtf8(button));
-        ASSERT_TRUE(found) << button;
-        QTest::mouseClick(found, Qt::LeftButton);
-    }
-
-  private:
-    struct Step {
-        std::string what;
-        Condition condition;
-        Action action;
-    };
-
-    static constexpr int PollMilliseconds = 5;
-    static constexpr int PatienceMilliseconds = 60000;
-
-    void Begin() {
-        deadline_.setRemainingTime(PatienceMilliseconds);
-        timer_ = startTimer(PollMilliseconds);
-    }
-    void timerEvent(QTimerEvent*) override {
-        // A timer of its own for each poll: the toolkit holds one back while its event is handled, and an
-        // action may wait in a loop of its own.
-        killTimer(timer_);
-        timer_ = startTimer(PollMilliseconds);
-        if (!steps_.empty() && steps_.front().condition()) {
-            const Action action = std::move(steps_.front().action);
-            steps_.pop_front();
-            deadline_.setRemainingTime(PatienceMilliseconds);
-            action();
-        } else if (deadline_.hasExpired()) {
-            ADD_FAILURE() << "waited in vain for: " << (steps_.empty() ? "the end" : steps_.front().what);
-            steps_.clear();
-            killTimer(timer_);
-            be_app->PostMessage(B_QUIT_REQUESTED);
-        }
-    }
-
-    static inline Driver* self_ = nullptr;
-    std::deque<Step> steps_;
-    QDeadlineTimer deadline_;
-    int timer_ = 0;
+  protected:
+    void Fail(const std::string& sentence) override { ADD_FAILURE() << sentence; }
 };

@@ -1,0 +1,115 @@
+#pragma once
+
+#include <deque>
+#include <functional>
+#include <string>
+#include <utility>
+
+#include <QAbstractButton>
+#include <QApplication>
+#include <QDeadlineTimer>
+#include <QMessageBox>
+#include <QTest>
+
+#include "platform/Application.h"
+
+// Works the program as a person would, while the caller's own code waits in a modal dialog or in the
+// application's loop: each step waits for its condition and then does its action, with real events on
+// widgets. Steps begin as soon as there is an application object. A condition that does not come true within
+// a time limit is told to the subclass and quits the application. One at a time; interface thread.
+class StepDriver : public QObject {
+    Q_DISABLE_COPY_MOVE(StepDriver)
+
+  public:
+    using Condition = std::function<bool()>;
+    using Action = std::function<void()>;
+
+    StepDriver() {
+        self_ = this;
+        if (QCoreApplication::instance())
+            Begin();
+        else
+            qAddPreRoutine([] { self_->Begin(); });
+    }
+    ~StepDriver() override { self_ = nullptr; }
+
+    StepDriver& When(std::string what, Condition condition, Action action) {
+        steps_.push_back({std::move(what), std::move(condition), std::move(action)});
+        return *this;
+    }
+
+    // Waits for an alert with this text and presses one of its buttons.
+    StepDriver& Answer(const char* text, const char* button) {
+        return When(
+            std::string("alert: ") + text,
+            [text] { return Alert() && Alert()->text() == QString::fromUtf8(text); },
+            [button] { Press(Alert(), button); });
+    }
+
+    // The alert that is shown; null when there is none.
+    static QMessageBox* Alert() { return qobject_cast<QMessageBox*>(QApplication::activeModalWidget()); }
+    // The visible window with this title; null when there is none.
+    static QWidget* Window(const char* title) {
+        for (QWidget* window : QApplication::topLevelWidgets()) {
+            if (window->isVisible() && window->windowTitle() == QString::fromUtf8(title))
+                return window;
+        }
+        return nullptr;
+    }
+    static Condition WindowShown(const char* title) {
+        return [title] { return Window(title) != nullptr; };
+    }
+    // Clicks a button found by its name; without such a button the step after it will wait in vain.
+    static void Press(QWidget* window, const char* button) {
+        if (auto* found = window->findChild<QAbstractButton*>(QString::fromUtf8(button)))
+            QTest::mouseClick(found, Qt::LeftButton);
+        else
+            self_->Fail(std::string("there is no button ") + button);
+    }
+
+  protected:
+    virtual void Fail(const std::string& sentence) = 0;
+    // Tells of every step that was not reached, which subclasses want at their end.
+    void FailForStepsLeft() {
+        for (const Step& step : steps_)
+            Fail("never came to: " + step.what);
+        steps_.clear();
+    }
+
+  private:
+    struct Step {
+        std::string what;
+        Condition condition;
+        Action action;
+    };
+
+    static constexpr int PollMilliseconds = 5;
+    static constexpr int PatienceMilliseconds = 60000;
+
+    void Begin() {
+        deadline_.setRemainingTime(PatienceMilliseconds);
+        timer_ = startTimer(PollMilliseconds);
+    }
+    void timerEvent(QTimerEvent*) override {
+        // A timer of its own for each poll: the toolkit holds one back while its event is handled, and an
+        // action may wait in a loop of its own.
+        killTimer(timer_);
+        timer_ = startTimer(PollMilliseconds);
+        if (!steps_.empty() && steps_.front().condition()) {
+            const Action action = std::move(steps_.front().action);
+            steps_.pop_front();
+            deadline_.setRemainingTime(PatienceMilliseconds);
+            action();
+        } else if (deadline_.hasExpired()) {
+            Fail("waited in vain for: " + (steps_.empty() ? "the end" : steps_.front().what));
+            steps_.clear();
+            killTimer(timer_);
+            be_app->PostMessage(B_QUIT_REQUESTED);
+        }
+    }
+
+    static inline StepDriver* self_ = nullptr;
+    std::deque<Step> steps_;
+    QDeadlineTimer deadline_;
+    int timer_ = 0;
+};
