@@ -1,0 +1,36 @@
+#pragma once
+
+#include <cstddef>
+#include <string_view>
+
+struct QuoteSource;
+
+// Is told, step by step, what a look-up of a price does and finds, for whoever wants to show it to a person.
+// It decides nothing. The caller of the look-up owns it; every call comes on the thread of the look-up, and
+// what is passed is borrowed for that call alone. Page text is as the server sent it: any bytes.
+class QuoteObserver {
+  public:
+    QuoteObserver() = default;
+    QuoteObserver(const QuoteObserver&) = delete;
+    QuoteObserver& operator=(const QuoteObserver&) = delete;
+    virtual ~QuoteObserver() = default;
+
+    // A source is about to be asked; its path ends with the ticker.
+    virtual void SourceTried(const QuoteSource& /*source*/) {}
+    // A line of the source file cannot be used; lines count from 1.
+    virtual void SourceSkipped(int /*line*/, const char* /*reason*/) {}
+    // There is a connection to this server, named by address and port.
+    virtual void Connected(const char* /*server*/) {}
+    // The exchange ended without a whole page for the reason given.
+    virtual void Failed(const char* /*reason*/) {}
+    // A piece of the page arrived.
+    virtual void PieceReceived(std::string_view /*piece*/) {}
+    // The marker stands at `position` of `piece`.
+    virtual void MarkerFound(std::string_view /*piece*/, std::size_t /*position*/) {}
+    // The price text, the page text from behind it to the end of the piece, and what the two were read as. A
+    // fraction below 0 is malformed.
+    virtual void PriceRead(std::string_view /*token*/, std::string_view /*following*/, double /*price*/,
+                           double /*fraction*/) {}
+    // The source was asked, and this is its answer: a price or a status.
+    virtual void SourceAnswered(float /*result*/) {}
+};
