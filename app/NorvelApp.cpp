@@ -10,6 +10,7 @@
 #include "db/Compaction.h"
 #include "db/Database.h"
 #include "dialogs/PasswordDialog.h"
+#include "resources/DesktopFiles.h"
 #include "resources/StatusImages.h"
 #include "util/CharacterBuffer.h"
 #include "util/IniFile.h"
@@ -60,6 +61,8 @@ void KeepRowMemory() {
 
 NorvelApp::NorvelApp() : BApplication(Signature) {
     KeepRowMemory();
+    // Without its icon the program works all the same.
+    static_cast<void>(SetDesktopIdentity(DesktopId, ProgramIcon()));
     app_state = &state_;
     const bool ready = Initialize() == 0;
     if (!ready)

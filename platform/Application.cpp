@@ -6,6 +6,10 @@
 #include <mutex>
 
 #include <QApplication>
+#include <QIcon>
+#include <QPainter>
+#include <QPixmap>
+#include <QSvgRenderer>
 #include <QTimer>
 
 #include "platform/Window.h"
@@ -21,6 +25,8 @@ namespace {
 
 constexpr int kQuitRetryMilliseconds = 5;
 constexpr bigtime_t kThreadPatience = 5000000;
+
+constexpr int kIconSizes[] = {16, 22, 24, 32, 48, 64, 128, 256};
 
 std::string gExecutablePath; // empty: ask the system
 
@@ -45,7 +51,6 @@ BApplication::BApplication(const char* signature)
     // the same.
     std::setlocale(LC_NUMERIC, "C");
     QApplication::setApplicationName(QStringLiteral("Quorvan"));
-    QApplication::setDesktopFileName(QStringLiteral("quorvan"));
     // The loop ends when the application says so, not when a start-up dialog closes before the first window
     // opens.
     QApplication::setQuitOnLastWindowClosed(false);
@@ -99,6 +104,24 @@ BWindow* BApplication::WindowAt(int32 index) const {
     if (index < 0 || static_cast<std::size_t>(index) >= peer_->windows.size())
         return nullptr;
     return peer_->windows[static_cast<std::size_t>(index)];
+}
+
+bool BApplication::SetDesktopIdentity(const char* desktopId, std::string_view svgIcon) {
+    QApplication::setDesktopFileName(QString::fromUtf8(desktopId));
+    QSvgRenderer picture(QByteArray(svgIcon.data(), static_cast<qsizetype>(svgIcon.size())));
+    if (!picture.isValid())
+        return false;
+    QIcon icon;
+    for (const int size : kIconSizes) {
+        QPixmap pixels(size, size);
+        pixels.fill(Qt::transparent);
+        QPainter painter(&pixels);
+        picture.render(&painter);
+        painter.end();
+        icon.addPixmap(pixels);
+    }
+    QApplication::setWindowIcon(icon);
+    return true;
 }
 
 status_t BApplication::GetAppInfo(app_info* info) const {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <string_view>
 #include <vector>
 
 #include "platform/Looper.h"
@@ -41,6 +42,11 @@ class BApplication : public BLooper {
     [[nodiscard]] int32 CountWindows() const;
     // Null when the index lies outside. Any thread.
     [[nodiscard]] BWindow* WindowAt(int32 index) const;
+
+    // How the desktop knows the program: the name of its desktop entry (without ".desktop") and the icon of
+    // all its windows, an SVG picture that is drawn anew for every usual size. To be called before the first
+    // window is made. False, with the icon left as it was, when the picture cannot be read.
+    [[nodiscard]] static bool SetDesktopIdentity(const char* desktopId, std::string_view svgIcon);
 
     // Always B_OK.
     status_t GetAppInfo(app_info* info) const;
