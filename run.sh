@@ -6,13 +6,14 @@ here=$(cd "$(dirname "$0")" && pwd)
 
 usage() {
     cat <<'END'
-Usage: ./run.sh [FOLDER] [--sample]
+Usage: ./run.sh [FOLDER] [--sample] [--desktop]
 
 Installs what is missing, builds Quorvan, makes FOLDER (~/Quorvan when none is
 given) and starts the program from there. Files in FOLDER that exist are kept;
 only the program itself is brought up to date.
 
   --sample   fill a new folder with two sample portfolios
+  --desktop  put the folder's program into your desktop's menu, with its icon
 
 Without a display the program runs on a virtual one, is taken on a short tour,
 and pictures of it are saved.
@@ -23,7 +24,7 @@ folder=
 options=()
 for argument in "$@"; do
     case $argument in
-    --sample) options+=(--sample) ;;
+    --sample | --desktop) options+=("$argument") ;;
     -h | --help) usage && exit 0 ;;
     -*) usage >&2 && exit 2 ;;
     *)

@@ -13,6 +13,7 @@
 
 #include "app/RecordLayouts.h"
 #include "db/Database.h"
+#include "tools/DesktopFiles.h"
 #include "tools/FirstFiles.h"
 #include "tools/SampleData.h"
 #include "util/WholeFile.h"
@@ -53,8 +54,10 @@ class FolderSetup {
         : options_(options), output_(output), errors_(errors) {}
 
     int Run();
+    int RemoveFromDesktop();
 
   private:
+    bool FindFolder();
     bool MakeFolder();
     bool MakeSubfolder(const std::string& name);
     void MakeDataFiles();
@@ -65,6 +68,8 @@ class FolderSetup {
     void MakeFile(const std::string& name, std::string_view content, mode_t mode);
     void InstallProgram();
     void CopyProgram(std::string_view content, ExistingFile existing);
+    bool HasDataFolder();
+    void AddToDesktop();
 
     // The outcome of a step that ends with a file of that name: errno has the reason of a failure.
     void Conclude(bool done, const std::string& name, const std::string& remark);
@@ -112,10 +117,11 @@ void FolderSetup::Conclude(bool done, const std::string& name, const std::string
         Fail(PathOf(name) + " cannot be made: " + Reason(error) + ".");
 }
 
-bool FolderSetup::MakeFolder() {
+bool FolderSetup::FindFolder() {
     std::error_code error;
-    const fs::path wanted =
-        options_.folder.empty() ? fs::path() : fs::weakly_canonical(options_.folder, error);
+    const fs::path wanted = options_.folder.empty()
+                                ? fs::path()
+                                : fs::weakly_canonical(fs::absolute(options_.folder, error), error);
     std::string path = wanted.string();
     while (path.size() > 1 && path.back() == '/')
         path.pop_back();
@@ -129,15 +135,18 @@ bool FolderSetup::MakeFolder() {
              " bytes, and Quorvan's files need one of at most " + std::to_string(MaxFolderLength) + ".");
         return false;
     }
-    fs::create_directories(path, error);
-    if (!error && !fs::is_directory(path, error) && !error)
-        error = std::make_error_code(std::errc::not_a_directory);
-    if (error) {
-        Fail("The folder " + path + " cannot be made: " + error.message() + ".");
-        return false;
-    }
     folder_ = path;
     return true;
+}
+
+bool FolderSetup::MakeFolder() {
+    std::error_code error;
+    fs::create_directories(folder_, error);
+    if (!error && !fs::is_directory(folder_, error) && !error)
+        error = std::make_error_code(std::errc::not_a_directory);
+    if (error)
+        Fail("The folder " + folder_ + " cannot be made: " + error.message() + ".");
+    return !error;
 }
 
 bool FolderSetup::MakeSubfolder(const std::string& name) {
@@ -234,8 +243,26 @@ void FolderSetup::InstallProgram() {
     }
 }
 
+bool FolderSetup::HasDataFolder() {
+    if (options_.dataFolder.empty())
+        Fail("There is no home folder, so the desktop keeps no programs for you.");
+    return !options_.dataFolder.empty();
+}
+
+void FolderSetup::AddToDesktop() {
+    if (!HasDataFolder() || !InstallDesktopFiles(PathOf("quorvan"), options_.dataFolder, output_, errors_))
+        failed_ = true;
+}
+
+int FolderSetup::RemoveFromDesktop() {
+    return FindFolder() && HasDataFolder() &&
+                   RemoveDesktopFiles(PathOf("quorvan"), options_.dataFolder, output_, errors_)
+               ? 0
+               : 1;
+}
+
 int FolderSetup::Run() {
-    if (!MakeFolder())
+    if (!FindFolder() || !MakeFolder())
         return 1;
     output_ << "Quorvan folder " << folder_ << '\n';
     MakeDataFiles();
@@ -245,6 +272,8 @@ int FolderSetup::Run() {
     if (MakeSubfolder("help"))
         MakeFile("help/Quorvan.html", HelpDocument(), 0666);
     InstallProgram();
+    if (options_.desktop && !failed_)
+        AddToDesktop();
     return failed_ ? 1 : 0;
 }
 
@@ -252,4 +281,8 @@ int FolderSetup::Run() {
 
 int RunSetup(const SetupOptions& options, std::ostream& output, std::ostream& errors) {
     return FolderSetup(options, output, errors).Run();
+}
+
+int RunDesktopRemoval(const SetupOptions& options, std::ostream& output, std::ostream& errors) {
+    return FolderSetup(options, output, errors).RemoveFromDesktop();
 }

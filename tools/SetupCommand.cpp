@@ -5,6 +5,7 @@
 #include <iostream>
 #include <memory>
 
+#include "tools/DesktopFiles.h"
 #include "tools/Setup.h"
 
 namespace {
@@ -34,10 +35,20 @@ void AddSetupCommand(CLI::App& application, int& status) {
                         "quorvan-cli)");
     command->add_flag("--update-program", options->updateProgram,
                       "Replace the folder's program when it is another version");
-    command->callback([options, &status] {
+    CLI::Option* desktop = command->add_flag(
+        "--desktop", options->desktop,
+        "Put the folder's program among the desktop's, with its icon (for you, not for everybody)");
+    const auto remove = std::make_shared<bool>(false);
+    command
+        ->add_flag("--remove-desktop", *remove,
+                   "Take the folder's program out of the desktop's; do nothing else")
+        ->excludes(desktop);
+    command->callback([options, remove, &status] {
         if (options->program.empty())
             options->program = FindProgram();
-        status = RunSetup(*options, std::cout, std::cerr);
+        options->dataFolder = PersonalDataFolder();
+        status = *remove ? RunDesktopRemoval(*options, std::cout, std::cerr)
+                         : RunSetup(*options, std::cout, std::cerr);
         std::cout.flush();
     });
 }
