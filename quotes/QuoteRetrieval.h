@@ -1,6 +1,7 @@
 #pragma once
 
 #include <limits>
+#include <string_view>
 
 class QuoteObserver;
 
@@ -30,9 +31,14 @@ struct QuoteContext {
 // leaves a line in the debug log.
 [[nodiscard]] float GetPriceQuote(const char* ticker, const QuoteContext& context);
 
+// As GetPriceQuote, with the lines of a quote-source file in `sources`; the context's path is not used.
+[[nodiscard]] float GetPriceQuoteFrom(std::string_view sources, const char* ticker,
+                                      const QuoteContext& context);
+
 // Asks one source: fetches the page `path`, which ends with the ticker already, and reads the price behind
 // `tag` and `skip` characters ">". `host` is a name that is asked by plain HTTP on port 80, a name with
-// ":PORT", or "https://NAME" with or without ":PORT". A plain source has no time limit.
+// ":PORT", or "https://NAME" with or without ":PORT"; for anything else the answer is NoQuote. A plain source
+// has no time limit. The request takes at most 1023 bytes.
 //
 // The price or a status: NoQuote when the name does not resolve, the page has no price, or its number is
 // beyond a float; QuoteNetworkFailure when there is no connection or the request cannot be sent.

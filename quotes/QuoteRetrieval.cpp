@@ -1,0 +1,105 @@
+#include "quotes/QuoteRetrieval.h"
+
+#include <string>
+
+#include "quotes/HostField.h"
+#include "quotes/HostLookup.h"
+#include "quotes/PlainExchange.h"
+#include "quotes/QuoteReport.h"
+#include "quotes/QuoteScanner.h"
+#include "quotes/QuoteSource.h"
+#include "quotes/TlsExchange.h"
+#include "util/WholeFile.h"
+
+namespace {
+
+constexpr std::size_t MaxSourceFileSize = 16'000'000;
+
+float AskSource(const char* host, const char* path, const char* tag, int skip, const QuoteContext& context,
+                const QuoteReport& report) {
+    report.Log("In GetQuote\n");
+    HostField server;
+    if (!ParseHostField(host, &server)) {
+        const char* reason = "the host is none of NAME, NAME:PORT and https://NAME[:PORT]";
+        report.Log("'%s': %s\n", host, reason);
+        report.Observer().Failed(reason);
+        return NoQuote;
+    }
+    QuoteScanner scanner(tag, skip, report);
+    if (server.tls)
+        return AskOverTls(server, path, scanner, context, report);
+    return PlainExchange(context, report).Ask(server, path, scanner);
+}
+
+// Null, or why the line cannot be used for this ticker.
+const char* PrepareSource(const QuoteSourceReader& reader, const char* ticker, QuoteSource* source) {
+    if (reader.Problem())
+        return reader.Problem();
+    *source = reader.Source();
+    return AppendTicker(source, ticker) ? nullptr : "its path has more than 127 bytes with the ticker";
+}
+
+float AskForTicker(const QuoteSource& source, const QuoteContext& context, const QuoteReport& report) {
+    report.Log("Checking '%s%s'\n", source.host, source.path);
+    report.Observer().SourceTried(source);
+    const float result = AskSource(source.host, source.path, source.tag, source.skip, context, report);
+    report.Observer().SourceAnswered(result);
+    if (result > 0)
+        report.LogNumber("Price = ", result);
+    else if (result == QuoteCancelled)
+        report.Log("cancelled\n");
+    return result;
+}
+
+bool EndsTheSearch(float result) {
+    return result > 0 || result == QuoteSearchEnded || result == QuoteCancelled;
+}
+
+float SearchSources(std::string_view sources, const char* ticker, const QuoteContext& context,
+                    const QuoteReport& report) {
+    using Line = QuoteSourceReader::Line;
+    QuoteSourceReader reader(sources);
+    float result = NoQuote;
+    for (Line line = reader.Next(); line != Line::EndOfFile && !EndsTheSearch(result); line = reader.Next()) {
+        // A line that is no source, be it the last, takes back what the source before it answered.
+        result = NoQuote;
+        if (line == Line::EndOfList)
+            break;
+        if (line == Line::Skipped && !reader.Problem())
+            continue;
+        QuoteSource source;
+        if (const char* problem = PrepareSource(reader, ticker, &source)) {
+            report.Log("Skipped line %d: %s\n", reader.LineNumber(), problem);
+            report.Observer().SourceSkipped(reader.LineNumber(), problem);
+            continue;
+        }
+        result = AskForTicker(source, context, report);
+    }
+    return result;
+}
+
+} // namespace
+
+float GetPriceQuote(const char* ticker, const QuoteContext& context) {
+    const QuoteReport report(context.logPath, context.observer);
+    std::string sources;
+    if (!ReadWholeFile(context.sourcePath, sources, MaxSourceFileSize)) {
+        report.Log("Unable to open '%s'\n", context.sourcePath);
+        report.Observer().Failed((std::string("the file ") + context.sourcePath + " cannot be read").c_str());
+        return NoQuoteSources;
+    }
+    return SearchSources(sources, ticker, context, report);
+}
+
+float GetPriceQuoteFrom(std::string_view sources, const char* ticker, const QuoteContext& context) {
+    return SearchSources(sources, ticker, context, QuoteReport(context.logPath, context.observer));
+}
+
+float GetQuote(const char* host, const char* path, const char* tag, int skip, const QuoteContext& context) {
+    return AskSource(host, path, tag, skip, context, QuoteReport(context.logPath, context.observer));
+}
+
+bool IsConnected(const char* hostName, int stopFd) {
+    in_addr address{};
+    return LookUpHost(hostName, stopFd, &address) == HostLookup::Found;
+}

@@ -1,0 +1,86 @@
+#include "quotes/QuoteSource.h"
+
+#include <algorithm>
+#include <charconv>
+#include <cstring>
+#include <limits>
+
+#include "quotes/Tokens.h"
+#include "util/CharacterBuffer.h"
+
+namespace {
+
+constexpr std::size_t MaxPiece = 255;
+constexpr std::size_t MinLine = 10; // a shorter one ends the list
+constexpr std::string_view WhiteSpace = " \t\n\v\f\r";
+
+constexpr const char* TooFewFields = "it has fewer than five fields";
+
+// Null, or why the word cannot be the field.
+template <std::size_t Size>
+const char* TakeField(std::string_view& line, char (&field)[Size], const char* tooLong) {
+    const auto word = TakeToken(line, WhiteSpace);
+    if (!word)
+        return TooFewFields;
+    if (word->size() >= Size)
+        return tooLong;
+    CopyText(field, *word);
+    return nullptr;
+}
+
+// Reads as far as there are digits.
+const char* TakeNumber(std::string_view& line, int* number) {
+    auto word = TakeToken(line, WhiteSpace);
+    if (!word)
+        return TooFewFields;
+    if (word->size() > 1 && word->front() == '+' && (*word)[1] != '-')
+        word->remove_prefix(1);
+    const auto [end, error] = std::from_chars(word->data(), word->data() + word->size(), *number);
+    if (error == std::errc::result_out_of_range)
+        *number = word->front() == '-' ? std::numeric_limits<int>::min() : std::numeric_limits<int>::max();
+    return error == std::errc::invalid_argument ? "its skip count is no number" : nullptr;
+}
+
+} // namespace
+
+const char* ParseQuoteSource(std::string_view line, QuoteSource* source) {
+    line = line.substr(0, line.find('\0'));
+    *source = {};
+    const char* problem = TakeField(line, source->label, "its label has more than 31 bytes");
+    if (!problem)
+        problem = TakeField(line, source->host, "its host has more than 63 bytes");
+    if (!problem)
+        problem = TakeField(line, source->path, "its path has more than 127 bytes");
+    if (!problem)
+        problem = TakeField(line, source->tag, "its marker has more than 31 bytes");
+    if (!problem)
+        problem = TakeNumber(line, &source->skip);
+    return problem;
+}
+
+bool AppendTicker(QuoteSource* source, std::string_view ticker) {
+    const std::size_t length = std::strlen(source->path);
+    if (length + ticker.size() >= sizeof source->path)
+        return false;
+    CopyText(source->path + length, sizeof source->path - length, ticker);
+    return true;
+}
+
+QuoteSourceReader::Line QuoteSourceReader::Next() {
+    problem_ = nullptr;
+    if (rest_.empty())
+        return Line::EndOfFile;
+    const std::size_t feed = rest_.substr(0, MaxPiece).find('\n');
+    const std::size_t length = feed == rest_.npos ? std::min(MaxPiece, rest_.size()) : feed + 1;
+    std::string_view piece = rest_.substr(0, length);
+    piece = piece.substr(0, piece.find('\0'));
+    lineNumber_ += insideLine_ ? 0 : 1;
+    insideLine_ = feed == rest_.npos;
+    rest_.remove_prefix(length);
+    if (piece.size() < MinLine)
+        return Line::EndOfList;
+    if (piece.front() == ';')
+        return Line::Skipped;
+    problem_ = ParseQuoteSource(piece, &source_);
+    return problem_ ? Line::Skipped : Line::Source;
+}
