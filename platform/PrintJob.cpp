@@ -1,6 +1,7 @@
 #include "platform/PrintJob.h"
 
 #include <algorithm>
+#include <cerrno>
 #include <string>
 
 #include <QFile>
@@ -13,6 +14,7 @@
 #include "platform/View.h"
 #include "platform/private/Convert.h"
 #include "platform/private/Loop.h"
+#include "platform/private/OutputFile.h"
 #include "platform/private/ViewPeer.h"
 #include "platform/private/ViewWidget.h"
 
@@ -106,10 +108,31 @@ struct PrintJobPeer {
     QPrinter printer{QPrinter::HighResolution};
     QPainter painter;
     bool pageWanted = false; // the next drawing begins a new page
+    OutputFile file;
+    QString wantedFile; // what the job writes to in the end; empty for a printer
 
     [[nodiscard]] bool IsUsable() const {
         return painter.isActive() && printer.printerState() != QPrinter::Aborted &&
                printer.printerState() != QPrinter::Error;
+    }
+    // Begins with the temporary file in the wanted one's place, for which CommitJob or CancelJob puts it
+    // back.
+    [[nodiscard]] bool Begin() {
+        wantedFile = printer.outputFileName();
+        if (wantedFile.isEmpty())
+            return printer.outputFormat() != QPrinter::PdfFormat && painter.begin(&printer);
+        if (!file.Begin(QFile::encodeName(wantedFile).toStdString()))
+            return false;
+        printer.setOutputFileName(QFile::decodeName(file.WritePath().c_str()));
+        if (painter.begin(&printer))
+            return true;
+        file.Drop();
+        printer.setOutputFileName(wantedFile);
+        errno = EIO;
+        return false;
+    }
+    [[nodiscard]] QString OutputFileName() const {
+        return painter.isActive() ? wantedFile : printer.outputFileName();
     }
 };
 
@@ -151,7 +174,7 @@ BMessage* BPrintJob::Settings() const {
     settings->AddFloat("bottom margin", static_cast<float>(margins.bottom()));
     settings->AddBool("landscape", layout.orientation() == QPageLayout::Landscape);
     settings->AddString("printer", printer.printerName().toUtf8().constData());
-    settings->AddString("output file", printer.outputFileName().toUtf8().constData());
+    settings->AddString("output file", peer_->OutputFileName().toUtf8().constData());
     settings->AddInt32("copies", printer.copyCount());
     settings->AddInt32("resolution", printer.resolution());
     settings->AddBool("colour", printer.colorMode() == QPrinter::Color);
@@ -178,9 +201,7 @@ void BPrintJob::SetSettings(const BMessage* message) {
 }
 
 bool BPrintJob::BeginJob() {
-    const QPrinter& printer = peer_->printer;
-    const bool nowhere = printer.outputFormat() == QPrinter::PdfFormat && printer.outputFileName().isEmpty();
-    return !nowhere && !peer_->painter.isActive() && peer_->painter.begin(&peer_->printer);
+    return !peer_->painter.isActive() && peer_->Begin();
 }
 
 bool BPrintJob::CanContinue() const {
@@ -222,9 +243,17 @@ void BPrintJob::SpoolPage() {
     peer_->pageWanted = true;
 }
 
-void BPrintJob::CommitJob() {
-    if (peer_->painter.isActive())
-        peer_->painter.end();
+bool BPrintJob::CommitJob() {
+    if (!peer_->painter.isActive())
+        return false;
+    const bool usable = peer_->IsUsable();
+    if (!peer_->painter.end() || !usable) {
+        peer_->file.Drop();
+        errno = EIO;
+        return false;
+    }
+    peer_->printer.setOutputFileName(peer_->wantedFile);
+    return peer_->file.Commit();
 }
 
 void BPrintJob::CancelJob() {
@@ -232,6 +261,6 @@ void BPrintJob::CancelJob() {
         return;
     peer_->printer.abort();
     peer_->painter.end();
-    if (!peer_->printer.outputFileName().isEmpty())
-        QFile::remove(peer_->printer.outputFileName());
+    peer_->file.Drop();
+    peer_->printer.setOutputFileName(peer_->wantedFile);
 }

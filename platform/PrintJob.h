@@ -32,7 +32,7 @@ class BPrintJob {
     // Takes the set-up from message; what it lacks keeps its default.
     void SetSettings(const BMessage* message);
 
-    // False when the printer or file cannot be opened.
+    // False when the printer or file cannot be opened; errno then says why for a file.
     [[nodiscard]] bool BeginJob();
     [[nodiscard]] bool CanContinue() const;
     // The whole sheet, from the printable part's left top.
@@ -44,9 +44,11 @@ class BPrintJob {
     void DrawView(BView* view, BRect rect, BPoint where);
     // Ends the page; what is drawn next goes on a new one.
     void SpoolPage();
-    // Hands the pages over, or ends the file.
-    void CommitJob();
-    // Drops the pages; a file begun is removed.
+    // Hands the pages over, or puts the finished file in its place: until then one that was there before
+    // stays. False when the job was not begun, or could not be written; errno then says why for a file, and
+    // there is no new one.
+    [[nodiscard]] bool CommitJob();
+    // Drops the pages, and a file begun.
     void CancelJob();
 
   private:

@@ -1,8 +1,11 @@
 // Print jobs into PDF files, read back with a PDF reader.
 #include <array>
+#include <cerrno>
+#include <csignal>
 #include <cstdio>
 #include <filesystem>
 #include <memory>
+#include <sys/resource.h>
 
 #include <QDialog>
 #include <QImage>
@@ -91,7 +94,7 @@ TEST(PrintJobs, DrawViewsAndControlsInPoints) {
     job.job.SpoolPage();
     job.job.DrawView(page, BRect(0, 50, 522, 600), BPoint(0, 100));
     job.job.SpoolPage();
-    job.job.CommitJob();
+    ASSERT_TRUE(job.job.CommitJob());
     EXPECT_FALSE(job.job.CanContinue());
 
     EXPECT_NE(Output("pdfinfo " + file).find(" 2\nEncrypted"), std::string::npos)
@@ -165,25 +168,61 @@ TEST(PrintJobs, KeepTheirSetUpInAMessageAndRefuseNonsense) {
     EXPECT_NEAR(second.PrintableRect().Width(), first.PrintableRect().Width(), 1);
 }
 
-TEST(PrintJobs, ThatCannotBeginOrAreCancelledLeaveNothing) {
+TEST(PrintJobs, LeaveFilesAsTheyWereUnlessAllIsWritten) {
     Stage stage;
     const TemporaryFolder folder;
     auto* page = stage.Add(new Page(BRect(0, 0, 500, 700), "Page"));
-    {
-        Job nowhere(folder.Path() + "/missing/report.pdf");
-        EXPECT_FALSE(nowhere.job.BeginJob());
-        nowhere.job.DrawView(page, page->Bounds(), BPoint(0, 0));
-        nowhere.job.SpoolPage();
-        nowhere.job.CommitJob();
+    const auto begin = [&](Job& job) {
+        const bool begun = job.job.BeginJob();
+        job.job.DrawView(page, page->Bounds(), BPoint(0, 0));
+        job.job.SpoolPage();
+        return begun;
+    };
+    const auto files = [&] { return std::distance(std::filesystem::directory_iterator(folder.Path()), {}); };
+    folder.Write("old.pdf", "old");
+    std::filesystem::permissions(folder.File("old.pdf"), std::filesystem::perms{0640});
+    std::filesystem::create_symlink("old.pdf", folder.File("link.pdf"));
+    std::filesystem::create_directory(folder.File("folder.pdf"));
+    for (const auto& [name, reason] : {std::pair{"missing/report.pdf", ENOENT}, {"folder.pdf", EISDIR}}) {
+        Job nowhere(folder.File(name));
+        EXPECT_FALSE(begin(nowhere)) << name;
+        EXPECT_EQ(errno, reason) << name;
+        EXPECT_FALSE(nowhere.job.CommitJob()) << name;
     }
-    const std::string file = folder.Path() + "/report.pdf";
-    {
-        Job dropped(file);
-        ASSERT_TRUE(dropped.job.BeginJob());
+    for (const char* name : {"new.pdf", "link.pdf"}) {
+        Job dropped(folder.File(name));
+        ASSERT_TRUE(begin(dropped));
         EXPECT_FALSE(dropped.job.BeginJob());
-        dropped.job.DrawView(page, page->Bounds(), BPoint(0, 0));
     }
-    EXPECT_FALSE(std::filesystem::exists(file));
+    {
+        Job full(folder.File("old.pdf"));
+        ASSERT_TRUE(begin(full));
+        std::signal(SIGXFSZ, SIG_IGN);
+        rlimit before{};
+        getrlimit(RLIMIT_FSIZE, &before);
+        const rlimit little{2000, before.rlim_max};
+        setrlimit(RLIMIT_FSIZE, &little);
+        EXPECT_FALSE(full.job.CommitJob());
+        EXPECT_EQ(errno, EIO);
+        setrlimit(RLIMIT_FSIZE, &before);
+    }
+    EXPECT_EQ(folder.Read("old.pdf"), "old");
+    EXPECT_EQ(files(), 3);
+    // A link's target is replaced, and keeps its permissions; the job still tells the name that it was given.
+    Job good(folder.File("link.pdf"));
+    ASSERT_TRUE(begin(good));
+    for (const bool committed : {false, true}) {
+        const std::unique_ptr<BMessage> settings(good.job.Settings());
+        const char* name = "";
+        settings->FindString("output file", &name);
+        EXPECT_EQ(name, folder.File("link.pdf"));
+        if (!committed) {
+            EXPECT_TRUE(good.job.CommitJob());
+        }
+    }
+    EXPECT_TRUE(folder.Read("old.pdf").starts_with("%PDF"));
+    EXPECT_EQ(std::filesystem::status(folder.File("old.pdf")).permissions(), std::filesystem::perms{0640});
+    EXPECT_EQ(files(), 3);
 }
 
 TEST(PrintJobs, AskThroughTheToolkitsDialogs) {
