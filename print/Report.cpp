@@ -1,0 +1,73 @@
+#include "print/Report.h"
+
+#include "app/PortfolioRules.h"
+#include "platform/PrintJob.h"
+#include "platform/Window.h"
+#include "print/PrinterView.h"
+
+namespace {
+
+constexpr const char* JobName = "Quorvan";
+
+// Attaches the hidden view to the window, if there is one, while it lives.
+class HiddenPage {
+  public:
+    HiddenPage(BWindow* window, std::unique_ptr<BView> view) : view_(std::move(view)), attached_(window) {
+        view_->Hide();
+        if (window)
+            window->AddChild(view_.get());
+    }
+    HiddenPage(const HiddenPage&) = delete;
+    HiddenPage& operator=(const HiddenPage&) = delete;
+    ~HiddenPage() {
+        if (attached_)
+            view_->RemoveSelf();
+    }
+    [[nodiscard]] BView* View() const { return view_.get(); }
+
+  private:
+    std::unique_ptr<BView> view_;
+    bool attached_;
+};
+
+bool ConfigureJob(BPrintJob& job, std::unique_ptr<BMessage>& settings) {
+    if (settings) {
+        job.SetSettings(settings.get());
+        return true;
+    }
+    if (job.ConfigPage() != B_OK || job.ConfigJob() != B_OK)
+        return false;
+    settings.reset(job.Settings());
+    return true;
+}
+
+} // namespace
+
+ReportResult PrintReport(BPrintJob& job, BWindow* window, const char* portfolio, DATABASE& investments) {
+    if (!job.BeginJob())
+        return ReportResult::NotPrinted;
+    investments.GetLastError(nullptr); // only what happens from here on counts
+    const float total = TotalValue(investments, portfolio);
+    {
+        const HiddenPage page(
+            window, std::make_unique<PrinterView>(job.PrintableRect(), portfolio, total, &investments));
+        job.DrawView(page.View(), page.View()->Bounds(), {0, 0});
+    }
+    if (investments.GetLastError(nullptr) != 0) {
+        job.CancelJob();
+        return ReportResult::NotRead;
+    }
+    job.SpoolPage();
+    return job.CommitJob() ? ReportResult::Printed : ReportResult::NotPrinted;
+}
+
+ReportResult RunReportJob(BWindow* window, const char* portfolio, DATABASE& investments,
+                          std::unique_ptr<BMessage>& settings) {
+    BPrintJob job(JobName);
+    if (!ConfigureJob(job, settings))
+        return ReportResult::Cancelled;
+    const ReportResult result = PrintReport(job, window, portfolio, investments);
+    if (result == ReportResult::NotPrinted)
+        settings.reset();
+    return result;
+}

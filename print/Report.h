@@ -1,0 +1,29 @@
+#pragma once
+
+#include <memory>
+
+class BMessage;
+class BPrintJob;
+class BWindow;
+class DATABASE;
+
+// The report as a print job, for the main window and for the command line. Interface thread.
+
+enum class ReportResult {
+    Printed,
+    Cancelled,  // in a dialog
+    NotPrinted, // printer or file could not be opened or written; errno says why for a file
+    NotRead,    // the investments could not all be read
+};
+
+// Prints the portfolio's report, exactly one page, on a job that is set up and not begun. The page's view is
+// attached to window meanwhile; null for none. Unless the result is Printed, nothing was. The investment
+// file's result set is left on the portfolio.
+[[nodiscard]] ReportResult PrintReport(BPrintJob& job, BWindow* window, const char* portfolio,
+                                       DATABASE& investments);
+
+// Makes the whole job for a window, which must be locked. Without kept settings it shows the page dialog and
+// the job dialog, and keeps what was chosen there; otherwise it asks nothing. Settings that could not be
+// printed with are dropped, so that the next job asks again.
+[[nodiscard]] ReportResult RunReportJob(BWindow* window, const char* portfolio, DATABASE& investments,
+                                        std::unique_ptr<BMessage>& settings);
