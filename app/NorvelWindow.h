@@ -83,6 +83,8 @@ class NorvelWindow : public BWindow {
     void OnPortfolioAdd();
     void OnPortfolioEdit();
     void OnPortfolioDelete();
+    // Opens the window that brings the prices up to date, unless there is no network.
+    void OnPortfolioUpdate();
     // Takes the marked item out of the selector.
     void RemoveMarkedItem();
 
@@ -105,9 +107,6 @@ class NorvelWindow : public BWindow {
     void OnInvestmentPaste();
 
     // --- other commands ---
-    // Tell the person that a change could not be written, or an investment not read.
-    static void TellNotSaved();
-    static void TellNotRead();
     void OnSettings();
     void OnHelp();
     // Where dialogs open.

@@ -6,6 +6,7 @@
 
 #include "ColumnListView/ColumnListView.h"
 #include "app/AppState.h"
+#include "app/FailureAlerts.h"
 #include "app/NorvelItem.h"
 #include "app/PortfolioRules.h"
 #include "dialogs/InvestmentDialog.h"

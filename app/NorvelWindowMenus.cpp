@@ -80,7 +80,8 @@ const NorvelWindow::Command NorvelWindow::Commands[] = {
     {MessagePortfolioDelete, Needs::Portfolio, &NorvelWindow::OnPortfolioDelete},
     {MessagePortfolioChart, Needs::Investment, nullptr, &NorvelWindow::IsValuePresent},
     {MessagePortfolioPrint, Needs::Investment, nullptr, &NorvelWindow::IsPortfolioPresent},
-    {MessagePortfolioUpdate, Needs::Investment, nullptr, &NorvelWindow::IsPortfolioPresent},
+    {MessagePortfolioUpdate, Needs::Investment, &NorvelWindow::OnPortfolioUpdate,
+     &NorvelWindow::IsPortfolioPresent},
     {MessageInvestmentAdd, Needs::Portfolio, &NorvelWindow::OnInvestmentAdd,
      &NorvelWindow::IsPortfolioPresent},
     {MessageInvestmentEdit, Needs::Investment, &NorvelWindow::OnInvestmentEdit},
@@ -139,14 +140,6 @@ void NorvelWindow::MenusBeginning() {
             menuBar_->FindItem(item.code)->SetEnabled(command && command->run && CanRun(*command));
         }
     }
-}
-
-void NorvelWindow::TellNotSaved() {
-    MessageBox("The change could not be saved! Is the disk full, or the file protected?", B_STOP_ALERT);
-}
-
-void NorvelWindow::TellNotRead() {
-    MessageBox("An investment could not be read from its file!", B_STOP_ALERT);
 }
 
 BPoint NorvelWindow::DialogCorner() const {

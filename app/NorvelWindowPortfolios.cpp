@@ -4,12 +4,17 @@
 #include <string>
 
 #include "app/AppState.h"
+#include "app/FailureAlerts.h"
 #include "app/MessageCodes.h"
 #include "app/PortfolioRules.h"
 #include "dialogs/PortfolioAddDialog.h"
 #include "dialogs/PortfolioEditDialog.h"
+#include "platform/Kernel.h"
 #include "platform/MenuField.h"
+#include "quotes/QuoteRetrieval.h"
+#include "quotes/UpdateWindow.h"
 #include "util/CharacterBuffer.h"
+#include "util/DebugLog.h"
 #include "util/InterfaceHelpers.h"
 
 void NorvelWindow::LoadPortfolioList() {
@@ -27,6 +32,32 @@ void NorvelWindow::LoadPortfolioList() {
     if (const BMenuItem* marked = MarkedPortfolio())
         CopyTextZeroed(currentPortfolio_, marked->Label());
 }
+
+namespace {
+
+struct LookUp {
+    const char* host;
+    bool found = false;
+};
+
+// On a thread of its own, since it can take long: the windows stay painted meanwhile.
+bool HostIsFound(const char* host) {
+    LookUp lookUp{host};
+    const thread_id thread = spawn_thread(
+        [](void* data) -> int32 {
+            auto* request = static_cast<LookUp*>(data);
+            request->found = IsConnected(request->host);
+            return 0;
+        },
+        "look-up", suggest_thread_priority(), &lookUp);
+    if (thread <= 0 || resume_thread(thread) != B_OK)
+        return false;
+    int32 ignored = 0;
+    wait_for_thread(thread, &ignored);
+    return lookUp.found;
+}
+
+} // namespace
 
 void NorvelWindow::AddPortfolioMenuItem(const char* name) {
     AppendMarkedItem(name);
@@ -137,6 +168,22 @@ void NorvelWindow::OnPortfolioDelete() {
     }
     RemoveMarkedItem();
     SelectFirstPortfolioMenuItem();
+}
+
+void NorvelWindow::OnPortfolioUpdate() {
+    PrintDebugStatement("CLEAR", app_state->logPath);
+    char host[128];
+    settings_.ReadString("GENERAL", "IsConnectedURL", "", host);
+    const bool connected = HostIsFound(host);
+    const std::string checked = std::string("Checked '") + host + "', ";
+    if (!connected) {
+        TellNotConnected();
+        PrintDebugStatement((checked + "no connection found!\n").c_str(), app_state->logPath);
+        return;
+    }
+    PrintDebugStatement((checked + "connection found ok\n").c_str(), app_state->logPath);
+    new UpdateWindow(Frame().LeftTop() + BPoint(100, 100), currentPortfolio_, app_state->investments.get(),
+                     investmentList_);
 }
 
 void NorvelWindow::RemoveMarkedItem() {

@@ -1,0 +1,163 @@
+#include "quotes/UpdateWindow.h"
+
+#include "ColumnListView/ColumnListView.h"
+#include "app/AppState.h"
+#include "app/FailureAlerts.h"
+#include "app/MessageCodes.h"
+#include "app/NorvelItem.h"
+#include "app/PortfolioRules.h"
+#include "platform/Application.h"
+#include "platform/StatusBar.h"
+#include "quotes/PriceUpdate.h"
+#include "quotes/QuoteRetrieval.h"
+#include "util/CharacterBuffer.h"
+#include "util/DebugLog.h"
+#include "util/InterfaceHelpers.h"
+#include "util/Numbers.h"
+
+namespace {
+
+constexpr const char* MainWindowTitle = "Quorvan";
+constexpr float Width = 200;
+constexpr float Height = 60;
+constexpr float Margin = 10;
+constexpr bigtime_t LockPatience = 20'000; // microseconds between looks at the stop request
+
+std::vector<int32> RecordNumbers(const ColumnListView* list) {
+    const bool all = list->CurrentSelection() < 0;
+    std::vector<int32> numbers;
+    for (int32 i = 0; i < list->CountItems(); ++i) {
+        if (all || list->IsItemSelected(i))
+            numbers.push_back(static_cast<const NorvelItem*>(list->ItemAt(i))->RecordNumber());
+    }
+    return numbers;
+}
+
+void Log(const std::string& line) {
+    PrintDebugStatement(line.c_str(), app_state->logPath);
+}
+
+} // namespace
+
+UpdateWindow::UpdateWindow(BPoint leftTop, const char* portfolioName, DATABASE* database,
+                           const ColumnListView* list)
+    : BWindow({leftTop.x, leftTop.y, leftTop.x + Width, leftTop.y + Height}, "Getting current prices...",
+              B_FLOATING_WINDOW_LOOK, B_MODAL_APP_WINDOW_FEEL,
+              B_NOT_RESIZABLE | B_NOT_ZOOMABLE | B_WILL_ACCEPT_FIRST_CLICK),
+      recordNumbers_(RecordNumbers(list)),
+      database_(database),
+      portfolioName_(portfolioName) {
+    if (const BWindow* mainWindow = GetAppWindow(be_app, MainWindowTitle))
+        mainWindow_ = BMessenger(mainWindow);
+    AddStatusBar(static_cast<float>(recordNumbers_.size()) + 1);
+    Show();
+    StartWorker();
+}
+
+UpdateWindow::~UpdateWindow() {
+    if (worker_ > 0)
+        kill_thread(worker_);
+}
+
+void UpdateWindow::AddStatusBar(float maximum) {
+    auto* topView = new BView(Bounds(), "top view", B_FOLLOW_ALL_SIDES, B_WILL_DRAW);
+    topView->SetViewColor(colors::gray);
+    AddChild(topView);
+    BRect frame = Bounds();
+    frame.InsetBy(Margin, Margin);
+    statusBar_ = new BStatusBar(frame, "Status Bar", "Checking:");
+    statusBar_->SetMaxValue(maximum);
+    topView->AddChild(statusBar_);
+}
+
+void UpdateWindow::StartWorker() {
+    Lock();
+    statusBar_->Update(1);
+    worker_ = spawn_thread(updateThread, "updateThread", suggest_thread_priority(), this);
+    if (worker_ <= 0 || resume_thread(worker_) != B_OK)
+        PostMessage(B_QUIT_REQUESTED);
+    Unlock();
+}
+
+int32 UpdateWindow::updateThread(void* window) {
+    auto* self = static_cast<UpdateWindow*>(window);
+    self->UpdateAll();
+    if (!thread_stop_requested()) {
+        self->AskForReload();
+        self->PostMessage(B_QUIT_REQUESTED);
+    }
+    return 0;
+}
+
+void UpdateWindow::UpdateAll() {
+    for (const int32 recordNumber : recordNumbers_) {
+        if (thread_stop_requested() || !UpdateOne(recordNumber))
+            return;
+    }
+}
+
+bool UpdateWindow::UpdateOne(int32 recordNumber) {
+    INVESTMENT_DATA record;
+    if (!ReadInvestment(*database_, recordNumber, &record)) {
+        Log("Database Read() error -1\n");
+        return false;
+    }
+    const std::string ticker(FieldText(record.Ticker));
+    Log("Checking price for '" + ticker + "'\n");
+    ShowTicker(ticker.c_str());
+    QuoteContext context;
+    context.sourcePath = app_state->quoteSourcePath;
+    context.logPath = app_state->logPath;
+    context.stopFd = thread_stop_fd();
+    const float quote = GetPriceQuote(ticker.c_str(), context);
+    // Whatever a call that was cut short answers, it says nothing about the price.
+    if (thread_stop_requested())
+        return false;
+    char number[64];
+    FormatFixed(quote, number, sizeof number, 2);
+    Log(std::string("GetPriceQuote() returned ") + number + "\n");
+    if (!Apply(quote, recordNumber, &record))
+        return false;
+    ShowProgress();
+    return true;
+}
+
+bool UpdateWindow::Apply(float quote, int32 recordNumber, INVESTMENT_DATA* record) {
+    if (ApplyQuote(*record, quote) == QuoteOutcome::Failed) {
+        TellNotConnected();
+        return false;
+    }
+    if (database_->Write(recordNumber, record) != 0) {
+        TellNotSaved();
+        return false;
+    }
+    return true;
+}
+
+void UpdateWindow::ShowTicker(const char* ticker) {
+    if (!LockUnlessStopped())
+        return;
+    statusBar_->SetText((std::string(" ") + ticker).c_str());
+    Unlock();
+}
+
+void UpdateWindow::ShowProgress() {
+    if (!LockUnlessStopped())
+        return;
+    statusBar_->Update(1);
+    Unlock();
+}
+
+bool UpdateWindow::LockUnlessStopped() {
+    while (!thread_stop_requested()) {
+        if (LockWithTimeout(LockPatience) == B_OK)
+            return true;
+    }
+    return false;
+}
+
+void UpdateWindow::AskForReload() const {
+    BMessage message(MessagePortfolioSelected);
+    message.AddString(PortfolioNameField, portfolioName_.c_str());
+    mainWindow_.SendMessage(message);
+}
