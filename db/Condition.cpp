@@ -7,22 +7,18 @@
 
 #include "db/Allocate.h"
 #include "db/LittleEndian.h"
+#include "db/LoweredText.h"
 #include "util/Strings.h"
 
 namespace {
 
-constexpr unsigned char FirstNonAscii = 128;
 constexpr int CaseBit = 'a' - 'A';
-
-constexpr unsigned char Lowered(unsigned char c) {
-    return c >= 'A' && c <= 'Z' ? static_cast<unsigned char>(c + ('a' - 'A')) : c;
-}
 
 // Lowered bytes by table: one load instead of two comparisons for each byte of a million fields.
 constexpr auto LoweredBytes = [] {
     std::array<unsigned char, 256> table{};
     for (std::size_t i = 0; i < table.size(); ++i) {
-        table[i] = Lowered(static_cast<unsigned char>(i));
+        table[i] = LoweredByte(static_cast<std::uint8_t>(i));
     }
     return table;
 }();
@@ -127,18 +123,6 @@ Word LoadWord(const void* bytes) {
     return word;
 }
 
-// Copies a field in lower letters. False when it has a byte of 128 or above, from where on letters keep their
-// case.
-bool LowerAscii(const std::uint8_t* field, std::size_t width, std::uint8_t* lowered) {
-    std::uint8_t seen = 0;
-    for (std::size_t i = 0; i < width; ++i) {
-        const std::uint8_t c = field[i];
-        seen |= c;
-        lowered[i] = static_cast<std::uint8_t>(c + (static_cast<std::uint8_t>(c - 'A') < 26 ? 'a' - 'A' : 0));
-    }
-    return seen < FirstNonAscii;
-}
-
 constexpr std::size_t SearchBlock = 16;
 
 // Searches value in text. The first and the last byte of the value are looked for at a whole block of places
@@ -218,9 +202,8 @@ struct Matchers {
         const std::string_view value(self.text_, self.length_);
         for (std::size_t i = 0; i < count; ++i, field += stride) {
             const std::string_view text = TextOf(field, self.width_);
-            matches[i] = LowerAscii(field, self.width_, self.scratch_.get())
-                             ? Contains(self.scratch_.get(), text.size(), value)
-                             : ContainsLowered(text, value);
+            CopyLowered(field, self.width_, self.scratch_.get());
+            matches[i] = Contains(self.scratch_.get(), text.size(), value);
         }
     }
 

@@ -3,6 +3,7 @@
 #include <cstdint>
 #include <memory>
 #include <span>
+#include <string>
 
 #include "db/Condition.h"
 #include "db/DataFile.h"
@@ -22,10 +23,12 @@ inline constexpr int Or = 2;  ///< add the records that match
 } // namespace QueryMode
 
 struct COMPACTION_PATHS;
+class RecordText;
+class SortKeys;
 
 /// One open data file of fixed-length records with typed columns: makes or opens it, reads and writes its
-/// records, selects records by queries, changes them together and rewrites the file without its deleted
-/// records. The file's bytes are described in doc/data-file.md.
+/// records, selects records by queries, sorts them, changes them together, writes and reads them as text and
+/// rewrites the file without its deleted records. The file's bytes are described in doc/data-file.md.
 ///
 /// It keeps no record that the file does not have: every operation that changes the file returns after the
 /// kernel has taken the bytes. It does not guard the file against other processes, and does not lock: an
@@ -175,6 +178,42 @@ class DATABASE {
         return CompareValues(op, field, value);
     }
 
+    // Sort
+
+    /// Puts the records of the result set (of all active ones when there is none) into ascending order of a
+    /// column, for the walk and for what goes by it; from then on AND and OR queries are refused until a new
+    /// query. Texts are compared ignoring the case of A to Z. Equal records keep their order, and so do all
+    /// when the column's type is unknown; a record whose float is no number keeps its place, the records
+    /// before and behind it being sorted apart. Records deleted since the query drop out. Fewer than two
+    /// records are left as they are. The second argument has no effect. Fails with 1701 column, 1702 to 1704
+    /// memory, 1709 read error, or as QueryReset; then the set keeps its order.
+    int SortBy(const char* column, int ignored);
+    /// Moves a pair of slots one step on: `*first` to the first used slot of the set behind it, `*second` to
+    /// the first used one behind that. Where there is none, to the number of records.
+    void GetNextSortSlots(long* first, long* second) const;
+
+    // Text
+
+    /// Writes records as lines of text (doc/text-file.md) to a file at `path`, which is created or replaced:
+    /// with `all` every active record in the order of the file, without it the records of the result set in
+    /// the order of the walk, QueryReset when there is none. Returns the number of lines. -1 on failure: 1901
+    /// the file cannot be opened for writing, is no regular file or is this data file; 1902 memory, 1907 read
+    /// error, 1908 no data file is open, 1909 write error, or as QueryReset. After 1907 and 1909 the text
+    /// file is there in part.
+    long Export(const char* path, int all, const char* separator);
+    /// Appends the records in a text file. A field ends at any of the `separators`, several of them count as
+    /// one; a line that begins with its newline is skipped, and a field that a line lacks is empty or 0. The
+    /// newline separates too only when it is given. Returns the number of records; -1 on failure: 1801 the
+    /// file cannot be opened, is no regular file or is this data file; 1802 the first line has not as many
+    /// fields as there are columns; 1803 or 1804 memory, 1808 no data file is open, 1809 read error, or as
+    /// AppendAll. Records appended before a failure stay; killed meanwhile, the file has the first so many of
+    /// them, whole.
+    long Load(const char* path, const char* separators);
+    /// Makes `line` the line, newline included, that Export writes for a record's data.
+    void FormatRecordData(std::string* line, const void* record, const char* separator) const;
+    /// 1: byte columns are written as the character of that code, otherwise (2 at first) as a number.
+    void SetByteOutputFormat(int format) { byteOutputFormat_ = format; }
+
     // Set statements
 
     /// Changes one column of every record in the result set by a set statement such as "Shares * 2"; without
@@ -268,6 +307,19 @@ class DATABASE {
     void MergeMatches(const Condition& condition, int mode, std::int32_t first, std::int32_t count,
                       const std::uint8_t* records);
 
+    // Walk, sort, text
+    [[nodiscard]] int MoveWalk(long start, long step, bool* found);
+    [[nodiscard]] int ReadSortKeys(SortKeys* keys);
+    void TakeSortOrder(const SortKeys& keys);
+    struct EXPORT;
+    struct LOAD;
+    [[nodiscard]] RecordText Text() const;
+    [[nodiscard]] bool OpenForExport(const char* path, File* file) const;
+    [[nodiscard]] int ExportAll(EXPORT& work);
+    [[nodiscard]] int ExportResultSet(EXPORT& work);
+    [[nodiscard]] int CheckFirstLine(LOAD& work) const;
+    [[nodiscard]] int LoadLines(LOAD& work);
+
     // Set statements
     [[nodiscard]] int PrepareChange(const char* statement, FieldChange* change) const;
     [[nodiscard]] int ChangeRecords(const FieldChange& change, long* changed);
@@ -295,6 +347,7 @@ class DATABASE {
     bool sorted_ = false;
     bool immediateHeaderWrite_ = true;
     bool caseSensitive_ = false;
+    int byteOutputFormat_ = 2;
     ReadCache cache_;
     std::int64_t dataStart_ = 0;
     int lastError_ = DatabaseError::None;

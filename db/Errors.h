@@ -50,15 +50,21 @@ enum Code : int {
     SortNoMemoryForFirstRecord = 1702,
     SortNoMemoryForSecondRecord = 1703,
     SortNoMemoryForKeys = 1704,
+    SortReadFailed = 1709,
 
     LoadOpenFailed = 1801,
     LoadInvalidFormat = 1802,
     LoadNoMemoryForLine = 1803,
     LoadNoMemoryForRecord = 1804,
+    LoadNoFile = 1808,
+    LoadReadFailed = 1809,
 
     ExportOpenFailed = 1901,
     ExportNoMemoryForLine = 1902,
     ExportNoMemoryForRecord = 1903,
+    ExportReadFailed = 1907,
+    ExportNoFile = 1908,
+    ExportWriteFailed = 1909,
 
     UpdateNoRecord = 2101,
 

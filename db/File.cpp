@@ -30,6 +30,8 @@ int FlagsOf(FileMode mode) {
     switch (mode) {
     case FileMode::ReadOnly:
         return O_RDONLY | common;
+    case FileMode::WriteOnly:
+        return O_WRONLY | O_CREAT | common;
     case FileMode::CreateNew:
     case FileMode::CreatePrivate:
         return O_RDWR | O_CREAT | O_EXCL | common;

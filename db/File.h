@@ -37,6 +37,7 @@ FileOperations& SystemFiles();
 enum class FileMode {
     ReadWrite,     ///< it must exist
     ReadOnly,      ///< it must exist
+    WriteOnly,     ///< made when it does not exist; what it holds stays until it is truncated
     CreateNew,     ///< it must not exist (not even as a symbolic link); opened for reading and writing
     CreatePrivate, ///< the same, for its owner's eyes only
 };

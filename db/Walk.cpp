@@ -37,8 +37,22 @@ void* DATABASE::QueryGetXXX(long start, long step, long* record) {
     if (!slots_ && QueryReset() < 0) {
         return nullptr;
     }
+    bool found = false;
+    if (const int code = MoveWalk(start, step, &found); code != DatabaseError::None) {
+        lastError_ = code;
+    }
+    if (found && record != nullptr) {
+        *record = slots_[walkPosition_];
+    }
+    return found ? recordBuffer_.get() : nullptr;
+}
+
+// Reads the next record of the walk into the record buffer; there must be a result set. Returns an error
+// code; neither that nor a record at the walk's end.
+int DATABASE::MoveWalk(long start, long step, bool* found) {
+    *found = false;
     if (resultCount_ == 0) {
-        return nullptr;
+        return DatabaseError::None;
     }
     // Records appended since the query have no slot: a walk may begin or stand among them, but finds none
     // there.
@@ -48,25 +62,19 @@ void* DATABASE::QueryGetXXX(long start, long step, long* record) {
         const std::int32_t number = walkPosition_ < slotCount_ ? slots_[walkPosition_] : NotInSet;
         if (number != NotInSet) {
             const int code = FetchRecord(number, recordBuffer_.get(), cache_.HasBuffer());
-            if (code == DatabaseError::None) {
-                if (record != nullptr) {
-                    *record = number;
-                }
-                return recordBuffer_.get();
-            }
-            if (code == DatabaseError::ReadFailed) {
-                lastError_ = code;
-                return nullptr;
+            *found = code == DatabaseError::None;
+            if (*found || code == DatabaseError::ReadFailed) {
+                return code;
             }
             slots_[walkPosition_] = NotInSet; // deleted since the query
             --resultCount_;
         }
         if (step == 0) {
-            return nullptr;
+            break;
         }
         walkPosition_ = Moved(walkPosition_, step);
     }
-    return nullptr;
+    return DatabaseError::None;
 }
 
 long DATABASE::ConvertPhysToLogRecordNumber(long n) const {

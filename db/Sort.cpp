@@ -1,0 +1,93 @@
+#include <algorithm>
+
+#include "db/Database.h"
+#include "db/SortKeys.h"
+
+namespace {
+constexpr std::int32_t NotInSet = -1;
+}
+
+int DATABASE::SortBy(const char* column, int /*ignored*/) {
+    const COLUMN_ENTRY* by = column != nullptr ? FindColumn(column) : nullptr;
+    if (by == nullptr) {
+        return Fail(DatabaseError::SortInvalidColumn);
+    }
+    if (!slots_ && QueryReset() < 0) {
+        return -1;
+    }
+    if (resultCount_ < 2) {
+        return 0;
+    }
+    SortKeys keys;
+    if (!keys.Prepare(*by, resultCount_)) {
+        return Fail(DatabaseError::SortNoMemoryForKeys);
+    }
+    if (const int code = ReadSortKeys(&keys); code != DatabaseError::None) {
+        return Fail(code);
+    }
+    keys.Sort();
+    TakeSortOrder(keys);
+    return 0;
+}
+
+// Reads the keys of the set's records, in the order of the file so that it is gone through once.
+int DATABASE::ReadSortKeys(SortKeys* keys) {
+    ReadCache own;
+    ReadCache* reader = ScanCache(&own);
+    if (reader == nullptr) {
+        return DatabaseError::SortNoMemoryForFirstRecord;
+    }
+    for (std::int32_t i = 0; i < slotCount_; ++i) {
+        if (slots_[i] != NotInSet) {
+            keys->Add(i, slots_[i]);
+        }
+    }
+    if (sorted_) {
+        keys->OrderByWord();
+    }
+    for (const SortKeys::ENTRY& entry : *keys) {
+        const std::int32_t number = slots_[entry.slot];
+        if (!reader->Holds(number) && reader->Fill(file_, Area(), number) != 0) {
+            return DatabaseError::SortReadFailed;
+        }
+        const std::uint8_t* record = reader->Record(number);
+        keys->TakeKey(*record == RecordStatus::Deleted ? nullptr : record + 1);
+    }
+    if (sorted_) {
+        keys->OrderBySlot();
+    }
+    return DatabaseError::None;
+}
+
+// Puts the records into the slots that the set uses, in the order of their keys; those that are gone leave
+// it.
+void DATABASE::TakeSortOrder(const SortKeys& keys) {
+    for (const SortKeys::ENTRY* gone = keys.EndOfKeys(); gone != keys.end(); ++gone) {
+        slots_[gone->slot] = NotInSet;
+        --resultCount_;
+    }
+    for (SortKeys::ENTRY* entry = keys.begin(); entry != keys.EndOfKeys(); ++entry) {
+        entry->key = slots_[entry->slot]; // the texts have done their part: now the record's number
+    }
+    const SortKeys::ENTRY* entry = keys.begin();
+    for (std::int32_t i = 0; i < slotCount_; ++i) {
+        if (slots_[i] != NotInSet) {
+            slots_[i] = entry++->key;
+        }
+    }
+    sorted_ = true;
+}
+
+void DATABASE::GetNextSortSlots(long* first, long* second) const {
+    const auto next = [this](long slot) {
+        for (slot = std::max(slot, -1L); slot < header_.recordCount;) {
+            ++slot;
+            if (slot < slotCount_ && slots_[slot] != NotInSet) {
+                return slot;
+            }
+        }
+        return static_cast<long>(header_.recordCount);
+    };
+    *first = next(*first);
+    *second = next(*first);
+}
