@@ -9,9 +9,9 @@ run_packages=(fonts-dejavu-core)
 display_packages=(xvfb xauth xdotool x11-utils imagemagick)
 # To build and run the tests and the benchmarks.
 test_packages=(libgtest-dev libgmock-dev libbenchmark-dev libsqlite3-dev poppler-utils clang-format)
-# To check what desktops read, and what assistive technology hears.
+# To check what desktops and man read, and what assistive technology hears.
 test_packages+=(desktop-file-utils appstream librsvg2-bin libxml2-utils libglib2.0-bin)
-test_packages+=(at-spi2-core dbus-daemon gir1.2-atspi-2.0 python3-gi)
+test_packages+=(at-spi2-core dbus-daemon man-db groff-base)
 # For scripts/tidy.sh.
 tidy_packages=(clang-tidy clang-tools)
 # For scripts/fuzz.sh.

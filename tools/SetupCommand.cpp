@@ -10,11 +10,12 @@
 
 namespace {
 
-// The program lies beside quorvan-cli, or in its own folder of the same build. Empty when it is in neither.
+// The program lies beside quorvan-cli, above its bin folder, or in its own folder of the same build. Empty
+// when it is in none of them.
 std::string FindProgram() {
     std::error_code error;
     const std::filesystem::path own = std::filesystem::read_symlink("/proc/self/exe", error).parent_path();
-    for (const char* place : {"quorvan", "../app/quorvan"}) {
+    for (const char* place : {"quorvan", "../quorvan", "../app/quorvan"}) {
         const std::filesystem::path candidate = (own / place).lexically_normal();
         if (std::filesystem::is_regular_file(candidate, error))
             return candidate.string();
