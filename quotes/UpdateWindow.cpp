@@ -103,6 +103,12 @@ bool UpdateWindow::UpdateOne(int32 recordNumber) {
         return false;
     }
     const std::string ticker(FieldText(record.Ticker));
+    // Without a ticker a page could only give the price of something else.
+    if (ticker.empty()) {
+        Log("No ticker for '" + std::string(FieldText(record.Name)) + "'\n");
+        ShowProgress();
+        return true;
+    }
     Log("Checking price for '" + ticker + "'\n");
     ShowTicker(ticker.c_str());
     QuoteContext context;

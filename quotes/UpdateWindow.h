@@ -23,7 +23,8 @@ class DATABASE;
 class UpdateWindow : public BWindow {
   public:
     // Builds and shows the window with its left top corner at the given place of the screen, and starts on
-    // the list's selected rows, or all of them when none is selected. The rows are NorvelItems.
+    // the list's selected rows, or all of them when none is selected. The rows are NorvelItems. An investment
+    // without a ticker keeps its price.
     UpdateWindow(BPoint leftTop, const char* portfolioName, DATABASE* database, const ColumnListView* list);
     // Stops the worker and waits until it has ended, which it does promptly.
     ~UpdateWindow() override;

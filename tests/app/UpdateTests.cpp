@@ -166,6 +166,20 @@ TEST(PriceUpdate, CancelledHalfWayItLeavesTheFirstHalfUpdated) {
     EXPECT_EQ(run.Server().Requests().size(), 3U); // no reload is shown, and nobody was asked again
 }
 
+TEST(PriceUpdate, AnInvestmentWithoutATickerKeepsItsPrice) {
+    UpdateRun run;
+    run.AddInvestment(Holding("", 48200, NoPreviousPrice));
+    run.Select("A");
+    run.When(
+        "six rows", [] { return Program::Main() && Program::List()->CountItems() == 6; }, [] {});
+    run.SelectRows({5, 0}).Update().UntilDone().Close();
+    run.Run();
+    EXPECT_EQ(run.Record(0).Price, 12.5F);
+    EXPECT_EQ(run.Record(5).Price, 48200);
+    EXPECT_EQ(run.Record(5).QuoteError, 0);
+    EXPECT_EQ(run.Server().Requests().size(), 1U);
+}
+
 TEST(PriceUpdate, EndsWithAnAlertWhenNobodyCanBeAsked) {
     struct Case {
         const char* ini;
