@@ -3,12 +3,12 @@
 
 # To build the program.
 build_packages=(g++ cmake ninja-build qt6-base-dev libqt6svg6-dev libgl-dev libcli11-dev libcurl4-openssl-dev nlohmann-json3-dev)
-# To show it, with letters.
-run_packages=(fonts-dejavu-core)
+# To show it, with letters, and to trust quote servers.
+run_packages=(fonts-dejavu-core ca-certificates)
 # To show it on a virtual display and take pictures.
 display_packages=(xvfb xauth xdotool x11-utils imagemagick)
 # To build and run the tests and the benchmarks.
-test_packages=(libgtest-dev libgmock-dev libbenchmark-dev libsqlite3-dev poppler-utils clang-format)
+test_packages=(libgtest-dev libgmock-dev libbenchmark-dev libsqlite3-dev libssl-dev poppler-utils clang-format)
 # To check what desktops and man read, and what assistive technology hears.
 test_packages+=(desktop-file-utils appstream librsvg2-bin libxml2-utils libglib2.0-bin)
 test_packages+=(at-spi2-core dbus-daemon man-db groff-base)
