@@ -4,6 +4,7 @@
 #include <cerrno>
 #include <chrono>
 #include <condition_variable>
+#include <csignal>
 #include <cstdint>
 #include <functional>
 #include <memory>
@@ -184,6 +185,11 @@ class LoopbackServer {
     }
 
     void Run() {
+        // A stream may write to a client that has gone.
+        sigset_t pipe;
+        sigemptyset(&pipe);
+        sigaddset(&pipe, SIGPIPE);
+        pthread_sigmask(SIG_BLOCK, &pipe, nullptr);
         while (Wait(socket_.Fd(), POLLIN)) {
             const int fd = accept4(socket_.Fd(), nullptr, nullptr, SOCK_NONBLOCK | SOCK_CLOEXEC);
             if (fd < 0)

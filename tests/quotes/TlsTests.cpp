@@ -1,0 +1,145 @@
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <future>
+#include <string>
+
+#include "LoopbackServer.h"
+#include "StopSwitch.h"
+#include "TemporaryFolder.h"
+#include "TlsServer.h"
+#include "quotes/QuoteRetrieval.h"
+
+namespace {
+
+const std::string Header = "HTTP/1.0 200 OK\r\n\r\n";
+const std::string Page = Header + "<td>Last</td><td><b>45 3/8</b></td>";
+
+Reply Redirect(const std::string& address) {
+    return {{"HTTP/1.0 302 Found\r\nLocation: " + address + "\r\nContent-Length: 0\r\n\r\n"}};
+}
+
+class Tls : public testing::Test {
+  protected:
+    Tls() {
+        setenv("no_proxy", "*", 1);
+        identity_.WriteCertificate(caFile_);
+        context_.caFile = caFile_.c_str();
+        context_.logPath = logPath_.c_str();
+        context_.stopFd = stop_.Fd();
+    }
+
+    float Quote(const std::string& host, const char* path = "/q?s=ABC") {
+        folder_.Write("log", "");
+        return GetQuote(host.c_str(), path, "Last", 3, context_);
+    }
+    [[nodiscard]] bool Logged(const std::string& text) const {
+        return folder_.Read("log").find(text) != std::string::npos;
+    }
+
+    TemporaryFolder folder_;
+    std::string caFile_ = folder_.File("ca.pem");
+    std::string logPath_ = folder_.File("log");
+    TlsIdentity identity_{"IP:127.0.0.1"};
+    StopSwitch stop_;
+    QuoteContext context_;
+};
+
+TEST_F(Tls, APageIsScannedInOnePiece) {
+    std::vector<std::string> bytes;
+    for (const char byte : Page)
+        bytes.emplace_back(1, byte);
+    TlsServer server(identity_, [&](const std::string&) { return Reply{bytes}; });
+    EXPECT_EQ(Quote(server.Host(), "q?s=B C#\xC3\xA4%20\n"), 45.375F);
+    EXPECT_TRUE(server.Server().Requests().at(0).starts_with("GET /q?s=B%20C%23%C3%A4%20%0A HTTP/1.1\r\n"));
+    EXPECT_EQ(folder_.Read("log"), "In GetQuote\nconnected to 127.0.0.1 port " +
+                                       std::to_string(server.Server().Port()) +
+                                       "\nreceived 35 bytes\nfound tag\nskipped ok\nvalue string is '45'\n"
+                                       "Returning price = 45.38\n");
+}
+
+TEST_F(Tls, WhatTheServerRefusesIsNoPrice) {
+    LoopbackServer plain(Reply{{Page}});
+    std::size_t redirects = 0;
+    TlsServer server(identity_, [&](const std::string& request) {
+        const auto asks = [&](const char* path) {
+            return request.starts_with(std::string("GET ") + path + " ");
+        };
+        if (asks("/down"))
+            return Redirect("http://" + plain.Host() + "/");
+        if (asks("/around") && redirects-- > 0)
+            return Redirect("/around");
+        if (asks("/missing"))
+            return Reply{{"HTTP/1.0 404 Not Found\r\n\r\n" + Page}};
+        if (asks("/large"))
+            return Reply{{Page, std::string(100'000, 'x')}, Reply::End::Endless};
+        return Reply{{Page}};
+    });
+    const struct {
+        const char* path;
+        std::size_t redirects;
+        float price;
+        const char* log;
+    } cases[] = {
+        {"/around", 5, 45.375F, "value string is '45'\n"},
+        {"/around", 6, NoQuote, "https error: Maximum (5) redirects followed\n"},
+        {"/down", 0, NoQuote, "https error: Protocol \"http\" not supported"},
+        {"/missing", 0, NoQuote, "https error: The requested URL returned error: 404\n"},
+        {"/large", 0, NoQuote, "https error: the page has more than 10 MB\n"},
+    };
+    for (const auto& c : cases) {
+        redirects = c.redirects;
+        EXPECT_EQ(Quote(server.Host(), c.path), c.price) << c.path;
+        EXPECT_TRUE(Logged(c.log)) << folder_.Read("log");
+    }
+    EXPECT_TRUE(plain.Requests().empty());
+}
+
+TEST_F(Tls, AConnectionThatCannotBeTrustedIsAFailure) {
+    const auto answer = [](const std::string&) { return Reply{{Page}}; };
+    const TlsIdentity stranger("IP:127.0.0.1");
+    const TlsIdentity otherName("DNS:quotes.example");
+    TlsServer unknown(stranger, answer);
+    EXPECT_EQ(Quote(unknown.Host()), QuoteNetworkFailure);
+    EXPECT_TRUE(Logged("https error: SSL certificate problem")) << folder_.Read("log");
+    TlsServer misnamed(otherName, answer);
+    otherName.WriteCertificate(caFile_);
+    EXPECT_EQ(Quote(misnamed.Host()), QuoteNetworkFailure);
+    EXPECT_TRUE(Logged("no alternative certificate subject name matches")) << folder_.Read("log");
+    EXPECT_TRUE(unknown.Server().Requests().empty() && misnamed.Server().Requests().empty());
+}
+
+TEST_F(Tls, NoConnectionIsAFailureAndNoNameIsNoPrice) {
+    const LoopbackSocket refusing;
+    EXPECT_EQ(Quote("https://" + refusing.Host()), QuoteNetworkFailure);
+    EXPECT_TRUE(Logged("https error: Failed to connect")) << folder_.Read("log");
+    EXPECT_EQ(Quote("https://no..such..host"), NoQuote);
+    EXPECT_TRUE(Logged("https error: Could not resolve host")) << folder_.Read("log");
+    TlsServer broken(identity_, [](const std::string&) { return Reply{{Page}, Reply::End::Reset}; });
+    EXPECT_EQ(Quote(broken.Host()), QuoteNetworkFailure);
+    EXPECT_TRUE(Logged("https error: ")) << folder_.Read("log");
+}
+
+TEST_F(Tls, StopsAtOnceWhereverTheServerIs) {
+    for (const Reply& reply : {Reply{{}, Reply::End::Hold}, Reply{{Page}, Reply::End::Hold}}) {
+        TlsServer server(identity_, [&](const std::string&) { return reply; });
+        const StopSwitch stop;
+        context_.stopFd = stop.Fd();
+        auto quote = std::async(std::launch::async, [&] { return Quote(server.Host()); });
+        EXPECT_TRUE(server.Server().WaitForRequests(1));
+        stop.Stop();
+        EXPECT_EQ(quote.get(), QuoteCancelled);
+        EXPECT_TRUE(server.Server().WaitForEnds(1));
+    }
+    // A server that never answers the first greeting.
+    context_.stopFd = stop_.Fd();
+    const LoopbackSocket silent;
+    ASSERT_EQ(listen(silent.Fd(), 1), 0);
+    auto quote = std::async(std::launch::async, [&] { return Quote("https://" + silent.Host()); });
+    pollfd connection{silent.Fd(), POLLIN, 0};
+    EXPECT_EQ(poll(&connection, 1, 10'000), 1);
+    stop_.Stop();
+    EXPECT_EQ(quote.get(), QuoteCancelled);
+}
+
+} // namespace
