@@ -143,9 +143,18 @@ TEST_F(DamageTest, NarrowColumnsAreNotReadPastTheirEnd) {
 
 TEST_F(DamageTest, FileThatShrinksWhileOpen) {
     DATABASE database(path_.c_str());
+    const long selected = database.Query("Name >= a", QueryMode::New);
+    ASSERT_GT(selected, 1);
+    database.SetReadCache(256);
     std::filesystem::resize_file(path_, DataStartOfRows + Length / 2);
     const ROW row = Row("x");
     ROW got{};
+    EXPECT_EQ(database.SortBy("Name", 0), -1);
+    EXPECT_EQ(database.GetLastError(nullptr), 1709);
+    for (int all : {0, 1}) {
+        EXPECT_EQ(database.Export(folder_.File("rows.txt").c_str(), all, "\t"), -1);
+        EXPECT_EQ(database.GetLastError(nullptr), 1907);
+    }
     EXPECT_EQ(database.Read(3, &got), -1);
     EXPECT_EQ(database.GetLastError(nullptr), 1209);
     EXPECT_EQ(database.Write(3, &row), -1);
