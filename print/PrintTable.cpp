@@ -11,6 +11,7 @@ namespace {
 
 constexpr float HeadingLines = 1.25F;
 constexpr float CellInset = 5; // from the column's line
+constexpr float LineWidth = 1;
 constexpr float RowGap = 5;
 constexpr float RightSlack = 2; // what placed text leaves at the right
 
@@ -70,7 +71,8 @@ int PRINT_TABLE::GetColumnXCoords(int column, BRect* rect) const {
 void PRINT_TABLE::DrawHeader() {
     BRect heading(left_, top_, left_ + tableWidth_, top_ + headingHeight_);
     view_->SetHighColor(colors::black);
-    view_->FillRect(heading);
+    // The line at the bottom is the first row's, whose letters would touch it.
+    view_->FillRect({heading.left, heading.top, heading.right, heading.bottom - LineWidth});
     view_->SetHighColor(colors::white);
     for (int i = 0; i < columnCount_; ++i) {
         if (columns_[i].label[0] != '\0' && GetColumnXCoords(i, &heading) == 0)
@@ -91,6 +93,7 @@ void PRINT_TABLE::DrawText(const char* cells, int cellStride) {
             DrawNumber(cell, text.c_str());
         } else {
             cell.left += CellInset;
+            cell.right -= LineWidth; // the edge itself is the line's
             ::DrawText(view_, &cell, text.c_str(),
                        static_cast<uint8>(columns_[i].alignment | DrawTextMiddle));
         }

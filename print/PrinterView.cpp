@@ -76,11 +76,12 @@ PrinterView::Rows PrinterView::DrawInvestments(BRect page) {
     auto columns = ReportColumns;
     PRINT_TABLE table(this, page.left, page.top + TableTop, ReportColumnCount, columns.data(), 0);
     table.DrawHeader();
+    const float footerTop = page.bottom - BarHeight;
     Rows rows;
     ForEachInvestment(*database_, portfolio_, [&](const INVESTMENT_DATA& record, long) {
         ++rows.all;
-        rows.shown += table.RowEnd() <= page.bottom - BarHeight;
-        if (table.RowPosition() > page.bottom) // a hundred thousand rows would only make the file large
+        rows.shown += table.RowEnd() <= footerTop;
+        if (table.RowPosition() > footerTop) // unseen, and a hundred thousand would only make the file large
             return;
         ReportRow row;
         FillReportRow(record, row);

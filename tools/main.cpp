@@ -3,6 +3,7 @@
 #include <exception>
 #include <iostream>
 
+#include "tools/ReportCommand.h"
 #include "tools/SetupCommand.h"
 
 namespace {
@@ -14,6 +15,7 @@ int Run(int argc, char** argv) {
     application.require_subcommand(1);
     int status = 0;
     AddSetupCommand(application, status);
+    AddReportCommand(application, status);
     try {
         application.parse(argc, argv);
     } catch (const CLI::ParseError& error) {
