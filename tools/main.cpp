@@ -3,6 +3,7 @@
 #include <exception>
 #include <iostream>
 
+#include "tools/DbCommand.h"
 #include "tools/ReportCommand.h"
 #include "tools/SetupCommand.h"
 
@@ -12,8 +13,10 @@ constexpr int WrongCommandLine = 2;
 
 int Run(int argc, char** argv) {
     CLI::App application("Companion of the portfolio program Quorvan.", "quorvan-cli");
+    application.set_version_flag("--version", "quorvan-cli " QUORVAN_VERSION);
     application.require_subcommand(1);
     int status = 0;
+    AddDbCommand(application, status);
     AddSetupCommand(application, status);
     AddReportCommand(application, status);
     try {
