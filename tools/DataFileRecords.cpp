@@ -1,0 +1,174 @@
+// What DataFileTool does with records: show, change and mark them.
+#include <algorithm>
+#include <cerrno>
+
+#include "tools/DataFileTool.h"
+#include "tools/RecordFields.h"
+
+namespace {
+
+std::string Records(long count) {
+    return std::to_string(count) + (count == 1 ? " record" : " records");
+}
+
+} // namespace
+
+bool DataFileTool::Select(const SELECTION& selection) {
+    database_.SetCaseSensitivity(selection.exact ? 1 : 0);
+    long count = database_.Query(selection.statement.c_str(), QueryMode::New);
+    for (std::size_t i = 0; i < selection.further.size() && count >= 0; ++i) {
+        const auto& [mode, statement] = selection.further[i];
+        count = database_.Query(statement.c_str(), mode);
+    }
+    return count >= 0 &&
+           (selection.sortColumn.empty() || database_.SortBy(selection.sortColumn.c_str(), 0) == 0);
+}
+
+int DataFileTool::Query(const SELECTION& selection) {
+    if (!Open(Access::Read))
+        return 1;
+    return Select(selection) ? PrintSet() : FailAsEngine();
+}
+
+// Walks the selected records as long as somebody takes the output. Returns an exit status.
+int DataFileTool::ForEachSelected(const std::function<void(long, const std::uint8_t*)>& use) {
+    long number = 0;
+    database_.GetLastError(nullptr);
+    for (void* data = database_.QueryGetFirst(&number); data != nullptr && output_.IsWorking();
+         data = database_.QueryGetNext(&number))
+        use(number, static_cast<const std::uint8_t*>(data));
+    const int code = database_.GetLastError(nullptr);
+    return code == 0 ? 0 : FailWithCode(code);
+}
+
+int DataFileTool::PrintSet() {
+    const std::vector<COLUMN_ENTRY> columns = AllColumns();
+    std::vector<std::string> names = {"record"};
+    for (const COLUMN_ENTRY& column : columns)
+        names.emplace_back(column.name);
+    TableWriter writer(format_, names, output_);
+    std::vector<CELL> row(names.size());
+    const auto fill = [&](long number, const std::uint8_t* data) {
+        row[0].SetNumber(number);
+        for (std::size_t i = 0; i < columns.size(); ++i)
+            FillCell(columns[i], data, &row[i + 1]);
+    };
+    int status = 0;
+    if (format_ == OutputFormat::Table)
+        status = ForEachSelected([&](long number, const std::uint8_t* data) {
+            fill(number, data);
+            writer.Measure(row);
+        });
+    if (status != 0)
+        return status;
+    writer.WriteHeading();
+    return ForEachSelected([&](long number, const std::uint8_t* data) {
+        fill(number, data);
+        writer.WriteRow(row);
+    });
+}
+
+int DataFileTool::Set(const std::string& statement, const SELECTION& selection) {
+    if (!Open(Access::Change))
+        return 1;
+    STATEMENT parts{};
+    std::string packed = statement;
+    if (SplitStatement(statement.c_str(), &parts)) {
+        for (const COLUMN_ENTRY& column : AllColumns()) {
+            if (std::string_view(column.name) == parts.column) {
+                packed = WithPackedValue(statement.c_str(), column);
+                break;
+            }
+        }
+    }
+    if (!Select(selection))
+        return FailAsEngine();
+    const long changed = database_.QueryUpdate(packed.c_str());
+    if (changed < 0)
+        return FailAsEngine();
+    Tell("changed", changed, Records(changed) + " changed");
+    return 0;
+}
+
+int DataFileTool::Append(const std::vector<std::string>& values) {
+    if (!Open(Access::Change))
+        return 1;
+    DATABASE_HEADER header{};
+    database_.GetHeaderInfo(&header);
+    const std::vector<COLUMN_ENTRY> columns = AllColumns();
+    std::vector<std::uint8_t> data(static_cast<std::size_t>(header.recordLength));
+    std::vector<bool> given(columns.size(), false);
+    for (const std::string& value : values) {
+        if (const std::string wrong = StoreValue(columns, value, given, data.data()); !wrong.empty())
+            return Fail(wrong);
+    }
+    const long number = database_.Append(data.data());
+    if (number < 0)
+        return FailAsEngine();
+    Tell("record", number, "record " + std::to_string(number) + " appended");
+    return 0;
+}
+
+// Stores NAME=VALUE. Returns what is wrong with it, or nothing.
+std::string DataFileTool::StoreValue(const std::vector<COLUMN_ENTRY>& columns, const std::string& assignment,
+                                     std::vector<bool>& given, std::uint8_t* data) const {
+    // A name may have a "=" in it: the longest one that fits is meant.
+    const auto lengthIn = [&assignment](const COLUMN_ENTRY& column) {
+        const std::string start = std::string(column.name) + "=";
+        return assignment.compare(0, start.size(), start) == 0 ? start.size() : 0;
+    };
+    std::size_t best = 0;
+    for (std::size_t i = 1; i < columns.size(); ++i)
+        best = lengthIn(columns[i]) > lengthIn(columns[best]) ? i : best;
+    const std::size_t length = columns.empty() ? 0 : lengthIn(columns[best]);
+    if (length == 0)
+        return "'" + assignment + "' begins with no column's name; `columns` lists them";
+    if (given[best])
+        return std::string("the column ") + columns[best].name + " is given twice";
+    given[best] = true;
+    const std::string value = assignment.substr(length);
+    const std::string wrong = StoreField(columns[best], value, data);
+    return wrong.empty() ? wrong : std::string(columns[best].name) + ": '" + value + "' " + wrong;
+}
+
+int DataFileTool::Delete(const std::vector<long>& records, const SELECTION* selection) {
+    return Mark({"deleted", [this](long n) { return database_.Delete(n); }}, records, selection);
+}
+
+int DataFileTool::UnDelete(const std::vector<long>& records) {
+    return Mark({"undeleted", [this](long n) { return database_.UnDelete(n); }}, records, nullptr);
+}
+
+int DataFileTool::Lock(const std::vector<long>& records, const SELECTION* selection) {
+    return Mark({"locked", [this](long n) { return database_.Lock(n); }}, records, selection);
+}
+
+int DataFileTool::UnLock(const std::vector<long>& records, const SELECTION* selection) {
+    return Mark({"unlocked", [this](long n) { return database_.UnLock(n); }}, records, selection);
+}
+
+int DataFileTool::Mark(const MARKING& marking, std::vector<long> records, const SELECTION* selection) {
+    if (!Open(Access::Change))
+        return 1;
+    if (selection != nullptr) {
+        if (!Select(*selection))
+            return FailAsEngine();
+        if (ForEachSelected([&records](long number, const std::uint8_t*) { records.push_back(number); }) != 0)
+            return 1;
+    }
+    int status = 0;
+    long done = 0;
+    for (const long number : records) {
+        errno = 0;
+        if (marking.apply(number) == 0) {
+            ++done;
+            continue;
+        }
+        const int code = database_.GetLastError(nullptr);
+        status = FailWithCode(code, "record " + std::to_string(number) + ": ");
+        if (IsFileFailure(code))
+            break;
+    }
+    Tell(marking.done, done, Records(done) + " " + marking.done);
+    return status;
+}

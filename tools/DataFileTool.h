@@ -1,0 +1,106 @@
+#pragma once
+
+#include <functional>
+#include <iosfwd>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "db/Database.h"
+#include "tools/TableWriter.h"
+#include "tools/TextOutput.h"
+
+// Which records a command is about.
+struct SELECTION {
+    std::string statement; // a query statement; empty for all records
+    // Further statements in their order, each with QueryMode::And or QueryMode::Or.
+    std::vector<std::pair<int, std::string>> further;
+    std::string sortColumn; // empty for the order of the file
+    bool exact = false;     // the case of letters matters
+};
+
+// One run of `quorvan-cli db`: works on one data file and tells about it. Every operation returns the
+// process's exit status, 0 when all was done and 1 when something was refused or failed. Results go to
+// `output` in the chosen format, messages to `errors`: a sentence each, with the engine's code and text where
+// the engine refused. Operations that change the file refuse one that may only be read, and one whose header
+// disagrees with it.
+//
+// It knows nothing of command-line options. The command owns it, for one operation each.
+class DataFileTool {
+  public:
+    // Both streams must outlive the tool.
+    DataFileTool(std::string file, OutputFormat format, TextOutput& output, std::ostream& errors);
+
+    // The header; the columns.
+    int Info();
+    int Columns();
+    // The records of the selection.
+    int Query(const SELECTION& selection);
+    // Applies a set statement to the selection.
+    int Set(const std::string& statement, const SELECTION& selection);
+    // Adds a record. The values are NAME=VALUE; columns without one are zero or empty.
+    int Append(const std::vector<std::string>& values);
+
+    // Marks records, by number or those of a selection. A record that is refused is told of, and the others
+    // are done all the same.
+    int Delete(const std::vector<long>& records, const SELECTION* selection);
+    int UnDelete(const std::vector<long>& records);
+    int Lock(const std::vector<long>& records, const SELECTION* selection);
+    int UnLock(const std::vector<long>& records, const SELECTION* selection);
+
+    // Writes text lines of the selection, or of all records when it is null, to a file that is replaced. With
+    // `characters` a byte column becomes the character of that code, as Load reads it, instead of a number.
+    int Export(const std::string& path, const std::string& separator, bool characters,
+               const SELECTION* selection);
+    // Appends the records of a text file. A field ends at any of the separators and at the line's end.
+    int Load(const std::string& path, const std::string& separators);
+
+    int Compact();
+    // Makes a new file. The columns are as ParseColumn reads them.
+    int Create(const std::string& description, const std::vector<std::string>& columns);
+    // Says what is wrong with the file and where: 0 only when nothing is. With `repair`, mends counts and
+    // puts back the backup of an interrupted compaction first.
+    int Check(bool repair);
+
+    // To be called last: writes what is left of the output. A reader that has gone away is no failure; what
+    // else hinders the output makes `status` 1.
+    int Finish(int status);
+
+  private:
+    enum class Access { Read, Change };
+    struct MARKING {
+        const char* done; // "deleted"
+        std::function<int(long)> apply;
+    };
+
+    [[nodiscard]] bool Open(Access access);
+    [[nodiscard]] std::string WhyNotOpened() const;
+    [[nodiscard]] int Fail(const std::string& sentence);
+    // Tells of a failure of the engine, by default its latest, with the system's reason for one of the file.
+    // Returns 1.
+    [[nodiscard]] int FailWithCode(int code, const std::string& about = "");
+    [[nodiscard]] int FailAsEngine(const std::string& about = "") {
+        return FailWithCode(database_.GetLastError(nullptr), about);
+    }
+    // The system failed; else the engine refused.
+    [[nodiscard]] static bool IsFileFailure(int code);
+    void Warn(const std::string& sentence);
+    void Tell(const char* name, long number, const std::string& sentence);
+
+    [[nodiscard]] std::vector<COLUMN_ENTRY> AllColumns();
+    [[nodiscard]] bool Select(const SELECTION& selection);
+    [[nodiscard]] int PrintSet();
+    [[nodiscard]] int ForEachSelected(const std::function<void(long, const std::uint8_t*)>& use);
+    [[nodiscard]] std::string StoreValue(const std::vector<COLUMN_ENTRY>& columns,
+                                         const std::string& assignment, std::vector<bool>& given,
+                                         std::uint8_t* data) const;
+    int Mark(const MARKING& marking, std::vector<long> records, const SELECTION* selection);
+    [[nodiscard]] bool RestoreBackup();
+    void PrintFindings(const class FileCheck& check);
+
+    std::string file_;
+    OutputFormat format_;
+    TextOutput& output_;
+    std::ostream& errors_;
+    DATABASE database_;
+};

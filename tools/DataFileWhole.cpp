@@ -1,0 +1,127 @@
+// What DataFileTool does with whole files: text files, compaction, new files, the check.
+#include <cerrno>
+#include <system_error>
+
+#include "db/Compaction.h"
+#include "db/FileCheck.h"
+#include "tools/DataFileTool.h"
+#include "tools/RecordFields.h"
+
+namespace {
+
+std::string Records(long count) {
+    return std::to_string(count) + (count == 1 ? " record" : " records");
+}
+
+} // namespace
+
+int DataFileTool::Export(const std::string& path, const std::string& separator, bool characters,
+                         const SELECTION* selection) {
+    if (!Open(Access::Read))
+        return 1;
+    if (selection != nullptr && !Select(*selection))
+        return FailAsEngine();
+    database_.SetByteOutputFormat(characters ? 1 : 2);
+    errno = 0;
+    const long lines = database_.Export(path.c_str(), selection == nullptr ? 1 : 0, separator.c_str());
+    if (lines < 0)
+        return FailAsEngine(path + ": ");
+    Tell("exported", lines, Records(lines) + " exported to " + path);
+    return 0;
+}
+
+int DataFileTool::Load(const std::string& path, const std::string& separators) {
+    if (!Open(Access::Change))
+        return 1;
+    const long loaded = database_.Load(path.c_str(), (separators + "\r\n").c_str());
+    if (loaded < 0)
+        return FailAsEngine(path + ": ");
+    Tell("loaded", loaded, Records(loaded) + " loaded from " + path);
+    return 0;
+}
+
+int DataFileTool::Compact() {
+    if (!Open(Access::Change))
+        return 1;
+    DATABASE_HEADER header{};
+    database_.GetHeaderInfo(&header);
+    if (database_.Compress(0) != 0)
+        return FailAsEngine();
+    DATABASE_HEADER compacted{};
+    database_.GetHeaderInfo(&compacted);
+    const long removed = static_cast<long>(header.recordCount) - compacted.recordCount;
+    Tell("removed", removed,
+         "compacted: " + Records(removed) + " removed, " + Records(compacted.recordCount) + " left");
+    return 0;
+}
+
+int DataFileTool::Create(const std::string& description, const std::vector<std::string>& columns) {
+    std::vector<COLUMN_ENTRY> entries;
+    for (const std::string& text : columns) {
+        COLUMN_ENTRY column{};
+        if (const std::string wrong = ParseColumn(text, &column); !wrong.empty())
+            return Fail(wrong);
+        for (const COLUMN_ENTRY& other : entries) {
+            if (std::string_view(other.name) == column.name)
+                return Fail(std::string("the column ") + column.name + " is given twice");
+        }
+        entries.push_back(column);
+    }
+    if (description.size() >= NameSize)
+        return Fail("the description is longer than 31 bytes");
+    errno = 0;
+    if (database_.Create(file_.c_str(), description.c_str(), static_cast<int>(entries.size()),
+                         entries.data()) != 0)
+        return FailAsEngine();
+    Tell("columns", static_cast<long>(entries.size()),
+         "created with " + std::to_string(entries.size()) + (entries.size() == 1 ? " column" : " columns"));
+    return 0;
+}
+
+// False when an interrupted compaction's backup could not be given back its name.
+bool DataFileTool::RestoreBackup() {
+    const int restored = RestoreCompactionBackup(file_.c_str());
+    if (restored > 0)
+        Warn("the backup of an interrupted compaction was given back its name");
+    return restored >= 0;
+}
+
+int DataFileTool::Check(bool repair) {
+    if (repair && !RestoreBackup())
+        return Fail("the backup of an interrupted compaction cannot be given back its name: " +
+                    std::generic_category().message(errno));
+    FileCheck check;
+    if (const int error = check.Run(file_); error != 0)
+        return Fail(error == ENOENT ? WhyNotOpened() : std::generic_category().message(error));
+    if (repair && check.CanRepair()) {
+        PrintFindings(check);
+        std::string backup;
+        if (const int error = check.Repair(file_, &backup); error != 0)
+            return Fail("the counts cannot be mended: " + std::generic_category().message(error));
+        Warn("the counts are mended; the file as it was is " + backup);
+        return check.IsSound() ? 0 : Fail("what is no count is left as it is");
+    }
+    PrintFindings(check);
+    return check.IsSound() ? 0 : 1;
+}
+
+void DataFileTool::PrintFindings(const FileCheck& check) {
+    if (format_ == OutputFormat::Table && check.Findings().empty()) {
+        output_.Write("nothing is wrong\n");
+        return;
+    }
+    TableWriter writer(format_, {"kind", "offset", "record", "finding"}, output_);
+    for (const bool write : {false, true}) {
+        if (write)
+            writer.WriteHeading();
+        for (const FILE_FINDING& finding : check.Findings()) {
+            CELL row[4];
+            row[0].SetText(finding.problem ? "problem" : "remark");
+            row[1].SetNumber(finding.offset);
+            if (finding.record >= 0)
+                row[2].SetNumber(finding.record);
+            row[3].SetText(finding.text);
+            write ? writer.WriteRow(row) : writer.Measure(row);
+        }
+    }
+}

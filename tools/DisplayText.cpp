@@ -1,0 +1,122 @@
+#include "tools/DisplayText.h"
+
+#include <algorithm>
+#include <array>
+
+namespace {
+
+struct CHARACTER {
+    char32_t code = 0;
+    std::size_t length = 0; // in bytes; 0 when the bytes begin no valid character
+};
+
+constexpr char32_t LastCharacter = 0x10FFFF;
+
+constexpr bool IsSurrogate(char32_t code) {
+    return code >= 0xD800 && code <= 0xDFFF;
+}
+
+CHARACTER DecodeFirst(std::string_view text) {
+    const auto byte = [text](std::size_t i) { return static_cast<unsigned char>(text[i]); };
+    if (byte(0) < 0x80U)
+        return {byte(0), 1};
+    const std::size_t length = byte(0) >= 0xF0U ? 4 : byte(0) >= 0xE0U ? 3 : 2;
+    if (byte(0) < 0xC2U || byte(0) > 0xF4U || text.size() < length)
+        return {};
+    char32_t code = byte(0) & (0xFFU >> (length + 1));
+    for (std::size_t i = 1; i < length; ++i) {
+        if ((byte(i) & 0xC0U) != 0x80U)
+            return {};
+        code = code << 6U | (byte(i) & 0x3FU);
+    }
+    constexpr std::array<char32_t, 5> least = {0, 0, 0x80, 0x800, 0x10000};
+    return code < least[length] || code > LastCharacter || IsSurrogate(code) ? CHARACTER{}
+                                                                             : CHARACTER{code, length};
+}
+
+// Control characters, and those that turn the direction of what follows.
+bool WorksTerminal(char32_t code) {
+    return code < 0x20 || (code >= 0x7F && code < 0xA0) || code == 0x2028 || code == 0x2029 ||
+           (code >= 0x202A && code <= 0x202E) || (code >= 0x2066 && code <= 0x2069);
+}
+
+void AppendHex(std::string& out, char byte) {
+    constexpr char digits[] = "0123456789ABCDEF";
+    const auto value = static_cast<unsigned char>(byte);
+    out += "\\x";
+    out += digits[value >> 4U];
+    out += digits[value & 0x0FU];
+}
+
+void AppendEscapedBytes(std::string& out, std::string_view bytes) {
+    for (const char byte : bytes) {
+        switch (byte) {
+        case '\\':
+            out += "\\\\";
+            break;
+        case '\t':
+            out += "\\t";
+            break;
+        case '\n':
+            out += "\\n";
+            break;
+        case '\r':
+            out += "\\r";
+            break;
+        default:
+            AppendHex(out, byte);
+        }
+    }
+}
+
+struct RANGE {
+    char32_t first;
+    char32_t last;
+};
+
+constexpr RANGE Combining[] = {
+    {0x300, 0x36F}, {0x200B, 0x200F}, {0x20D0, 0x20FF}, {0xFE00, 0xFE0F}, {0xFE20, 0xFE2F}};
+constexpr RANGE Wide[] = {{0x1100, 0x115F},   {0x2E80, 0x303E},   {0x3041, 0xA4CF},  {0xAC00, 0xD7A3},
+                          {0xF900, 0xFAFF},   {0xFE30, 0xFE6F},   {0xFF00, 0xFF60},  {0xFFE0, 0xFFE6},
+                          {0x1F300, 0x1F64F}, {0x1F900, 0x1F9FF}, {0x20000, 0x3FFFD}};
+
+template <std::size_t Count>
+bool IsIn(const RANGE (&ranges)[Count], char32_t code) {
+    return std::any_of(std::begin(ranges), std::end(ranges),
+                       [code](const RANGE& range) { return code >= range.first && code <= range.last; });
+}
+
+bool IsPlain(char c) {
+    return c >= ' ' && c <= '~' && c != '\\';
+}
+
+} // namespace
+
+void AppendEscaped(std::string& out, std::string_view text) {
+    while (!text.empty()) {
+        const auto plain =
+            static_cast<std::size_t>(std::find_if_not(text.begin(), text.end(), IsPlain) - text.begin());
+        out += text.substr(0, plain);
+        text.remove_prefix(plain);
+        if (text.empty())
+            return;
+        const CHARACTER character = DecodeFirst(text);
+        const std::size_t length = std::max<std::size_t>(character.length, 1);
+        if (character.length == 0 || character.code == '\\' || WorksTerminal(character.code))
+            AppendEscapedBytes(out, text.substr(0, length));
+        else
+            out += text.substr(0, length);
+        text.remove_prefix(length);
+    }
+}
+
+std::size_t DisplayWidth(std::string_view text) {
+    std::size_t width = 0;
+    while (!text.empty()) {
+        const CHARACTER character = DecodeFirst(text);
+        if (!IsIn(Combining, character.code))
+            width += IsIn(Wide, character.code) ? 2 : 1;
+        text.remove_prefix(std::max<std::size_t>(character.length, 1));
+    }
+    return width;
+}

@@ -1,0 +1,16 @@
+#pragma once
+
+#include <cstddef>
+#include <string>
+#include <string_view>
+
+// Text of any bytes as it is shown in one line of a terminal or of a tab-separated file.
+
+// Appends `text` to `out`: a backslash as "\\", tab, newline and carriage return as "\t", "\n" and "\r", and
+// every other byte that is no printable character of valid UTF-8 as "\x" and two hexadecimal digits. So what
+// is appended is valid UTF-8 on one line, works no terminal, and can be turned back into the bytes.
+void AppendEscaped(std::string& out, std::string_view text);
+
+// How many cells of a terminal a text of AppendEscaped takes: none for a combining mark, two for a wide
+// character.
+[[nodiscard]] std::size_t DisplayWidth(std::string_view text);

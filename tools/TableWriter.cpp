@@ -1,0 +1,178 @@
+#include "tools/TableWriter.h"
+
+#include <algorithm>
+#include <charconv>
+#include <cmath>
+#include <iterator>
+#include <nlohmann/json.hpp>
+#include <set>
+
+#include "tools/DisplayText.h"
+#include "util/Numbers.h"
+
+namespace {
+
+// The shortest text that reads back as the same number, without an exponent as long as that is no burden.
+void AppendShortest(std::string& out, float value) {
+    constexpr float large = 1e9F;
+    constexpr float small = 1e-4F;
+    const float size = std::fabs(value);
+    const bool plain = size == 0 || (size >= small && size < large);
+    char buffer[64];
+    char* const end = plain ? std::to_chars(buffer, std::end(buffer), value, std::chars_format::fixed).ptr
+                            : std::to_chars(buffer, std::end(buffer), value).ptr;
+    out.append(&buffer[0], end);
+}
+
+} // namespace
+
+void CELL::SetText(std::string_view bytes) {
+    kind = Kind::Text;
+    text = bytes;
+}
+
+void CELL::SetNumber(std::int64_t whole) {
+    kind = Kind::Number;
+    number = whole;
+}
+
+void CELL::SetFloat(float single, int shownDecimals) {
+    kind = Kind::Float;
+    value = single;
+    decimals = shownDecimals;
+}
+
+void CELL::SetTruth(bool truth) {
+    kind = Kind::Truth;
+    number = truth ? 1 : 0;
+}
+
+// An object whose members keep their order, and whose values are replaced row by row.
+class TableWriter::JsonLine {
+  public:
+    explicit JsonLine(const std::vector<std::string>& names) {
+        std::set<std::string> taken;
+        for (const std::string& name : names) {
+            std::string unique = name;
+            for (int number = 2; !taken.insert(unique).second; ++number)
+                unique = name + "_" + std::to_string(number);
+            object_.get_ref<Json::object_t&>().emplace_back(unique, nullptr);
+        }
+    }
+
+    [[nodiscard]] std::string Text(std::span<const CELL> row) {
+        auto member = object_.begin();
+        for (const CELL& cell : row)
+            *member++ = ValueOf(cell);
+        return object_.dump(-1, ' ', false, Json::error_handler_t::replace) + '\n';
+    }
+
+  private:
+    // Floats are single, so that 0.1 is written as 0.1.
+    using Json = nlohmann::basic_json<nlohmann::ordered_map, std::vector, std::string, bool, std::int64_t,
+                                      std::uint64_t, float>;
+
+    static Json ValueOf(const CELL& cell) {
+        switch (cell.kind) {
+        case CELL::Kind::Text:
+            return cell.text;
+        case CELL::Kind::Number:
+            return cell.number;
+        case CELL::Kind::Float:
+            return cell.value;
+        case CELL::Kind::Truth:
+            return cell.number != 0;
+        case CELL::Kind::Nothing:
+            break;
+        }
+        return nullptr;
+    }
+
+    Json object_ = Json::object();
+};
+
+TableWriter::TableWriter(OutputFormat format, const std::vector<std::string>& names, TextOutput& output)
+    : format_(format), right_(names.size(), false), output_(output) {
+    for (const std::string& name : names) {
+        AppendEscaped(names_.emplace_back(), name);
+        widths_.push_back(DisplayWidth(names_.back()));
+    }
+    if (format == OutputFormat::Json)
+        json_ = std::make_unique<JsonLine>(names);
+}
+
+TableWriter::~TableWriter() = default;
+
+// The cell's text in a table or in tab-separated text.
+void TableWriter::Render(const CELL& cell) {
+    char buffer[64];
+    field_.clear();
+    switch (cell.kind) {
+    case CELL::Kind::Text:
+        AppendEscaped(field_, cell.text);
+        break;
+    case CELL::Kind::Number:
+        field_.append(buffer, std::to_chars(buffer, std::end(buffer), cell.number).ptr);
+        break;
+    case CELL::Kind::Float:
+        if (format_ == OutputFormat::Table && FormatFixed(cell.value, buffer, sizeof(buffer), cell.decimals))
+            field_ = buffer;
+        else
+            AppendShortest(field_, cell.value);
+        break;
+    case CELL::Kind::Truth:
+        field_ = cell.number != 0 ? "yes" : "no";
+        break;
+    case CELL::Kind::Nothing:
+        break;
+    }
+}
+
+void TableWriter::Measure(std::span<const CELL> row) {
+    for (std::size_t i = 0; format_ == OutputFormat::Table && i < row.size(); ++i) {
+        Render(row[i]);
+        widths_[i] = std::max(widths_[i], DisplayWidth(field_));
+        right_[i] = row[i].kind == CELL::Kind::Number || row[i].kind == CELL::Kind::Float;
+    }
+}
+
+void TableWriter::WriteHeading() {
+    line_.clear();
+    for (std::size_t i = 0; i < names_.size(); ++i) {
+        field_ = names_[i];
+        AppendAligned(i, right_[i], i + 1 == names_.size());
+    }
+    if (format_ != OutputFormat::Json)
+        output_.Write(line_ += '\n');
+}
+
+void TableWriter::WriteRow(std::span<const CELL> row) {
+    if (json_) {
+        output_.Write(json_->Text(row));
+        return;
+    }
+    line_.clear();
+    for (std::size_t i = 0; i < row.size(); ++i) {
+        Render(row[i]);
+        const bool number = row[i].kind == CELL::Kind::Number || row[i].kind == CELL::Kind::Float;
+        AppendAligned(i, number, i + 1 == row.size());
+    }
+    output_.Write(line_ += '\n');
+}
+
+// Appends the text of the cell at hand, and what separates it from the next.
+void TableWriter::AppendAligned(std::size_t column, bool toTheRight, bool last) {
+    if (format_ == OutputFormat::Tsv) {
+        line_ += field_;
+        line_ += last ? "" : "\t";
+        return;
+    }
+    const std::size_t width = DisplayWidth(field_);
+    const std::size_t padding = widths_[column] > width ? widths_[column] - width : 0;
+    line_.append(toTheRight ? padding : 0, ' ');
+    line_ += field_;
+    line_.append(toTheRight ? 0 : padding, ' ');
+    line_ += "  ";
+    if (last)
+        line_.erase(line_.find_last_not_of(' ') + 1);
+}

@@ -1,0 +1,66 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <memory>
+#include <span>
+#include <string>
+#include <vector>
+
+#include "tools/TextOutput.h"
+
+enum class OutputFormat {
+    Table, // aligned with blanks, under a heading line
+    Tsv,   // separated by tabs, under a heading line; texts as AppendEscaped writes them
+    Json,  // an object on a line of its own for each row
+};
+
+// One value of a row. A row's cells are filled again and again, so that their texts keep their room.
+struct CELL {
+    enum class Kind {
+        Nothing, // empty; null in JSON
+        Text,    // bytes; what is no valid UTF-8 becomes U+FFFD in JSON
+        Number,
+        Float, // as short as it can be read back exactly; in a table with so many decimals
+        Truth, // yes or no; true or false in JSON
+    };
+    Kind kind = Kind::Nothing;
+    std::string text;
+    std::int64_t number = 0;
+    float value = 0;
+    int decimals = 0;
+
+    void SetText(std::string_view bytes);
+    void SetNumber(std::int64_t whole);
+    void SetFloat(float single, int shownDecimals);
+    void SetTruth(bool truth);
+};
+
+// Writes rows of cells as a table, as tab-separated text or as JSON lines. It keeps no row: for a table, all
+// rows are to be measured before the first is written, and those not measured stand out of line.
+class TableWriter {
+  public:
+    // `output` must outlive the writer. Names that occur twice get a number in JSON ("Name_2").
+    TableWriter(OutputFormat format, const std::vector<std::string>& names, TextOutput& output);
+    ~TableWriter();
+
+    // Makes the columns of a table as wide as this row needs; nothing in the other formats.
+    void Measure(std::span<const CELL> row);
+    // Writes the heading line, which JSON has none of. To be called once, before the first row.
+    void WriteHeading();
+    void WriteRow(std::span<const CELL> row);
+
+  private:
+    class JsonLine;
+    void AppendAligned(std::size_t column, bool toTheRight, bool last);
+    void Render(const CELL& cell);
+
+    OutputFormat format_;
+    std::vector<std::string> names_;
+    std::vector<std::size_t> widths_; // of a table's columns
+    std::vector<bool> right_;         // whether a table's heading stands to the right, as its numbers do
+    TextOutput& output_;
+    std::unique_ptr<JsonLine> json_;
+    std::string field_; // of the cell at hand
+    std::string line_;
+};
