@@ -280,7 +280,11 @@ int FileCheck::WriteBackup(const File& file, const std::string& path, std::strin
     int error = EEXIST;
     constexpr int mostNames = 1000;
     for (int number = 1; error == EEXIST && number <= mostNames; ++number) {
-        name = target + ".before-repair" + (number > 1 ? "-" + std::to_string(number) : "");
+        name = target + ".before-repair";
+        if (number > 1) {
+            name += "-";
+            name += std::to_string(number);
+        }
         error = copy.Open(name, FileMode::CreatePrivate);
     }
     if (error != 0) {
