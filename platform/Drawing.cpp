@@ -1,6 +1,7 @@
 // The drawing calls of BView: each draws with the painter of the paint pass under way, and asks for one when
 // there is none.
 
+#include <algorithm>
 #include <cmath>
 
 #include <QPainter>
@@ -26,6 +27,14 @@ QPen LinePen(BPoint from, BPoint to, rgb_color color, float width) {
 // The middle line of an outline that lies wholly inside rect.
 QRectF OutlineRect(const BRect& rect, float pen) {
     return ToQt(rect).adjusted(pen / 2.0, pen / 2.0, -pen / 2.0, -pen / 2.0);
+}
+
+// The part of the image with every pixel made a square of at least as many as the device has for it, so that
+// only what is left over is smoothed: pixels keep their edges at any density.
+QImage Enlarged(const QImage& image, const QRect& part, double devicePixels) {
+    constexpr double most = 16;
+    const int whole = static_cast<int>(std::ceil(std::clamp(devicePixels, 1.0, most)));
+    return image.copy(part).scaled(part.size() * whole);
 }
 
 QRectF EllipseRect(BPoint center, float xRadius, float yRadius) {
@@ -193,11 +202,14 @@ void BView::DrawString(const char* text) {
 
 void BView::DrawBitmap(const BBitmap* bitmap, BRect source, BRect target) {
     QPainter* painter = ViewAccess::Painter(this);
-    if (!painter || !bitmap)
+    if (!painter || !bitmap || !source.IsValid())
         return;
     if (drawingMode_ == B_OP_COPY)
         painter->fillRect(ToQt(target), ToQt(lowColor_));
-    painter->drawImage(ToQt(target), BitmapAccess::Image(*bitmap), ToQt(source));
+    const QRectF place = ToQt(target);
+    const QRect part = ToQt(source).toAlignedRect();
+    const double devicePixels = painter->deviceTransform().m11() * place.width() / part.width();
+    painter->drawImage(place, Enlarged(BitmapAccess::Image(*bitmap), part, devicePixels));
 }
 
 void BView::DrawBitmap(const BBitmap* bitmap, BPoint leftTop) {

@@ -1,4 +1,7 @@
 // Controls as a person finds them: worked with the mouse and the keys, read by their names.
+#include <algorithm>
+#include <cmath>
+
 #include <QCheckBox>
 #include <QClipboard>
 #include <QLabel>
@@ -10,6 +13,7 @@
 #include "platform/Button.h"
 #include "platform/CheckBox.h"
 #include "platform/Kernel.h"
+#include "platform/MenuField.h"
 #include "platform/StatusBar.h"
 #include "platform/StringView.h"
 #include "platform/TextControl.h"
@@ -85,28 +89,64 @@ TEST(Controls, HaveNamesLabelsAndLettersOfTheirOwn) {
     EXPECT_EQ(stage.Find<QPushButton>("search")->text(), "&Search");
 }
 
-// Labels and check boxes bring no background: they must stand out from the view's, not from the theme's.
-TEST(Controls, LabelsAreReadableWhateverTheTheme) {
+double Luminance(QRgb color) {
+    const auto part = [](int value) { return std::pow(value / 255.0, 2.2); };
+    return 0.2126 * part(qRed(color)) + 0.7152 * part(qGreen(color)) + 0.0722 * part(qBlue(color));
+}
+
+// The contrast ratio between the lightest and the darkest pixel that a widget shows inside its frame.
+double Contrast(const QWidget* widget) {
+    constexpr int frame = 4;
+    const QPoint place = widget->mapTo(widget->window(), QPoint(0, 0));
+    const QImage shown = widget->window()
+                             ->grab(QRect(place, widget->size()).adjusted(frame, frame, -frame, -frame))
+                             .toImage()
+                             .convertToFormat(QImage::Format_RGB32);
+    double lightest = 0;
+    double darkest = 1;
+    for (int y = 0; y < shown.height(); y++)
+        for (int x = 0; x < shown.width(); x++) {
+            lightest = std::max(lightest, Luminance(shown.pixel(x, y)));
+            darkest = std::min(darkest, Luminance(shown.pixel(x, y)));
+        }
+    return (lightest + 0.05) / (darkest + 0.05);
+}
+
+// Labels, check boxes and arrows bring no background of their own, or only half of one: they must stand out
+// from what they are drawn on, be it the view's colour or the theme's.
+TEST(Controls, AreReadableWhateverTheTheme) {
     Stage stage;
-    QPalette dark(QColor(40, 40, 40));
-    dark.setColor(QPalette::WindowText, Qt::white);
-    QApplication::setPalette(dark);
     auto* ground = stage.Add(new BView(BRect(0, 0, 399, 299), "ground", B_FOLLOW_ALL_SIDES, B_WILL_DRAW));
-    auto* box = new BCheckBox(BRect(10, 50, 200, 70), "box", "Box", nullptr);
-    ground->AddChild(box);
-    auto* total = new BStringView(BRect(10, 90, 200, 110), "total", "Total");
-    total->SetHighColor(0, 128, 0);
+    ground->AddChild(new BCheckBox(BRect(10, 10, 200, 40), "box", "Box", nullptr));
+    ground->AddChild(new BTextControl(BRect(10, 50, 300, 80), "line", "Line", "typed", nullptr));
+    ground->AddChild(new BButton(BRect(10, 90, 100, 120), "button", "Button", nullptr));
+    auto* menu = new BPopUpMenu("");
+    menu->AddItem(new BMenuItem("One", nullptr));
+    ground->AddChild(new BMenuField(BRect(10, 130, 32, 150), "arrow", "", menu));
+    ground->AddChild(new BStatusBar(BRect(10, 160, 300, 200), "bar", "Working"));
+    auto* total = new BStringView(BRect(10, 210, 200, 240), "total", "Total");
     ground->AddChild(total);
-    const auto contrast = [&](const char* name, int background) {
-        const QPalette palette = stage.Find<QWidget>(name)->palette();
-        return std::abs(palette.color(QPalette::WindowText).lightness() - background);
-    };
     stage.Show();
-    ground->SetViewColor({216, 216, 216, 255});
-    EXPECT_GT(contrast("box", 216), 120);
-    EXPECT_EQ(stage.Find<QLabel>("total")->palette().color(QPalette::WindowText), QColor(0, 128, 0));
-    ground->SetViewColor({30, 30, 30, 255});
-    EXPECT_GT(contrast("box", 30), 120);
+    QPalette dark(QColor(49, 54, 59), QColor(49, 54, 59));
+    dark.setColor(QPalette::Base, QColor(35, 38, 41));
+    for (const QPalette::ColorRole role : {QPalette::WindowText, QPalette::Text, QPalette::ButtonText})
+        dark.setColor(role, QColor(239, 240, 241));
+    for (const QPalette& palette : {QPalette(QColor(239, 239, 239)), dark}) {
+        QApplication::setPalette(palette);
+        ASSERT_TRUE(QTest::qWaitFor([&] {
+            return stage.Find<QWidget>("line")->palette().color(QPalette::Base) ==
+                   palette.color(QPalette::Base);
+        }));
+        for (const rgb_color color : {rgb_color{216, 216, 216, 255}, rgb_color{30, 30, 30, 255}}) {
+            ground->SetViewColor(color);
+            for (const char* name : {"box", "line", "line container", "button", "arrow", "bar text"})
+                EXPECT_GT(Contrast(stage.Find<QWidget>(name)), 4.5)
+                    << name << " on " << int{color.red} << " with a window of "
+                    << palette.color(QPalette::Window).lightness();
+        }
+        total->SetHighColor(0, 128, 0);
+        EXPECT_EQ(stage.Find<QLabel>("total")->palette().color(QPalette::WindowText), QColor(0, 128, 0));
+    }
 }
 
 TEST(TextControls, AreLaidOutByTheirDividerAtTheHeightTheyNeed) {

@@ -37,11 +37,14 @@ struct Shown {
         window->AddChild(canvas);
         window->Show();
     }
-    QImage Picture() const {
+    // On a screen with this many pixels to a logical one, each way.
+    QImage Picture(double density = 1) const {
+        QImage image((QSizeF(100, 100) * density).toSize(), QImage::Format_RGB32);
+        image.setDevicePixelRatio(density);
         for (QWidget* widget : QApplication::topLevelWidgets())
             if (widget->objectName() == QLatin1String("picture"))
-                return widget->grab().toImage();
-        return {};
+                widget->render(&image);
+        return image;
     }
 
     BWindow* window;
@@ -120,6 +123,28 @@ TEST(Drawing, BitmapsKeepTheirTransparentPixels) {
     });
     ExpectPixels(shown.Picture(),
                  {{10, 10, 0x000000}, {11, 10, 0x0000FF}, {20, 10, 0x000000}, {21, 10, 0xFF0000}});
+}
+
+TEST(Drawing, BitmapsStaySharpOnDenseScreens) {
+    BApplication application("test");
+    BBitmap bitmap(BRect(0, 0, 2, 0), B_CMAP8);
+    const uint8 pixels[] = {0, B_TRANSPARENT_MAGIC_CMAP8, 0};
+    bitmap.SetBits(pixels, 3, 0, B_CMAP8);
+    const Shown shown([&](BView* view) {
+        view->SetDrawingMode(B_OP_OVER);
+        view->DrawBitmap(&bitmap, BPoint(10, 10));
+    });
+    ExpectPixels(shown.Picture(2), {{19, 20, 0xFFFFFF},
+                                    {20, 20, 0x000000},
+                                    {21, 21, 0x000000},
+                                    {22, 20, 0xFFFFFF},
+                                    {23, 21, 0xFFFFFF},
+                                    {24, 20, 0x000000},
+                                    {25, 21, 0x000000},
+                                    {26, 20, 0xFFFFFF}});
+    // Between two whole densities only the pixels that two share are mixed: here there is one such at each
+    // side of the middle.
+    ExpectPixels(shown.Picture(1.5), {{15, 15, 0x000000}, {18, 15, 0x000000}, {14, 15, 0xFFFFFF}});
 }
 
 TEST(Drawing, OutsideAPaintPassItOnlyAsksForOne) {
