@@ -1,5 +1,7 @@
 #pragma once
 
+#include <memory>
+
 #include "app/RecordLayouts.h"
 #include "platform/Window.h"
 #include "util/IniFile.h"
@@ -83,6 +85,7 @@ class NorvelWindow : public BWindow {
     void OnPortfolioAdd();
     void OnPortfolioEdit();
     void OnPortfolioDelete();
+    void OnPortfolioPrint();
     // Opens the window that brings the prices up to date, unless there is no network.
     void OnPortfolioUpdate();
     // Takes the marked item out of the selector.
@@ -117,7 +120,8 @@ class NorvelWindow : public BWindow {
     BMenuField* selector_ = nullptr;
     BStringView* totalValueView_ = nullptr;
     ColumnListView* investmentList_ = nullptr;
-    char currentPortfolio_[NameSize] = ""; // whose investments are shown; empty for none
+    std::unique_ptr<BMessage> printSettings_; // chosen at the first print; null until then
+    char currentPortfolio_[NameSize] = "";    // whose investments are shown; empty for none
 };
 
 // A new row for the investment, which belongs to the caller until a list takes it.

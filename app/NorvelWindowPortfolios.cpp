@@ -11,6 +11,7 @@
 #include "dialogs/PortfolioEditDialog.h"
 #include "platform/Kernel.h"
 #include "platform/MenuField.h"
+#include "print/Report.h"
 #include "quotes/QuoteRetrieval.h"
 #include "quotes/UpdateWindow.h"
 #include "util/CharacterBuffer.h"
@@ -184,6 +185,20 @@ void NorvelWindow::OnPortfolioUpdate() {
     PrintDebugStatement((checked + "connection found ok\n").c_str(), app_state->logPath);
     new UpdateWindow(Frame().LeftTop() + BPoint(100, 100), currentPortfolio_, app_state->investments.get(),
                      investmentList_);
+}
+
+void NorvelWindow::OnPortfolioPrint() {
+    switch (RunReportJob(this, currentPortfolio_, *app_state->investments, printSettings_)) {
+    case ReportResult::NotPrinted:
+        MessageBox("The report could not be printed! Is the printer there, or the file protected?",
+                   B_STOP_ALERT);
+        break;
+    case ReportResult::NotRead:
+        TellNotRead();
+        break;
+    default:
+        break;
+    }
 }
 
 void NorvelWindow::RemoveMarkedItem() {

@@ -1,8 +1,6 @@
 // Print jobs into PDF files, read back with a PDF reader.
-#include <array>
 #include <cerrno>
 #include <csignal>
-#include <cstdio>
 #include <filesystem>
 #include <memory>
 #include <sys/resource.h>
@@ -12,6 +10,7 @@
 #include <QRadioButton>
 #include <QTimer>
 
+#include "Pdf.h"
 #include "Stage.h"
 #include "TemporaryFolder.h"
 #include "platform/PrintJob.h"
@@ -45,30 +44,6 @@ struct Job {
     BPrintJob job;
 };
 
-std::string Output(const std::string& command) {
-    const std::unique_ptr<FILE, int (*)(FILE*)> pipe(popen(command.c_str(), "r"), pclose);
-    std::string output;
-    std::array<char, 4096> part;
-    while (pipe && std::fgets(part.data(), part.size(), pipe.get()))
-        output += part.data();
-    return output;
-}
-
-// Left and bottom edge of a word in the reader's list of words, in points from the sheet's left top.
-BPoint PlaceOf(const std::string& words, const std::string& word) {
-    const std::size_t end = words.find(">" + word + "<");
-    if (end == std::string::npos)
-        return {-1, -1};
-    const std::string tag = words.substr(words.rfind("<word", end), end);
-    BPoint place;
-    float top = 0;
-    float right = 0;
-    EXPECT_EQ(std::sscanf(tag.c_str(), "<word xMin=\"%f\" yMin=\"%f\" xMax=\"%f\" yMax=\"%f\"", &place.x,
-                          &top, &right, &place.y),
-              4);
-    return place;
-}
-
 } // namespace
 
 TEST(PrintJobs, DrawViewsAndControlsInPoints) {
@@ -97,15 +72,14 @@ TEST(PrintJobs, DrawViewsAndControlsInPoints) {
     ASSERT_TRUE(job.job.CommitJob());
     EXPECT_FALSE(job.job.CanContinue());
 
-    EXPECT_NE(Output("pdfinfo " + file).find(" 2\nEncrypted"), std::string::npos)
-        << Output("pdfinfo " + file);
-    const std::string first = Output("pdftotext -f 1 -l 1 -bbox " + file + " -");
-    EXPECT_NEAR(PlaceOf(first, "Report").x, 36 + 36, 2);
-    EXPECT_NEAR(PlaceOf(first, "Report").y, 36 + 72, 5);
-    EXPECT_NEAR(PlaceOf(first, "Inner").x, 36 + 100 + 36, 2);
-    EXPECT_NEAR(PlaceOf(first, "Inner").y, 36 + 200 + 72, 5);
+    EXPECT_EQ(PdfPages(file), 2);
+    const std::vector<PdfWord> first = PdfWords(file, 1);
+    EXPECT_NEAR(FindWord(first, "Report").left, 36 + 36, 2);
+    EXPECT_NEAR(FindWord(first, "Report").bottom, 36 + 72, 5);
+    EXPECT_NEAR(FindWord(first, "Inner").left, 36 + 100 + 36, 2);
+    EXPECT_NEAR(FindWord(first, "Inner").bottom, 36 + 200 + 72, 5);
     EXPECT_NE(Output("pdfimages -f 1 -l 1 -list " + file).find("image"), std::string::npos); // the control
-    EXPECT_EQ(PlaceOf(first, "Hidden"), BPoint(-1, -1));
+    EXPECT_EQ(FindWord(first, "Hidden").text, "");
     Output("pdftoppm -r 72 -png -singlefile " + file + " " + folder.File("first"));
     const QImage picture(QString::fromStdString(folder.File("first.png")));
     const auto inked = [&](QRect place) {
@@ -117,8 +91,8 @@ TEST(PrintJobs, DrawViewsAndControlsInPoints) {
     };
     EXPECT_TRUE(inked(QRect(72, 36 + 60, 40, 14)));
     EXPECT_FALSE(inked(QRect(72, 36 + 688, 40, 14))); // outside what was to be drawn
-    const std::string second = Output("pdftotext -f 2 -l 2 -bbox " + file + " -");
-    EXPECT_NEAR(PlaceOf(second, "Report").y, 36 + 72 - 50 + 100, 5);
+    const std::vector<PdfWord> second = PdfWords(file, 2);
+    EXPECT_NEAR(FindWord(second, "Report").bottom, 36 + 72 - 50 + 100, 5);
 }
 
 TEST(PrintJobs, KeepTheirSetUpInAMessageAndRefuseNonsense) {
