@@ -1,0 +1,63 @@
+#pragma once
+
+#include <csignal>
+#include <functional>
+#include <stdexcept>
+
+#include <sys/wait.h>
+#include <unistd.h>
+
+// The result (0 to 255) of work done in a process of its own; -1 when a signal ended it.
+inline int ResultInChild(const std::function<int()>& work) {
+    const pid_t child = fork();
+    if (child == 0)
+        _exit(work());
+    int status = 0;
+    waitpid(child, &status, 0);
+    return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+}
+
+// The same, as an ordinary user also where the tests run as root, whom no permission keeps out.
+inline int ResultAsOrdinaryUser(const std::function<int()>& work) {
+    return ResultInChild([&] {
+        constexpr int nobody = 65534;
+        const bool ordinary = getuid() != 0 || (setgid(nobody) == 0 && setuid(nobody) == 0);
+        return ordinary ? work() : 255;
+    });
+}
+
+// A process that does some work and then waits to be killed.
+class WaitingChild {
+  public:
+    // The work is done when the constructor returns; it should not end the process.
+    explicit WaitingChild(const std::function<void()>& work) {
+        int ends[2];
+        if (pipe(ends) != 0)
+            throw std::runtime_error("no pipe");
+        id_ = fork();
+        if (id_ == 0) {
+            work();
+            static_cast<void>(!write(ends[1], "", 1));
+            for (;;)
+                pause();
+        }
+        close(ends[1]);
+        char done = 0;
+        static_cast<void>(!read(ends[0], &done, 1));
+        close(ends[0]);
+    }
+    WaitingChild(const WaitingChild&) = delete;
+    WaitingChild& operator=(const WaitingChild&) = delete;
+    ~WaitingChild() { Kill(); }
+
+    [[nodiscard]] pid_t Id() const { return id_; }
+    // It has no chance to clear up.
+    void Kill() {
+        if (!killed_ && kill(id_, SIGKILL) == 0)
+            killed_ = waitpid(id_, nullptr, 0) == id_;
+    }
+
+  private:
+    pid_t id_ = -1;
+    bool killed_ = false;
+};
