@@ -4,6 +4,7 @@
 
 #include <cstdio>
 #include <cstring>
+#include <filesystem>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -61,10 +62,15 @@ inline void FillInvestment(long i, char* data) {
     PutText(data + 157, 72, i % 10 == 3 ? "Med" : "Low");
 }
 
+inline bool MakeEmptyFile(DATABASE& database, const std::string& path) {
+    const auto columns = BenchColumns();
+    std::filesystem::remove(path);
+    return database.Create(path.c_str(), "benchmark", static_cast<int>(columns.size()), columns.data()) == 0;
+}
+
 inline bool MakeFile(const std::string& path, long records) {
     DATABASE database(nullptr);
-    const auto columns = BenchColumns();
-    if (database.Create(path.c_str(), "benchmark", static_cast<int>(columns.size()), columns.data()) != 0) {
+    if (!MakeEmptyFile(database, path)) {
         return false;
     }
     database.SetImmediateHeaderWrite(0);
@@ -83,14 +89,20 @@ class Peer {
   public:
     enum class Journal { Off, Default };
 
-    Peer(const std::string& path, long records, Journal journal = Journal::Off) {
+    static constexpr const char* Table =
+        "CREATE TABLE t (Portfolio TEXT COLLATE NOCASE, Name TEXT, Ticker TEXT, Type TEXT, Retire INT,"
+        " Shares REAL, Date INT, Price REAL, PrevPrice REAL, Value REAL, Agent TEXT,"
+        " Risk TEXT COLLATE NOCASE, QuoteError INT)";
+
+    // Opens a file that is there.
+    explicit Peer(const std::string& path, Journal journal = Journal::Off) {
         good_ = sqlite3_open(path.c_str(), &connection_) == SQLITE_OK;
         Run("PRAGMA synchronous = OFF; PRAGMA cache_size = -1000000");
         Run(journal == Journal::Off ? "PRAGMA journal_mode = OFF" : "PRAGMA journal_mode = DELETE");
-        Run("CREATE TABLE t (Portfolio TEXT COLLATE NOCASE, Name TEXT, Ticker TEXT, Type TEXT, Retire INT,"
-            " Shares REAL, Date INT, Price REAL, PrevPrice REAL, Value REAL, Agent TEXT, Risk TEXT COLLATE "
-            "NOCASE,"
-            " QuoteError INT)");
+    }
+    // Makes one.
+    Peer(const std::string& path, long records, Journal journal = Journal::Off) : Peer(path, journal) {
+        Run(Table);
         Insert(0, records);
     }
     Peer(const Peer&) = delete;
@@ -104,6 +116,11 @@ class Peer {
     // Adds made-up investments in one transaction.
     void Insert(long first, long count) {
         Run("BEGIN");
+        InsertEach(first, count);
+        Run("COMMIT");
+    }
+    // The same, each in a transaction of its own.
+    void InsertEach(long first, long count) {
         sqlite3_stmt* insert = nullptr;
         sqlite3_prepare_v2(connection_, "INSERT INTO t VALUES (?1,?2,?3,?4,0,?5,0,?6,0,?7,?8,?9,0)", -1,
                            &insert, nullptr);
@@ -115,7 +132,6 @@ class Peer {
             sqlite3_reset(insert);
         }
         sqlite3_finalize(insert);
-        Run("COMMIT");
     }
 
     // Runs a statement that changes rows, and tells how many.

@@ -33,15 +33,22 @@ inline bool ReadOptions(int argc, char** argv, OPTIONS* options) {
     return argc % 2 == 1;
 }
 
-// The shortest of several runs, in seconds.
-template <class Work>
-double Shortest(int rounds, Work work) {
+// The shortest of several runs, in seconds. `prepare` comes before each and is not counted.
+template <class Prepare, class Work>
+double Shortest(int rounds, Prepare prepare, Work work) {
     double shortest = 1e9;
     for (int i = 0; i < rounds; ++i) {
+        prepare();
         const auto start = std::chrono::steady_clock::now();
         work();
         const std::chrono::duration<double> took = std::chrono::steady_clock::now() - start;
         shortest = std::min(shortest, took.count());
     }
     return shortest;
+}
+
+template <class Work>
+double Shortest(int rounds, Work work) {
+    return Shortest(
+        rounds, [] {}, work);
 }

@@ -1,5 +1,7 @@
-// Prints what the record engine does in a second beside a bare sequential read of the same bytes, all from
-// one run over one file of investments (230 bytes of data) that lies in the page cache.
+// Prints how long the record engine takes beside SQLite (same columns, no index, journal and synchronous off)
+// and beside a limit, all from one run over one file of investments (230 bytes of data) that lies in the page
+// cache. The limit is a bare sequential read or copy of the same bytes, or the part of the work that cannot
+// be left out. Text is written and read beside the sqlite3 shell, when there is one.
 //
 //   db_bench [--records N] [--rounds N] [--folder PATH]
 
@@ -10,39 +12,72 @@
 
 namespace {
 
-long BareRead(const std::string& path) {
+constexpr long AppendedAtMost = 100'000;
+
+// Reads a file, and writes what it reads to `copy` unless that is null.
+void BareRead(const std::string& path, const char* copy = nullptr) {
     static std::vector<char> buffer(256 * 1024);
     const int file = open(path.c_str(), O_RDONLY | O_CLOEXEC);
-    long total = 0;
+    const int target = copy != nullptr ? open(copy, O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600) : -1;
     ssize_t got = 0;
     while ((got = read(file, buffer.data(), buffer.size())) > 0) {
-        total += got;
+        if (target >= 0 && write(target, buffer.data(), static_cast<std::size_t>(got)) != got) {
+            break;
+        }
     }
     close(file);
-    return total;
+    close(target);
 }
 
-// What is done, in both engines; each tells how many records it met.
+// One line of the table. Seconds; 0 for what there is none of.
+struct LINE {
+    const char* work;
+    double ours;
+    double theirs = 0;
+    double limit = 0;
+    double wantedOfTheirs = 0; // at most so many times
+    double wantedOfLimit = 0;
+};
+
+void PrintRatio(double ours, double other, double wanted) {
+    if (other == 0) {
+        std::printf(" %10s %8s %-7s", "", "", "");
+        return;
+    }
+    char bracket[16] = "";
+    if (wanted > 0) {
+        std::snprintf(bracket, sizeof(bracket), "(%.2f)", wanted);
+    }
+    std::printf(" %10.2f %8.3f %-7s", other * 1e3, ours / other, bracket);
+}
+
+// What is done in both engines, again and again on the same file; each tells how many records it met.
 struct WORK {
     const char* name;
-    const char* readLimit; // wanted at most, as a multiple of the bare read
-    const char* peerLimit; // and of SQLite
+    double wantedOfTheirs;
+    double wantedOfLimit; // a bare read
     long (*ours)(DATABASE&);
     long (*theirs)(Peer&);
 };
 
+long SortAll(DATABASE& database, const char* column) {
+    const long all = database.QueryReset();
+    return database.SortBy(column, 0) == 0 ? all : -1;
+}
+
 const WORK Works[] = {
-    {"NEW query, \"=\" on text", "(1.30)", "(0.50)",
+    {"NEW query, \"=\" on text", 0.5, 1.3,
      [](DATABASE& database) { return database.Query("Portfolio = portfolio 17", QueryMode::New); },
      [](Peer& peer) { return peer.Step("SELECT rowid FROM t WHERE Portfolio = 'portfolio 17'"); }},
-    {"NEW query, \">\" on float", "(1.30)", "(0.50)",
+    {"NEW query, \">\" on float", 0.5, 1.3,
      [](DATABASE& database) { return database.Query("Price > 1000", QueryMode::New); },
      [](Peer& peer) { return peer.Step("SELECT rowid FROM t WHERE Price > 1000"); }},
-    {"NEW query, \"contains\" ignoring case", "(2.00)", "(0.20)",
+    {"NEW query, \"contains\" ignoring case", 0.2, 2,
      [](DATABASE& database) { return database.Query("Name contains NUMBER 99", QueryMode::New); },
      [](Peer& peer) { return peer.Step("SELECT rowid FROM t WHERE Name LIKE '%NUMBER 99%'"); }},
-    {"walk of all records", "(1.50)", "(0.50)",
+    {"walk of all records", 0.5, 1.5,
      [](DATABASE& database) {
+         database.QueryReset();
          long walked = 0;
          for (void* data = database.QueryGetFirst(nullptr); data != nullptr; ++walked) {
              data = database.QueryGetNext(nullptr);
@@ -50,44 +85,225 @@ const WORK Works[] = {
          return walked;
      },
      [](Peer& peer) { return peer.Step("SELECT * FROM t"); }},
-    {"query and update of 1 %", "", "(1.00)",
-     [](DATABASE& database) {
-         database.Query("Portfolio = portfolio 17", QueryMode::New);
-         return database.QueryUpdate("Retire = 1");
-     },
-     [](Peer& peer) { return peer.Change("UPDATE t SET Retire = 1 WHERE Portfolio = 'portfolio 17'"); }},
-    {"query and update of 10 %, text", "", "(1.00)",
-     [](DATABASE& database) {
-         database.Query("Risk = med", QueryMode::New);
-         return database.QueryUpdate("Agent = Somebody Else");
-     },
-     [](Peer& peer) { return peer.Change("UPDATE t SET Agent = 'Somebody Else' WHERE Risk = 'med'"); }},
+    {"sort by text", 0.35, 0, [](DATABASE& database) { return SortAll(database, "Name"); },
+     [](Peer& peer) { return peer.Step("SELECT rowid FROM t ORDER BY Name COLLATE NOCASE"); }},
+    {"sort by text, 100 different ones", 0.35, 0,
+     [](DATABASE& database) { return SortAll(database, "Portfolio"); },
+     [](Peer& peer) { return peer.Step("SELECT rowid FROM t ORDER BY Portfolio"); }},
+    {"sort by number", 0.3, 0, [](DATABASE& database) { return SortAll(database, "Price"); },
+     [](Peer& peer) { return peer.Step("SELECT rowid FROM t ORDER BY Price"); }},
 };
 
-bool Compare(const OPTIONS& options, const std::string& path, Peer& peer) {
-    BareRead(path); // warms the page cache
-    const double bareRead = Shortest(options.rounds, [&] { BareRead(path); });
-    DATABASE database(path.c_str());
-    bool agree = true;
-    std::printf("%ld records; limits in brackets\n%-38s %10s %14s %18s %10s %18s\n", options.records, "work",
-                "ms", "records/s", "x bare read", "SQLite ms", "x SQLite");
-    std::printf("%-38s %10.2f\n", "bare sequential read", bareRead * 1e3);
-    for (const WORK& work : Works) {
-        long ours = 0;
-        long theirs = 0;
-        database.QueryReset();
-        const double seconds = Shortest(options.rounds, [&] { ours = work.ours(database); });
-        const double peers = Shortest(std::min(options.rounds, 3), [&] { theirs = work.theirs(peer); });
-        std::printf("%-38s %10.2f %14.0f %10.2f %-7s %11.2f %10.3f %-7s\n", work.name, seconds * 1e3,
-                    static_cast<double>(options.records) / seconds, seconds / bareRead, work.readLimit,
-                    peers * 1e3, seconds / peers, work.peerLimit);
-        if (ours != theirs) {
-            std::fprintf(stderr, "%s: %ld records, SQLite has %ld\n", work.name, ours, theirs);
-            agree = false;
+// Changes of the records that a query selects.
+struct CHANGE {
+    const char* name;
+    double wantedOfTheirs;
+    double wantedOfLimit; // the query alone
+    const char* query;
+    const char* set;
+    const char* theirs;
+};
+
+const CHANGE Changes[] = {
+    {"query and update of 1 %", 1, 1.5, "Portfolio = portfolio 17", "Retire = 1",
+     "UPDATE t SET Retire = 1 WHERE Portfolio = 'portfolio 17'"},
+    {"query and update of 10 %, text", 1, 0, "Risk = med", "Agent = Somebody Else",
+     "UPDATE t SET Agent = 'Somebody Else' WHERE Risk = 'med'"},
+};
+
+// The files of one run, and its table.
+class Bench {
+  public:
+    Bench(const OPTIONS& options, std::string folder)
+        : rounds_(options.rounds),
+          fewRounds_(std::min(options.rounds, 3)),
+          records_(options.records),
+          folder_(std::move(folder)),
+          path_(folder_ + "/invest.db"),
+          peerPath_(folder_ + "/peer.sqlite") {}
+
+    // True when everything worked and both engines met the same records.
+    bool Run() {
+        std::printf("%ld records; wanted at most in brackets\n%-36s %10s %10s %16s %10s %16s\n", records_,
+                    "work", "ms", "SQLite ms", "ratio", "limit ms", "ratio");
+        if (!MakeFile(path_, records_)) {
+            return false;
+        }
+        {
+            Peer peer(peerPath_, records_);
+            DATABASE database(path_.c_str());
+            MeasureWorks(database, peer);
+            MeasureChanges(database, peer);
+            Check(peer.IsGood(), "SQLite");
+        }
+        MeasureAppend();
+        MeasureText();
+        MeasureCompaction();
+        return good_;
+    }
+
+  private:
+    static void Print(const LINE& line) {
+        std::printf("%-36s %10.2f", line.work, line.ours * 1e3);
+        PrintRatio(line.ours, line.theirs, line.wantedOfTheirs);
+        PrintRatio(line.ours, line.limit, line.wantedOfLimit);
+        std::printf("\n");
+        std::fflush(stdout);
+    }
+
+    void Check(bool good, const char* work) {
+        if (!good) {
+            std::fprintf(stderr, "%s: failed, or SQLite has another result\n", work);
+            good_ = false;
         }
     }
-    return agree && peer.IsGood();
-}
+
+    void MeasureWorks(DATABASE& database, Peer& peer) {
+        BareRead(path_); // warms the page cache
+        const double bareRead = Shortest(rounds_, [&] { BareRead(path_); });
+        Print({"bare sequential read", bareRead});
+        for (const WORK& work : Works) {
+            long ours = 0;
+            long theirs = 0;
+            const double seconds = Shortest(rounds_, [&] { ours = work.ours(database); });
+            const double peers = Shortest(fewRounds_, [&] { theirs = work.theirs(peer); });
+            Print({work.name, seconds, peers, bareRead, work.wantedOfTheirs, work.wantedOfLimit});
+            Check(ours == theirs, work.name);
+        }
+    }
+
+    void MeasureChanges(DATABASE& database, Peer& peer) {
+        for (const CHANGE& change : Changes) {
+            long ours = 0;
+            long theirs = 0;
+            const double query = Shortest(rounds_, [&] { database.Query(change.query, QueryMode::New); });
+            const double seconds = Shortest(rounds_, [&] {
+                database.Query(change.query, QueryMode::New);
+                ours = database.QueryUpdate(change.set);
+            });
+            const double peers = Shortest(fewRounds_, [&] { theirs = peer.Change(change.theirs); });
+            Print({change.name, seconds, peers, query, change.wantedOfTheirs, change.wantedOfLimit});
+            Check(ours == theirs, change.name);
+        }
+    }
+
+    void MeasureAppend() {
+        const long count = std::min(records_, AppendedAtMost);
+        const std::string path = folder_ + "/append.db";
+        const std::string peerPath = folder_ + "/append.sqlite";
+        std::vector<char> data(static_cast<std::size_t>(count) * DataSize);
+        for (long i = 0; i < count; ++i) {
+            FillInvestment(i, &data[static_cast<std::size_t>(i) * DataSize]);
+        }
+        DATABASE database(nullptr);
+        bool good = true;
+        const double ours = Shortest(
+            fewRounds_, [&] { good &= MakeEmptyFile(database, path); },
+            [&] {
+                for (long i = 0; i < count; ++i) {
+                    good &= database.Append(&data[static_cast<std::size_t>(i) * DataSize]) == i;
+                }
+            });
+        Peer peer(peerPath, 0);
+        const double theirs = Shortest(fewRounds_, [&] { peer.InsertEach(0, count); });
+        Print({"append, flushed, header written", ours, theirs, 0, 0.4});
+        Check(good && peer.IsGood(), "append");
+    }
+
+    void MeasureText() {
+        if (std::system("command -v sqlite3 > /dev/null") != 0) {
+            std::printf("Text is not compared: there is no sqlite3 shell.\n");
+            return;
+        }
+        const std::string text = folder_ + "/invest.txt";
+        const std::string csv = folder_ + "/peer.csv";
+        DATABASE database(path_.c_str());
+        long exported = 0;
+        long loaded = 0;
+        bool good = true;
+        double ours = Shortest(fewRounds_, [&] { exported = database.Export(text.c_str(), 1, "\t"); });
+        double theirs = Shortest(
+            fewRounds_, [&] { good &= Shell(peerPath_, "'.mode csv' 'SELECT * FROM t' > '" + csv + "'"); });
+        Print({"export of text", ours, theirs, 0, 0.5});
+        const std::string copyPath = folder_ + "/copy.db";
+        const std::string peerCopyPath = folder_ + "/copy.sqlite";
+        DATABASE copy(nullptr);
+        ours = Shortest(
+            fewRounds_, [&] { good &= MakeEmptyFile(copy, copyPath); },
+            [&] { loaded = copy.Load(text.c_str(), "\t\n"); });
+        theirs = Shortest(
+            fewRounds_,
+            [&] {
+                std::filesystem::remove(peerCopyPath);
+                Peer(peerCopyPath, 0);
+            },
+            [&] {
+                good &=
+                    Shell(peerCopyPath, "'PRAGMA journal_mode = OFF' 'PRAGMA synchronous = OFF' '.mode csv' "
+                                        "'.import \"" +
+                                            csv + "\" t' > /dev/null");
+            });
+        Print({"load of text", ours, theirs, 0, 0.5});
+        good &= exported == records_ && loaded == records_;
+        good &= Peer(peerCopyPath).Step("SELECT rowid FROM t") == records_;
+        Check(good, "text");
+        for (const std::string& path : {text, csv, copyPath, peerCopyPath}) {
+            std::filesystem::remove(path); // makes room for what follows
+        }
+    }
+
+    static bool Shell(const std::string& path, const std::string& arguments) {
+        return std::system(("sqlite3 '" + path + "' " + arguments).c_str()) == 0;
+    }
+
+    void MeasureCompaction() {
+        bool good = DeleteHalf();
+        const std::string work = folder_ + "/work.db";
+        const std::string copy = folder_ + "/copy.db";
+        const double limit = Shortest(fewRounds_, [&] { BareRead(path_, copy.c_str()); });
+        DATABASE database(nullptr);
+        const double ours = Shortest(
+            fewRounds_,
+            [&] {
+                BareRead(path_, work.c_str());
+                good &= database.Open(work.c_str()) == 0;
+            },
+            [&] { good &= database.Compress(0) == 0; });
+        std::filesystem::remove(copy);
+        const std::string peerWork = folder_ + "/work.sqlite";
+        const double theirs = Shortest(
+            fewRounds_, [&] { BareRead(peerPath_, peerWork.c_str()); },
+            [&] {
+                Peer peer(peerWork);
+                peer.Run("VACUUM");
+                good &= peer.IsGood();
+            });
+        Print({"compaction, half deleted", ours, theirs, limit, 0.5, 3});
+        good &= Peer(peerWork).Step("SELECT rowid FROM t") == database.GetNumberOfActiveRecords();
+        Check(good, "compaction");
+    }
+
+    // Deletes every other record of both files.
+    bool DeleteHalf() {
+        DATABASE database(path_.c_str());
+        database.SetImmediateHeaderWrite(0);
+        bool good = true;
+        for (long i = 1; i < records_; i += 2) {
+            good &= database.Delete(i) == 0;
+        }
+        Peer peer(peerPath_);
+        peer.Run("DELETE FROM t WHERE rowid % 2 = 0");
+        return database.SetImmediateHeaderWrite(1) == 0 && good && peer.IsGood();
+    }
+
+    int rounds_;
+    int fewRounds_;
+    long records_;
+    std::string folder_;
+    std::string path_;
+    std::string peerPath_;
+    bool good_ = true;
+};
 
 } // namespace
 
@@ -102,12 +318,7 @@ int main(int argc, char** argv) {
         std::perror(folder.c_str());
         return 1;
     }
-    const std::string path = folder + "/invest.db";
-    bool good = MakeFile(path, options.records);
-    if (good) {
-        Peer peer(folder + "/peer.sqlite", options.records);
-        good = Compare(options, path, peer);
-    }
+    const bool good = Bench(options, folder).Run();
     std::filesystem::remove_all(folder);
     return good ? 0 : 1;
 }
