@@ -48,6 +48,7 @@ class RowsWidget : public QListView {
     void resizeEvent(QResizeEvent* event) override;
     void scrollContentsBy(int dx, int dy) override;
     void updateGeometries() override;
+    void changeEvent(QEvent* event) override;
     void focusInEvent(QFocusEvent* event) override;
     void keyPressEvent(QKeyEvent* event) override { Input(event); }
     void mousePressEvent(QMouseEvent* event) override { Input(event); }

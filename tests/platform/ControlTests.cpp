@@ -6,14 +6,18 @@
 #include <QClipboard>
 #include <QLabel>
 #include <QLineEdit>
+#include <QListView>
 #include <QProgressBar>
 #include <QPushButton>
+#include <QScrollBar>
 
 #include "Stage.h"
 #include "platform/Button.h"
 #include "platform/CheckBox.h"
 #include "platform/Kernel.h"
+#include "platform/ListView.h"
 #include "platform/MenuField.h"
+#include "platform/ScrollView.h"
 #include "platform/StatusBar.h"
 #include "platform/StringView.h"
 #include "platform/TextControl.h"
@@ -112,6 +116,11 @@ double Contrast(const QWidget* widget) {
     return (lightest + 0.05) / (darkest + 0.05);
 }
 
+class BlankRow : public BListItem {
+  public:
+    void DrawItem(BView*, BRect, bool) override {}
+};
+
 // Labels, check boxes and arrows bring no background of their own, or only half of one: they must stand out
 // from what they are drawn on, be it the view's colour or the theme's.
 TEST(Controls, AreReadableWhateverTheTheme) {
@@ -126,7 +135,13 @@ TEST(Controls, AreReadableWhateverTheTheme) {
     ground->AddChild(new BStatusBar(BRect(10, 160, 300, 200), "bar", "Working"));
     auto* total = new BStringView(BRect(10, 210, 200, 240), "total", "Total");
     ground->AddChild(total);
+    BlankRow rows[30];
+    auto* list = new BListView(BRect(310, 10, 370, 60), "list");
+    for (BlankRow& row : rows)
+        list->AddItem(&row);
+    ground->AddChild(new BScrollView("around", list, B_FOLLOW_NONE, 0, false, true, B_NO_BORDER));
     stage.Show();
+    stage.Find<QListView>("list")->verticalScrollBar()->setObjectName("scroll bar");
     QPalette dark(QColor(49, 54, 59), QColor(49, 54, 59));
     dark.setColor(QPalette::Base, QColor(35, 38, 41));
     for (const QPalette::ColorRole role : {QPalette::WindowText, QPalette::Text, QPalette::ButtonText})
@@ -139,7 +154,8 @@ TEST(Controls, AreReadableWhateverTheTheme) {
         }));
         for (const rgb_color color : {rgb_color{216, 216, 216, 255}, rgb_color{30, 30, 30, 255}}) {
             ground->SetViewColor(color);
-            for (const char* name : {"box", "line", "line container", "button", "arrow", "bar text"})
+            for (const char* name :
+                 {"box", "line", "line container", "button", "arrow", "bar text", "scroll bar"})
                 EXPECT_GT(Contrast(stage.Find<QWidget>(name)), 4.5)
                     << name << " on " << int{color.red} << " with a window of "
                     << palette.color(QPalette::Window).lightness();
