@@ -81,7 +81,11 @@ int DATABASE::Compress(int /*ignored*/) {
     if (target.Open(paths.temporary, FileMode::CreatePrivate) != 0) {
         return Fail(DatabaseError::CompressOpenTemporary);
     }
-    if (int code = WriteCompacted(target); code != DatabaseError::None) {
+    int code = WriteCompacted(target);
+    if (code == DatabaseError::None && SyncFolderOf(operations_, paths.temporary) != 0) {
+        code = DatabaseError::CompressWriteFailed;
+    }
+    if (code != DatabaseError::None) {
         target.Close();
         static_cast<void>(RemoveFile(operations_, paths.temporary)); // gives back the room it took
         return Fail(code);
@@ -144,9 +148,9 @@ int DATABASE::SwapIn(const COMPACTION_PATHS& paths) {
     if (RenameFile(operations_, paths.temporary, paths.data) != 0) {
         return Fail(DatabaseError::CompressSecondRename);
     }
-    // The names must be on the disk before the old data goes.
-    static_cast<void>(SyncFolderOf(operations_, paths.data));
-    const bool denied = IsPermissionDenied(RemoveFile(operations_, paths.backup));
+    // The names must be on the disk before the old data goes; else it stays until the next run.
+    const bool swapped = SyncFolderOf(operations_, paths.data) == 0;
+    const bool denied = swapped && IsPermissionDenied(RemoveFile(operations_, paths.backup));
     char path[PathBufferSize];
     std::memcpy(path, path_, PathBufferSize);
     const int opened = Open(path);

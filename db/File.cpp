@@ -232,11 +232,11 @@ int SyncFolderOf(FileOperations& operations, const std::string& path) {
     int descriptor =
         Retry([&] { return operations.Open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC, 0); });
     if (descriptor < 0) {
-        return errno;
+        return errno == EACCES ? 0 : errno;
     }
-    int error = ErrorOf(Retry([&] { return operations.Sync(descriptor); }));
+    const int error = ErrorOf(Retry([&] { return operations.Sync(descriptor); }));
     operations.Close(descriptor);
-    return error;
+    return error == EINVAL ? 0 : error;
 }
 
 bool FileExists(const std::string& path) {

@@ -87,8 +87,9 @@ class File {
 [[nodiscard]] int RenameFile(FileOperations& operations, const std::string& from, const std::string& to);
 /// Removes a file. Returns 0 or an errno number.
 [[nodiscard]] int RemoveFile(FileOperations& operations, const std::string& path);
-/// Returns when the names in the folder that holds `path` have reached the disk. Returns 0 or an errno
-/// number.
+/// Returns when the names in the folder that holds `path` have reached the disk, or at once where the system
+/// has no way to wait for it: in a folder that may not be read, or a file system that does not know how.
+/// Returns 0 or an errno number.
 [[nodiscard]] int SyncFolderOf(FileOperations& operations, const std::string& path);
 /// Tells whether a file, folder or symbolic link of that name exists.
 [[nodiscard]] bool FileExists(const std::string& path);

@@ -81,11 +81,55 @@ TEST_F(CompactionTest, CopyOfAPrivateFileIsPrivateFromTheStart) {
     EXPECT_EQ(watched.seen & 0777U, 0600U);
 }
 
+TEST_F(CompactionTest, IsOnTheDiskBeforeTheSwap) {
+    struct : FileOperations {
+        std::vector<std::string> calls;
+        static std::string Name(const std::string& path) { return path.substr(path.rfind('/') + 1); }
+        int Sync(int file) override {
+            struct stat status {};
+            calls.push_back(Status(file, &status) == 0 && S_ISDIR(status.st_mode) ? "sync folder" : "sync");
+            return FileOperations::Sync(file);
+        }
+        ssize_t WriteAt(int file, const void* data, std::size_t size, off_t offset) override {
+            if (calls.empty() || calls.back() != "write") {
+                calls.emplace_back("write");
+            }
+            return FileOperations::WriteAt(file, data, size, offset);
+        }
+        int Rename(const char* from, const char* to) override {
+            calls.push_back(Name(from) + " to " + Name(to));
+            return FileOperations::Rename(from, to);
+        }
+        int Remove(const char* path) override {
+            calls.push_back("remove " + Name(path));
+            return FileOperations::Remove(path);
+        }
+    } watched;
+    DATABASE database(path_.c_str(), watched);
+    ASSERT_EQ(database.Compress(0), 0);
+    EXPECT_EQ(watched.calls,
+              (std::vector<std::string>{"remove rows.new", "write", "sync", "sync folder", "remove rows.bak",
+                                        "rows.db to rows.bak", "rows.new to rows.db", "sync folder",
+                                        "remove rows.bak"}));
+}
+
+TEST_F(CompactionTest, KeepsTheOwner) {
+    struct stat status {};
+    if (chown(path_.c_str(), 12345, 12346) != 0) {
+        GTEST_SKIP() << "only root may give files away";
+    }
+    DATABASE database(path_.c_str());
+    ASSERT_EQ(database.Compress(0), 0);
+    ASSERT_EQ(stat(path_.c_str(), &status), 0);
+    EXPECT_EQ(status.st_uid, 12345U);
+    EXPECT_EQ(status.st_gid, 12346U);
+}
+
 // What each failing step leaves on disk. Whatever it is, the object goes on working with complete data.
 TEST_F(CompactionTest, OutcomesOfFailingSteps) {
     const struct {
         int call; // 0 removes a leftover, then open, header and 7 columns, records, header and columns, mode,
-                  // sync, remove, rename, rename, sync of the folder, remove
+                  // sync, sync of the folder, remove, rename, rename, sync of the folder, remove
         int error;
         int code;
         std::vector<std::string> files;
@@ -96,21 +140,22 @@ TEST_F(CompactionTest, OutcomesOfFailingSteps) {
         {10, ENOSPC, 2706, {"rows.db"}, 3},
         {18, EIO, 2706, {"rows.db"}, 3},
         {20, EIO, 2706, {"rows.db"}, 3},
-        {21, EACCES, 2704, {"rows.db", "rows.new", "rows.bak"}, 3},
-        {21, EPERM, 2704, {"rows.db", "rows.new", "rows.bak"}, 3},
-        {21, ENOENT, 0, {"rows.db"}, 2},
-        {22, EACCES, 2702, {"rows.db", "rows.new"}, 3},
-        {23, EIO, 2703, {"rows.new", "rows.bak"}, 3},
-        {24, EIO, 0, {"rows.db"}, 2},
-        {25, EACCES, 2704, {"rows.db", "rows.bak"}, 2},
+        {21, EIO, 2706, {"rows.db"}, 3},
+        {22, EACCES, 2704, {"rows.db", "rows.new", "rows.bak"}, 3},
+        {22, EPERM, 2704, {"rows.db", "rows.new", "rows.bak"}, 3},
+        {22, ENOENT, 0, {"rows.db"}, 2},
+        {23, EACCES, 2702, {"rows.db", "rows.new"}, 3},
+        {24, EIO, 2703, {"rows.new", "rows.bak"}, 3},
         {25, EIO, 0, {"rows.db", "rows.bak"}, 2},
+        {26, EACCES, 2704, {"rows.db", "rows.bak"}, 2},
+        {26, EIO, 0, {"rows.db", "rows.bak"}, 2},
     };
     for (const auto& failure : cases) {
         SCOPED_TRACE("call " + std::to_string(failure.call) + " error " + std::to_string(failure.error));
         std::filesystem::remove_all(folder_.Path());
         std::filesystem::create_directory(folder_.Path());
         MakeFile(path_);
-        if (failure.call == 21) {
+        if (failure.call == 22) {
             folder_.Write("rows.bak", "left over");
         }
         const std::string before = folder_.Read("rows.db");
