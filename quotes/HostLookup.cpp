@@ -1,5 +1,6 @@
 #include "quotes/HostLookup.h"
 
+#include <arpa/inet.h>
 #include <cstdint>
 #include <memory>
 #include <mutex>
@@ -15,19 +16,6 @@
 #include "quotes/StopSignal.h"
 
 namespace {
-
-bool Resolve(const char* name, int flags, in_addr* address) {
-    addrinfo hints{};
-    hints.ai_family = AF_INET;
-    hints.ai_socktype = SOCK_STREAM;
-    hints.ai_flags = flags;
-    addrinfo* list = nullptr;
-    if (*name == '\0' || getaddrinfo(name, nullptr, &hints, &list) != 0)
-        return false;
-    *address = reinterpret_cast<const sockaddr_in*>(list->ai_addr)->sin_addr;
-    freeaddrinfo(list);
-    return true;
-}
 
 // One look-up, shared by who asks and the thread that resolves: the last of the two takes it down.
 class PendingLookup {
@@ -49,7 +37,7 @@ class PendingLookup {
     }
 
     [[nodiscard]] HostLookup Await(int stopFd, in_addr* address) {
-        if (!WaitUnlessStopped(doneFd_, POLLIN, stopFd))
+        if (WaitUnlessStopped(doneFd_, POLLIN, stopFd) == Waited::Stopped)
             return HostLookup::Stopped;
         const std::lock_guard lock(mutex_);
         *address = address_;
@@ -81,16 +69,25 @@ HostLookup LookUpOnThread(const char* name, int stopFd, in_addr* address, NameRe
 
 } // namespace
 
+bool ReadNumericAddress(const char* name, in_addr* address) {
+    return inet_pton(AF_INET, name, address) == 1;
+}
+
 bool ResolveName(const char* name, in_addr* address) {
-    return Resolve(name, 0, address);
+    addrinfo hints{};
+    hints.ai_family = AF_INET;
+    hints.ai_socktype = SOCK_STREAM;
+    addrinfo* list = nullptr;
+    if (*name == '\0' || getaddrinfo(name, nullptr, &hints, &list) != 0)
+        return false;
+    *address = reinterpret_cast<const sockaddr_in*>(list->ai_addr)->sin_addr;
+    freeaddrinfo(list);
+    return true;
 }
 
 HostLookup LookUpHost(const char* name, int stopFd, in_addr* address, NameResolver resolver) {
     if (IsStopped(stopFd))
         return HostLookup::Stopped;
-    // An address in figures asks nobody.
-    if (Resolve(name, AI_NUMERICHOST, address))
-        return HostLookup::Found;
     if (stopFd < 0)
         return resolver(name, address) ? HostLookup::Found : HostLookup::NotFound;
     return LookUpOnThread(name, stopFd, address, resolver);

@@ -4,6 +4,9 @@
 
 enum class HostLookup { Found, NotFound, Stopped };
 
+// Reads a name that is an IPv4 address in figures, for which nobody needs to be asked.
+[[nodiscard]] bool ReadNumericAddress(const char* name, in_addr* address);
+
 // Stores a host's first IPv4 address; false when the name has none.
 using NameResolver = bool (*)(const char* name, in_addr* address);
 

@@ -33,7 +33,7 @@ PlainExchange::~PlainExchange() {
 }
 
 float PlainExchange::Ask(const HostField& host, const char* path, QuoteScanner& scanner) {
-    Step step = LookUp(host);
+    Step step = LookUp(host.name.c_str());
     if (step == Step::Failed)
         return NoQuote;
     if (step == Step::Done)
@@ -57,16 +57,27 @@ PlainExchange::Step PlainExchange::Fail(const char* line) {
     return Step::Failed;
 }
 
-PlainExchange::Step PlainExchange::LookUp(const HostField& host) {
+bool PlainExchange::Wait(short events) {
+    Waited waited = WaitUnlessStopped(socket_, events, context_.stopFd, 0);
+    if (waited == Waited::NotYet) {
+        report_.Flush();
+        waited = WaitUnlessStopped(socket_, events, context_.stopFd);
+    }
+    return waited != Waited::Stopped;
+}
+
+PlainExchange::Step PlainExchange::LookUp(const char* host) {
     in_addr address{};
-    switch (LookUpHost(host.name.c_str(), context_.stopFd, &address)) {
-    case HostLookup::Stopped:
+    HostLookup result = HostLookup::Found;
+    if (!ReadNumericAddress(host, &address)) {
+        report_.Flush();
+        result = LookUpHost(host, context_.stopFd, &address);
+    }
+    if (result == HostLookup::Stopped)
         return Step::Stopped;
-    case HostLookup::NotFound:
+    if (result == HostLookup::NotFound) {
         errno = 0;
         return Fail("gethostbyname() error");
-    case HostLookup::Found:
-        break;
     }
     address_ = address.s_addr;
     report_.Log("gethostname() ok\n");
@@ -84,7 +95,7 @@ PlainExchange::Step PlainExchange::Connect(std::uint16_t port) {
     server.sin_addr.s_addr = address_;
     int error = connect(socket_, reinterpret_cast<const sockaddr*>(&server), sizeof server) == 0 ? 0 : errno;
     if (error == EINPROGRESS || error == EINTR) {
-        if (!WaitUnlessStopped(socket_, POLLOUT, context_.stopFd))
+        if (!Wait(POLLOUT))
             return Step::Stopped;
         socklen_t size = sizeof error;
         getsockopt(socket_, SOL_SOCKET, SO_ERROR, &error, &size);
@@ -117,7 +128,7 @@ PlainExchange::Step PlainExchange::Send(const char* path) {
             rest.remove_prefix(static_cast<std::size_t>(sent));
         else if (!MustWait())
             return Fail("send() error");
-        else if (!WaitUnlessStopped(socket_, POLLOUT, context_.stopFd))
+        else if (!Wait(POLLOUT))
             return Step::Stopped;
     }
     return Step::Done;
@@ -126,7 +137,7 @@ PlainExchange::Step PlainExchange::Send(const char* path) {
 PlainExchange::Step PlainExchange::Receive(QuoteScanner& scanner) {
     char buffer[BufferSize];
     for (;;) {
-        if (!WaitUnlessStopped(socket_, POLLIN, context_.stopFd))
+        if (!Wait(POLLIN))
             return Step::Stopped;
         const ssize_t received = recv(socket_, buffer, sizeof buffer, 0);
         if (received < 0 && MustWait())

@@ -15,8 +15,7 @@ class QuoteScanner;
 // A local object of the look-up; what it is given is borrowed.
 class PlainExchange {
   public:
-    PlainExchange(const QuoteContext& context, const QuoteReport& report)
-        : context_(context), report_(report) {}
+    PlainExchange(const QuoteContext& context, QuoteReport& report) : context_(context), report_(report) {}
     PlainExchange(const PlainExchange&) = delete;
     PlainExchange& operator=(const PlainExchange&) = delete;
     ~PlainExchange();
@@ -28,16 +27,18 @@ class PlainExchange {
   private:
     enum class Step { Done, Failed, Stopped };
 
-    [[nodiscard]] Step LookUp(const HostField& host);
+    [[nodiscard]] Step LookUp(const char* host);
     [[nodiscard]] Step Connect(std::uint16_t port);
     [[nodiscard]] Step Send(const char* path);
     // Failed when the page ended without a price.
     [[nodiscard]] Step Receive(QuoteScanner& scanner);
     Step Fail(const char* line);
+    // False when the caller shall stop.
+    [[nodiscard]] bool Wait(short events);
     void ReportConnection(std::uint16_t port) const;
 
     const QuoteContext& context_;
-    const QuoteReport& report_;
+    QuoteReport& report_;
     std::uint32_t address_ = 0; // in network order
     int socket_ = -1;
 };

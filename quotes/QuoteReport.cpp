@@ -21,29 +21,35 @@ QuoteObserver* Nobody() {
 QuoteReport::QuoteReport(const char* logPath, QuoteObserver* observer)
     : log_(logPath), observer_(observer ? observer : Nobody()) {}
 
-void QuoteReport::Log(const char* format, ...) const {
+void QuoteReport::Log(const char* format, ...) {
     char formatted[LogLineSize];
     va_list arguments;
     va_start(arguments, format);
     const int length = std::vsnprintf(formatted, sizeof formatted, format, arguments);
     va_end(arguments);
     if (length < static_cast<int>(sizeof formatted)) {
-        log_.Write(formatted);
+        LogWhole(formatted);
         return;
     }
     // What was cut off must not take the line's end along: the next line would run into it.
     char line[LogLineSize];
     CopyText(line, LogLineSize - 1, formatted);
     std::strcat(line, "\n");
-    log_.Write(line);
+    LogWhole(line);
 }
 
-void QuoteReport::LogNumber(const char* text, float value) const {
+void QuoteReport::LogNumber(const char* text, float value) {
     char number[64];
     FormatFixed(static_cast<double>(value), number, sizeof number, 2);
     Log("%s%s\n", text, number);
 }
 
-void QuoteReport::LogWhole(const char* text) const {
-    log_.Write(text);
+void QuoteReport::LogWhole(const char* text) {
+    unwritten_ += text;
+}
+
+void QuoteReport::Flush() {
+    if (!unwritten_.empty())
+        log_.Write(unwritten_.c_str());
+    unwritten_.clear();
 }

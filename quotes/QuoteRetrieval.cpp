@@ -8,6 +8,7 @@
 #include "quotes/QuoteReport.h"
 #include "quotes/QuoteScanner.h"
 #include "quotes/QuoteSource.h"
+#include "quotes/StopSignal.h"
 #include "quotes/TlsExchange.h"
 #include "util/WholeFile.h"
 
@@ -16,8 +17,10 @@ namespace {
 constexpr std::size_t MaxSourceFileSize = 16'000'000;
 
 float AskSource(const char* host, const char* path, const char* tag, int skip, const QuoteContext& context,
-                const QuoteReport& report) {
+                QuoteReport& report) {
     report.Log("In GetQuote\n");
+    if (IsStopped(context.stopFd))
+        return QuoteCancelled;
     HostField server;
     if (!ParseHostField(host, &server)) {
         const char* reason = "the host is none of NAME, NAME:PORT and https://NAME[:PORT]";
@@ -39,7 +42,7 @@ const char* PrepareSource(const QuoteSourceReader& reader, const char* ticker, Q
     return AppendTicker(source, ticker) ? nullptr : "its path has more than 127 bytes with the ticker";
 }
 
-float AskForTicker(const QuoteSource& source, const QuoteContext& context, const QuoteReport& report) {
+float AskForTicker(const QuoteSource& source, const QuoteContext& context, QuoteReport& report) {
     report.Log("Checking '%s%s'\n", source.host, source.path);
     report.Observer().SourceTried(source);
     const float result = AskSource(source.host, source.path, source.tag, source.skip, context, report);
@@ -56,7 +59,7 @@ bool EndsTheSearch(float result) {
 }
 
 float SearchSources(std::string_view sources, const char* ticker, const QuoteContext& context,
-                    const QuoteReport& report) {
+                    QuoteReport& report) {
     using Line = QuoteSourceReader::Line;
     QuoteSourceReader reader(sources);
     float result = NoQuote;
@@ -81,7 +84,7 @@ float SearchSources(std::string_view sources, const char* ticker, const QuoteCon
 } // namespace
 
 float GetPriceQuote(const char* ticker, const QuoteContext& context) {
-    const QuoteReport report(context.logPath, context.observer);
+    QuoteReport report(context.logPath, context.observer);
     std::string sources;
     if (!ReadWholeFile(context.sourcePath, sources, MaxSourceFileSize)) {
         report.Log("Unable to open '%s'\n", context.sourcePath);
@@ -92,11 +95,13 @@ float GetPriceQuote(const char* ticker, const QuoteContext& context) {
 }
 
 float GetPriceQuoteFrom(std::string_view sources, const char* ticker, const QuoteContext& context) {
-    return SearchSources(sources, ticker, context, QuoteReport(context.logPath, context.observer));
+    QuoteReport report(context.logPath, context.observer);
+    return SearchSources(sources, ticker, context, report);
 }
 
 float GetQuote(const char* host, const char* path, const char* tag, int skip, const QuoteContext& context) {
-    return AskSource(host, path, tag, skip, context, QuoteReport(context.logPath, context.observer));
+    QuoteReport report(context.logPath, context.observer);
+    return AskSource(host, path, tag, skip, context, report);
 }
 
 bool IsConnected(const char* hostName, int stopFd) {

@@ -21,7 +21,7 @@ float PriceOf(double whole, double fraction) {
 
 } // namespace
 
-QuoteScanner::QuoteScanner(std::string_view tag, int skip, const QuoteReport& report)
+QuoteScanner::QuoteScanner(std::string_view tag, int skip, QuoteReport& report)
     : report_(report), tag_(tag), remaining_(skip), price_(NoQuote) {}
 
 bool QuoteScanner::Scan(std::string_view piece) {

@@ -16,7 +16,7 @@ class QuoteScanner {
   public:
     // The number of ">" counts from the marker's first character on; 0 or less lets the price text begin
     // right there. The report is told what is found, and must outlive the scanner.
-    QuoteScanner(std::string_view tag, int skip, const QuoteReport& report);
+    QuoteScanner(std::string_view tag, int skip, QuoteReport& report);
 
     // Reads the next piece. True when the search has ended with it: pieces after that are not looked at.
     [[nodiscard]] bool Scan(std::string_view piece);
@@ -31,7 +31,7 @@ class QuoteScanner {
     [[nodiscard]] bool PassBrackets(std::string_view& rest);
     void ReadPrice(std::string_view token, std::string_view following);
 
-    const QuoteReport& report_;
+    QuoteReport& report_;
     std::string tag_;
     int remaining_; // characters ">" to be passed yet
     bool tagFound_ = false;

@@ -3,14 +3,16 @@
 #include <cerrno>
 #include <poll.h>
 
-bool WaitUnlessStopped(int fd, short events, int stopFd) {
+Waited WaitUnlessStopped(int fd, short events, int stopFd, int milliseconds) {
     pollfd fds[] = {{fd, events, 0}, {stopFd, POLLIN, 0}};
-    while (poll(fds, 2, -1) < 0 && errno == EINTR) {
+    while (poll(fds, 2, milliseconds) < 0 && errno == EINTR) {
     }
-    return fds[1].revents == 0;
+    if (fds[1].revents != 0)
+        return Waited::Stopped;
+    return fds[0].revents != 0 ? Waited::Ready : Waited::NotYet;
 }
 
 bool IsStopped(int stopFd) {
     pollfd stop{stopFd, POLLIN, 0};
-    return poll(&stop, 1, 0) > 0;
+    return stopFd >= 0 && poll(&stop, 1, 0) > 0;
 }

@@ -178,8 +178,9 @@ float StatusOf(CURLcode result) {
 } // namespace
 
 float AskOverTls(const HostField& host, const char* path, QuoteScanner& scanner, const QuoteContext& context,
-                 const QuoteReport& report) {
+                 QuoteReport& report) {
     Transfer transfer(Address(host, path), context.caFile);
+    report.Flush();
     if (!transfer.Run(context.stopFd))
         return QuoteCancelled;
     if (const std::string server = transfer.Server(); !server.empty()) {

@@ -16,4 +16,4 @@ class QuoteScanner;
 // QuoteNetworkFailure for every other failure of connection, TLS or transfer; QuoteCancelled as soon as the
 // context's stop descriptor is readable. The report gets a line that says what failed.
 [[nodiscard]] float AskOverTls(const HostField& host, const char* path, QuoteScanner& scanner,
-                               const QuoteContext& context, const QuoteReport& report);
+                               const QuoteContext& context, QuoteReport& report);

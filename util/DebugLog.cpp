@@ -20,17 +20,15 @@ void PrintDebugStatement(const char* text, const char* logPath) {
         close(file);
 }
 
-DebugLog::DebugLog(const char* logPath) {
-    if (logPath)
-        file_ = Open(logPath, O_APPEND);
-}
-
 DebugLog::~DebugLog() {
     if (file_ >= 0)
         close(file_);
 }
 
-void DebugLog::Write(const char* text) const {
+void DebugLog::Write(const char* text) {
+    if (logPath_)
+        file_ = Open(logPath_, O_APPEND);
+    logPath_ = nullptr;
     // A log that cannot take the text loses it: there is nobody to tell.
     if (file_ >= 0)
         (void)!write(file_, text, std::strlen(text));

@@ -166,7 +166,7 @@ TEST_F(Retrieval, ReadsEachPieceAsItArrives) {
     for (const char byte : "#>\n<7 1/2"s)
         bytes.emplace_back(1, byte);
     pages.push_back(bytes);
-    const QuoteReport nobody(nullptr, nullptr);
+    QuoteReport nobody(nullptr, nullptr);
     for (const auto& pieces : pages) {
         const char* tag = pieces.size() == 2 ? "Last" : "#";
         const int skip = pieces.size() == 2 ? 3 : 1;

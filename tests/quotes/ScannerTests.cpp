@@ -22,12 +22,13 @@ struct Scanned {
 
 Scanned Scan(const std::vector<std::string>& pieces, const std::string& tag, int skip) {
     const TemporaryFolder folder;
-    const QuoteReport report(folder.File("log").c_str(), nullptr);
+    QuoteReport report(folder.File("log").c_str(), nullptr);
     QuoteScanner scanner(tag, skip, report);
     for (const std::string& piece : pieces) {
         if (scanner.Scan(piece))
             break;
     }
+    report.Flush();
     return {scanner.Price(), folder.Read("log")};
 }
 
