@@ -5,7 +5,6 @@
 #include <functional>
 #include <string_view>
 
-#include "db/Allocate.h"
 #include "db/LittleEndian.h"
 #include "db/LoweredText.h"
 #include "util/Strings.h"
@@ -123,29 +122,7 @@ Word LoadWord(const void* bytes) {
     return word;
 }
 
-constexpr std::size_t SearchBlock = 16;
-
-// Searches value in text. The first and the last byte of the value are looked for at a whole block of places
-// at once, which compilers turn into a few instructions; bytes up to a block and the value's length behind
-// the text are read.
-bool Contains(const std::uint8_t* text, std::size_t length, std::string_view value) {
-    const auto first = static_cast<std::uint8_t>(value.front());
-    const auto last = static_cast<std::uint8_t>(value.back());
-    const std::size_t lastAt = value.size() - 1;
-    for (std::size_t at = 0; at + value.size() <= length; at += SearchBlock) {
-        std::uint8_t candidates = 0;
-        for (std::size_t i = 0; i < SearchBlock; ++i) {
-            candidates |=
-                static_cast<std::uint8_t>((text[at + i] == first) & (text[at + i + lastAt] == last));
-        }
-        for (std::size_t i = at; candidates != 0 && i < at + SearchBlock && i + value.size() <= length; ++i) {
-            if (text[i] == first && std::memcmp(text + i, value.data(), value.size()) == 0) {
-                return true;
-            }
-        }
-    }
-    return false;
-}
+constexpr std::size_t PlacesAtOnce = 16;
 
 } // namespace
 
@@ -197,22 +174,78 @@ struct Matchers {
         }
     }
 
-    static void LoweredContains(const Condition& self, const std::uint8_t* field, std::size_t stride,
-                                std::size_t count, std::uint8_t* matches) {
-        const std::string_view value(self.text_, self.length_);
+    // Whether a place agrees with the value in the bits that count.
+    static bool AgreesAt(const Condition& self, const std::uint8_t* place) {
+        std::uint8_t difference = 0;
+        for (std::size_t i = 0; i < self.length_; ++i) {
+            difference |= static_cast<std::uint8_t>((place[i] ^ self.text_[i]) & self.bits_[i]);
+        }
+        return difference == 0;
+    }
+
+    // The first of some places in a row that agrees; their number when none does. The value's first and last
+    // byte are looked at in all of them at once, which compilers turn into a few instructions.
+    static std::size_t FirstOfBlock(const Condition& self, const std::uint8_t* places) {
+        const std::size_t last = self.length_ - 1;
+        const auto firstBits = static_cast<std::uint8_t>(self.bits_[0]);
+        const auto lastBits = static_cast<std::uint8_t>(self.bits_[last]);
+        const auto firstByte = static_cast<std::uint8_t>(self.text_[0] & firstBits);
+        const auto lastByte = static_cast<std::uint8_t>(self.text_[last] & lastBits);
+        std::uint8_t agree[PlacesAtOnce];
+        for (std::size_t i = 0; i < PlacesAtOnce; ++i) {
+            agree[i] = static_cast<std::uint8_t>(((places[i] & firstBits) == firstByte) &
+                                                 ((places[i + last] & lastBits) == lastByte));
+        }
+        if ((LoadWord<std::uint64_t>(agree) | LoadWord<std::uint64_t>(agree + 8)) == 0) {
+            return PlacesAtOnce;
+        }
+        std::size_t i = 0;
+        while (i < PlacesAtOnce && !(agree[i] != 0 && AgreesAt(self, places + i))) {
+            ++i;
+        }
+        return i;
+    }
+
+    // The first place in a column that agrees, whether the text reaches that far or not; the number of places
+    // when none does.
+    static std::size_t FirstPlace(const Condition& self, const std::uint8_t* field, std::size_t places) {
+        std::size_t at = 0;
+        if (places < PlacesAtOnce) {
+            while (at < places && !AgreesAt(self, field + at)) {
+                ++at;
+            }
+            return at;
+        }
+        while (at < places) {
+            at = std::min(at, places - PlacesAtOnce); // the last block begins in the one before
+            const std::size_t found = FirstOfBlock(self, field + at);
+            at += found;
+            if (found < PlacesAtOnce) {
+                break;
+            }
+        }
+        return at;
+    }
+
+    template <bool Exact>
+    static void ContainsText(const Condition& self, const std::uint8_t* field, std::size_t stride,
+                             std::size_t count, std::uint8_t* matches) {
+        const std::size_t places = self.length_ > self.width_ ? 0 : self.width_ - self.length_ + 1;
         for (std::size_t i = 0; i < count; ++i, field += stride) {
-            const std::string_view text = TextOf(field, self.width_);
-            CopyLowered(field, self.width_, self.scratch_.get());
-            matches[i] = Contains(self.scratch_.get(), text.size(), value);
+            const std::size_t place = FirstPlace(self, field, places);
+            matches[i] = place < places && IsInText<Exact>(self, field, place + self.length_);
         }
     }
 
-    static void ExactContains(const Condition& self, const std::uint8_t* field, std::size_t stride,
-                              std::size_t count, std::uint8_t* matches) {
-        const std::string_view value(self.text_, self.length_);
-        for (std::size_t i = 0; i < count; ++i, field += stride) {
-            matches[i] = TextOf(field, self.width_).find(value) != std::string_view::npos;
+    // Whether what agrees and ends `end` bytes into the field is part of the text. Behind a byte of 128 or
+    // above case counts, so that another place may be the right one.
+    template <bool Exact>
+    static bool IsInText(const Condition& self, const std::uint8_t* field, std::size_t end) {
+        const std::string_view before = TextOf(field, end);
+        if (!Exact && before.size() == end && AsciiLength(before) < end) {
+            return ContainsLowered(TextOf(field, self.width_), {self.text_, self.length_});
         }
+        return before.size() == end;
     }
 
     static void Nothing(const Condition& /*self*/, const std::uint8_t* /*field*/, std::size_t /*stride*/,
@@ -261,7 +294,7 @@ struct Matchers {
         case CompareOperator::GreaterOrEqual:
             return exact ? ExactTexts<std::greater_equal<>> : LoweredTexts<std::greater_equal<>>;
         case CompareOperator::Contains:
-            return exact ? ExactContains : LoweredContains;
+            return exact ? ContainsText<true> : ContainsText<false>;
         default:
             return Nothing;
         }
@@ -275,13 +308,14 @@ struct Matchers {
     }
 };
 
-bool Condition::Prepare(const COLUMN_ENTRY& column, int op, const char* value, bool exact) {
+void Condition::Prepare(const COLUMN_ENTRY& column, int op, const char* value, bool exact) {
     offset_ = static_cast<std::size_t>(column.offset);
     width_ = static_cast<std::size_t>(column.size);
     switch (column.type) {
     case ColumnType::String:
         matcher_ = Matchers::OfTexts(op, exact, width_);
-        return PrepareText(value, op == CompareOperator::Contains, exact);
+        PrepareText(value, exact);
+        break;
     case ColumnType::Byte:
         whole_ = std::int32_t{static_cast<std::int8_t>(WholeNumber(value))};
         matcher_ = Matchers::OfNumbers<ByteField>(op);
@@ -309,10 +343,9 @@ bool Condition::Prepare(const COLUMN_ENTRY& column, int op, const char* value, b
     default:
         matcher_ = Matchers::Nothing;
     }
-    return true;
 }
 
-bool Condition::PrepareText(const char* value, bool searched, bool exact) {
+void Condition::PrepareText(const char* value, bool exact) {
     length_ = strnlen(value, TokenSize - 1);
     std::memcpy(text_, value, length_);
     std::memset(bits_, 0xFF, length_ + 1);
@@ -323,15 +356,6 @@ bool Condition::PrepareText(const char* value, bool searched, bool exact) {
             bits_[i] = static_cast<char>(text_[i] >= 'a' && text_[i] <= 'z' ? ~CaseBit : ~0);
         }
     }
-    if (searched) {
-        const std::size_t size = width_ + SearchBlock + TokenSize;
-        scratch_ = TryAllocate<std::uint8_t>(size);
-        if (!scratch_) {
-            return false;
-        }
-        std::memset(scratch_.get(), 0, size);
-    }
-    return true;
 }
 
 int CompareOperatorOf(const char* token) {

@@ -2,7 +2,6 @@
 
 #include <cstddef>
 #include <cstdint>
-#include <memory>
 
 #include "db/RecordTypes.h"
 #include "db/Statement.h"
@@ -53,9 +52,9 @@ template <class T>
 /// column and knows nothing of files, deleted records or result sets.
 class Condition {
   public:
-    /// `op` must be a CompareOperator, Contains only for a string column. A column of unknown type matches
-    /// nothing. False when there is no memory.
-    [[nodiscard]] bool Prepare(const COLUMN_ENTRY& column, int op, const char* value, bool exact);
+    /// `op` must be a CompareOperator, Contains only for a string column; `value` is not empty. A column of
+    /// unknown type matches nothing.
+    void Prepare(const COLUMN_ENTRY& column, int op, const char* value, bool exact);
 
     /// Asks about `count` records that lie `stride` bytes apart, `data` being the data of the first:
     /// matches[i] becomes 1 or 0.
@@ -65,7 +64,7 @@ class Condition {
 
   private:
     friend struct Matchers;
-    [[nodiscard]] bool PrepareText(const char* value, bool searched, bool exact);
+    void PrepareText(const char* value, bool exact);
     using Matcher = void (*)(const Condition& self, const std::uint8_t* fields, std::size_t stride,
                              std::size_t count, std::uint8_t* matches);
 
@@ -78,5 +77,4 @@ class Condition {
     char bits_[TokenSize]{}; // of each byte of text_ and its terminator, the bits in which an equal field
                              // agrees
     std::size_t length_ = 0; // of text_
-    std::unique_ptr<std::uint8_t[]> scratch_; // for Contains: a field's text in lower letters
 };

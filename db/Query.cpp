@@ -73,9 +73,8 @@ int DATABASE::PrepareCondition(const char* statement, Condition* condition) cons
     if (op == CompareOperator::Contains && column->type != ColumnType::String) {
         return DatabaseError::QueryContainsNeedsString;
     }
-    return condition->Prepare(*column, op, parts.value, caseSensitive_)
-               ? DatabaseError::None
-               : DatabaseError::QueryNoMemoryForRecord;
+    condition->Prepare(*column, op, parts.value, caseSensitive_);
+    return DatabaseError::None;
 }
 
 bool DATABASE::NewSlots() {

@@ -43,18 +43,19 @@ int DATABASE::ReadSortKeys(SortKeys* keys) {
         }
     }
     if (sorted_) {
-        keys->OrderByWord();
+        keys->OrderByRecord();
     }
-    for (const SortKeys::ENTRY& entry : *keys) {
+    for (SortKeys::ENTRY& entry : keys->Entries()) {
         const std::int32_t number = slots_[entry.slot];
         if (!reader->Holds(number) && reader->Fill(file_, Area(), number) != 0) {
             return DatabaseError::SortReadFailed;
         }
         const std::uint8_t* record = reader->Record(number);
-        keys->TakeKey(*record == RecordStatus::Deleted ? nullptr : record + 1);
-    }
-    if (sorted_) {
-        keys->OrderBySlot();
+        if (*record == RecordStatus::Deleted) {
+            SortKeys::SetGone(&entry);
+        } else {
+            keys->SetKey(&entry, record + 1);
+        }
     }
     return DatabaseError::None;
 }
@@ -62,17 +63,18 @@ int DATABASE::ReadSortKeys(SortKeys* keys) {
 // Puts the records into the slots that the set uses, in the order of their keys; those that are gone leave
 // it.
 void DATABASE::TakeSortOrder(const SortKeys& keys) {
-    for (const SortKeys::ENTRY* gone = keys.EndOfKeys(); gone != keys.end(); ++gone) {
-        slots_[gone->slot] = NotInSet;
+    for (const SortKeys::ENTRY& gone : keys.Gone()) {
+        slots_[gone.slot] = NotInSet;
         --resultCount_;
     }
-    for (SortKeys::ENTRY* entry = keys.begin(); entry != keys.EndOfKeys(); ++entry) {
-        entry->key = slots_[entry->slot]; // the texts have done their part: now the record's number
+    const std::span<SortKeys::ENTRY> sorted = keys.Sorted();
+    for (SortKeys::ENTRY& entry : sorted) {
+        entry.word = static_cast<std::uint32_t>(slots_[entry.slot]); // the record, before its slot is taken
     }
-    const SortKeys::ENTRY* entry = keys.begin();
+    auto entry = sorted.begin();
     for (std::int32_t i = 0; i < slotCount_; ++i) {
         if (slots_[i] != NotInSet) {
-            slots_[i] = entry++->key;
+            slots_[i] = static_cast<std::int32_t>((entry++)->word);
         }
     }
     sorted_ = true;

@@ -1,9 +1,11 @@
 #include "db/SortKeys.h"
 
 #include <algorithm>
+#include <array>
 #include <bit>
 #include <cmath>
 #include <cstring>
+#include <numeric>
 #include <utility>
 
 #include "db/Allocate.h"
@@ -47,19 +49,51 @@ std::uint64_t OrderedNumber(std::int8_t type, const std::uint8_t* field, std::si
     }
 }
 
-bool WordIsLess(const SortKeys::ENTRY& a, const SortKeys::ENTRY& b) {
-    return a.word != b.word ? a.word < b.word : a.slot < b.slot;
-}
-
-void SortByWord(SortKeys::ENTRY* first, SortKeys::ENTRY* last) {
-    if (!std::is_sorted(first, last, WordIsLess)) { // as all the same, or sorted before
-        std::sort(first, last, WordIsLess);
-    }
-}
-
 // Whether a text is over with this word: what is behind its end is 0.
 bool IsLastWord(std::uint64_t word) {
     return (word & 0xFF) == 0;
+}
+
+// A sort of numbers byte by byte, the lowest first: a few passes, however many entries there are, and it
+// keeps the order of equal ones.
+constexpr int ByteCount = sizeof(std::uint64_t);
+constexpr std::size_t ByteValues = 256;
+constexpr std::size_t FewEntries = 1024; // are sorted faster by comparing
+
+std::size_t ByteOf(std::uint64_t word, int byte) {
+    return (word >> (8 * byte)) & 0xFF;
+}
+
+using COUNTS = std::array<std::array<std::uint32_t, ByteValues>, ByteCount>;
+
+void CountBytes(std::span<const SortKeys::ENTRY> entries, COUNTS* counts) {
+    for (const SortKeys::ENTRY& entry : entries) {
+        for (int byte = 0; byte < ByteCount; ++byte) {
+            ++(*counts)[static_cast<std::size_t>(byte)][ByteOf(entry.word, byte)];
+        }
+    }
+}
+
+// Sorts by bytes; `scratch` has room for as many entries.
+void SortByBytes(std::span<SortKeys::ENTRY> entries, SortKeys::ENTRY* scratch) {
+    COUNTS counts{};
+    CountBytes(entries, &counts);
+    SortKeys::ENTRY* from = entries.data();
+    SortKeys::ENTRY* to = scratch;
+    for (int byte = 0; byte < ByteCount; ++byte) {
+        auto& places = counts[static_cast<std::size_t>(byte)];
+        if (places[ByteOf(entries.front().word, byte)] == entries.size()) {
+            continue; // the same in all
+        }
+        std::exclusive_scan(places.begin(), places.end(), places.begin(), 0U);
+        for (const SortKeys::ENTRY* entry = from; entry != from + entries.size(); ++entry) {
+            to[places[ByteOf(entry->word, byte)]++] = *entry;
+        }
+        std::swap(from, to);
+    }
+    if (from != entries.data()) {
+        std::copy_n(from, entries.size(), entries.data());
+    }
 }
 
 } // namespace
@@ -68,41 +102,36 @@ bool SortKeys::Prepare(const COLUMN_ENTRY& column, std::int32_t count) {
     column_ = column;
     const auto entries = static_cast<std::size_t>(count);
     entries_ = TryAllocate<ENTRY>(entries);
+    scratch_ = TryAllocate<ENTRY>(entries);
     if (column.type == ColumnType::String) {
         constexpr std::size_t word = sizeof(std::uint64_t);
         words_ = std::max<std::size_t>((static_cast<std::size_t>(column.size) + word - 1) / word, 1);
         texts_ = TryAllocate<std::uint64_t>(entries * words_);
     }
-    return entries_ && (texts_ || column.type != ColumnType::String);
+    return entries_ && scratch_ && (texts_ || words_ == 0);
 }
 
-void SortKeys::OrderByWord() {
-    SortByWord(begin(), end());
+void SortKeys::Add(std::int32_t slot, std::int32_t record) {
+    entries_[count_] = {static_cast<std::uint64_t>(record), slot, count_};
+    ++count_;
 }
 
-void SortKeys::OrderBySlot() {
-    std::sort(begin(), EndOfKeys(), [](const ENTRY& a, const ENTRY& b) { return a.slot < b.slot; });
+void SortKeys::OrderByRecord() {
+    SortByWord(Entries());
 }
 
-void SortKeys::TakeKey(const std::uint8_t* data) {
-    if (data == nullptr) {
-        ++gone_;
-        return;
-    }
-    ENTRY& entry = entries_[keys_];
-    std::swap(entry, entries_[keys_ + gone_]);
-    entry.key = keys_++;
+void SortKeys::SetKey(ENTRY* entry, const std::uint8_t* data) {
     const std::uint8_t* field = data + column_.offset;
     if (column_.type == ColumnType::String) {
-        StoreText(field, entry.key);
+        StoreText(field, entry->index);
     } else {
-        entry.word = OrderedNumber(column_.type, field, static_cast<std::size_t>(column_.size));
+        entry->word = OrderedNumber(column_.type, field, static_cast<std::size_t>(column_.size));
     }
 }
 
 // Texts are kept as numbers of which the first byte is the highest, so that comparing numbers compares texts.
-void SortKeys::StoreText(const std::uint8_t* field, std::int32_t key) {
-    std::uint64_t* text = &texts_[static_cast<std::size_t>(key) * words_];
+void SortKeys::StoreText(const std::uint8_t* field, std::int32_t index) {
+    std::uint64_t* text = &texts_[static_cast<std::size_t>(index) * words_];
     auto* bytes = reinterpret_cast<std::uint8_t*>(text);
     const std::size_t length =
         strnlen(reinterpret_cast<const char*>(field), static_cast<std::size_t>(column_.size));
@@ -118,39 +147,73 @@ void SortKeys::StoreText(const std::uint8_t* field, std::int32_t key) {
 }
 
 void SortKeys::Sort() {
+    RestoreOrder();
     if (words_ > 0) {
-        SortTexts(begin(), EndOfKeys(), 0);
+        SortTexts(Sorted(), 0);
     } else {
         SortNumbers();
     }
 }
 
+// Puts the entries that have a key back into the order in which they were added, the others behind them.
+void SortKeys::RestoreOrder() {
+    for (const ENTRY& entry : Entries()) {
+        scratch_[entry.index] = entry;
+    }
+    keys_ = 0;
+    ENTRY* gone = entries_.get() + count_;
+    for (std::int32_t i = 0; i < count_; ++i) {
+        if (scratch_[i].slot >= 0) {
+            entries_[keys_++] = scratch_[i];
+        } else {
+            *--gone = scratch_[i];
+            gone->slot = ~gone->slot;
+        }
+    }
+}
+
 void SortKeys::SortNumbers() {
     const auto isNotANumber = [](const ENTRY& entry) { return entry.word == NotANumber; };
-    ENTRY* const end = EndOfKeys();
-    ENTRY* first = begin();
+    const auto end = Sorted().end();
+    auto first = Sorted().begin();
     while (first != end) {
-        ENTRY* last = std::find_if(first, end, isNotANumber);
-        SortByWord(first, last);
+        const auto last = std::find_if(first, end, isNotANumber);
+        SortByWord({first, last});
         first = std::find_if_not(last, end, isNotANumber);
     }
 }
 
-// Sorts entries that agree in `depth` words, and stand in the order of their slots.
-void SortKeys::SortTexts(ENTRY* first, ENTRY* last, std::size_t depth) {
-    for (ENTRY* entry = first; entry != last; ++entry) {
-        entry->word = texts_[static_cast<std::size_t>(entry->key) * words_ + depth];
+// Sorts entries that agree in `depth` words and stand in the order in which they were added.
+void SortKeys::SortTexts(std::span<ENTRY> entries, std::size_t depth) {
+    for (ENTRY& entry : entries) {
+        entry.word = texts_[static_cast<std::size_t>(entry.index) * words_ + depth];
     }
-    SortByWord(first, last);
+    SortByWord(entries);
     if (depth + 1 == words_) {
         return;
     }
-    for (ENTRY* group = first; group != last;) {
-        ENTRY* end =
-            std::find_if(group, last, [group](const ENTRY& entry) { return entry.word != group->word; });
-        if (end - group > 1 && !IsLastWord(group->word)) {
-            SortTexts(group, end, depth + 1);
+    for (auto group = entries.begin(); group != entries.end();) {
+        const std::uint64_t word = group->word;
+        const auto end =
+            std::find_if(group, entries.end(), [word](const ENTRY& entry) { return entry.word != word; });
+        if (end - group > 1 && !IsLastWord(word)) {
+            SortTexts({group, end}, depth + 1);
         }
         group = end;
+    }
+}
+
+// Sorts by word; entries with the same one keep their order.
+void SortKeys::SortByWord(std::span<ENTRY> entries) {
+    const auto less = [](const ENTRY& a, const ENTRY& b) { return a.word < b.word; };
+    if (std::is_sorted(entries.begin(), entries.end(), less)) {
+        return; // as when all are the same
+    }
+    if (entries.size() < FewEntries) {
+        std::sort(entries.begin(), entries.end(), [](const ENTRY& a, const ENTRY& b) {
+            return a.word != b.word ? a.word < b.word : a.index < b.index;
+        });
+    } else {
+        SortByBytes(entries, scratch_.get());
     }
 }

@@ -3,6 +3,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <memory>
+#include <span>
 
 #include "db/RecordTypes.h"
 
@@ -11,49 +12,48 @@
 /// type that has no order, stay as they were; a float that is no number stays in its place, as nothing is
 /// greater or smaller than it, and the records before and behind it are sorted apart.
 ///
-/// It knows nothing of files, and its only idea of a record is the slot of the set that holds it. Entries are
-/// added in the order of the slots, then given their keys in any order.
+/// It knows nothing of files. A sort makes one, adds the records in the order of their slots in the set,
+/// gives each its key (in that order or by record number, as it likes), sorts, and reads off the result.
 class SortKeys {
   public:
     struct ENTRY {
         std::uint64_t word; ///< ordered as the key, or as eight bytes of it where it is text
-        std::int32_t slot;
-        std::int32_t key; ///< where the text is
+        std::int32_t slot;  ///< of the set; its complement while a record is known to be gone
+        std::int32_t index; ///< how many were added before
     };
 
     /// Makes room for `count` entries. False when there is no memory.
     [[nodiscard]] bool Prepare(const COLUMN_ENTRY& column, std::int32_t count);
 
-    /// Adds an entry, with any number as its word until it gets its key.
-    void Add(std::int32_t slot, std::int32_t word) {
-        entries_[count_++] = {static_cast<std::uint64_t>(word), slot, 0};
+    void Add(std::int32_t slot, std::int32_t record);
+    /// Puts the entries, none of which has its key yet, into the order of their records.
+    void OrderByRecord();
+    [[nodiscard]] std::span<ENTRY> Entries() const {
+        return {entries_.get(), static_cast<std::size_t>(count_)};
     }
-    [[nodiscard]] ENTRY* begin() const { return entries_.get(); }
-    [[nodiscard]] ENTRY* end() const { return entries_.get() + count_; }
+    /// Gives an entry the key in its record's data.
+    void SetKey(ENTRY* entry, const std::uint8_t* data);
+    /// Takes an entry out of the sort.
+    static void SetGone(ENTRY* entry) { entry->slot = ~entry->slot; }
 
-    /// Orders the entries by their words, those with equal words by their slots.
-    void OrderByWord();
-    void OrderBySlot();
-
-    /// Gives the next entry, in the order in which they now stand, the key in its record's data. Null for a
-    /// record that is gone: its entry moves behind those that have a key.
-    void TakeKey(const std::uint8_t* data);
-    /// Where the entries that have a key end.
-    [[nodiscard]] ENTRY* EndOfKeys() const { return begin() + keys_; }
-
-    /// Sorts the entries that have a key; each entry must have been given one or none.
+    /// Sorts the entries that have a key; all others must be gone.
     void Sort();
+    /// After Sort: the entries that have a key, in their order; and the others.
+    [[nodiscard]] std::span<ENTRY> Sorted() const { return Entries().first(static_cast<std::size_t>(keys_)); }
+    [[nodiscard]] std::span<ENTRY> Gone() const { return Entries().subspan(static_cast<std::size_t>(keys_)); }
 
   private:
+    void StoreText(const std::uint8_t* field, std::int32_t index);
+    void RestoreOrder();
     void SortNumbers();
-    void SortTexts(ENTRY* first, ENTRY* last, std::size_t depth);
-    void StoreText(const std::uint8_t* field, std::int32_t key);
+    void SortTexts(std::span<ENTRY> entries, std::size_t depth);
+    void SortByWord(std::span<ENTRY> entries);
 
     COLUMN_ENTRY column_{};
     std::unique_ptr<ENTRY[]> entries_;
+    std::unique_ptr<ENTRY[]> scratch_; // as many
     std::int32_t count_ = 0;
-    std::int32_t keys_ = 0; // entries with a key, which come first
-    std::int32_t gone_ = 0; // entries without
-    std::size_t words_ = 0; // of a text; 0 for other columns
-    std::unique_ptr<std::uint64_t[]> texts_;
+    std::int32_t keys_ = 0;                  // entries with a key, which come first; known after Sort
+    std::size_t words_ = 0;                  // of a text; 0 for other columns
+    std::unique_ptr<std::uint64_t[]> texts_; // of each entry that has a key, by its index
 };

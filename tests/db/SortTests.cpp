@@ -127,6 +127,23 @@ TEST_F(SortTest, OrderIsThatOfABubbleSort) {
     }
 }
 
+// So many that they are sorted without comparing them.
+TEST_F(SortTest, OrderOfManyIsThatOfABubbleSort) {
+    std::mt19937 random(20260102);
+    std::vector<ROW> rows;
+    for (int i = 0; i < 2500; ++i) {
+        rows.push_back(RandomRow(random));
+        rows.back().count /= static_cast<std::int32_t>(random() % 1000 + 1);
+    }
+    Append(rows);
+    for (const auto& order : Orders) {
+        ASSERT_GT(database_.Query("Small != 1", QueryMode::New), 2000);
+        const std::vector<long> expected = Bubbled(Walked(database_), order.greater);
+        EXPECT_EQ(database_.SortBy(order.column, 0), 0);
+        EXPECT_EQ(Walked(database_), expected) << order.column;
+    }
+}
+
 TEST_F(SortTest, LongTextsThatDifferLate) {
     const std::string head(5000, 'x');
     DATABASE database(nullptr);
