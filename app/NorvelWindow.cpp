@@ -1,6 +1,7 @@
 #include "app/NorvelWindow.h"
 
 #include <algorithm>
+#include <cmath>
 
 #include "ColumnListView/BetterScrollView.h"
 #include "ColumnListView/CLVColumn.h"
@@ -31,6 +32,9 @@ constexpr float TotalGap = 10;
 constexpr const char* WidthSection = "DISPLAY";
 constexpr const char* WidthKey = "ColumnWidth%d";
 constexpr int DefaultWidth = 50;
+// The size, in pixels, of the list's letters that the widths were saved for.
+constexpr const char* TextSizeKey = "TextSize";
+constexpr float GreatestWidthGrowth = 10;
 
 struct ColumnInfo {
     const char* label;
@@ -52,6 +56,12 @@ constexpr ColumnInfo Columns[InvestmentColumnCount] = {
     {"Agent", CLVF_SORTABLE, 20},
 };
 
+// For the usual font 501 by 201 pixels.
+BRect FirstFrame() {
+    const float growth = GetFontGrowth();
+    return {100, 100, 100 + std::round(500 * growth), 100 + std::round(200 * growth)};
+}
+
 struct ButtonInfo {
     const char* name;
     const char* label;
@@ -67,7 +77,7 @@ constexpr ButtonInfo Buttons[] = {
 } // namespace
 
 NorvelWindow::NorvelWindow()
-    : BWindow({100, 100, 600, 300}, WindowTitle, B_DOCUMENT_WINDOW, B_WILL_ACCEPT_FIRST_CLICK),
+    : BWindow(FirstFrame(), WindowTitle, B_DOCUMENT_WINDOW, B_WILL_ACCEPT_FIRST_CLICK),
       settings_(app_state->settingsPath) {
     SetSizeLimits(LeastSize, GreatestSize, LeastSize, GreatestSize);
     BView* topView = AddTopView();
@@ -149,17 +159,27 @@ void NorvelWindow::AddInvestmentList(BView* topView, float top) {
     topView->AddChild(container);
 }
 
+float NorvelWindow::WidthGrowth() const {
+    const int size = settings_.ReadInt(WidthSection, TextSizeKey, 0);
+    return size > 0 ? std::min(be_fixed_font->Size() / static_cast<float>(size), GreatestWidthGrowth) : 1;
+}
+
 void NorvelWindow::AddColumns() {
+    const float growth = WidthGrowth();
     for (int index = 0; index < InvestmentColumnCount; ++index) {
         char key[32];
         FormatInto(key, sizeof key, WidthKey, index);
         const auto width = static_cast<float>(settings_.ReadInt(WidthSection, key, DefaultWidth));
         const ColumnInfo& info = Columns[index];
-        investmentList_->AddColumn(new CLVColumn(info.label, width, info.flags, info.minWidth));
+        investmentList_->AddColumn(new CLVColumn(info.label, info.label ? std::round(width * growth) : width,
+                                                 info.flags, info.minWidth));
     }
 }
 
 void NorvelWindow::SaveColumnWidths() const {
+    if (settings_.ReadInt(WidthSection, TextSizeKey, 0) > 0)
+        static_cast<void>(
+            settings_.WriteInt(WidthSection, TextSizeKey, static_cast<int>(be_fixed_font->Size())));
     const CLVColumn* column = nullptr;
     for (int index = 0; (column = investmentList_->ColumnAt(index)) != nullptr; ++index) {
         char key[32];
@@ -172,10 +192,8 @@ void NorvelWindow::SaveColumnWidths() const {
 void NorvelWindow::AddButtons(BView* topView) {
     BRect frame(10, Bounds().bottom - 40, 100, Bounds().bottom - 10);
     for (const ButtonInfo& info : Buttons) {
-        auto* button = new BButton(frame, info.name, info.label, new BMessage(info.code),
-                                   B_FOLLOW_LEFT | B_FOLLOW_BOTTOM);
-        button->SetEnabled(IsAvailable(info.code));
-        topView->AddChild(button);
+        topView->AddChild(new BButton(frame, info.name, info.label, new BMessage(info.code),
+                                      B_FOLLOW_LEFT | B_FOLLOW_BOTTOM));
         frame.OffsetBy(ButtonStep, 0);
     }
 }

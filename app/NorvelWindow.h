@@ -51,10 +51,9 @@ class NorvelWindow : public BWindow {
         void (NorvelWindow::*run)();
         bool (NorvelWindow::*check)() = nullptr; // tells the person what is missing, and answers false then
     };
-    // What messages lead to. The menu item and button of a command without a run are disabled.
+    // What messages lead to.
     static const Command Commands[];
     [[nodiscard]] static const Command* FindCommand(uint32 code);
-    [[nodiscard]] static bool IsAvailable(uint32 code);
     [[nodiscard]] bool CanRun(const Command& command) const;
     void Execute(const Command& command);
 
@@ -69,6 +68,8 @@ class NorvelWindow : public BWindow {
     void AddButtons(BView* topView);
     // Keeps the total to the right of what the selector shows.
     void PlaceTotalValueView();
+    // How many times larger the list's letters are than when the widths were saved; 1 when it is not known.
+    [[nodiscard]] float WidthGrowth() const;
     void SaveColumnWidths() const;
 
     // --- portfolios ---
@@ -85,6 +86,7 @@ class NorvelWindow : public BWindow {
     void OnPortfolioAdd();
     void OnPortfolioEdit();
     void OnPortfolioDelete();
+    void OnPortfolioChart();
     void OnPortfolioPrint();
     // Opens the window that brings the prices up to date, unless there is no network.
     void OnPortfolioUpdate();

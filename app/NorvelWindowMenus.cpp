@@ -78,7 +78,8 @@ const NorvelWindow::Command NorvelWindow::Commands[] = {
     {MessagePortfolioAdd, Needs::Nothing, &NorvelWindow::OnPortfolioAdd},
     {MessagePortfolioEdit, Needs::Portfolio, &NorvelWindow::OnPortfolioEdit},
     {MessagePortfolioDelete, Needs::Portfolio, &NorvelWindow::OnPortfolioDelete},
-    {MessagePortfolioChart, Needs::Investment, nullptr, &NorvelWindow::IsValuePresent},
+    {MessagePortfolioChart, Needs::Investment, &NorvelWindow::OnPortfolioChart,
+     &NorvelWindow::IsValuePresent},
     {MessagePortfolioPrint, Needs::Investment, &NorvelWindow::OnPortfolioPrint,
      &NorvelWindow::IsPortfolioPresent},
     {MessagePortfolioUpdate, Needs::Investment, &NorvelWindow::OnPortfolioUpdate,
@@ -100,16 +101,10 @@ const NorvelWindow::Command* NorvelWindow::FindCommand(uint32 code) {
     return found == std::end(Commands) ? nullptr : found;
 }
 
-bool NorvelWindow::IsAvailable(uint32 code) {
-    const Command* command = FindCommand(code);
-    return command && command->run;
-}
-
 void NorvelWindow::Execute(const Command& command) {
     if (command.check && !(this->*command.check)())
         return;
-    if (command.run)
-        (this->*command.run)();
+    (this->*command.run)();
 }
 
 bool NorvelWindow::CanRun(const Command& command) const {
@@ -138,7 +133,7 @@ void NorvelWindow::MenusBeginning() {
             if (!item.label || item.goes == Goes::ToApplication)
                 continue;
             const Command* command = FindCommand(item.code);
-            menuBar_->FindItem(item.code)->SetEnabled(command && command->run && CanRun(*command));
+            menuBar_->FindItem(item.code)->SetEnabled(command && CanRun(*command));
         }
     }
 }

@@ -7,6 +7,7 @@
 #include "app/FailureAlerts.h"
 #include "app/MessageCodes.h"
 #include "app/PortfolioRules.h"
+#include "charts/ChartWindow.h"
 #include "dialogs/PortfolioAddDialog.h"
 #include "dialogs/PortfolioEditDialog.h"
 #include "platform/Kernel.h"
@@ -185,6 +186,11 @@ void NorvelWindow::OnPortfolioUpdate() {
     PrintDebugStatement((checked + "connection found ok\n").c_str(), app_state->logPath);
     new UpdateWindow(Frame().LeftTop() + BPoint(100, 100), currentPortfolio_, app_state->investments.get(),
                      investmentList_);
+}
+
+void NorvelWindow::OnPortfolioChart() {
+    const BPoint corner = Frame().LeftTop() + BPoint(100, 100);
+    new ChartWindow(corner.x, corner.y, currentPortfolio_);
 }
 
 void NorvelWindow::OnPortfolioPrint() {

@@ -15,8 +15,7 @@
 #include "platform/private/Convert.h"
 #include "platform/private/Loop.h"
 #include "platform/private/OutputFile.h"
-#include "platform/private/ViewPeer.h"
-#include "platform/private/ViewWidget.h"
+#include "platform/private/ViewTree.h"
 
 namespace {
 
@@ -71,35 +70,6 @@ QPageLayout LayoutOf(const BMessage& settings, QPageLayout layout) {
     if (wanted.left() + wanted.right() < page.width() && wanted.top() + wanted.bottom() < page.height())
         layout.setMargins(wanted);
     return layout;
-}
-
-// Draws view, whose (0, 0) is the painter's origin, and what lies in it. Controls draw themselves.
-void DrawTree(BView* view, QPainter& painter, const BRect& part) {
-    auto* plain = dynamic_cast<ViewWidget*>(ViewAccess::Widget(view));
-    if (!plain) {
-        const BPoint origin = view->Bounds().LeftTop();
-        ViewAccess::Widget(view)->render(&painter,
-                                         QPoint(static_cast<int>(origin.x), static_cast<int>(origin.y)),
-                                         QRegion(), QWidget::DrawChildren);
-        return;
-    }
-    painter.fillRect(ToQt(part), ToQt(view->ViewColor()));
-    {
-        const PaintPass pass(view, &painter);
-        view->Draw(part);
-    }
-    for (int32 index = 0; BView* child = view->ChildAt(index); index++) {
-        const BPoint shift = child->Frame().LeftTop() - child->Bounds().LeftTop();
-        BRect inner = part & child->Frame();
-        if (child->IsHidden() || !inner.IsValid())
-            continue;
-        painter.save();
-        painter.setClipRect(ToQt(inner), Qt::IntersectClip);
-        painter.translate(ToQt(shift));
-        inner.OffsetBy(-shift.x, -shift.y);
-        DrawTree(child, painter, inner);
-        painter.restore();
-    }
 }
 
 } // namespace

@@ -1,0 +1,108 @@
+#include "charts/ChartDataSets.h"
+
+#include <algorithm>
+#include <cstring>
+#include <new>
+#include <stdexcept>
+
+#include "util/CharacterBuffer.h"
+#include "util/Strings.h"
+
+namespace {
+
+enum Set { ByInvestment, ByTicker, ByType, ByCategory, ByRisk, ByRetirement, SharesByInvestment };
+
+constexpr const char* Categories[] = {"Fund", "Stock", "Other"};
+constexpr const char* Risks[] = {"Low", "Med", "High"};
+constexpr const char* Retirement[] = {"Retirement", "Non-Retirement"};
+
+constexpr long LeastCapacity = 3; // the fixed slices
+
+void SetLabel(ChartLabel& label, std::string_view text) {
+    label = {};
+    std::memcpy(label.data(), text.data(), std::min(text.size(), label.size() - 1));
+}
+
+template <std::size_t Size>
+void Preset(CHART_DATA_SET& set, const char* const (&labels)[Size]) {
+    for (std::size_t i = 0; i < Size; ++i)
+        SetLabel(set.labels[i], labels[i]);
+    set.count = static_cast<std::int32_t>(Size);
+}
+
+std::size_t CategoryOf(std::string_view type) {
+    const std::string text(type);
+    char lower[NameSize];
+    CopyText(lower, text);
+    strlwr(lower);
+    if (std::strstr(lower, "fund"))
+        return 0;
+    return std::strstr(lower, "stock") ? 1 : 2;
+}
+
+} // namespace
+
+int ChartDataSets::GenerateDataSets(long capacity) {
+    tickers_.clear();
+    types_.clear();
+    names_.clear();
+    const auto slots = static_cast<std::size_t>(std::max(capacity, LeastCapacity));
+    try {
+        for (CHART_DATA_SET& set : sets_) {
+            set = {};
+            set.labels.resize(slots);
+            set.values.resize(slots);
+            set.capacity = static_cast<std::int32_t>(slots);
+        }
+    } catch (const std::bad_alloc&) {
+        return 1;
+    } catch (const std::length_error&) {
+        return 1;
+    }
+    Preset(sets_[ByCategory], Categories);
+    Preset(sets_[ByRisk], Risks);
+    Preset(sets_[ByRetirement], Retirement);
+    return 0;
+}
+
+int ChartDataSets::AccumulateDataSet(int index, const INVESTMENT_DATA& record) {
+    const std::string_view name = FieldText(record.Name);
+    const std::string_view type = FieldText(record.Type);
+    CHART_DATA_SET& investments = sets_[ByInvestment];
+    if (index >= 0 && index < investments.capacity) {
+        investments.values[static_cast<std::size_t>(index)] = record.Value;
+        SetLabel(investments.labels[static_cast<std::size_t>(index)], name);
+        ++investments.count;
+    }
+    AddKeyed(sets_[ByTicker], tickers_, FieldText(record.Ticker), record.Value);
+    AddKeyed(sets_[ByType], types_, type, record.Value);
+    sets_[ByCategory].values[CategoryOf(type)] += record.Value;
+    const std::string risk(FieldText(record.Risk));
+    for (std::size_t i = 0; i < std::size(Risks); ++i) {
+        if (strcmpi(risk.c_str(), Risks[i]) == 0)
+            sets_[ByRisk].values[i] += record.Value;
+    }
+    sets_[ByRetirement].values[record.Retire ? 0 : 1] += record.Value;
+    AddKeyed(sets_[SharesByInvestment], names_, name, record.Shares);
+    return 0;
+}
+
+void ChartDataSets::AddKeyed(CHART_DATA_SET& set, Slots& slots, std::string_view key, float value) {
+    if (key.empty())
+        return;
+    const auto found = slots.find(std::string(key));
+    if (found != slots.end()) {
+        set.values[static_cast<std::size_t>(found->second)] += value;
+        return;
+    }
+    if (set.count >= set.capacity)
+        return;
+    const auto slot = static_cast<std::size_t>(set.count);
+    set.values[slot] = value;
+    SetLabel(set.labels[slot], key);
+    slots.emplace(key, set.count++);
+}
+
+const CHART_DATA_SET& ChartDataSets::ForChart(std::uint32_t code) const {
+    return code < FirstChart || code >= FirstChart + Count ? sets_[ByInvestment] : sets_[code - FirstChart];
+}

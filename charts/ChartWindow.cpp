@@ -1,0 +1,122 @@
+#include "charts/ChartWindow.h"
+
+#include <algorithm>
+#include <cmath>
+
+#include "app/AppState.h"
+#include "app/PortfolioRules.h"
+#include "charts/PieChartView.h"
+#include "charts/ValueChartView.h"
+#include "platform/MenuField.h"
+#include "platform/MenuItem.h"
+#include "util/InterfaceHelpers.h"
+
+namespace {
+
+constexpr float Width = 350;
+constexpr float Height = 400;
+constexpr float UsualFontHeight = 17; // above it the window grows with the person's font
+constexpr float MenuLeft = 10;
+
+BRect FrameAt(float left, float top) {
+    const float scale = std::max(1.0F, ::GetFontHeight(be_plain_font) / UsualFontHeight);
+    return {left, top, left + std::ceil(Width * scale), top + std::ceil(Height * scale)};
+}
+
+} // namespace
+
+int ReadChartData(DATABASE& investments, const char* portfolio, ChartDataSets& dataSets, float& total) {
+    total = 0;
+    if (dataSets.GenerateDataSets(SelectInvestments(investments, portfolio)) != 0)
+        return 1;
+    int index = 0;
+    ForEachInvestment(investments, portfolio, [&](const INVESTMENT_DATA& record, long) {
+        dataSets.AccumulateDataSet(index++, record);
+        total += record.Value;
+    });
+    return 0;
+}
+
+void ShowDataSet(PieChartView& view, const ChartDataSets& dataSets, uint32 code) {
+    for (const ChartInfo& chart : Charts) {
+        if (chart.code != code)
+            continue;
+        view.SetTitle(chart.title);
+        view.SetDecimalPlaces(chart.decimalPlaces);
+    }
+    const CHART_DATA_SET& set = dataSets.ForChart(code);
+    view.SetData(set.values.data(), set.count);
+    for (int i = 0; i < set.count; ++i)
+        view.SetLegendLabel(i, set.labels[static_cast<std::size_t>(i)].data());
+}
+
+ChartWindow::ChartWindow(float left, float top, const char* portfolio)
+    : BWindow(FrameAt(left, top), "Quorvan", B_FLOATING_WINDOW_LOOK, B_MODAL_APP_WINDOW_FEEL,
+              B_NOT_RESIZABLE | B_NOT_ZOOMABLE | B_WILL_ACCEPT_FIRST_CLICK),
+      topView_(new BView(Bounds(), "top view", B_FOLLOW_ALL_SIDES, B_WILL_DRAW)) {
+    topView_->SetViewColor(colors::gray);
+    AddChild(topView_);
+    CreateGraphTypeMenu();
+    BRect chart = Bounds();
+    chart.bottom -= 2 * ::GetFontHeight(be_plain_font);
+    pieView_ = new PieChartView(chart);
+    topView_->AddChild(pieView_);
+    if (GenerateDataSets(portfolio) != 0)
+        return; // never shown, it goes with the application
+    SelectDataSet(false);
+    valueView_ = new ValueChartView(chart, currentValue_);
+    valueView_->Hide();
+    topView_->AddChild(valueView_);
+    Show();
+}
+
+int ChartWindow::GenerateDataSets(const char* portfolio) {
+    if (ReadChartData(*app_state->investments, portfolio, dataSets_, currentValue_) == 0)
+        return 0;
+    MessageBox("GenerateDataSets() malloc error!", B_STOP_ALERT);
+    return 1;
+}
+
+void ChartWindow::CreateGraphTypeMenu() {
+    auto* menu = new BPopUpMenu(Charts[0].title);
+    for (const ChartInfo& chart : Charts) {
+        auto* item = new BMenuItem(chart.title, new BMessage(chart.code));
+        item->SetTarget(this);
+        menu->AddItem(item);
+    }
+    const BRect bounds = Bounds();
+    const float top = bounds.bottom - 2 * ::GetFontHeight(be_plain_font);
+    auto* field = new BMenuField({bounds.left + MenuLeft, top, bounds.right, bounds.bottom}, "", "", menu,
+                                 B_FOLLOW_LEFT | B_FOLLOW_BOTTOM);
+    field->SetDivider(0);
+    field->SetAccessibleName("Chart");
+    topView_->AddChild(field);
+}
+
+void ChartWindow::MessageReceived(BMessage* message) {
+    if (message->what >= FirstChart && message->what <= GrowthChart)
+        ShowChart(message->what);
+    else if (message->what == MessageToggleRates && !valueView_->IsHidden())
+        valueView_->Toggle20And25Percent();
+    else
+        BWindow::MessageReceived(message);
+}
+
+void ChartWindow::ShowChart(uint32 code) {
+    currentChart_ = code;
+    const bool growth = code == GrowthChart;
+    BView* shown = growth ? static_cast<BView*>(valueView_) : pieView_;
+    BView* hidden = growth ? static_cast<BView*>(pieView_) : valueView_;
+    if (!hidden->IsHidden())
+        hidden->Hide();
+    if (shown->IsHidden())
+        shown->Show();
+    if (!growth)
+        SelectDataSet(true);
+}
+
+void ChartWindow::SelectDataSet(bool invalidate) {
+    ShowDataSet(*pieView_, dataSets_, currentChart_);
+    if (invalidate)
+        pieView_->Invalidate();
+}

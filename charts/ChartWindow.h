@@ -1,0 +1,43 @@
+#pragma once
+
+#include "charts/ChartDataSets.h"
+#include "platform/Window.h"
+
+class DATABASE;
+class PieChartView;
+class ValueChartView;
+
+// The window that charts one portfolio: a chart, and below it the menu that chooses which. It reads the
+// portfolio's investments once, when it is created; nothing that it does changes a file. The caller makes it
+// with new, when the portfolio is worth more than nothing, and keeps no pointer: it shows itself and deletes
+// itself when it is closed. While it is there the person can do nothing else in the program. Interface
+// thread; app_state must be set.
+class ChartWindow : public BWindow {
+  public:
+    // left and top are screen coordinates.
+    ChartWindow(float left, float top, const char* portfolio);
+
+    void MessageReceived(BMessage* message) override;
+
+  private:
+    // Returns 0, or 1 after telling the person that there is no memory.
+    int GenerateDataSets(const char* portfolio);
+    void CreateGraphTypeMenu();
+    void ShowChart(uint32 code);
+    void SelectDataSet(bool invalidate);
+
+    ChartDataSets dataSets_;
+    float currentValue_ = 0; // the sum of all investments' values
+    uint32 currentChart_ = FirstChart;
+    PieChartView* pieView_ = nullptr; // these belong to the window
+    ValueChartView* valueView_ = nullptr;
+    BView* topView_ = nullptr;
+};
+
+// Reads the portfolio's investments into the data sets; the sum of their values goes to `total`. Returns 0,
+// or 1 without memory. Investments that cannot be read are none.
+[[nodiscard]] int ReadChartData(DATABASE& investments, const char* portfolio, ChartDataSets& dataSets,
+                                float& total);
+
+// Gives the view title, values and labels of one of the pie charts.
+void ShowDataSet(PieChartView& view, const ChartDataSets& dataSets, uint32 code);

@@ -1,0 +1,74 @@
+#include "platform/ViewPicture.h"
+
+#include <algorithm>
+#include <cmath>
+
+#include <QBuffer>
+#include <QImage>
+#include <QPageSize>
+#include <QPainter>
+#include <QPdfWriter>
+#include <QSvgGenerator>
+
+#include "platform/View.h"
+#include "platform/private/Convert.h"
+#include "platform/private/ViewTree.h"
+
+namespace {
+
+constexpr int kPointsPerInch = 72;
+constexpr float kMaxScale = 16;
+
+QSize SizeOf(const BView* view) {
+    const BRect bounds = view->Bounds();
+    return {static_cast<int>(std::ceil(bounds.Width())) + 1,
+            static_cast<int>(std::ceil(bounds.Height())) + 1};
+}
+
+bool Paint(BView* view, QPaintDevice* device, double scale) {
+    QPainter painter;
+    if (!painter.begin(device))
+        return false;
+    painter.scale(scale, scale);
+    painter.translate(-ToQt(view->Bounds().LeftTop()));
+    DrawTree(view, painter, view->Bounds());
+    return painter.end();
+}
+
+bool WritePng(BView* view, QBuffer& file, float scale) {
+    QImage image(SizeOf(view) * std::clamp(scale, 1 / kMaxScale, kMaxScale), QImage::Format_RGB32);
+    if (image.isNull())
+        return false;
+    image.fill(ToQt(view->ViewColor()));
+    return Paint(view, &image, std::clamp(scale, 1 / kMaxScale, kMaxScale)) && image.save(&file, "PNG");
+}
+
+bool WriteSvg(BView* view, QBuffer& file) {
+    QSvgGenerator svg;
+    svg.setOutputDevice(&file);
+    svg.setResolution(kPointsPerInch);
+    svg.setSize(SizeOf(view));
+    svg.setViewBox(QRect(QPoint(0, 0), SizeOf(view)));
+    svg.setTitle(QString::fromUtf8(view->Name()));
+    svg.setDescription(QString::fromStdString(view->AccessibleDescription()));
+    return Paint(view, &svg, 1);
+}
+
+bool WritePdf(BView* view, QBuffer& file) {
+    QPdfWriter pdf(&file);
+    pdf.setResolution(kPointsPerInch);
+    pdf.setPageSize(QPageSize(QSizeF(SizeOf(view)), QPageSize::Point, QString(), QPageSize::ExactMatch));
+    pdf.setPageMargins(QMarginsF());
+    return Paint(view, &pdf, 1);
+}
+
+} // namespace
+
+std::string DrawPicture(BView* view, PictureFormat format, float scale) {
+    QBuffer file;
+    file.open(QIODevice::WriteOnly);
+    const bool written = format == PictureFormat::Png   ? WritePng(view, file, scale)
+                         : format == PictureFormat::Svg ? WriteSvg(view, file)
+                                                        : WritePdf(view, file);
+    return written ? file.data().toStdString() : std::string();
+}
