@@ -11,7 +11,7 @@
 
 namespace {
 
-constexpr int Steps = 20000;
+constexpr int Steps = 8000;
 constexpr long MostRecords = 40;
 
 // One random operation after another on a file and on the model, compared after each.
