@@ -17,8 +17,6 @@ constexpr uint32 MessageShow = 2000;
 constexpr float BottomMargin = 20;
 constexpr float RightMargin = 10;
 constexpr const char* WidestLabel = "  Cancel  ";
-// How wide that label may be before forms grow with it.
-constexpr float UsualLabelWidth = 64;
 
 } // namespace
 
@@ -51,8 +49,7 @@ BDialog::~BDialog() {
 }
 
 float BDialog::FormWidth(float usual) {
-    const float label = be_plain_font->StringWidth(WidestLabel);
-    return std::ceil(usual * std::max(label / UsualLabelWidth, 1.0F));
+    return std::ceil(usual * GetFontGrowth());
 }
 
 void BDialog::AddButtons(uint16 flags) {

@@ -14,6 +14,9 @@
 namespace {
 
 constexpr bigtime_t WindowLockPatience = 200000; // microseconds
+// A text, and its width in the font that frames are laid out for.
+constexpr const char* SampleText = "  Cancel  ";
+constexpr float UsualSampleWidth = 56;
 
 } // namespace
 
@@ -50,6 +53,10 @@ float GetFontHeight(const BFont* font) {
     font_height height;
     font->GetHeight(&height);
     return height.ascent + height.descent + height.leading;
+}
+
+float GetFontGrowth() {
+    return std::max(be_plain_font->StringWidth(SampleText) / UsualSampleWidth, 1.0F);
 }
 
 BWindow* GetAppWindow(const BApplication* app, const char* title) {

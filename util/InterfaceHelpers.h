@@ -57,6 +57,10 @@ void GetBRectCenter(const BRect* rect, BPoint* out);
 // Ascent, descent and leading of the font, in logical pixels.
 [[nodiscard]] float GetFontHeight(const BFont* font);
 
+// How many times wider than usual letters of the plain font are, and at least 1. What is laid out for the
+// usual font is stretched by it, so that nothing is cut off in a larger one.
+[[nodiscard]] float GetFontGrowth();
+
 // The first of the application's windows with exactly this title; null when there is none. Waits at most 0.2
 // s for each window's lock and passes over a window that it cannot lock in that time. Any thread; the window
 // may be gone by the time the caller uses it, unless the caller knows better.
