@@ -11,7 +11,8 @@ void PrintDebugStatement(const char* text, const char* logPath);
 // the log with the first text. It is a local object of whoever has much to say.
 class DebugLog {
   public:
-    // A null path is no log, and what is written to it is dropped, as with one that cannot be opened.
+    // A null path is no log, and what is written to it is dropped, as with one that cannot be opened. The
+    // path must live as long as the object.
     explicit DebugLog(const char* logPath) : logPath_(logPath) {}
     DebugLog(const DebugLog&) = delete;
     DebugLog& operator=(const DebugLog&) = delete;
@@ -20,6 +21,6 @@ class DebugLog {
     void Write(const char* text);
 
   private:
-    const char* logPath_; // borrowed; null once it is open or will not be
+    const char* logPath_; // null once it is open or will not be
     int file_ = -1;
 };

@@ -22,7 +22,8 @@ struct Scanned {
 
 Scanned Scan(const std::vector<std::string>& pieces, const std::string& tag, int skip) {
     const TemporaryFolder folder;
-    QuoteReport report(folder.File("log").c_str(), nullptr);
+    const std::string logPath = folder.File("log");
+    QuoteReport report(logPath.c_str(), nullptr);
     QuoteScanner scanner(tag, skip, report);
     for (const std::string& piece : pieces) {
         if (scanner.Scan(piece))
