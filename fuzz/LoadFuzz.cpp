@@ -28,11 +28,9 @@ ROW RecordOf(DATABASE& database, long number) {
     return row;
 }
 
-// Whether the record's line has a field for each column again, and is short enough to be read whole.
+// Whether the record's line has a field for each column again.
 bool LoadsAgain(const ROW& row) {
-    const float price = row.price;
-    return std::strpbrk(row.name, "\t\n") == nullptr && row.tag != '\0' && row.tag != '\t' &&
-           row.tag != '\n' && price < 1e8F && price > -1e8F;
+    return std::strpbrk(row.name, "\t\n") == nullptr && row.tag != '\0' && row.tag != '\t' && row.tag != '\n';
 }
 
 // What is exported loads again, prices apart, which are rounded.
