@@ -170,8 +170,11 @@ void ValueChartView::DrawGrowth() {
 
 void ValueChartView::DrawLegend() {
     const float size = std::ceil(::GetFontHeight(be_plain_font));
-    const float step = 3 * StringWidth("10%");
     const float left = rects_.legend.left + LegendIndent;
+    const float entry = size + LegendGap + StringWidth("10%") + LegendGap;
+    // All five have room in the view, whatever the font.
+    const float step =
+        std::min(3 * StringWidth("10%"), (rects_.legend.right - left - entry) / (Percentages.size() - 1));
     BRect box(left, rects_.legend.top, left + size, rects_.legend.top + size);
     BRect text(box.right + LegendGap, box.top, box.right + LegendGap + LegendTextWidth, box.bottom);
     for (std::size_t row = 0; row < RowsInUse(); ++row) {

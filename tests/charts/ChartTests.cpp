@@ -1,0 +1,243 @@
+// The charts as they are drawn, read pixel by pixel, and the window they stand in.
+#include "DataFolder.h"
+#include "Driver.h"
+
+#include <cmath>
+
+#include <QCheckBox>
+#include <QImage>
+#include <QMenu>
+#include <QPushButton>
+
+#include "app/AppState.h"
+#include "charts/ChartWindow.h"
+#include "charts/PieChartView.h"
+#include "charts/ValueChartView.h"
+#include "platform/CheckBox.h"
+#include "platform/ViewPicture.h"
+#include "util/InterfaceHelpers.h"
+
+namespace {
+
+const BRect Area(0, 0, 350, 370);
+
+class Picture {
+  public:
+    explicit Picture(BView& view, float scale = 1) : scale_(scale) {
+        const std::string bytes = DrawPicture(&view, PictureFormat::Png, scale);
+        image_.loadFromData(reinterpret_cast<const uchar*>(bytes.data()), static_cast<int>(bytes.size()));
+        EXPECT_FALSE(image_.isNull());
+    }
+    [[nodiscard]] rgb_color At(float x, float y) const {
+        const QColor color = image_.pixelColor(static_cast<int>(x * scale_), static_cast<int>(y * scale_));
+        return {static_cast<uint8>(color.red()), static_cast<uint8>(color.green()),
+                static_cast<uint8>(color.blue()), 255};
+    }
+    // Half-way between the pie's middle and its rim.
+    [[nodiscard]] rgb_color AtAngle(double degrees) const {
+        const PieEllipse pie = EllipseIn(LayOutPie(Area).chart);
+        const double angle = degrees / 180 * M_PI;
+        return At(static_cast<float>(pie.center.x + pie.xRadius / 2 * std::cos(angle)),
+                  static_cast<float>(pie.center.y - pie.yRadius / 2 * std::sin(angle)));
+    }
+    [[nodiscard]] bool Has(BRect part, rgb_color color) const {
+        for (float y = part.top; y <= part.bottom; ++y) {
+            for (float x = part.left; x <= part.right; ++x) {
+                if (At(x, y) == color)
+                    return true;
+            }
+        }
+        return false;
+    }
+    [[nodiscard]] int Width() const { return image_.width(); }
+
+  private:
+    QImage image_;
+    float scale_;
+};
+
+// The colour box of a legend's line, without its outline.
+BRect LegendBox(int line) {
+    const float height = std::ceil(::GetFontHeight(be_plain_font));
+    const BRect legend = LayOutPie(Area).legend;
+    const float top = legend.top + static_cast<float>(line) * (height + 2);
+    return {legend.left + 2, top + 2, legend.left + height - 3, top + height - 3};
+}
+
+rgb_color SliceColor(std::size_t index) {
+    return PieChartColors[index % PieChartColors.size()];
+}
+
+void Show(PieChartView& view, const std::vector<float>& values, const std::vector<const char*>& labels) {
+    view.SetTitle("Title");
+    ASSERT_EQ(view.SetData(values.data(), static_cast<int>(values.size())), 0);
+    for (std::size_t i = 0; i < labels.size(); ++i)
+        EXPECT_EQ(view.SetLegendLabel(static_cast<int>(i), labels[i]), 0);
+}
+
+} // namespace
+
+TEST(PieChart, SlicesRunCounterClockwiseFromThreeOClock) {
+    const BApplication application("test");
+    PieChartView view(Area);
+    // The last one's sweep is out of the legend's way.
+    const std::vector<float> values = {1, 2, 1, 4};
+    Show(view, values, {"", "", "", ""});
+    for (const float scale : {1.0F, 2.0F}) {
+        const Picture picture(view, scale);
+        const double middles[] = {22.5, 90, 157.5, 270};
+        for (std::size_t i = 0; i < std::size(middles); ++i)
+            EXPECT_EQ(picture.AtAngle(middles[i]), SliceColor(i)) << i;
+        const PieEllipse pie = EllipseIn(LayOutPie(Area).chart);
+        EXPECT_EQ(picture.At(pie.center.x, pie.center.y + pie.yRadius + 3), colors::dark_gray);
+        EXPECT_EQ(picture.At(pie.center.x, pie.center.y - pie.yRadius - 4), colors::gray);
+        EXPECT_TRUE(picture.Has(LayOutPie(Area).title, colors::black));
+    }
+    EXPECT_EQ(Picture(view, 2).Width(), 2 * Picture(view).Width());
+}
+
+TEST(PieChart, LegendLinesKeepStepWithTheirSlices) {
+    const BApplication application("test");
+    PieChartView view(Area);
+    const std::vector<float> values = {1, 1, 0, 1};
+    Show(view, values, {"First", "", "Nothing", "A label of thirty-one bytes, aaa"});
+    const Picture picture(view);
+    const rgb_color boxes[] = {SliceColor(0), colors::gray, SliceColor(2), SliceColor(3)};
+    for (int i = 0; i < 4; ++i) {
+        const BRect box = LegendBox(i);
+        EXPECT_EQ(picture.At(box.left, box.top), boxes[i]) << i;
+        EXPECT_EQ(picture.At(box.right, box.bottom), boxes[i]) << i;
+    }
+    EXPECT_EQ(view.AccessibleDescription(), "Title\nFirst: $1.00 33.33%\nNothing: $0.00 0.00%\n"
+                                            "A label of thirty-one bytes, aa: $1.00 33.33%");
+    EXPECT_EQ(view.SetLegendLabel(4, "too many"), 1);
+    EXPECT_EQ(view.SetLegendLabel(-1, "none"), 1);
+}
+
+TEST(PieChart, ColorsBeginAgainAndALongLegendSaysWhatIsMissing) {
+    const BApplication application("test");
+    PieChartView view(Area);
+    const std::vector<float> values(17, 1);
+    Show(view, values, std::vector<const char*>(17, "x"));
+    const Picture picture(view);
+    EXPECT_EQ(picture.AtAngle(16.5 / 17 * 360), SliceColor(0));
+    const BRect last = LegendBox(16);
+    EXPECT_EQ(picture.At(last.left, last.top), SliceColor(0));
+
+    const std::vector<float> many(60, 1);
+    Show(view, many, std::vector<const char*>(60, "x"));
+    const Picture full(view);
+    const float step = LegendBox(1).top - LegendBox(0).top;
+    const int room = static_cast<int>((LayOutPie(Area).legend.Height() + 2) / step);
+    EXPECT_EQ(full.At(LegendBox(room - 2).left, LegendBox(room - 2).top), SliceColor(room - 2));
+    EXPECT_EQ(full.At(LegendBox(room - 1).left, LegendBox(room - 1).top), colors::gray);
+    BRect note = LegendBox(room - 1); // "and 42 more" in place of the box's line
+    note.OffsetBy(25, 0);
+    note.right += 60;
+    EXPECT_TRUE(full.Has(note, colors::black));
+}
+
+TEST(PieChart, SaysWhenThereIsNothingToChart) {
+    const BApplication application("test");
+    PieChartView view(Area);
+    const float zeros[] = {0, 0, 0};
+    const float canceling[] = {5, -5, 0};
+    const float noNumbers[] = {1, std::nanf(""), 2};
+    const struct {
+        const float* values;
+        int count;
+    } cases[] = {{nullptr, 0}, {zeros, 0}, {zeros, 3}, {canceling, 3}, {noNumbers, 3}};
+    for (const auto& each : cases) {
+        view.SetData(each.values, each.count);
+        const Picture picture(view);
+        EXPECT_TRUE(picture.Has({100, 170, 250, 200}, colors::black));
+        EXPECT_FALSE(picture.Has(LegendBox(0), SliceColor(0)));
+    }
+}
+
+TEST(GrowthChart, LinesRunFromTheCornerToTheirValues) {
+    const BApplication application("test");
+    ValueChartView view(Area, 1000);
+    const BRect graph = LayOutGrowth(Area, ::GetFontHeight(be_plain_font)).graph;
+    const auto at = [&](float x, float y) { return BRect(x - 3, y - 3, x + 2, y + 3); };
+    const auto end = [&](float value, float maximum) {
+        return graph.bottom - (value - 1000) * graph.Height() / (maximum - 1000);
+    };
+    const Picture all(view);
+    EXPECT_TRUE(all.Has(at(graph.right, graph.top + 3), colors::magenta));
+    EXPECT_TRUE(all.Has(at(graph.right, end(95'396, 264'698)), colors::yellow));
+    EXPECT_TRUE(all.Has(at(graph.left + 4, graph.bottom), colors::magenta)); // the last one lies on top
+    EXPECT_EQ(all.At(graph.left + 10, graph.top + 10), (rgb_color{205, 168, 157, 255}));
+
+    view.Toggle20And25Percent();
+    const Picture some(view);
+    EXPECT_FALSE(some.Has(Area, colors::magenta));
+    EXPECT_FALSE(some.Has(Area, colors::yellow));
+    EXPECT_TRUE(some.Has(at(graph.right, graph.top + 3), colors::blue));
+    EXPECT_TRUE(some.Has(at(graph.right, end(10'835, 32'919)), colors::green));
+    view.Toggle20And25Percent();
+    EXPECT_TRUE(Picture(view).Has(Area, colors::magenta));
+}
+
+TEST(GrowthChart, DrawsWithoutGrowth) {
+    const BApplication application("test");
+    for (const float value : {0.0F, -100.0F, 3e38F, std::nanf("")}) {
+        ValueChartView view(Area, value);
+        const BRect graph = LayOutGrowth(Area, ::GetFontHeight(be_plain_font)).graph;
+        EXPECT_TRUE(Picture(view).Has(graph, {205, 168, 157, 255})) << value;
+    }
+}
+
+TEST(ChartWindow, TheMenuAndTheCheckBoxChooseWhatIsShown) {
+    DataFolder folder;
+    folder.AddInvestment(MakeInvestment("P", "Acme", 10, 10));
+    folder.AddInvestment(MakeInvestment("Q", "Other", 10, 10));
+    Driver driver;
+    BApplication application("test");
+    AppState state;
+    state.investments = std::make_unique<DATABASE>(folder.File("invest.db").c_str());
+    app_state = &state;
+    const auto choose = [&](const char* title) {
+        driver.When("menu", Driver::WindowShown("Quorvan"), [] {
+            for (auto* button : Driver::Window("Quorvan")->findChildren<QPushButton*>()) {
+                if (button->menu())
+                    QTest::mouseClick(button, Qt::LeftButton);
+            }
+        });
+        driver.When(
+            title, [] { return QApplication::activePopupWidget() != nullptr; },
+            [title] {
+                auto* menu = qobject_cast<QMenu*>(QApplication::activePopupWidget());
+                for (QAction* item : menu->actions()) {
+                    if (item->objectName() == title)
+                        QTest::mouseClick(menu, Qt::LeftButton, {}, menu->actionGeometry(item).center());
+                }
+            });
+    };
+    const auto view = [](const char* name) { return GetAppWindow(be_app, "Quorvan")->FindView(name); };
+    const auto pie = [view] { return view("pie chart view")->AccessibleDescription(); };
+    driver.When("first", Driver::WindowShown("Quorvan"), [&] {
+        EXPECT_EQ(pie(), "Value by Investment\nAcme: $100.00 100.00%");
+        EXPECT_TRUE(view("value chart view")->IsHidden());
+    });
+    choose("Shares by Investment");
+    driver.When(
+        "shares", [&] { return pie() == "Shares by Investment\nAcme: 10.00 100.00%"; }, [] {});
+    choose("Value over Time");
+    driver.When(
+        "growth", [&] { return !view("value chart view")->IsHidden(); },
+        [&] {
+            EXPECT_TRUE(view("pie chart view")->IsHidden());
+            QTest::mouseClick(Driver::Window("Quorvan")->findChild<QCheckBox*>(), Qt::LeftButton, {}, {6, 6});
+        });
+    driver.When(
+        "without 25%",
+        [&] { return view("value chart view")->AccessibleDescription().find("25%") == std::string::npos; },
+        [] { Driver::Window("Quorvan")->close(); });
+    driver.When(
+        "closed", [] { return !GetAppWindow(be_app, "Quorvan"); },
+        [] { be_app->PostMessage(B_QUIT_REQUESTED); });
+    new ChartWindow(50, 50, "P");
+    application.Run();
+    app_state = nullptr;
+}
