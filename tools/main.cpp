@@ -4,6 +4,7 @@
 #include <iostream>
 
 #include "tools/DbCommand.h"
+#include "tools/QuoteCommand.h"
 #include "tools/ReportCommand.h"
 #include "tools/SetupCommand.h"
 
@@ -18,6 +19,7 @@ int Run(int argc, char** argv) {
     int status = 0;
     AddDbCommand(application, status);
     AddSetupCommand(application, status);
+    AddQuoteCommand(application, status);
     AddReportCommand(application, status);
     try {
         application.parse(argc, argv);

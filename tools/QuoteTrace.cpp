@@ -1,0 +1,119 @@
+#include "tools/QuoteTrace.h"
+
+#include <algorithm>
+#include <ostream>
+
+#include "quotes/QuoteRetrieval.h"
+#include "quotes/QuoteSource.h"
+#include "util/Numbers.h"
+
+namespace {
+
+constexpr std::size_t Around = 60;     // bytes shown on either side of the marker
+constexpr std::size_t Beginning = 160; // bytes shown of a page without the marker
+
+std::string Printable(std::string_view text) {
+    constexpr char digits[] = "0123456789ABCDEF";
+    std::string printable;
+    for (const char c : text) {
+        const auto byte = static_cast<unsigned char>(c);
+        if (c == '\n')
+            printable += "\\n";
+        else if (c == '\r')
+            printable += "\\r";
+        else if (c == '\t')
+            printable += "\\t";
+        else if (c == '\\')
+            printable += "\\\\";
+        else if (byte < 0x20 || byte >= 0x7F)
+            printable += {'\\', 'x', digits[byte >> 4U], digits[byte & 0xFU]};
+        else
+            printable += c;
+    }
+    return printable;
+}
+
+std::string Number(double value, int decimals) {
+    char text[64];
+    FormatFixed(value, text, sizeof text, decimals);
+    return text;
+}
+
+} // namespace
+
+void QuoteTrace::SourceTried(const QuoteSource& source) {
+    marker_ = source.tag;
+    beginning_.clear();
+    lastBytes_.clear();
+    received_ = 0;
+    markerFound_ = markerDivided_ = priceRead_ = false;
+    output_ << "source " << Printable(source.label) << ": asking " << Printable(source.host) << " for "
+            << Printable(source.path) << ", marker '" << Printable(source.tag) << "', skip " << source.skip
+            << '\n';
+}
+
+void QuoteTrace::SourceSkipped(int line, const char* reason) {
+    output_ << "line " << line << " is no source: " << reason << '\n';
+}
+
+void QuoteTrace::Connected(const char* server) {
+    output_ << "  connected to " << server << '\n';
+}
+
+void QuoteTrace::Failed(const char* reason) {
+    output_ << "  failed: " << Printable(reason) << '\n';
+}
+
+void QuoteTrace::PieceReceived(std::string_view piece) {
+    received_ += piece.size();
+    beginning_ += piece.substr(0, Beginning - std::min(Beginning, beginning_.size()));
+    markerDivided_ = markerDivided_ || CrossesPieces(piece);
+    const std::size_t kept = marker_.empty() ? 0 : marker_.size() - 1;
+    lastBytes_ += piece.substr(piece.size() - std::min(piece.size(), kept));
+    lastBytes_.erase(0, lastBytes_.size() - std::min(lastBytes_.size(), kept));
+}
+
+bool QuoteTrace::CrossesPieces(std::string_view piece) const {
+    const std::string seam = lastBytes_ + std::string(piece.substr(0, marker_.size()));
+    return !lastBytes_.empty() && seam.find(marker_) != seam.npos;
+}
+
+void QuoteTrace::MarkerFound(std::string_view piece, std::size_t position) {
+    markerFound_ = true;
+    const std::size_t start = position - std::min(position, Around);
+    const std::size_t behind = position + marker_.size();
+    output_ << "  marker found: " << (start > 0 ? "..." : "")
+            << Printable(piece.substr(start, position - start)) << '[' << Printable(marker_) << ']'
+            << Printable(piece.substr(behind, Around)) << (behind + Around < piece.size() ? "..." : "")
+            << '\n';
+}
+
+void QuoteTrace::PriceRead(std::string_view token, std::string_view following, double price,
+                           double fraction) {
+    priceRead_ = true;
+    output_ << "  price text '" << Printable(token.substr(0, Around)) << "' read as " << Number(price, 4)
+            << '\n'
+            << "  behind it '" << Printable(following.substr(0, Around)) << "': "
+            << (fraction < 0    ? "a malformed fraction"
+                : fraction == 0 ? "no fraction"
+                                : "fraction " + Number(fraction, 4))
+            << '\n';
+}
+
+void QuoteTrace::SourceAnswered(float result) {
+    if (!priceRead_ && received_ > 0)
+        TellWhatIsMissing();
+    output_ << (result > 0 ? "  price " : "  no price, ") << Number(static_cast<double>(result), 2) << '\n';
+}
+
+void QuoteTrace::TellWhatIsMissing() {
+    if (markerFound_)
+        output_ << "  the page ended before the skip count was used up, or without a price text\n";
+    else if (markerDivided_)
+        output_ << "  the marker arrived in two pieces, and is found only in one; it may be found another "
+                   "time\n";
+    else
+        output_ << "  marker not found in the " << received_
+                << " bytes received, which begin: " << Printable(beginning_)
+                << (received_ > beginning_.size() ? "..." : "") << '\n';
+}
