@@ -323,8 +323,8 @@ class DATABASE {
     // Set statements
     [[nodiscard]] int PrepareChange(const char* statement, FieldChange* change) const;
     [[nodiscard]] int ChangeRecords(const FieldChange& change, long* changed);
-    [[nodiscard]] const std::int32_t* EndOfSpan(const ReadCache& reader, const std::int32_t* numbers,
-                                                const std::int32_t* end) const;
+    [[nodiscard]] std::span<const std::int32_t> TakeSpan(const ReadCache& reader, const std::int32_t** next,
+                                                         const std::int32_t* end) const;
     [[nodiscard]] int ChangeSpan(const FieldChange& change, ReadCache& reader,
                                  std::span<const std::int32_t> numbers, std::uint8_t* before);
 

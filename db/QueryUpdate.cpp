@@ -62,45 +62,40 @@ int DATABASE::ChangeRecords(const FieldChange& change, long* changed) {
         next = sorted.get();
         end = next + slotCount_;
     }
-    reader->Reset(); // what is written beside a changed record has just been read
-    while (next != end) {
-        if (*next == NotInSet) {
-            ++next;
-            continue;
+    for (;;) {
+        const std::span<const std::int32_t> numbers = TakeSpan(*reader, &next, end);
+        if (numbers.empty()) {
+            return DatabaseError::None;
         }
-        if (!reader->Holds(*next) && reader->Fill(file_, Area(), *next) != 0) {
+        // Always read anew: what lies between the records is written back as well.
+        const std::int32_t first = numbers.front();
+        if (reader->FillSpan(file_, Area(), first, numbers.back() - first + 1) != 0) {
             return DatabaseError::SetReadFailed;
         }
-        const std::int32_t* spanEnd = EndOfSpan(*reader, next, end);
-        const int count = ChangeSpan(change, *reader, {next, spanEnd}, before.get());
+        const int count = ChangeSpan(change, *reader, numbers, before.get());
         if (count < 0) {
             return DatabaseError::WriteFailed;
         }
         *changed += count;
-        next = spanEnd;
     }
-    return DatabaseError::None;
 }
 
-// Where the records that are written together with the first one listed end: they are held by the reader and
-// no further than a page from each other, so that writing what lies between costs less than one more call.
-const std::int32_t* DATABASE::EndOfSpan(const ReadCache& reader, const std::int32_t* numbers,
-                                        const std::int32_t* end) const {
+// Takes the records that are read and written together off the list: they fit the reader, and lie no further
+// than a page from each other, so that what lies between costs less than one more call. None at the end.
+std::span<const std::int32_t> DATABASE::TakeSpan(const ReadCache& reader, const std::int32_t** next,
+                                                 const std::int32_t* end) const {
     const std::int32_t mostGap = MostGapBytes / header_.recordLength + 1;
-    const std::int32_t most = static_cast<std::int32_t>(SpanBytes) / header_.recordLength;
-    const std::int32_t* spanEnd = numbers + 1;
-    std::int32_t previous = *numbers;
-    for (const std::int32_t* number = spanEnd; number != end; ++number) {
-        if (*number == NotInSet) {
-            continue;
-        }
-        if (!reader.Holds(*number) || *number - *numbers > most || *number - previous > mostGap) {
-            break;
-        }
-        previous = *number;
-        spanEnd = number + 1;
+    const std::int32_t most = std::min(static_cast<std::int32_t>(SpanBytes) / header_.recordLength,
+                                       reader.Capacity(header_.recordLength));
+    const auto inSet = [](std::int32_t number) { return number != NotInSet; };
+    const std::int32_t* first = std::find_if(*next, end, inSet);
+    const std::int32_t* last = first;
+    *next = first;
+    while (*next != end && **next - *first < most && **next - *last <= mostGap) {
+        last = *next;
+        *next = std::find_if(last + 1, end, inSet);
     }
-    return spanEnd;
+    return {first, *next == first ? first : last + 1};
 }
 
 // Changes the listed records in the reader and in the file; returns how many, -1 when they could not be

@@ -45,12 +45,12 @@ void ReadCache::DropFrom(std::int32_t n) {
     }
 }
 
-std::int32_t ReadCache::Capacity(const RECORD_AREA& area) const {
-    return static_cast<std::int32_t>(std::max<std::int64_t>(size_ / area.recordLength, 1));
+std::int32_t ReadCache::Capacity(std::int32_t recordLength) const {
+    return static_cast<std::int32_t>(std::max<std::int64_t>(size_ / recordLength, 1));
 }
 
 int ReadCache::Fill(const File& file, const RECORD_AREA& area, std::int32_t n) {
-    const std::int32_t capacity = Capacity(area);
+    const std::int32_t capacity = Capacity(area.recordLength);
     const std::int32_t scattered = std::clamp(ScatteredBytes / area.recordLength, 1, capacity);
     const bool downwards = n == first_ - 1;
     const bool goesOn = downwards || (n > last_ && n - last_ <= scattered);
@@ -68,7 +68,12 @@ int ReadCache::Fill(const File& file, const RECORD_AREA& area, std::int32_t n) {
 }
 
 int ReadCache::FillFrom(const File& file, const RECORD_AREA& area, std::int32_t n) {
-    return ReadRange(file, area, n, std::min(Capacity(area), area.recordCount - n));
+    return ReadRange(file, area, n, std::min(Capacity(area.recordLength), area.recordCount - n));
+}
+
+int ReadCache::FillSpan(const File& file, const RECORD_AREA& area, std::int32_t first, std::int32_t count) {
+    const int error = ReadRange(file, area, first, count);
+    return error == 0 && !Holds(first + count - 1) ? ENODATA : error;
 }
 
 int ReadCache::ReadRange(const File& file, const RECORD_AREA& area, std::int32_t first, std::int32_t count) {

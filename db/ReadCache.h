@@ -40,9 +40,13 @@ class ReadCache {
     [[nodiscard]] int Fill(const File& file, const RECORD_AREA& area, std::int32_t n);
     /// The same with a whole buffer from record n on, for a reader that wants them all.
     [[nodiscard]] int FillFrom(const File& file, const RECORD_AREA& area, std::int32_t n);
+    /// The same with `count` records, at most Capacity, of which one that the file lacks is ENODATA as well.
+    [[nodiscard]] int FillSpan(const File& file, const RECORD_AREA& area, std::int32_t first,
+                               std::int32_t count);
+    /// How many records of that length it can hold, at least 1.
+    [[nodiscard]] std::int32_t Capacity(std::int32_t recordLength) const;
 
   private:
-    [[nodiscard]] std::int32_t Capacity(const RECORD_AREA& area) const;
     [[nodiscard]] int ReadRange(const File& file, const RECORD_AREA& area, std::int32_t first,
                                 std::int32_t count);
 
