@@ -37,6 +37,12 @@ int ReadChartData(DATABASE& investments, const char* portfolio, ChartDataSets& d
     return 0;
 }
 
+BRect ChartArea() {
+    BRect area = FrameAt(0, 0);
+    area.bottom -= 2 * ::GetFontHeight(be_plain_font);
+    return area;
+}
+
 void ShowDataSet(PieChartView& view, const ChartDataSets& dataSets, uint32 code) {
     for (const ChartInfo& chart : Charts) {
         if (chart.code != code)
@@ -57,8 +63,7 @@ ChartWindow::ChartWindow(float left, float top, const char* portfolio)
     topView_->SetViewColor(colors::gray);
     AddChild(topView_);
     CreateGraphTypeMenu();
-    BRect chart = Bounds();
-    chart.bottom -= 2 * ::GetFontHeight(be_plain_font);
+    const BRect chart = ChartArea();
     pieView_ = new PieChartView(chart);
     topView_->AddChild(pieView_);
     if (GenerateDataSets(portfolio) != 0)

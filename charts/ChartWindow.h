@@ -39,5 +39,8 @@ class ChartWindow : public BWindow {
 [[nodiscard]] int ReadChartData(DATABASE& investments, const char* portfolio, ChartDataSets& dataSets,
                                 float& total);
 
+// The part of the window that a chart fills, from (0, 0) on.
+[[nodiscard]] BRect ChartArea();
+
 // Gives the view title, values and labels of one of the pie charts.
 void ShowDataSet(PieChartView& view, const ChartDataSets& dataSets, uint32 code);

@@ -35,12 +35,13 @@ std::string Whole(float value) {
 
 } // namespace
 
-ValueChartView::ValueChartView(BRect frame, float currentValue)
+ValueChartView::ValueChartView(BRect frame, float currentValue, Controls controls)
     : BView(frame, "value chart view", B_FOLLOW_ALL_SIDES, B_WILL_DRAW | B_FRAME_EVENTS),
       currentValue_(currentValue),
       rects_(LayOutGrowth(Bounds(), ::GetFontHeight(be_plain_font))) {
     SetViewColor(colors::gray);
-    AddCheckBox();
+    if (controls == Controls::CheckBox)
+        AddCheckBox();
     CalculateDataPoints();
     maximum_ = GetMaxValue();
     GetDate(&year_, nullptr, nullptr);
@@ -125,7 +126,9 @@ void ValueChartView::DrawYears() {
     const BRect& graph = rects_.graph;
     // A year is never cut, however large the font.
     const float half = std::max(YearHalfWidth, std::ceil(StringWidth("0000") / 2) + 1);
-    BRect label(graph.left - half, graph.bottom + 2, graph.left + half, graph.bottom + 32);
+    // Below the lowest value's text, which ends at the graph's left edge, half of it under the bottom.
+    const float top = graph.bottom + std::ceil(::GetFontHeight(be_fixed_font) / 2);
+    BRect label(graph.left - half, top, graph.left + half, top + 30);
     for (int i = 0; i <= AxisSteps; ++i) {
         const int year = year_ + i * GrowthYears / AxisSteps;
         DrawText(this, &label, std::to_string(year).c_str(), DrawTextCenter | DrawTextTop);

@@ -16,7 +16,9 @@ inline constexpr uint32 MessageToggleRates = 3001;
 // construction is all it knows. Interface thread.
 class ValueChartView : public BView {
   public:
-    ValueChartView(BRect frame, float currentValue);
+    enum class Controls { CheckBox, None };
+    // Without the check box the chart is for a picture.
+    ValueChartView(BRect frame, float currentValue, Controls controls = Controls::CheckBox);
 
     // Shows or hides the two highest rates, with the values' scale. The check box is left as it is: its click
     // has changed it already.

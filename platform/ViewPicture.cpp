@@ -30,6 +30,7 @@ bool Paint(BView* view, QPaintDevice* device, double scale) {
     if (!painter.begin(device))
         return false;
     painter.scale(scale, scale);
+    painter.fillRect(QRect(QPoint(0, 0), SizeOf(view)), ToQt(view->ViewColor())); // to the last whole pixel
     painter.translate(-ToQt(view->Bounds().LeftTop()));
     DrawTree(view, painter, view->Bounds());
     return painter.end();
@@ -39,7 +40,6 @@ bool WritePng(BView* view, QBuffer& file, float scale) {
     QImage image(SizeOf(view) * std::clamp(scale, 1 / kMaxScale, kMaxScale), QImage::Format_RGB32);
     if (image.isNull())
         return false;
-    image.fill(ToQt(view->ViewColor()));
     return Paint(view, &image, std::clamp(scale, 1 / kMaxScale, kMaxScale)) && image.save(&file, "PNG");
 }
 
@@ -49,8 +49,9 @@ bool WriteSvg(BView* view, QBuffer& file) {
     svg.setResolution(kPointsPerInch);
     svg.setSize(SizeOf(view));
     svg.setViewBox(QRect(QPoint(0, 0), SizeOf(view)));
-    svg.setTitle(QString::fromUtf8(view->Name()));
-    svg.setDescription(QString::fromStdString(view->AccessibleDescription()));
+    // The generator writes these as they are given.
+    svg.setTitle(QString::fromUtf8(view->Name()).toHtmlEscaped());
+    svg.setDescription(QString::fromStdString(view->AccessibleDescription()).toHtmlEscaped());
     return Paint(view, &svg, 1);
 }
 

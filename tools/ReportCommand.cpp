@@ -2,16 +2,15 @@
 
 #include <CLI/CLI.hpp>
 #include <cerrno>
-#include <cstdlib>
 #include <cstring>
 #include <iostream>
 #include <memory>
 
 #include "db/Database.h"
-#include "platform/Application.h"
 #include "platform/PrintJob.h"
 #include "print/Report.h"
 #include "tools/HomeFolder.h"
+#include "tools/OffscreenApplication.h"
 
 namespace {
 
@@ -25,9 +24,7 @@ struct ReportOptions {
 
 // Returns what came of it, and in `error` the errno number of a file that cannot be written.
 ReportResult WriteReport(const ReportOptions& options, DATABASE& investments, int& error) {
-    setenv("QT_QPA_PLATFORM", "offscreen", 1);        // no display is needed, not even looked for
-    setenv("QT_LOGGING_RULES", "*.warning=false", 1); // what the toolkit misses of a desktop is no news
-    const BApplication application("application/x-vnd.Palandri-Quorvan-cli");
+    const OffscreenApplication application;
     BMessage settings;
     settings.AddString("output file", options.output.c_str());
     for (const char* name : {"left margin", "top margin", "right margin", "bottom margin"})

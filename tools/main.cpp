@@ -3,6 +3,7 @@
 #include <exception>
 #include <iostream>
 
+#include "tools/ChartCommand.h"
 #include "tools/DbCommand.h"
 #include "tools/QuoteCommand.h"
 #include "tools/ReportCommand.h"
@@ -21,6 +22,7 @@ int Run(int argc, char** argv) {
     AddSetupCommand(application, status);
     AddQuoteCommand(application, status);
     AddReportCommand(application, status);
+    AddChartCommand(application, status);
     try {
         application.parse(argc, argv);
     } catch (const CLI::ParseError& error) {
