@@ -15,8 +15,8 @@ only the program itself is brought up to date.
   --sample   fill a new folder with two sample portfolios
   --desktop  put the folder's program into your desktop's menu, with its icon
 
-Without a display the program runs on a virtual one, is taken on a short tour,
-and pictures of it are saved.
+Without a display the program is taken on a short tour on a virtual one, in a
+sample folder of the tour's own, and pictures of it are saved.
 END
 }
 
@@ -51,8 +51,9 @@ echo "Building Quorvan (the first time takes some minutes)"
 # Nothing but the program is built, so the packages of the benchmarks are not needed.
 quietly "the build could not be prepared" \
     cmake -S "$here" --preset release -B "$build" -DQUORVAN_BENCH=OFF
-quietly "the build failed" \
-    cmake --build "$build" --parallel "$(nproc)" --target quorvan quorvan-cli
+targets=(quorvan quorvan-cli)
+[ -n "${DISPLAY:-}${WAYLAND_DISPLAY:-}" ] || targets+=(quorvan-tour)
+quietly "the build failed" cmake --build "$build" --parallel "$(nproc)" --target "${targets[@]}"
 
 "$build/tools/quorvan-cli" setup "$folder" "${options[@]}" --program "$build/app/quorvan" --update-program ||
     fail "the folder $folder could not be made ready"
@@ -62,4 +63,5 @@ if [ -n "${DISPLAY:-}${WAYLAND_DISPLAY:-}" ]; then
     echo "Starting $PWD/quorvan"
     exec ./quorvan
 fi
-exec "$here/scripts/tour.sh" "$PWD" "$here/build/tour"
+echo "There is no display: $PWD/quorvan starts it where there is one. Taking the tour meanwhile."
+exec "$here/scripts/tour.sh" "$build" "$here/build/pictures"

@@ -6,7 +6,7 @@ build_packages=(g++ cmake ninja-build qt6-base-dev libqt6svg6-dev libgl-dev libc
 # To show it, with letters, and to trust quote servers.
 run_packages=(fonts-dejavu-core ca-certificates)
 # To show it on a virtual display and take pictures.
-display_packages=(xvfb xauth xdotool x11-utils imagemagick)
+display_packages=(xvfb xauth xdotool x11-utils imagemagick poppler-utils)
 # To build and run the tests and the benchmarks.
 test_packages=(libgtest-dev libgmock-dev libbenchmark-dev libsqlite3-dev libssl-dev poppler-utils clang-format)
 # To check what desktops and man read, and what assistive technology hears.
