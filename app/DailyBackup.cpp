@@ -1,0 +1,207 @@
+#include "app/DailyBackup.h"
+
+#include <algorithm>
+#include <cerrno>
+#include <cstdint>
+#include <cstdlib>
+#include <filesystem>
+#include <memory>
+#include <string_view>
+#include <system_error>
+
+#include "util/Dates.h"
+
+namespace {
+
+constexpr const char* PartSuffix = "part";
+
+// Whether the text is a day such as "2026-11-22".
+bool IsDay(std::string_view text) {
+    constexpr std::string_view pattern = "0000-00-00";
+    if (text.size() != pattern.size())
+        return false;
+    for (std::size_t i = 0; i < pattern.size(); ++i) {
+        const bool digit = text[i] >= '0' && text[i] <= '9';
+        if (pattern[i] == '0' ? !digit : text[i] != pattern[i])
+            return false;
+    }
+    const std::string parts(text);
+    return CheckDate(std::atoi(parts.c_str()), std::atoi(parts.c_str() + 5), std::atoi(parts.c_str() + 8)) ==
+           0;
+}
+
+} // namespace
+
+std::time_t DailyBackup::SystemClock() {
+    return std::time(nullptr);
+}
+
+std::vector<std::string> DailyBackup::FilesKeptWith(const std::string& name) {
+    if (name == "portfol.db" || name == "invest.db")
+        return {"portfol.db", "invest.db"};
+    return {name};
+}
+
+DailyBackup::DailyBackup(std::string folder, std::vector<std::string> names, FileOperations& operations,
+                         Clock clock)
+    : folder_(std::move(folder)), names_(std::move(names)), operations_(operations), clock_(clock) {}
+
+DailyBackup::~DailyBackup() {
+    stop_ = true;
+    EndPreparing();
+    for (const std::string& name : prepared_)
+        static_cast<void>(RemoveFile(operations_, Kept(name, PartSuffix)));
+}
+
+void DailyBackup::EndPreparing() {
+    if (worker_.joinable())
+        worker_.join();
+}
+
+bool DailyBackup::BeginDay(std::time_t now) {
+    std::tm midnight{};
+    char text[16] = "";
+    if (localtime_r(&now, &midnight) == nullptr ||
+        std::strftime(text, sizeof text, "%Y-%m-%d", &midnight) == 0)
+        return false;
+    midnight.tm_hour = midnight.tm_min = midnight.tm_sec = 0;
+    midnight.tm_isdst = -1;
+    std::tm next = midnight;
+    ++next.tm_mday;
+    day_ = text;
+    dayBegin_ = std::mktime(&midnight);
+    dayEnd_ = std::mktime(&next);
+    return true;
+}
+
+bool DailyBackup::IsWanted(const std::string& name) const {
+    return FileExists(DataPath(name)) && !FileExists(Kept(name, day_));
+}
+
+void DailyBackup::Prepare() {
+    std::vector<std::string> wanted;
+    {
+        const std::lock_guard guard(mutex_);
+        if (!BeginDay(clock_()))
+            return;
+        dayEnd_ = 0; // no Keep has made sure of it
+        std::copy_if(names_.begin(), names_.end(), std::back_inserter(wanted),
+                     [this](const std::string& name) { return IsWanted(name); });
+    }
+    const auto copy = [this, wanted] {
+        for (const std::string& name : wanted) {
+            if (!stop_ && CopyToPart(name) == 0)
+                prepared_.push_back(name);
+        }
+    };
+    try {
+        if (!wanted.empty())
+            worker_ = std::thread(copy);
+    } catch (const std::system_error&) {
+        // Without a thread the first Keep makes the copies.
+    }
+}
+
+int DailyBackup::Keep() {
+    const std::lock_guard guard(mutex_);
+    const std::time_t now = clock_();
+    if (now >= dayBegin_ && now < dayEnd_)
+        return error_;
+    EndPreparing();
+    error_ = BeginDay(now) ? KeepAll() : EOVERFLOW;
+    if (error_ != 0 && tell_)
+        tell_(error_);
+    return error_;
+}
+
+int DailyBackup::KeepAll() {
+    int error = 0;
+    bool made = false;
+    for (const std::string& name : names_) {
+        if (!IsWanted(name))
+            continue;
+        const int failure = KeepFile(name);
+        made = made || failure == 0;
+        error = error == 0 ? failure : error;
+    }
+    if (made) {
+        const int failure = SyncFolderOf(operations_, Kept(names_.front(), day_));
+        error = error == 0 ? failure : error;
+    }
+    for (const std::string& name : names_) {
+        if (error == 0)
+            RemoveOldOf(name);
+    }
+    return error;
+}
+
+int DailyBackup::KeepFile(const std::string& name) {
+    const auto prepared = std::find(prepared_.begin(), prepared_.end(), name);
+    if (prepared != prepared_.end())
+        prepared_.erase(prepared); // the file is not as it was then for a second time
+    else if (const int error = CopyToPart(name); error != 0)
+        return error;
+    const std::string part = Kept(name, PartSuffix);
+    const int error = RenameFile(operations_, part, Kept(name, day_));
+    if (error != 0)
+        static_cast<void>(RemoveFile(operations_, part));
+    return error;
+}
+
+// The complete copy, on the disk, under the name that it has until it is needed.
+int DailyBackup::CopyToPart(const std::string& name) {
+    std::error_code ignored; // what is in the folder's place shows when the file is made
+    std::filesystem::create_directory(folder_ + "/" + FolderName, folder_, ignored);
+    const std::string part = Kept(name, PartSuffix);
+    static_cast<void>(RemoveFile(operations_, part)); // left by a program that was killed
+    File source(operations_);
+    File target(operations_);
+    int error = source.Open(DataPath(name), FileMode::ReadOnly);
+    if (error == 0)
+        error = target.Open(part, FileMode::CreatePrivate);
+    if (error != 0)
+        return error;
+    error = CopyBytes(source, target);
+    if (error == 0)
+        error = target.TakeOwnerAndMode(source);
+    if (error == 0)
+        error = target.Sync();
+    target.Close();
+    if (error != 0)
+        static_cast<void>(RemoveFile(operations_, part));
+    return error;
+}
+
+int DailyBackup::CopyBytes(const File& source, File& target) const {
+    constexpr std::size_t bufferSize = 256 * 1024;
+    const auto buffer = std::make_unique<char[]>(bufferSize);
+    std::size_t got = bufferSize;
+    for (std::int64_t offset = 0; got == bufferSize; offset += static_cast<std::int64_t>(got)) {
+        if (stop_)
+            return ECANCELED;
+        if (const int error = source.ReadUpTo(offset, buffer.get(), bufferSize, &got); error != 0)
+            return error;
+        if (const int error = target.WriteAt(offset, buffer.get(), got); error != 0)
+            return error;
+    }
+    return 0;
+}
+
+void DailyBackup::RemoveOldOf(const std::string& name) {
+    const std::string beginning = name + ".";
+    std::vector<std::string> days;
+    std::error_code error;
+    std::filesystem::directory_iterator entry(folder_ + "/" + FolderName, error);
+    for (; !error && entry != std::filesystem::directory_iterator(); entry.increment(error)) {
+        const std::string file = entry->path().filename().string();
+        if (!file.starts_with(beginning))
+            continue;
+        std::string day = file.substr(beginning.size());
+        // Today's is never too old, whatever a clock that ran ahead has left.
+        if (IsDay(day) && day != day_)
+            days.push_back(std::move(day));
+    }
+    std::sort(days.begin(), days.end());
+    for (std::size_t i = 0; i + Generations - 1 < days.size(); ++i)
+        static_cast<void>(RemoveFile(operations_, Kept(name, days[i])));
+}

@@ -1,0 +1,84 @@
+#pragma once
+
+#include <atomic>
+#include <ctime>
+#include <functional>
+#include <mutex>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include "db/File.h"
+
+// Keeps what data files held before the first change of a day: in the folder "backups" beside them, a file
+// such as invest.db.2026-11-22 for each. Each of these is complete and on the disk under its name, or is not
+// there at all; it has the data file's permissions. Of each data file the newest Generations are kept.
+// Nothing that is named otherwise is touched, save NAME.part, where a copy is made.
+//
+// It does not see changes by itself: who is about to change one of the files calls Keep first (BackedUpFiles
+// does so for a DATABASE), and holds the FolderLock all the while. The application object or a tool owns it.
+// Keep may be called from any thread; everything else belongs to the owner's.
+class DailyBackup {
+  public:
+    static constexpr const char* FolderName = "backups";
+    static constexpr std::size_t Generations = 7;
+
+    using Clock = std::time_t (*)();
+    static std::time_t SystemClock();
+
+    // For the files of these names in the folder; one that does not exist is passed over. They are kept
+    // together, so that the backups of a day fit each other. `operations` must outlive the object.
+    DailyBackup(std::string folder, std::vector<std::string> names,
+                FileOperations& operations = SystemFiles(), Clock clock = SystemClock);
+    DailyBackup(const DailyBackup&) = delete;
+    DailyBackup& operator=(const DailyBackup&) = delete;
+    // Removes what was prepared and not needed.
+    ~DailyBackup();
+
+    // The names of the data files whose contents refer to each other, this one among them.
+    [[nodiscard]] static std::vector<std::string> FilesKeptWith(const std::string& name);
+
+    // Has `tell` called the first time that Keep fails on a day, with the errno number. To be called before
+    // the files change; `tell` runs on the thread that called Keep, must not wait for another, and must not
+    // call Keep.
+    void OnFailure(std::function<void(int)> tell) { tell_ = std::move(tell); }
+
+    // Begins to copy the files on a thread of its own, so that the first Keep need not wait for it: to be
+    // called once, before the files change. Copies that no Keep asks for leave no backup.
+    void Prepare();
+
+    // Returns once the files' backups of today are there, at once when it had made sure of that before. 0, or
+    // the errno number of the first failure: then what could be kept was, and it is not tried again on this
+    // day.
+    [[nodiscard]] int Keep();
+
+  private:
+    [[nodiscard]] std::string DataPath(const std::string& name) const { return folder_ + "/" + name; }
+    [[nodiscard]] std::string Kept(const std::string& name, const std::string& suffix) const {
+        return folder_ + "/" + FolderName + "/" + name + "." + suffix;
+    }
+    [[nodiscard]] bool BeginDay(std::time_t now);
+    [[nodiscard]] bool IsWanted(const std::string& name) const;
+    [[nodiscard]] int KeepAll();
+    [[nodiscard]] int KeepFile(const std::string& name);
+    [[nodiscard]] int CopyToPart(const std::string& name);
+    [[nodiscard]] int CopyBytes(const File& source, File& target) const;
+    void EndPreparing();
+    void RemoveOldOf(const std::string& name);
+
+    const std::string folder_;
+    const std::vector<std::string> names_;
+    FileOperations& operations_;
+    const Clock clock_;
+    std::function<void(int)> tell_;
+
+    std::thread worker_;
+    std::atomic<bool> stop_ = false;
+    std::vector<std::string> prepared_; // names; the worker's until it has ended
+
+    std::mutex mutex_;         // guards what follows
+    std::string day_;          // "2026-11-22"
+    std::time_t dayBegin_ = 0; // the day of which Keep has made sure
+    std::time_t dayEnd_ = 0;
+    int error_ = 0; // of that day
+};
