@@ -77,7 +77,8 @@ QPageLayout LayoutOf(const BMessage& settings, QPageLayout layout) {
 struct PrintJobPeer {
     QPrinter printer{QPrinter::HighResolution};
     QPainter painter;
-    bool pageWanted = false; // the next drawing begins a new page
+    bool pageWanted = false;  // the next drawing begins a new page
+    bool printerGone = false; // the one that was set up is not there; another will not do
     OutputFile file;
     QString wantedFile; // what the job writes to in the end; empty for a printer
 
@@ -90,7 +91,7 @@ struct PrintJobPeer {
     [[nodiscard]] bool Begin() {
         wantedFile = printer.outputFileName();
         if (wantedFile.isEmpty())
-            return printer.outputFormat() != QPrinter::PdfFormat && painter.begin(&printer);
+            return printer.outputFormat() != QPrinter::PdfFormat && !printerGone && painter.begin(&printer);
         if (!file.Begin(QFile::encodeName(wantedFile).toStdString()))
             return false;
         printer.setOutputFileName(QFile::decodeName(file.WritePath().c_str()));
@@ -125,7 +126,10 @@ status_t BPrintJob::ConfigJob() {
     QPrintDialog dialog(&peer_->printer);
     dialog.setObjectName(QStringLiteral("print dialog"));
     dialog.setOptions(QAbstractPrintDialog::PrintToFile | QAbstractPrintDialog::PrintShowPageSize);
-    return RunDialog(dialog) == QDialog::Accepted ? B_OK : B_ERROR;
+    if (RunDialog(dialog) != QDialog::Accepted)
+        return B_ERROR;
+    peer_->printerGone = false;
+    return B_OK;
 }
 
 BMessage* BPrintJob::Settings() const {
@@ -157,7 +161,8 @@ void BPrintJob::SetSettings(const BMessage* message) {
         return;
     const QString name = QString::fromStdString(Text(*message, "printer"));
     const QString file = QString::fromStdString(Text(*message, "output file"));
-    if (!name.isEmpty() && !QPrinterInfo::printerInfo(name).isNull())
+    peer_->printerGone = !name.isEmpty() && QPrinterInfo::printerInfo(name).isNull();
+    if (!name.isEmpty() && !peer_->printerGone)
         printer.setPrinterName(name);
     if (!file.isEmpty())
         printer.setOutputFileName(file);

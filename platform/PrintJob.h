@@ -32,7 +32,8 @@ class BPrintJob {
     // Takes the set-up from message; what it lacks keeps its default.
     void SetSettings(const BMessage* message);
 
-    // False when the printer or file cannot be opened; errno then says why for a file.
+    // False when the printer is not there, or printer or file cannot be opened; errno then says why for a
+    // file.
     [[nodiscard]] bool BeginJob();
     [[nodiscard]] bool CanContinue() const;
     // The whole sheet, from the printable part's left top.
