@@ -5,8 +5,10 @@
 #include <chrono>
 #include <cstdlib>
 #include <filesystem>
+#include <functional>
 #include <string>
 #include <string_view>
+#include <vector>
 
 struct OPTIONS {
     explicit OPTIONS(long defaultRecords) : records(defaultRecords) {}
@@ -51,4 +53,22 @@ template <class Work>
 double Shortest(int rounds, Work work) {
     return Shortest(
         rounds, [] {}, work);
+}
+
+// Something to be timed; `prepare` comes before it and is not counted.
+struct TIMED {
+    std::function<void()> work;
+    std::function<void()> prepare = [] {};
+};
+
+// The shortest of several runs of each, in seconds. They take turns, so that a busy moment of the machine
+// meets all of them.
+inline std::vector<double> ShortestInTurn(int rounds, const std::vector<TIMED>& all) {
+    std::vector<double> shortest(all.size(), 1e9);
+    for (int round = 0; round < rounds; ++round) {
+        for (std::size_t i = 0; i < all.size(); ++i) {
+            shortest[i] = std::min(shortest[i], Shortest(1, all[i].prepare, all[i].work));
+        }
+    }
+    return shortest;
 }

@@ -29,21 +29,15 @@ void BareRead(const std::string& path, const char* copy = nullptr) {
     close(target);
 }
 
-// One line of the table. Seconds; 0 for what there is none of.
+// One line of the table.
 struct LINE {
     const char* work;
-    double ours;
-    double theirs = 0;
-    double limit = 0;
-    double wantedOfTheirs = 0; // at most so many times
+    std::vector<double> seconds; // ours, SQLite's and, where there is one, the limit's
+    double wantedOfTheirs = 0;   // at most so many times
     double wantedOfLimit = 0;
 };
 
 void PrintRatio(double ours, double other, double wanted) {
-    if (other == 0) {
-        std::printf(" %10s %8s %-7s", "", "", "");
-        return;
-    }
     char bracket[16] = "";
     if (wanted > 0) {
         std::snprintf(bracket, sizeof(bracket), "(%.2f)", wanted);
@@ -144,9 +138,12 @@ class Bench {
 
   private:
     static void Print(const LINE& line) {
-        std::printf("%-36s %10.2f", line.work, line.ours * 1e3);
-        PrintRatio(line.ours, line.theirs, line.wantedOfTheirs);
-        PrintRatio(line.ours, line.limit, line.wantedOfLimit);
+        const double ours = line.seconds[0];
+        std::printf("%-36s %10.2f", line.work, ours * 1e3);
+        PrintRatio(ours, line.seconds[1], line.wantedOfTheirs);
+        if (line.seconds.size() > 2) {
+            PrintRatio(ours, line.seconds[2], line.wantedOfLimit);
+        }
         std::printf("\n");
         std::fflush(stdout);
     }
@@ -160,14 +157,13 @@ class Bench {
 
     void MeasureWorks(DATABASE& database, Peer& peer) {
         BareRead(path_); // warms the page cache
-        const double bareRead = Shortest(rounds_, [&] { BareRead(path_); });
-        Print({"bare sequential read", bareRead});
         for (const WORK& work : Works) {
             long ours = 0;
             long theirs = 0;
-            const double seconds = Shortest(rounds_, [&] { ours = work.ours(database); });
-            const double peers = Shortest(fewRounds_, [&] { theirs = work.theirs(peer); });
-            Print({work.name, seconds, peers, bareRead, work.wantedOfTheirs, work.wantedOfLimit});
+            const auto times = ShortestInTurn(rounds_, {{[&] { ours = work.ours(database); }},
+                                                        {[&] { theirs = work.theirs(peer); }},
+                                                        {[&] { BareRead(path_); }}});
+            Print({work.name, times, work.wantedOfTheirs, work.wantedOfLimit});
             Check(ours == theirs, work.name);
         }
     }
@@ -176,37 +172,36 @@ class Bench {
         for (const CHANGE& change : Changes) {
             long ours = 0;
             long theirs = 0;
-            const double query = Shortest(rounds_, [&] { database.Query(change.query, QueryMode::New); });
-            const double seconds = Shortest(rounds_, [&] {
-                database.Query(change.query, QueryMode::New);
+            const auto query = [&] { database.Query(change.query, QueryMode::New); };
+            const auto update = [&] {
+                query();
                 ours = database.QueryUpdate(change.set);
-            });
-            const double peers = Shortest(fewRounds_, [&] { theirs = peer.Change(change.theirs); });
-            Print({change.name, seconds, peers, query, change.wantedOfTheirs, change.wantedOfLimit});
+            };
+            const auto times =
+                ShortestInTurn(rounds_, {{update}, {[&] { theirs = peer.Change(change.theirs); }}, {query}});
+            Print({change.name, times, change.wantedOfTheirs, change.wantedOfLimit});
             Check(ours == theirs, change.name);
         }
     }
 
     void MeasureAppend() {
         const long count = std::min(records_, AppendedAtMost);
-        const std::string path = folder_ + "/append.db";
-        const std::string peerPath = folder_ + "/append.sqlite";
         std::vector<char> data(static_cast<std::size_t>(count) * DataSize);
         for (long i = 0; i < count; ++i) {
             FillInvestment(i, &data[static_cast<std::size_t>(i) * DataSize]);
         }
         DATABASE database(nullptr);
+        Peer peer(folder_ + "/append.sqlite", 0);
         bool good = true;
-        const double ours = Shortest(
-            fewRounds_, [&] { good &= MakeEmptyFile(database, path); },
-            [&] {
-                for (long i = 0; i < count; ++i) {
-                    good &= database.Append(&data[static_cast<std::size_t>(i) * DataSize]) == i;
-                }
-            });
-        Peer peer(peerPath, 0);
-        const double theirs = Shortest(fewRounds_, [&] { peer.InsertEach(0, count); });
-        Print({"append, flushed, header written", ours, theirs, 0, 0.4});
+        const auto append = [&] {
+            for (long i = 0; i < count; ++i) {
+                good &= database.Append(&data[static_cast<std::size_t>(i) * DataSize]) == i;
+            }
+        };
+        const auto times = ShortestInTurn(
+            rounds_, {{append, [&] { good &= MakeEmptyFile(database, folder_ + "/append.db"); }},
+                      {[&] { peer.InsertEach(0, count); }, [&] { peer.Run("DELETE FROM t"); }}});
+        Print({"append, flushed, header written", times, 0.4});
         Check(good && peer.IsGood(), "append");
     }
 
@@ -217,33 +212,29 @@ class Bench {
         }
         const std::string text = folder_ + "/invest.txt";
         const std::string csv = folder_ + "/peer.csv";
+        const std::string copyPath = folder_ + "/copy.db";
+        const std::string peerCopyPath = folder_ + "/copy.sqlite";
         DATABASE database(path_.c_str());
+        DATABASE copy(nullptr);
         long exported = 0;
         long loaded = 0;
         bool good = true;
-        double ours = Shortest(fewRounds_, [&] { exported = database.Export(text.c_str(), 1, "\t"); });
-        double theirs = Shortest(
-            fewRounds_, [&] { good &= Shell(peerPath_, "'.mode csv' 'SELECT * FROM t' > '" + csv + "'"); });
-        Print({"export of text", ours, theirs, 0, 0.5});
-        const std::string copyPath = folder_ + "/copy.db";
-        const std::string peerCopyPath = folder_ + "/copy.sqlite";
-        DATABASE copy(nullptr);
-        ours = Shortest(
-            fewRounds_, [&] { good &= MakeEmptyFile(copy, copyPath); },
-            [&] { loaded = copy.Load(text.c_str(), "\t\n"); });
-        theirs = Shortest(
-            fewRounds_,
-            [&] {
-                std::filesystem::remove(peerCopyPath);
-                Peer(peerCopyPath, 0);
-            },
-            [&] {
-                good &=
-                    Shell(peerCopyPath, "'PRAGMA journal_mode = OFF' 'PRAGMA synchronous = OFF' '.mode csv' "
-                                        "'.import \"" +
-                                            csv + "\" t' > /dev/null");
-            });
-        Print({"load of text", ours, theirs, 0, 0.5});
+        auto times = ShortestInTurn(
+            fewRounds_, {{[&] { exported = database.Export(text.c_str(), 1, "\t"); }}, {[&] {
+                             good &= Shell(peerPath_, "'.mode csv' 'SELECT * FROM t' > '" + csv + "'");
+                         }}});
+        Print({"export of text", times, 0.5});
+        const std::string import =
+            "'PRAGMA journal_mode = OFF' 'PRAGMA synchronous = OFF' '.mode csv' '.import \"" + csv +
+            "\" t' > /dev/null";
+        const auto emptyPeer = [&] {
+            std::filesystem::remove(peerCopyPath);
+            Peer(peerCopyPath, 0);
+        };
+        times = ShortestInTurn(fewRounds_, {{[&] { loaded = copy.Load(text.c_str(), "\t\n"); },
+                                             [&] { good &= MakeEmptyFile(copy, copyPath); }},
+                                            {[&] { good &= Shell(peerCopyPath, import); }, emptyPeer}});
+        Print({"load of text", times, 0.5});
         good &= exported == records_ && loaded == records_;
         good &= Peer(peerCopyPath).Step("SELECT rowid FROM t") == records_;
         Check(good, "text");
@@ -256,29 +247,31 @@ class Bench {
         return std::system(("sqlite3 '" + path + "' " + arguments).c_str()) == 0;
     }
 
+    // What was copied has reached the disk before a run, as the data of yesterday has.
     void MeasureCompaction() {
         bool good = DeleteHalf();
         const std::string work = folder_ + "/work.db";
-        const std::string copy = folder_ + "/copy.db";
-        const double limit = Shortest(fewRounds_, [&] { BareRead(path_, copy.c_str()); });
-        DATABASE database(nullptr);
-        const double ours = Shortest(
-            fewRounds_,
-            [&] {
-                BareRead(path_, work.c_str());
-                good &= database.Open(work.c_str()) == 0;
-            },
-            [&] { good &= database.Compress(0) == 0; });
-        std::filesystem::remove(copy);
         const std::string peerWork = folder_ + "/work.sqlite";
-        const double theirs = Shortest(
-            fewRounds_, [&] { BareRead(peerPath_, peerWork.c_str()); },
-            [&] {
-                Peer peer(peerWork);
-                peer.Run("VACUUM");
-                good &= peer.IsGood();
-            });
-        Print({"compaction, half deleted", ours, theirs, limit, 0.5, 3});
+        DATABASE database(nullptr);
+        const auto compress = [&] { good &= database.Compress(0) == 0; };
+        const auto vacuum = [&] {
+            Peer peer(peerWork);
+            peer.Run("VACUUM");
+            good &= peer.IsGood();
+        };
+        const auto copy = [&] {
+            BareRead(path_, work.c_str());
+            sync();
+            good &= database.Open(work.c_str()) == 0;
+        };
+        const auto copyPeer = [&] {
+            BareRead(peerPath_, peerWork.c_str());
+            sync();
+        };
+        const auto times = ShortestInTurn(fewRounds_, {{compress, copy}, {vacuum, copyPeer}, {[&] {
+                                                           BareRead(path_, (folder_ + "/copy.db").c_str());
+                                                       }}});
+        Print({"compaction, half deleted", times, 0.5, 3});
         good &= Peer(peerWork).Step("SELECT rowid FROM t") == database.GetNumberOfActiveRecords();
         Check(good, "compaction");
     }
