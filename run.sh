@@ -10,7 +10,7 @@ Usage: ./run.sh [FOLDER] [--sample] [--desktop]
 
 Installs what is missing, builds Quorvan, makes FOLDER (~/Quorvan when none is
 given) and starts the program from there. Files in FOLDER that exist are kept;
-only the program itself is brought up to date.
+only the program itself and its help are brought up to date.
 
   --sample   fill a new folder with two sample portfolios
   --desktop  put the folder's program into your desktop's menu, with its icon

@@ -66,8 +66,13 @@ class FolderSetup {
     void MakeTogether(std::span<const DataFilePlan> plans);
     bool PrepareDataFile(const DataFilePlan& plan);
     void MakeFile(const std::string& name, std::string_view content, mode_t mode);
-    void InstallProgram();
-    void CopyProgram(std::string_view content, ExistingFile existing);
+    void MakeHelp();
+    // A part of the help, which belongs to the program's version: replaced together with the program.
+    void MakeHelpFile(const std::string& name, std::string_view content);
+    // Copies the program of that name from where it lies, empty when it was not found.
+    void InstallProgram(const std::string& name, const std::string& from);
+    void CopyProgram(const std::string& name, const std::string& from, std::string_view content,
+                     ExistingFile existing);
     bool HasDataFolder();
     void AddToDesktop();
 
@@ -217,29 +222,31 @@ void FolderSetup::MakeFile(const std::string& name, std::string_view content, mo
             name, "");
 }
 
-void FolderSetup::CopyProgram(std::string_view content, ExistingFile existing) {
-    Conclude(WriteWholeFile(PathOf("quorvan"), TemporaryFor("quorvan"), content, Permissions(0755), existing),
-             "quorvan", "copied from " + options_.program);
+void FolderSetup::CopyProgram(const std::string& name, const std::string& from, std::string_view content,
+                              ExistingFile existing) {
+    Conclude(WriteWholeFile(PathOf(name), TemporaryFor(name), content, Permissions(0755), existing), name,
+             "copied from " + from);
 }
 
-void FolderSetup::InstallProgram() {
-    const bool there = Exists(PathOf("quorvan"));
+void FolderSetup::InstallProgram(const std::string& name, const std::string& from) {
+    const bool there = Exists(PathOf(name));
     std::string content;
-    if (options_.program.empty()) {
+    std::string present;
+    if (from.empty()) {
         if (there)
-            Kept("quorvan", "");
+            Kept(name, "");
         else
-            Fail("The program quorvan was not found beside quorvan-cli; name it with --program FILE.");
-    } else if (!ReadWholeFile(options_.program, content, MaxProgramSize)) {
-        Fail("The program " + options_.program + " cannot be read: " + Reason(errno) + ".");
-    } else if (std::string present; !there) {
-        CopyProgram(content, ExistingFile::Keep);
-    } else if (ReadWholeFile(PathOf("quorvan"), present, MaxProgramSize) && present == content) {
-        Kept("quorvan", "");
+            Fail("The program " + name + " was not found beside quorvan-cli; name it with --program FILE.");
+    } else if (!ReadWholeFile(from, content, MaxProgramSize)) {
+        Fail("The program " + from + " cannot be read: " + Reason(errno) + ".");
+    } else if (!there) {
+        CopyProgram(name, from, content, ExistingFile::Keep);
+    } else if (ReadWholeFile(PathOf(name), present, MaxProgramSize) && present == content) {
+        Kept(name, "");
     } else if (options_.updateProgram) {
-        CopyProgram(content, ExistingFile::Replace);
+        CopyProgram(name, from, content, ExistingFile::Replace);
     } else {
-        Kept("quorvan", "it differs from " + options_.program + "; --update-program replaces it");
+        Kept(name, "it differs from " + from + "; --update-program replaces it");
     }
 }
 
@@ -261,6 +268,29 @@ int FolderSetup::RemoveFromDesktop() {
                : 1;
 }
 
+void FolderSetup::MakeHelpFile(const std::string& name, std::string_view content) {
+    std::string present;
+    if (!Exists(PathOf(name)) || !options_.updateProgram) {
+        MakeFile(name, content, 0666);
+    } else if (ReadWholeFile(PathOf(name), present, content.size()) && present == content) {
+        Kept(name, "");
+    } else {
+        Conclude(WriteWholeFile(PathOf(name), TemporaryFor(name), content, Permissions(0666),
+                                ExistingFile::Replace),
+                 name, "brought up to date");
+    }
+}
+
+void FolderSetup::MakeHelp() {
+    if (!MakeSubfolder("help"))
+        return;
+    MakeHelpFile("help/Quorvan.html", HelpDocument());
+    if (!MakeSubfolder("help/pictures"))
+        return;
+    for (const EmbeddedFile& picture : HelpPictures())
+        MakeHelpFile(std::string("help/pictures/") + picture.name, picture.content);
+}
+
 int FolderSetup::Run() {
     if (!FindFolder() || !MakeFolder())
         return 1;
@@ -269,9 +299,9 @@ int FolderSetup::Run() {
     // It may come to hold a password.
     MakeFile("Quorvan.ini", FirstSettings(), 0600);
     MakeFile("Quorvan.cfg", FirstQuoteSources(), 0666);
-    if (MakeSubfolder("help"))
-        MakeFile("help/Quorvan.html", HelpDocument(), 0666);
-    InstallProgram();
+    MakeHelp();
+    InstallProgram("quorvan", options_.program);
+    InstallProgram("quorvan-cli", options_.companion);
     if (options_.desktop && !failed_)
         AddToDesktop();
     return failed_ ? 1 : 0;

@@ -10,11 +10,16 @@
 
 namespace {
 
+std::filesystem::path OwnPath() {
+    std::error_code error;
+    return std::filesystem::read_symlink("/proc/self/exe", error);
+}
+
 // The program lies beside quorvan-cli, above its bin folder, or in its own folder of the same build. Empty
 // when it is in none of them.
 std::string FindProgram() {
     std::error_code error;
-    const std::filesystem::path own = std::filesystem::read_symlink("/proc/self/exe", error).parent_path();
+    const std::filesystem::path own = OwnPath().parent_path();
     for (const char* place : {"quorvan", "../quorvan", "../app/quorvan"}) {
         const std::filesystem::path candidate = (own / place).lexically_normal();
         if (std::filesystem::is_regular_file(candidate, error))
@@ -35,7 +40,7 @@ void AddSetupCommand(CLI::App& application, int& status) {
                         "The quorvan executable to copy (default: the one found beside "
                         "quorvan-cli)");
     command->add_flag("--update-program", options->updateProgram,
-                      "Replace the folder's program when it is another version");
+                      "Replace the folder's program and help when they are another version's");
     CLI::Option* desktop = command->add_flag(
         "--desktop", options->desktop,
         "Put the folder's program among the desktop's, with its icon (for you, not for everybody)");
@@ -47,6 +52,7 @@ void AddSetupCommand(CLI::App& application, int& status) {
     command->callback([options, remove, &status] {
         if (options->program.empty())
             options->program = FindProgram();
+        options->companion = OwnPath();
         options->dataFolder = PersonalDataFolder();
         status = *remove ? RunDesktopRemoval(*options, std::cout, std::cerr)
                          : RunSetup(*options, std::cout, std::cerr);
