@@ -1,18 +1,21 @@
 #include "app/NorvelApp.h"
 
+#include <cerrno>
 #include <cstring>
+#include <system_error>
 
 #include <malloc.h>
 
 #include "ColumnListView/PrefilledBitmap.h"
+#include "app/DataFileOpening.h"
 #include "app/NorvelWindow.h"
 #include "app/PortfolioRules.h"
-#include "db/Compaction.h"
 #include "db/Database.h"
 #include "dialogs/PasswordDialog.h"
 #include "resources/DesktopFiles.h"
 #include "resources/StatusImages.h"
 #include "util/CharacterBuffer.h"
+#include "util/FolderProbe.h"
 #include "util/IniFile.h"
 #include "util/InterfaceHelpers.h"
 #include "util/Strings.h"
@@ -36,18 +39,17 @@ bool JoinPath(char (&out)[PathBufferSize], const char* folder, const char* file)
     return FormatInto(out, sizeof out, "%s/%s", folder, file);
 }
 
-// Opens a data file. One that is no such file, or has another layout than the program's records, gives a
-// database without a file.
-std::unique_ptr<DATABASE> OpenDatabase(const char* folder, const char* file, bool (*holds)(DATABASE&)) {
-    char path[PathBufferSize];
-    if (JoinPath(path, folder, file)) {
-        RestoreCompactionBackup(path);
-        auto database = std::make_unique<DATABASE>(path);
-        if (holds(*database))
-            return database;
-    }
-    return std::make_unique<DATABASE>(nullptr);
+std::string Reason(int error) {
+    return std::generic_category().message(error);
 }
+
+bool IsFull(int error) {
+    return error == ENOSPC || error == EDQUOT;
+}
+
+// The application's message to itself that the day's backup failed, with the errno number.
+constexpr uint32 MessageBackupFailed = 1050;
+constexpr const char* ErrorField = "Error";
 
 // A portfolio's rows come and go together. Their memory is kept for the next portfolio's up to this size:
 // handing it back to the system and having it cleared anew takes longer than making the rows.
@@ -64,21 +66,30 @@ NorvelApp::NorvelApp() : BApplication(Signature) {
     // Without its icon the program works all the same.
     static_cast<void>(SetDesktopIdentity(DesktopId, ProgramIcon()));
     app_state = &state_;
-    const bool ready = Initialize() == 0;
-    if (!ready)
-        MessageBox("Quorvan cannot start: the path of its folder is too long. Please move the folder to a "
-                   "place with a path of at most 108 characters.",
-                   B_STOP_ALERT);
-    if (ready && PassPasswordGate())
-        (new NorvelWindow)->Activate(); // above what stood there while the password was asked for
-    else
+    std::string complaints;
+    if (Initialize(complaints) != 0)
+        exitStatus_ = 1;
+    if (exitStatus_ != 0 || !PassPasswordGate()) {
         PostMessage(B_QUIT_REQUESTED);
+        return;
+    }
+    if (!complaints.empty()) {
+        complaints.pop_back(); // the last line's end
+        MessageBox(complaints.c_str(), B_WARNING_ALERT);
+    }
+    (new NorvelWindow)->Activate(); // above what stood there while the password was asked for
 }
 
 NorvelApp::~NorvelApp() {
     for (std::unique_ptr<DATABASE>* database : {&state_.portfolios, &state_.investments}) {
-        if (*database)
-            (*database)->Compress(0);
+        if (!*database)
+            continue;
+        DATABASE_HEADER header{};
+        (*database)->GetHeaderInfo(&header);
+        // What was deleted on an earlier day can be had back until now.
+        if (backup_ && header.deletedCount > 0)
+            static_cast<void>(backup_->Keep());
+        (*database)->Compress(0);
         database->reset();
     }
     app_state = nullptr;
@@ -86,11 +97,18 @@ NorvelApp::~NorvelApp() {
         *bitmap.global = nullptr;
 }
 
-int NorvelApp::Initialize() {
+int NorvelApp::Initialize(std::string& complaints) {
     MakeStatusBitmaps();
-    if (!BuildPaths())
+    if (!BuildPaths()) {
+        MessageBox("Quorvan cannot start: the path of its folder is too long. Please move the folder to a "
+                   "place with a path of at most 108 characters.",
+                   B_STOP_ALERT);
         return 1;
-    OpenDatabases();
+    }
+    if (!EnterFolder(complaints))
+        return 1;
+    PrepareBackup();
+    OpenDatabases(complaints);
     return 0;
 }
 
@@ -110,10 +128,81 @@ bool NorvelApp::BuildPaths() {
            JoinPath(state_.logPath, state_.homeFolder, "Quorvan.log");
 }
 
-void NorvelApp::OpenDatabases() {
-    state_.portfolios = OpenDatabase(state_.homeFolder, "portfol.db", HoldsPortfolios);
-    state_.investments = OpenDatabase(state_.homeFolder, "invest.db", HoldsInvestments);
-    state_.categories = OpenDatabase(state_.homeFolder, "misc.db", HoldsCategories);
+bool NorvelApp::EnterFolder(std::string& complaints) {
+    const std::string folder = state_.homeFolder;
+    const FolderLock::Outcome outcome = TakeLock();
+    if (outcome == FolderLock::Outcome::Held)
+        MessageBox(("Quorvan cannot start: its folder " + folder + " is in use by " +
+                    DescribeHolder(lock_.Holder()) + ". Please close that program first.")
+                       .c_str(),
+                   B_STOP_ALERT);
+    if (outcome == FolderLock::Outcome::Held || outcome == FolderLock::Outcome::Doubtful)
+        return false;
+    const int error = outcome == FolderLock::Outcome::Failed ? lock_.Error() : TryWritingIn(folder);
+    lookOnly_ = error != 0 && !(IsFull(error) && lock_.IsTaken());
+    if (lookOnly_)
+        complaints += "The folder " + folder + " cannot be written: " +
+                      (error == EINVAL ? std::string(FolderLock::FileName) + " in it is no file of Quorvan's"
+                                       : Reason(error)) +
+                      ". You can look at your portfolios, but no change will be kept.\n";
+    else if (error != 0)
+        complaints += "The disk of the folder " + folder +
+                      " is full. Please make room: until then changes may not be kept.\n";
+    return true;
+}
+
+FolderLock::Outcome NorvelApp::TakeLock() {
+    constexpr const char* program = "quorvan";
+    FolderLock::Outcome outcome = lock_.Take(state_.homeFolder, program);
+    if (outcome != FolderLock::Outcome::Doubtful)
+        return outcome;
+    const std::string question = std::string("The folder ") + state_.homeFolder + " was in use by " +
+                                 DescribeHolder(lock_.Holder()) +
+                                 ", and it cannot be seen from here whether it still is. Two programs that "
+                                 "change the same files damage them.\n\nHas that program ended?";
+    return YesNoBox(question.c_str()) ? outcome
+                                      : lock_.Take(state_.homeFolder, program, FolderLock::Doubt::PassOver);
+}
+
+void NorvelApp::PrepareBackup() {
+    if (lookOnly_)
+        return;
+    backup_.emplace(state_.homeFolder, DailyBackup::FilesKeptWith("invest.db"));
+    portfolioFiles_.emplace(*backup_);
+    investmentFiles_.emplace(*backup_);
+    // Told by the loop, since it fails in the middle of a command or on the price update's thread.
+    backup_->OnFailure([this](int error) {
+        BMessage message(MessageBackupFailed);
+        message.AddInt32(ErrorField, error);
+        PostMessage(&message);
+    });
+}
+
+void NorvelApp::OpenDatabases(std::string& complaints) {
+    const auto open = [&](const char* name, bool (*holds)(DATABASE&), std::optional<BackedUpFiles>* files) {
+        FileOperations& operations = lookOnly_ ? readOnlyFiles_ : files ? **files : SystemFiles();
+        const bool change = files != nullptr && !lookOnly_;
+        return OpenDataFile(state_.homeFolder, name, holds, change ? DataFileUse::Change : DataFileUse::Look,
+                            operations, complaints);
+    };
+    state_.portfolios = open("portfol.db", HoldsPortfolios, &portfolioFiles_);
+    state_.investments = open("invest.db", HoldsInvestments, &investmentFiles_);
+    state_.categories = open("misc.db", HoldsCategories, nullptr); // which the program never changes
+    if (backup_)
+        backup_->Prepare();
+}
+
+void NorvelApp::MessageReceived(BMessage* message) {
+    if (message->what != MessageBackupFailed) {
+        BApplication::MessageReceived(message);
+        return;
+    }
+    int32 error = 0;
+    static_cast<void>(message->FindInt32(ErrorField, &error));
+    MessageBox(("The day's backup of your portfolios could not be made in the folder \"backups\": " +
+                Reason(error) + ".\nYour changes are saved all the same.")
+                   .c_str(),
+               B_WARNING_ALERT);
 }
 
 bool NorvelApp::PassPasswordGate() {

@@ -2,36 +2,60 @@
 
 #include <array>
 #include <memory>
+#include <optional>
+#include <string>
 
 #include "app/AppState.h"
+#include "app/BackedUpFiles.h"
+#include "app/DailyBackup.h"
+#include "app/ReadOnlyFiles.h"
 #include "platform/Application.h"
 #include "platform/Bitmap.h"
+#include "util/FolderLock.h"
 
-// The application object: finds the program's folder, opens the three data files, asks for the start-up
-// password and opens the main window; at the end it rewrites the two data files that the program changes
-// without their deleted records. It makes no data file: missing or foreign ones leave the program without
-// portfolios, and are not touched.
+// The application object: finds the program's folder and keeps other programs out of it, opens the three data
+// files, says what is wrong with them, asks for the start-up password and opens the main window; at the end
+// it rewrites the two data files that the program changes without their deleted records. It makes no data
+// file: missing or foreign ones leave the program without portfolios, and are not touched. In a folder that
+// cannot be written the files are opened for looking only.
 //
 // main owns the only one, on the interface thread. app_state and the status bitmaps last exactly as long.
 class NorvelApp : public BApplication {
   public:
-    // Ends with the main window shown; or, when the password was refused or the folder cannot be used, with
-    // the quit request posted, so that Run returns at once.
+    // Ends with the main window shown; or, when the password was refused or the folder cannot be used or is
+    // in use, with the quit request posted, so that Run returns at once.
     NorvelApp();
     ~NorvelApp() override;
 
+    void MessageReceived(BMessage* message) override;
     void AboutRequested() override;
 
+    // What the process should end with: 1 when the folder could not be used, else 0.
+    [[nodiscard]] int ExitStatus() const { return exitStatus_; }
+
   private:
-    // Makes the bitmaps and paths and opens the databases. 0, or 1 when the folder's path is too long for the
-    // files in it: then no file is opened.
-    [[nodiscard]] int Initialize();
+    // Makes bitmaps and paths, takes the folder and opens the databases. 0, or 1 when the folder cannot be
+    // used, which the person was told: then no file is opened. Sentences on what else is wrong are appended
+    // to `complaints`, a line each.
+    [[nodiscard]] int Initialize(std::string& complaints);
     void MakeStatusBitmaps();
     [[nodiscard]] bool BuildPaths();
-    void OpenDatabases();
+    // Takes the folder for this program. When the folder cannot be written, lookOnly_ is set.
+    [[nodiscard]] bool EnterFolder(std::string& complaints);
+    [[nodiscard]] FolderLock::Outcome TakeLock();
+    void OpenDatabases(std::string& complaints);
+    void PrepareBackup();
     // Whether the person may go on: no password is set, or it was typed.
     [[nodiscard]] bool PassPasswordGate();
 
+    int exitStatus_ = 0;
+    bool lookOnly_ = false;
+    FolderLock lock_;
+    // What the databases reach their files through.
+    ReadOnlyFiles readOnlyFiles_;
+    std::optional<DailyBackup> backup_; // unless lookOnly_; and so the next two
+    std::optional<BackedUpFiles> portfolioFiles_;
+    std::optional<BackedUpFiles> investmentFiles_;
     AppState state_;
     std::array<std::unique_ptr<BBitmap>, 5> statusBitmaps_;
 };

@@ -5,5 +5,5 @@
 int main() {
     const auto application = std::make_unique<NorvelApp>();
     application->Run();
-    return 0;
+    return application->ExitStatus();
 }

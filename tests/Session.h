@@ -55,6 +55,7 @@ class Process {
         }
     }
 
+    [[nodiscard]] pid_t Id() const { return id_; }
     bool HasEnded() { return ended_ || (ended_ = waitpid(id_, &status_, WNOHANG) == id_); }
     // Once it has ended: whether it did so by itself, with the result 0.
     [[nodiscard]] bool EndedWell() const { return WIFEXITED(status_) && WEXITSTATUS(status_) == 0; }

@@ -28,10 +28,11 @@ class Program : public DataFolder, public Driver {
   public:
     Program() { BApplication::SetExecutablePath(File("quorvan").c_str()); }
 
-    // From start to end, as main does it. The last step is to end the program.
-    void Run() {
+    // From start to end, as main does it. The last step is to end the program. Returns its exit status.
+    int Run() {
         NorvelApp application;
         application.Run();
+        return application.ExitStatus();
     }
     // A step as soon as the main window is shown and nothing keeps the person out of it.
     Program& Then(std::string what, Action action) {

@@ -43,4 +43,40 @@ TEST(Program, StartsFromItsFolderAndEndsByItsMenuKey) {
     EXPECT_NE(folder.Read("Quorvan.ini").find("ColumnWidth10=50\n"), std::string::npos);
 }
 
+std::string WindowOf(const Process& program) {
+    return Output("xdotool search --onlyvisible --pid " + std::to_string(program.Id()) + " 2>/dev/null");
+}
+
+TEST(Program, IsRefusedAFolderUntilItsHolderHasGoneHoweverItWent) {
+    const DataFolder folder;
+    std::filesystem::copy(QUORVAN_PROGRAM, folder.File("quorvan"));
+    const Display display;
+    ASSERT_TRUE(display.IsReady()) << "Xvfb did not start";
+    auto first = std::make_unique<Process>(std::vector{folder.File("quorvan")});
+    ASSERT_TRUE(WaitUntil([&] { return !WindowOf(*first).empty() || first->HasEnded(); }));
+    const std::string text = folder.Read("Quorvan.lock");
+    EXPECT_NE(text.find("process: " + std::to_string(first->Id()) + "\n"), std::string::npos);
+
+    Process second({folder.File("quorvan")});
+    EXPECT_TRUE(WaitUntil([&] {
+        Output("xdotool windowfocus " + WindowOf(second) + " 2>&1"); // the alert
+        Output("xdotool key Return 2>&1");
+        return second.HasEnded();
+    }));
+    EXPECT_FALSE(second.EndedWell());
+    EXPECT_FALSE(first->HasEnded());
+    EXPECT_EQ(folder.Read("Quorvan.lock"), text);
+
+    kill(first->Id(), SIGKILL);
+    EXPECT_TRUE(WaitUntil([&] { return first->HasEnded(); }));
+    EXPECT_EQ(folder.Read("Quorvan.lock"), text);
+    Process third({folder.File("quorvan")});
+    EXPECT_TRUE(WaitUntil([&] {
+        return folder.Read("Quorvan.lock").find("process: " + std::to_string(third.Id()) + "\n") !=
+                   std::string::npos &&
+               !WindowOf(third).empty();
+    }));
+    EXPECT_FALSE(third.HasEnded());
+}
+
 } // namespace

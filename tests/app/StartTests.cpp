@@ -1,9 +1,12 @@
 // Start-up, the password gate and shutdown, on a folder with real files.
 #include "Program.h"
 
+#include <algorithm>
 #include <filesystem>
 
 #include <QLineEdit>
+
+#include "util/FolderLock.h"
 
 namespace {
 
@@ -146,7 +149,7 @@ TEST_F(StartTest, AFolderWithTooLongAPathIsLeftAlone) {
 TEST_F(StartTest, TheLongestFolderThatFitsIsUsed) {
     const std::string folder = program_.Path() + "/" + std::string(107 - program_.Path().size(), 'x');
     std::filesystem::create_directory(folder);
-    for (const char* file : {"portfol.db", "invest.db"})
+    for (const char* file : {"portfol.db", "invest.db", "misc.db"})
         std::filesystem::copy(program_.File(file), folder + "/" + file);
     BApplication::SetExecutablePath((folder + "/quorvan").c_str());
     program_.Expect({"second"})
@@ -155,35 +158,131 @@ TEST_F(StartTest, TheLongestFolderThatFitsIsUsed) {
     program_.Run();
 }
 
-// Each of these is neither understood nor changed; the window opens without portfolios or without
-// investments.
+// What the alert says, once it is closed with a button.
+void AnswerAlert(Program& program, const char* button, std::string& said) {
+    program.When("alert", Driver::Alert, [&said, button] {
+        said = Driver::Alert()->text().toStdString();
+        Driver::Press(Driver::Alert(), button);
+    });
+}
+
+TEST_F(StartTest, AFolderInUseIsLeftToItsHolder) {
+    FolderLock holder;
+    ASSERT_EQ(holder.Take(program_.Path(), "quorvan-cli"), FolderLock::Outcome::Taken);
+    const std::string text = program_.Read("Quorvan.lock");
+    const std::string invest = program_.Read("invest.db");
+    std::string said;
+    AnswerAlert(program_, "Ok", said);
+    EXPECT_EQ(program_.Run(), 1);
+    EXPECT_TRUE(said.starts_with("Quorvan cannot start: its folder " + program_.Path() +
+                                 " is in use by quorvan-cli (process " + std::to_string(getpid()) + " on "))
+        << said;
+    EXPECT_EQ(program_.Read("Quorvan.lock"), text);
+    EXPECT_EQ(program_.Read("invest.db"), invest);
+}
+
+TEST_F(StartTest, AHolderOnAnotherComputerIsAskedAbout) {
+    const std::string text = "program: quorvan\nprocess: 17\nhost: elsewhere\nsince: 2026-11-22 14:03:07\n";
+    program_.Write("Quorvan.lock", text);
+    std::string asked;
+    AnswerAlert(program_, "No", asked);
+    EXPECT_EQ(program_.Run(), 1);
+    EXPECT_NE(asked.find("quorvan (process 17 on the computer elsewhere, since 2026-11-22 14:03:07)"),
+              std::string::npos);
+    EXPECT_EQ(program_.Read("Quorvan.lock"), text);
+    AnswerAlert(program_, "Yes", asked);
+    program_.Expect({"second"})
+        .Then("lock",
+              [&] {
+                  EXPECT_NE(program_.Read("Quorvan.lock").find(std::to_string(getpid())), std::string::npos);
+              })
+        .Close();
+    EXPECT_EQ(program_.Run(), 0);
+    EXPECT_FALSE(program_.Has("Quorvan.lock"));
+}
+
+TEST_F(StartTest, AFolderThatCannotBeWrittenIsForLooking) {
+    std::filesystem::create_directory(program_.File("Quorvan.lock")); // also where the tests run as root
+    const std::string invest = program_.Read("invest.db");
+    std::string said;
+    AnswerAlert(program_, "Ok", said);
+    program_.Expect({"second"})
+        .Then("change", [] { EXPECT_EQ(app_state->investments->Delete(1), -1); })
+        .Close();
+    EXPECT_EQ(program_.Run(), 0);
+    EXPECT_EQ(said,
+              "The folder " + program_.Path() +
+                  " cannot be written: Quorvan.lock in it is no file of Quorvan's. You can look at your "
+                  "portfolios, but no change will be kept.");
+    EXPECT_EQ(program_.Read("invest.db"), invest);
+    EXPECT_FALSE(program_.Has("backups"));
+}
+
+TEST_F(StartTest, WhatTheLastCompactionDropsIsKeptInTheBackup) {
+    const std::string invest = program_.Read("invest.db");
+    program_.Expect({"second"}).Close();
+    program_.Run();
+    ExpectCompacted();
+    int kept = 0;
+    for (const auto& entry : std::filesystem::directory_iterator(program_.File("backups"))) {
+        const std::string name = entry.path().filename();
+        EXPECT_TRUE(name.starts_with("portfol.db.") || program_.Read("backups/" + name) == invest) << name;
+        ++kept;
+    }
+    EXPECT_EQ(kept, 2);
+}
+
+TEST_F(StartTest, ABackupThatFailsIsToldAndTheChangeIsMade) {
+    program_.Write("backups", "in the way");
+    program_.Expect({"second"}).Then("change", [] {
+        EXPECT_EQ(app_state->investments->Delete(1), 0);
+        EXPECT_EQ(app_state->investments->UnDelete(1), 0);
+    });
+    std::string said;
+    AnswerAlert(program_, "Ok", said);
+    program_.Close();
+    EXPECT_EQ(program_.Run(), 0);
+    EXPECT_EQ(said, "The day's backup of your portfolios could not be made in the folder \"backups\": Not a "
+                    "directory.\nYour changes are saved all the same.");
+    ExpectCompacted();
+}
+
+// Each of these is neither understood nor changed; it is named, and the window opens without portfolios or
+// without investments.
 TEST(Start, FilesThatAreNoneOfTheProgramsStayAsTheyAre) {
     const struct {
         const char* what;
         std::function<void(Program&)> spoil;
+        std::vector<const char*> said;
     } cases[] = {
         {"missing",
          [](Program& p) {
              for (const char* file : {"portfol.db", "invest.db", "misc.db"})
                  std::filesystem::remove(p.File(file));
-         }},
+         },
+         {"portfol.db is missing", "\ninvest.db is missing", "\nmisc.db is missing"}},
         {"empty",
          [](Program& p) {
              for (const char* file : {"portfol.db", "invest.db", "misc.db"})
                  p.Write(file, "");
-         }},
+         },
+         {"portfol.db is no data file", "\ninvest.db is no data file", "\nmisc.db is no data file"}},
         {"truncated header",
          [](Program& p) {
              p.Write("portfol.db", p.Read("portfol.db").substr(0, 51));
              p.Write("invest.db", p.Read("invest.db").substr(0, 300));
-         }},
-        {"text", [](Program& p) { p.Write("portfol.db", std::string(5000, 'x')); }},
+         },
+         {"portfol.db is no data file", "\ninvest.db is no data file"}},
+        {"text",
+         [](Program& p) { p.Write("portfol.db", std::string(5000, 'x')); },
+         {"portfol.db is no data file"}},
         {"exchanged",
          [](Program& p) {
              const std::string portfolios = p.Read("portfol.db");
              p.Write("portfol.db", p.Read("invest.db"));
              p.Write("invest.db", portfolios);
-         }},
+         },
+         {"portfol.db holds other records", "\ninvest.db holds other records"}},
     };
     for (const auto& each : cases) {
         Program program;
@@ -195,6 +294,8 @@ TEST(Start, FilesThatAreNoneOfTheProgramsStayAsTheyAre) {
             if (program.Has(file))
                 before.emplace_back(file, program.Read(file));
         }
+        std::string said;
+        AnswerAlert(program, "Ok", said);
         program
             .Then(each.what,
                   [&] {
@@ -204,6 +305,9 @@ TEST(Start, FilesThatAreNoneOfTheProgramsStayAsTheyAre) {
                   })
             .Close();
         program.Run();
+        for (const char* words : each.said)
+            EXPECT_NE(said.find(words), std::string::npos) << each.what << ": " << words;
+        EXPECT_EQ(std::count(said.begin(), said.end(), '\n') + 1, std::ssize(each.said)) << each.what;
         for (const auto& [file, content] : before)
             EXPECT_EQ(program.Read(file), content) << each.what << ": " << file;
         EXPECT_EQ(program.Has("portfol.db"), !before.empty());
