@@ -16,6 +16,7 @@
 #include "tools/DesktopFiles.h"
 #include "tools/FirstFiles.h"
 #include "tools/SampleData.h"
+#include "util/FolderLock.h"
 #include "util/WholeFile.h"
 
 namespace {
@@ -59,6 +60,7 @@ class FolderSetup {
   private:
     bool FindFolder();
     bool MakeFolder();
+    bool TakeFolder();
     bool MakeSubfolder(const std::string& name);
     void MakeDataFiles();
     // Prepares all of the files before the first takes its name, and makes none when one fails: investments
@@ -96,6 +98,7 @@ class FolderSetup {
     std::ostream& output_;
     std::ostream& errors_;
     std::string folder_;
+    FolderLock lock_;
     bool failed_ = false;
 };
 
@@ -152,6 +155,18 @@ bool FolderSetup::MakeFolder() {
     if (error)
         Fail("The folder " + folder_ + " cannot be made: " + error.message() + ".");
     return !error;
+}
+
+bool FolderSetup::TakeFolder() {
+    const FolderLock::Outcome outcome = lock_.Take(folder_, "quorvan-cli");
+    const std::string holder = DescribeHolder(lock_.Holder());
+    if (outcome == FolderLock::Outcome::Held)
+        Fail("The folder " + folder_ + " is in use by " + holder + "; close that program first.");
+    if (outcome == FolderLock::Outcome::Doubtful)
+        Fail("The folder " + folder_ + " was in use by " + holder + "; once that program has ended, delete " +
+             PathOf(FolderLock::FileName) + ".");
+    // Where the lock cannot be made nothing else can: what is missing is told file by file.
+    return !failed_;
 }
 
 bool FolderSetup::MakeSubfolder(const std::string& name) {
@@ -293,6 +308,8 @@ void FolderSetup::MakeHelp() {
 
 int FolderSetup::Run() {
     if (!FindFolder() || !MakeFolder())
+        return 1;
+    if (!TakeFolder())
         return 1;
     output_ << "Quorvan folder " << folder_ << '\n';
     MakeDataFiles();

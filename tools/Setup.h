@@ -21,8 +21,8 @@ inline constexpr std::size_t MaxFolderLength = 108;
 // options.updateProgram is set), and a new one comes into being complete or not at all. Each file gets a line
 // on `output` that tells what was done, each failure a sentence on `errors`; one file's failure does not stop
 // the others, except that no desktop gets a program whose folder is not whole. The sample goes into data
-// files of its own making only: with a portfol.db or invest.db that exists there is none. Returns 0 when
-// every file is there, else 1.
+// files of its own making only: with a portfol.db or invest.db that exists there is none. A folder that
+// another program uses is left as it is. Returns 0 when every file is there, else 1.
 [[nodiscard]] int RunSetup(const SetupOptions& options, std::ostream& output, std::ostream& errors);
 
 // Takes the folder's program out of the desktop's again; the folder, which need not be there any more, stays

@@ -9,12 +9,14 @@
 #include <sstream>
 #include <string>
 #include <sys/wait.h>
+#include <unistd.h>
 #include <vector>
 
 #include "TemporaryFolder.h"
 #include "app/RecordLayouts.h"
 #include "db/Database.h"
 #include "util/CharacterBuffer.h"
+#include "util/FolderLock.h"
 #include "util/IniFile.h"
 
 namespace {
@@ -80,9 +82,9 @@ TEST_F(SetupTest, MakesAFolderThatRuns) {
         names.insert(name.substr(5).starts_with("help/pictures/") ? "help/pictures" : name.substr(5));
         EXPECT_NE(output_.find("made  " + name.substr(5)), std::string::npos) << output_;
     }
-    EXPECT_EQ(names, (std::set<std::string>{"portfol.db", "invest.db", "misc.db", "Quorvan.ini",
-                                            "Quorvan.cfg", "quorvan", "quorvan-cli", "help/Quorvan.html",
-                                            "help/pictures"}));
+    EXPECT_EQ(names,
+              (std::set<std::string>{"portfol.db", "invest.db", "misc.db", "Quorvan.ini", "Quorvan.cfg",
+                                     "quorvan", "quorvan-cli", "help/Quorvan.html", "help/pictures"}));
     EXPECT_EQ(Records<PORTFOLIO_DATA>("portfol.db").size(), 0U);
     EXPECT_EQ(Records<INVESTMENT_DATA>("invest.db").size(), 0U);
     EXPECT_EQ(RecordLength("portfol.db"), 33);
@@ -227,6 +229,23 @@ TEST_F(SetupTest, FailsWithOneClearSentence) {
     EXPECT_FALSE(folder_.Has(std::string(109, 'd')));
     EXPECT_EQ(Run("setup --help"), 0);
     EXPECT_NE(output_.find("--sample"), std::string::npos);
+}
+
+TEST_F(SetupTest, LeavesAFolderInUseAlone) {
+    fs::create_directory(folder_.File("home"));
+    FolderLock lock;
+    ASSERT_EQ(lock.Take(folder_.File("home"), "quorvan"), FolderLock::Outcome::Taken);
+    EXPECT_EQ(Setup("--sample"), 1);
+    EXPECT_NE(errors_.find("is in use by quorvan (process " + std::to_string(getpid()) + " on "),
+              std::string::npos)
+        << errors_;
+    EXPECT_EQ(Files().size(), 1U); // the lock
+    lock.Release();
+    EXPECT_EQ(Setup(), 0) << errors_;
+    EXPECT_FALSE(folder_.Has("home/Quorvan.lock"));
+    folder_.Write("home/Quorvan.lock", "program: quorvan\nprocess: 17\nhost: elsewhere\n");
+    EXPECT_EQ(Setup(), 1);
+    EXPECT_NE(errors_.find("delete " + folder_.File("home/Quorvan.lock")), std::string::npos) << errors_;
 }
 
 TEST_F(SetupTest, AFullDiskLeavesNoPartOfAFile) {
