@@ -60,9 +60,10 @@ bool OutputFile::Begin(const std::string& path) {
 
 bool OutputFile::MakeTemporary(const std::string& folderAndStem, const std::string& extension) {
     constexpr int attempts = 100;
+    const std::string begin = folderAndStem + "." + std::to_string(getpid());
     for (int i = 0; i < attempts; i++) {
-        const std::string name =
-            folderAndStem + "." + std::to_string(getpid()) + "-" + std::to_string(i) + extension;
+        std::string name = begin;
+        name.append("-").append(std::to_string(i)).append(extension);
         const int file = open(name.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666);
         if (file >= 0) {
             temporary_ = name;

@@ -94,8 +94,8 @@ class ReportTest : public testing::Test {
     // The darkest place of a piece of a line.
     int Darkest(float from, float to, float y) {
         int least = 255;
-        for (float x = from; x < to; x += 0.5F)
-            least = std::min(least, Brightness(x, y));
+        for (int step = 0; from + static_cast<float>(step) / 2 < to; ++step)
+            least = std::min(least, Brightness(from + static_cast<float>(step) / 2, y));
         return least;
     }
 
