@@ -2,12 +2,23 @@
 
 #include <cerrno>
 #include <cstring>
+#include <filesystem>
 #include <ostream>
 #include <system_error>
 
+#include "app/DailyBackup.h"
 #include "db/Compaction.h"
 #include "db/FileCheck.h"
 #include "tools/RecordFields.h"
+
+namespace {
+
+std::string FolderOf(const std::string& file) {
+    const std::filesystem::path path(file);
+    return path.has_parent_path() ? path.parent_path().string() : ".";
+}
+
+} // namespace
 
 DataFileTool::DataFileTool(std::string file, OutputFormat format, TextOutput& output, std::ostream& errors)
     : file_(std::move(file)), format_(format), output_(output), errors_(errors), database_(nullptr) {}
@@ -45,7 +56,37 @@ bool DataFileTool::IsFileFailure(int code) {
     }
 }
 
+bool DataFileTool::TakeFolder() {
+    const std::string folder = FolderOf(file_);
+    const FolderLock::Outcome outcome = lock_.Take(folder, "quorvan-cli");
+    if (outcome == FolderLock::Outcome::Held)
+        Warn("the folder is in use by " + DescribeHolder(lock_.Holder()) + "; nothing is changed");
+    else if (outcome == FolderLock::Outcome::Doubtful)
+        Warn("the folder was in use by " + DescribeHolder(lock_.Holder()) +
+             "; once that program has ended, delete " + folder + "/" + FolderLock::FileName);
+    else if (outcome == FolderLock::Outcome::Failed && lock_.Error() != ENOENT)
+        Warn("other programs cannot be kept out of the folder: " + folder + "/" + FolderLock::FileName +
+             (lock_.Error() == EINVAL
+                  ? " is in the way"
+                  : " cannot be made: " + std::generic_category().message(lock_.Error())));
+    else
+        return true; // where there is no folder, there is no file either
+    return false;
+}
+
+bool DataFileTool::KeepBackup() {
+    const std::filesystem::path path(file_);
+    const int error = DailyBackup(FolderOf(file_), DailyBackup::FilesKeptWith(path.filename())).Keep();
+    if (error != 0)
+        Warn(std::string("the day's backup cannot be made in the folder ") + DailyBackup::FolderName +
+             " beside it: " + std::generic_category().message(error) + "; nothing is changed");
+    errno = 0;
+    return error == 0;
+}
+
 bool DataFileTool::Open(Access access) {
+    if (access == Access::Change && !TakeFolder())
+        return false;
     if (database_.Open(file_.c_str()) != 0) {
         const int code = database_.GetLastError(nullptr);
         Warn(std::to_string(code) + " " + ErrorMessage(code) + ": " + WhyNotOpened());
@@ -62,7 +103,7 @@ bool DataFileTool::Open(Access access) {
     }
     if (database_.IsDamaged())
         Warn("the file is damaged: its header disagrees with it, and records may be missing; see `check`");
-    return true;
+    return access == Access::Read || KeepBackup();
 }
 
 std::string DataFileTool::WhyNotOpened() const {

@@ -9,6 +9,7 @@
 #include "db/Database.h"
 #include "tools/TableWriter.h"
 #include "tools/TextOutput.h"
+#include "util/FolderLock.h"
 
 // Which records a command is about.
 struct SELECTION {
@@ -22,8 +23,9 @@ struct SELECTION {
 // One run of `quorvan-cli db`: works on one data file and tells about it. Every operation returns the
 // process's exit status, 0 when all was done and 1 when something was refused or failed. Results go to
 // `output` in the chosen format, messages to `errors`: a sentence each, with the engine's code and text where
-// the engine refused. Operations that change the file refuse one that may only be read, and one whose header
-// disagrees with it.
+// the engine refused. Operations that change the file refuse one that may only be read, one whose header
+// disagrees with it, one in a folder that another program uses, and one whose state before the day's first
+// change cannot be kept.
 //
 // It knows nothing of command-line options. The command owns it, for one operation each.
 class DataFileTool {
@@ -74,6 +76,9 @@ class DataFileTool {
     };
 
     [[nodiscard]] bool Open(Access access);
+    // Keeps other programs out of the file's folder while the tool lives.
+    [[nodiscard]] bool TakeFolder();
+    [[nodiscard]] bool KeepBackup();
     [[nodiscard]] std::string WhyNotOpened() const;
     [[nodiscard]] int Fail(const std::string& sentence);
     // Tells of a failure of the engine, by default its latest, with the system's reason for one of the file.
@@ -102,5 +107,6 @@ class DataFileTool {
     OutputFormat format_;
     TextOutput& output_;
     std::ostream& errors_;
+    FolderLock lock_;
     DATABASE database_;
 };

@@ -69,6 +69,8 @@ int DataFileTool::Create(const std::string& description, const std::vector<std::
     }
     if (description.size() >= NameSize)
         return Fail("the description is longer than 31 bytes");
+    if (!TakeFolder())
+        return 1;
     errno = 0;
     if (database_.Create(file_.c_str(), description.c_str(), static_cast<int>(entries.size()),
                          entries.data()) != 0)
@@ -87,6 +89,8 @@ bool DataFileTool::RestoreBackup() {
 }
 
 int DataFileTool::Check(bool repair) {
+    if (repair && !TakeFolder())
+        return 1;
     if (repair && !RestoreBackup())
         return Fail("the backup of an interrupted compaction cannot be given back its name: " +
                     std::generic_category().message(errno));

@@ -14,6 +14,7 @@
 #include "tools/DataFileTool.h"
 #include "tools/DisplayText.h"
 #include "tools/RecordFields.h"
+#include "util/FolderLock.h"
 
 namespace {
 
@@ -312,6 +313,34 @@ TEST_F(DataFileToolTest, DamageIsToldAndMended) {
     EXPECT_EQ(Run(&DataFileTool::Info), 1);
     EXPECT_TRUE(Refused("1103 Open error - file could not be opened: header and 5 columns need 272 bytes"))
         << errors_;
+}
+
+TEST_F(DataFileToolTest, ChangesOnlyWhatItHasToItselfAndHasKept) {
+    const std::string before = folder_.Read("a.db");
+    FolderLock lock;
+    ASSERT_EQ(lock.Take(folder_.Path(), "quorvan"), FolderLock::Outcome::Taken);
+    EXPECT_EQ(Run(&DataFileTool::Append, std::vector<std::string>{}), 1);
+    EXPECT_TRUE(Refused("in use by quorvan (process " + std::to_string(getpid()))) << errors_;
+    EXPECT_EQ(Run(&DataFileTool::Compact), 1);
+    EXPECT_EQ(Run(&DataFileTool::Check, true), 1);
+    EXPECT_EQ(Run(&DataFileTool::Check, false), 0);
+    EXPECT_EQ(Query({}), 0);
+    lock.Release();
+    std::filesystem::remove_all(folder_.File("backups"));
+    folder_.Write("backups", "in the way");
+    EXPECT_EQ(Run(&DataFileTool::Append, std::vector<std::string>{}), 1);
+    EXPECT_TRUE(Refused("the day's backup cannot be made")) << errors_;
+    EXPECT_EQ(folder_.Read("a.db"), before);
+    std::filesystem::remove(folder_.File("backups"));
+    EXPECT_EQ(Run(&DataFileTool::Delete, std::vector<long>{0}, nullptr), 0) << errors_;
+    EXPECT_EQ(Run(&DataFileTool::Compact), 0) << errors_;
+    int kept = 0;
+    for (const auto& entry : std::filesystem::directory_iterator(folder_.File("backups"))) {
+        EXPECT_EQ(folder_.Read("backups/" + entry.path().filename().string()), before);
+        ++kept;
+    }
+    EXPECT_EQ(kept, 1);
+    EXPECT_FALSE(folder_.Has("Quorvan.lock"));
 }
 
 TEST_F(DataFileToolTest, OutputThatNobodyTakes) {
