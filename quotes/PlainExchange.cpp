@@ -137,7 +137,8 @@ PlainExchange::Step PlainExchange::Send(const char* path) {
 PlainExchange::Step PlainExchange::Receive(QuoteScanner& scanner) {
     char buffer[BufferSize];
     for (;;) {
-        if (!Wait(POLLIN))
+        report_.Flush();
+        if (WaitUnlessStopped(socket_, POLLIN, context_.stopFd) == Waited::Stopped)
             return Step::Stopped;
         const ssize_t received = recv(socket_, buffer, sizeof buffer, 0);
         if (received < 0 && MustWait())
