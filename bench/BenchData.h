@@ -94,16 +94,14 @@ class Peer {
         " Shares REAL, Date INT, Price REAL, PrevPrice REAL, Value REAL, Agent TEXT,"
         " Risk TEXT COLLATE NOCASE, QuoteError INT)";
 
-    // Opens a file that is there.
-    explicit Peer(const std::string& path, Journal journal = Journal::Off) {
+    // Opens a file, or makes an empty one. Without a size of the cache SQLite has its own, 2 MB.
+    explicit Peer(const std::string& path, int cacheKilobytes = 0, Journal journal = Journal::Off) {
         good_ = sqlite3_open(path.c_str(), &connection_) == SQLITE_OK;
-        Run("PRAGMA synchronous = OFF; PRAGMA cache_size = -1000000");
+        Run("PRAGMA synchronous = OFF");
+        if (cacheKilobytes > 0) {
+            Run(("PRAGMA cache_size = -" + std::to_string(cacheKilobytes)).c_str());
+        }
         Run(journal == Journal::Off ? "PRAGMA journal_mode = OFF" : "PRAGMA journal_mode = DELETE");
-    }
-    // Makes one.
-    Peer(const std::string& path, long records, Journal journal = Journal::Off) : Peer(path, journal) {
-        Run(Table);
-        Insert(0, records);
     }
     Peer(const Peer&) = delete;
     Peer& operator=(const Peer&) = delete;
@@ -113,6 +111,11 @@ class Peer {
         good_ &= sqlite3_exec(connection_, statements, nullptr, nullptr, nullptr) == SQLITE_OK;
     }
 
+    // Makes the table, with made-up investments.
+    void Make(long records) {
+        Run(Table);
+        Insert(0, records);
+    }
     // Adds made-up investments in one transaction.
     void Insert(long first, long count) {
         Run("BEGIN");

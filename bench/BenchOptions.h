@@ -15,6 +15,7 @@ struct OPTIONS {
 
     long records;
     int rounds = 7;
+    int peerCache = 0; // of SQLite, in KB; 0: its own default
     std::string folder = std::filesystem::temp_directory_path();
 };
 
@@ -26,6 +27,8 @@ inline bool ReadOptions(int argc, char** argv, OPTIONS* options) {
             options->records = std::max(std::atol(argv[i + 1]), 1L);
         } else if (name == "--rounds") {
             options->rounds = std::max(std::atoi(argv[i + 1]), 1);
+        } else if (name == "--peer-cache") {
+            options->peerCache = std::max(std::atoi(argv[i + 1]), 0);
         } else if (name == "--folder") {
             options->folder = argv[i + 1];
         } else {

@@ -3,7 +3,9 @@
 // cache. The limit is a bare sequential read or copy of the same bytes, or the part of the work that cannot
 // be left out. Text is written and read beside the sqlite3 shell, when there is one.
 //
-//   db_bench [--records N] [--rounds N] [--folder PATH]
+//   db_bench [--records N] [--rounds N] [--folder PATH] [--peer-cache KB]
+//
+// Both engines have their own default cache, 256 KB and 2 MB, unless SQLite is given a larger one.
 
 #include <fcntl.h>
 #include <unistd.h>
@@ -112,6 +114,7 @@ class Bench {
         : rounds_(options.rounds),
           fewRounds_(std::min(options.rounds, 3)),
           records_(options.records),
+          peerCache_(options.peerCache),
           folder_(std::move(folder)),
           path_(folder_ + "/invest.db"),
           peerPath_(folder_ + "/peer.sqlite") {}
@@ -124,7 +127,8 @@ class Bench {
             return false;
         }
         {
-            Peer peer(peerPath_, records_);
+            Peer peer(peerPath_, peerCache_);
+            peer.Make(records_);
             DATABASE database(path_.c_str());
             MeasureWorks(database, peer);
             MeasureChanges(database, peer);
@@ -191,7 +195,8 @@ class Bench {
             FillInvestment(i, &data[static_cast<std::size_t>(i) * DataSize]);
         }
         DATABASE database(nullptr);
-        Peer peer(folder_ + "/append.sqlite", 0);
+        Peer peer(folder_ + "/append.sqlite", peerCache_);
+        peer.Make(0);
         bool good = true;
         const auto append = [&] {
             for (long i = 0; i < count; ++i) {
@@ -229,7 +234,7 @@ class Bench {
             "\" t' > /dev/null";
         const auto emptyPeer = [&] {
             std::filesystem::remove(peerCopyPath);
-            Peer(peerCopyPath, 0);
+            Peer(peerCopyPath).Make(0);
         };
         times = ShortestInTurn(fewRounds_, {{[&] { loaded = copy.Load(text.c_str(), "\t\n"); },
                                              [&] { good &= MakeEmptyFile(copy, copyPath); }},
@@ -255,7 +260,7 @@ class Bench {
         DATABASE database(nullptr);
         const auto compress = [&] { good &= database.Compress(0) == 0; };
         const auto vacuum = [&] {
-            Peer peer(peerWork);
+            Peer peer(peerWork, peerCache_);
             peer.Run("VACUUM");
             good &= peer.IsGood();
         };
@@ -292,6 +297,7 @@ class Bench {
     int rounds_;
     int fewRounds_;
     long records_;
+    int peerCache_;
     std::string folder_;
     std::string path_;
     std::string peerPath_;
@@ -303,7 +309,8 @@ class Bench {
 int main(int argc, char** argv) {
     OPTIONS options(1'000'000);
     if (!ReadOptions(argc, argv, &options)) {
-        std::fprintf(stderr, "usage: db_bench [--records N] [--rounds N] [--folder PATH]\n");
+        std::fprintf(stderr,
+                     "usage: db_bench [--records N] [--rounds N] [--folder PATH] [--peer-cache KB]\n");
         return 2;
     }
     std::string folder = options.folder + "/db_bench.XXXXXX";

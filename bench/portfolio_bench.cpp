@@ -67,7 +67,8 @@ bool Measure(const OPTIONS& options, const std::string& folder) {
         !MakePortfolios(portfolios, folder + "/portfol.db"))
         return false;
     DATABASE investments((folder + "/invest.db").c_str());
-    Peer peer(folder + "/peer.sqlite", options.records, Peer::Journal::Default);
+    Peer peer(folder + "/peer.sqlite", options.peerCache, Peer::Journal::Default);
+    peer.Make(options.records);
     std::printf("%ld investments\n", options.records);
     return GatherPortfolio(investments, peer) && MeasureRename(options, portfolios, investments, peer) &&
            MeasurePaste(options, investments, peer) && peer.IsGood();
