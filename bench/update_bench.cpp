@@ -1,0 +1,198 @@
+// Prints how long a price update of the whole program takes beside a bare loop of the same requests, and how
+// long a mouse event waits meanwhile. The server is on loopback; the window is the program's own, on the
+// toolkit's offscreen platform unless QT_QPA_PLATFORM says otherwise.
+//
+//   update_bench [--records N] [--rounds N] [--folder PATH]
+
+#include <atomic>
+#include <chrono>
+#include <cstdio>
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <string>
+#include <thread>
+
+#include <QWidget>
+
+#include "BenchOptions.h"
+#include "StepDriver.h"
+#include "app/MessageCodes.h"
+#include "app/NorvelApp.h"
+#include "app/NorvelWindow.h"
+#include "app/RecordLayouts.h"
+#include "db/Database.h"
+#include "quotes/LoopbackServer.h"
+#include "util/CharacterBuffer.h"
+#include "util/InterfaceHelpers.h"
+
+namespace {
+
+using Clock = std::chrono::steady_clock;
+constexpr const char* ProgressTitle = "Getting current prices...";
+
+double MillisecondsSince(Clock::time_point start) {
+    return std::chrono::duration<double, std::milli>(Clock::now() - start).count();
+}
+
+// Takes a mouse event every few milliseconds from another thread to the progress window, and keeps the
+// longest time from posting it to the end of its handling.
+class MouseProbe : public QObject {
+  public:
+    MouseProbe() : poster_([this] { Post(); }) {}
+    ~MouseProbe() override {
+        stopping_ = true;
+        poster_.join();
+    }
+    MouseProbe(const MouseProbe&) = delete;
+    MouseProbe& operator=(const MouseProbe&) = delete;
+
+    [[nodiscard]] double LongestWait() const { return longest_; }
+    [[nodiscard]] int Count() const { return count_; }
+
+  private:
+    struct Posted : QEvent {
+        Posted() : QEvent(QEvent::User) {}
+        Clock::time_point when = Clock::now();
+    };
+    void Post() {
+        while (!stopping_) {
+            QCoreApplication::postEvent(this, new Posted);
+            std::this_thread::sleep_for(std::chrono::milliseconds(2));
+        }
+    }
+    bool event(QEvent* event) override {
+        if (event->type() != QEvent::User)
+            return QObject::event(event);
+        if (QWidget* window = StepDriver::Window(ProgressTitle)) {
+            QTest::mouseMove(window, QPoint(20 + count_ % 100, 20));
+            longest_ = std::max(longest_, MillisecondsSince(static_cast<Posted*>(event)->when));
+            ++count_;
+        }
+        return true;
+    }
+
+    double longest_ = 0;
+    int count_ = 0;
+    std::atomic<bool> stopping_ = false;
+    std::thread poster_;
+};
+
+// One update in the program, from the command to the progress window's end.
+class UpdateRun : public StepDriver {
+  public:
+    UpdateRun() {
+        When("the main window", WindowShown("Quorvan"), [this] {
+            probe_ = std::make_unique<MouseProbe>();
+            start_ = Clock::now();
+            GetAppWindow(be_app, "Quorvan")->PostMessage(MessagePortfolioUpdate);
+        });
+        When("the progress window", WindowShown(ProgressTitle), [] {});
+        When(
+            "the end", [] { return Window(ProgressTitle) == nullptr; },
+            [this] {
+                milliseconds = MillisecondsSince(start_);
+                longestWait = probe_->LongestWait();
+                mouseEvents = probe_->Count();
+                probe_.reset();
+                be_app->PostMessage(B_QUIT_REQUESTED);
+            });
+    }
+
+    double milliseconds = 0;
+    double longestWait = 0;
+    int mouseEvents = 0;
+    bool failed = false;
+
+  protected:
+    void Fail(const std::string& sentence) override {
+        std::fprintf(stderr, "update_bench: %s\n", sentence.c_str());
+        failed = true;
+    }
+
+  private:
+    Clock::time_point start_;
+    std::unique_ptr<MouseProbe> probe_;
+};
+
+template <std::size_t Count>
+bool Create(DATABASE& file, const std::string& path, const std::array<COLUMN_ENTRY, Count>& columns) {
+    return file.Create(path.c_str(), "benchmark", Count, columns.data()) == 0;
+}
+
+bool MakeFolder(const std::string& folder, const std::string& host, long records) {
+    DATABASE portfolios(nullptr);
+    DATABASE investments(nullptr);
+    DATABASE categories(nullptr);
+    if (!Create(portfolios, folder + "/portfol.db", PortfolioColumns) ||
+        !Create(investments, folder + "/invest.db", InvestmentColumns) ||
+        !Create(categories, folder + "/misc.db", CategoryColumns))
+        return false;
+    PORTFOLIO_DATA portfolio{};
+    CopyText(portfolio.Name, "All");
+    portfolios.Append(&portfolio);
+    for (long i = 0; i < records; ++i) {
+        INVESTMENT_DATA record{};
+        CopyText(record.Portfolio, "All");
+        FormatInto(record.Name, sizeof record.Name, "Investment %ld", i);
+        FormatInto(record.Ticker, sizeof record.Ticker, "T%ld", i % 100'000);
+        record.Shares = 1;
+        if (investments.Append(&record) < 0)
+            return false;
+    }
+    std::ofstream(folder + "/Quorvan.cfg") << "local " << host << " /quote/ Last 3\n";
+    std::ofstream(folder + "/Quorvan.ini") << "[GENERAL]\nIsConnectedURL=localhost\n[DISPLAY]\n";
+    return true;
+}
+
+// What any client has to do for the same pages.
+bool AskBare(std::uint16_t port, long records) {
+    for (long i = 0; i < records; ++i) {
+        const int fd = socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0);
+        sockaddr_in address{};
+        address.sin_family = AF_INET;
+        address.sin_port = htons(port);
+        address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+        const std::string request = "GET /quote/T" + std::to_string(i) + " HTTP/1.0\n\n";
+        bool asked = connect(fd, reinterpret_cast<sockaddr*>(&address), sizeof address) == 0 &&
+                     send(fd, request.data(), request.size(), MSG_NOSIGNAL) > 0;
+        char bytes[1024];
+        while (asked && recv(fd, bytes, sizeof bytes, 0) > 0) {
+        }
+        close(fd);
+        if (!asked)
+            return false;
+    }
+    return true;
+}
+
+} // namespace
+
+int main(int argc, char** argv) {
+    setenv("QT_QPA_PLATFORM", "offscreen", 0);
+    OPTIONS options(500);
+    if (!ReadOptions(argc, argv, &options)) {
+        std::fprintf(stderr, "usage: update_bench [--records N] [--rounds N] [--folder PATH]\n");
+        return 2;
+    }
+    const std::string folder = options.folder + "/quorvan-update-bench";
+    std::filesystem::remove_all(folder);
+    std::filesystem::create_directories(folder);
+    LoopbackServer server(Reply{{"HTTP/1.0 200 OK\r\n\r\n<td>Last Trade</td><td><b>45 3/8</b></td>"}});
+    if (!MakeFolder(folder, server.Host(), options.records)) {
+        std::fprintf(stderr, "update_bench: the folder could not be filled\n");
+        return 1;
+    }
+    const double bare = Shortest(options.rounds, [&] { AskBare(server.Port(), options.records); }) * 1000;
+    BApplication::SetExecutablePath((folder + "/quorvan").c_str());
+    UpdateRun run;
+    {
+        NorvelApp application;
+        application.Run();
+    }
+    std::printf("%ld prices: update %.1f ms, bare requests %.1f ms: %.2f x\n", options.records,
+                run.milliseconds, bare, run.milliseconds / bare);
+    std::printf("%d mouse events meanwhile, the longest wait %.1f ms\n", run.mouseEvents, run.longestWait);
+    std::filesystem::remove_all(folder);
+    return run.failed ? 1 : 0;
+}
