@@ -117,7 +117,7 @@ std::vector<std::string_view> SplitAtColons(std::string_view text) {
 }
 
 std::string ReadWidth(std::string_view text, COLUMN_ENTRY* column) {
-    const int least = TypeBytes[static_cast<std::size_t>(column->type)];
+    const int least = TypeBytes[static_cast<std::uint8_t>(column->type)];
     const std::optional<std::int16_t> width = NumberIn<std::int16_t>(text);
     if (!width || *width < least)
         return std::string("a ") + ColumnTypeName(column->type) + "'s width is a number of bytes from " +
@@ -137,8 +137,8 @@ std::string ReadDecimals(std::string_view text, COLUMN_ENTRY* column) {
 } // namespace
 
 const char* ColumnTypeName(std::int8_t type) {
-    return type >= 0 && type < static_cast<int>(TypeNames.size()) ? TypeNames[static_cast<std::size_t>(type)]
-                                                                  : "unknown";
+    const auto code = static_cast<std::uint8_t>(type);
+    return code < TypeNames.size() ? TypeNames[code] : "unknown";
 }
 
 void FillCell(const COLUMN_ENTRY& column, const std::uint8_t* data, CELL* cell) {

@@ -447,10 +447,10 @@ TEST_F(DbCommandTest, ManualNamesEveryCommandAndOption) {
     std::string manual{std::istreambuf_iterator<char>(file), {}};
     manual.erase(std::remove(manual.begin(), manual.end(), '\\'), manual.end());
     int found = 0;
-    for (const char* arguments :
-         {"--help", "setup --help", "db --help", "db x info --help", "db x query --help", "db x set --help",
-          "db x append --help", "db x delete --help", "db x check --help", "db x create --help",
-          "db x export --help", "db x load --help"}) {
+    for (const char* arguments : {"--help", "setup --help", "quote --help", "chart --help", "report --help",
+                                  "db --help", "db x info --help", "db x query --help", "db x set --help",
+                                  "db x append --help", "db x delete --help", "db x check --help",
+                                  "db x create --help", "db x export --help", "db x load --help"}) {
         ASSERT_EQ(Run(arguments), 0);
         std::istringstream lines(output_);
         bool commands = false;
