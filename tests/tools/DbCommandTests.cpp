@@ -343,6 +343,24 @@ TEST_F(DataFileToolTest, ChangesOnlyWhatItHasToItselfAndHasKept) {
     EXPECT_FALSE(folder_.Has("Quorvan.lock"));
 }
 
+TEST_F(DataFileToolTest, FileThatMayOnlyBeReadIsShown) {
+    const std::string before = folder_.Read("a.db");
+    ASSERT_EQ(chmod(path_.c_str(), 0444) + chmod(folder_.File("out").c_str(), 0666), 0);
+    ASSERT_EQ(chmod(folder_.Path().c_str(), 0777), 0);
+    if (geteuid() == 0) { // who may write everything
+        ASSERT_EQ(seteuid(65534), 0);
+    }
+    EXPECT_EQ(Query({"Price > 0", {}, "Name", false}), 0) << errors_;
+    EXPECT_NE(output_.find("Acorn"), output_.npos);
+    EXPECT_EQ(Run(&DataFileTool::Check, false), 0) << errors_;
+    EXPECT_EQ(Run(&DataFileTool::Append, std::vector<std::string>{}), 1);
+    EXPECT_TRUE(Refused("the file may only be read, not changed")) << errors_;
+    EXPECT_EQ(Run(&DataFileTool::Compact), 1);
+    EXPECT_TRUE(Refused("the file may only be read, not changed")) << errors_;
+    EXPECT_EQ(seteuid(getuid()), 0);
+    EXPECT_EQ(folder_.Read("a.db"), before);
+}
+
 TEST_F(DataFileToolTest, OutputThatNobodyTakes) {
     const auto query = [this](int file) {
         TextOutput output(file);
