@@ -20,6 +20,7 @@
 namespace {
 
 constexpr std::size_t BufferSize = 1024; // of the request and of each receive
+constexpr int ShortWait = 10;            // milliseconds; a longer wait is worth the time to write the log
 
 bool MustWait() {
     return errno == EAGAIN || errno == EWOULDBLOCK || errno == EINTR;
@@ -58,7 +59,7 @@ PlainExchange::Step PlainExchange::Fail(const char* line) {
 }
 
 bool PlainExchange::Wait(short events) {
-    Waited waited = WaitUnlessStopped(socket_, events, context_.stopFd, 0);
+    Waited waited = WaitUnlessStopped(socket_, events, context_.stopFd, ShortWait);
     if (waited == Waited::NotYet) {
         report_.Flush();
         waited = WaitUnlessStopped(socket_, events, context_.stopFd);
@@ -137,8 +138,7 @@ PlainExchange::Step PlainExchange::Send(const char* path) {
 PlainExchange::Step PlainExchange::Receive(QuoteScanner& scanner) {
     char buffer[BufferSize];
     for (;;) {
-        report_.Flush();
-        if (WaitUnlessStopped(socket_, POLLIN, context_.stopFd) == Waited::Stopped)
+        if (!Wait(POLLIN))
             return Step::Stopped;
         const ssize_t received = recv(socket_, buffer, sizeof buffer, 0);
         if (received < 0 && MustWait())

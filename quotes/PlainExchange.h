@@ -33,7 +33,7 @@ class PlainExchange {
     // Failed when the page ended without a price.
     [[nodiscard]] Step Receive(QuoteScanner& scanner);
     Step Fail(const char* line);
-    // False when the caller shall stop.
+    // Writes the log when it takes long. False when the caller shall stop.
     [[nodiscard]] bool Wait(short events);
     void ReportConnection(std::uint16_t port) const;
 

@@ -5,6 +5,7 @@
 #include <cstring>
 
 #include "util/CharacterBuffer.h"
+#include "util/DebugLog.h"
 #include "util/Numbers.h"
 
 namespace {
@@ -19,7 +20,7 @@ QuoteObserver* Nobody() {
 } // namespace
 
 QuoteReport::QuoteReport(const char* logPath, QuoteObserver* observer)
-    : log_(logPath), observer_(observer ? observer : Nobody()) {}
+    : logPath_(logPath), observer_(observer ? observer : Nobody()) {}
 
 void QuoteReport::Log(const char* format, ...) {
     char formatted[LogLineSize];
@@ -45,11 +46,12 @@ void QuoteReport::LogNumber(const char* text, float value) {
 }
 
 void QuoteReport::LogWhole(const char* text) {
-    unwritten_ += text;
+    if (logPath_)
+        unwritten_ += text;
 }
 
 void QuoteReport::Flush() {
     if (!unwritten_.empty())
-        log_.Write(unwritten_.c_str());
+        PrintDebugStatement(unwritten_.c_str(), logPath_);
     unwritten_.clear();
 }
