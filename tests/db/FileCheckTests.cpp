@@ -57,7 +57,7 @@ TEST_F(FileCheckTest, SaysWhatIsWrongAndWhere) {
         std::string bytes;
         int kind;
         std::int64_t offset; // of a finding; -1 for none
-        std::int32_t record;
+        std::int64_t record;
         const char* text; // in that finding
     } cases[] = {
         {intact_, Sound, -1, -1, ""},

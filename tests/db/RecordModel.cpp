@@ -62,8 +62,8 @@ int MonthLength(int year, int month) {
 
 dbDATE Valid(dbDATE date) {
     int year = date.year;
-    int month = date.month;
-    int day = date.day;
+    int month = +date.month;
+    int day = +date.day;
     const auto carry = [&] {
         for (; month > 12; month -= 12, ++year) {
         }
@@ -85,9 +85,9 @@ dbDATE Valid(dbDATE date) {
 }
 
 dbTIME Valid(dbTIME time) {
-    int second = time.second;
-    int minute = time.minute;
-    int hour = time.hour;
+    int second = +time.second;
+    int minute = +time.minute;
+    int hour = +time.hour;
     for (; second > 59; second -= 60, ++minute) {
     }
     for (; second < 0; second += 60, --minute) {
@@ -104,8 +104,8 @@ dbTIME Valid(dbTIME time) {
 // Integers wrap at their width; dividing one by 0 changes nothing.
 template <class T>
 void Change(const std::string& op, T* field, std::int64_t wanted) {
-    const std::int64_t value = static_cast<T>(wanted);
-    const std::int64_t old = *field;
+    const std::int64_t value = +static_cast<T>(wanted);
+    const std::int64_t old = +*field;
     const std::int64_t changed = op == "="    ? value
                                  : op == "+"  ? old + value
                                  : op == "-"  ? old - value

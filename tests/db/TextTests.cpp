@@ -55,6 +55,27 @@ TEST_F(TextTest, FieldsAsText) {
     EXPECT_EQ(LineOf(Row("a", 65), nullptr), "a65000.0020000101120000\n");
 }
 
+// The document's example is loaded and exported again, bytes as the characters that they were read as.
+TEST_F(TextTest, LinesAreAsDocumented) {
+    std::ifstream document(TEXT_FILE_DOCUMENT);
+    const std::string text(std::istreambuf_iterator<char>(document), {});
+    const std::size_t end = text.rfind("```");
+    const std::size_t begin = text.rfind("```\n", end - 1) + 4;
+    const std::string example = text.substr(begin, end - begin);
+    DATABASE database(nullptr);
+    const COLUMN_ENTRY columns[] = {Column("Name", ColumnType::String, 8), Column("Kind", ColumnType::Byte),
+                                    Column("Price", ColumnType::Float), Column("Bought", ColumnType::Date),
+                                    Column("Sold", ColumnType::Time)};
+    ASSERT_EQ(database.Create(folder_.File("example.db").c_str(), "", 5, columns), 0);
+    Write(example);
+    EXPECT_EQ(database.Load(path_.c_str(), "|\n"), 2);
+    EXPECT_EQ(database.Query("Bought = 19990105", QueryMode::New), 1);
+    EXPECT_EQ(database.Query("Price = 12.25", QueryMode::And), 1);
+    database.SetByteOutputFormat(1);
+    EXPECT_EQ(database.Export(path_.c_str(), 1, "|"), 2);
+    EXPECT_EQ(Text(), example);
+}
+
 TEST_F(TextTest, ExportOfAllAndOfTheSet) {
     const std::vector<ROW> rows = {Row("c"), Row("b", 1), Row("gone"), Row("a", 1)};
     EXPECT_EQ(database_.AppendAll(rows.data(), sizeof(ROW), 4), 0);
