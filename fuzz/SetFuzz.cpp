@@ -57,7 +57,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
         return 0;
     }
     Require(changed == (selected < 0 ? SampleRecords - 1 : selected), "not as many are changed as selected");
-    const COLUMN_ENTRY column = ColumnOf(database, statement.c_str());
+    const COLUMN_ENTRY column = ColumnOf(database, statement);
     Require(Blanked(after, column) == Blanked(sample, column), "more than the column was changed");
     if (column.type == ColumnType::String) {
         Require(database.Query((std::string(column.name) + " contains x").c_str(), QueryMode::New) >= 0,
