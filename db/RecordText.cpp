@@ -133,7 +133,7 @@ std::string_view FieldSplitter::Next() {
     char* end = std::find_if(begin, end_, isSeparator);
     if (begin == end) {
         next_ = end_;
-        return {"", 0};
+        return "";
     }
     *end = '\0';
     next_ = std::min(end + 1, end_);

@@ -111,7 +111,7 @@ class FaultTest : public testing::Test {
         DATABASE database(path_.c_str());
         EXPECT_TRUE(database.IsOpen());
         EXPECT_FALSE(database.IsDamaged());
-        const CONTENT content = ContentOf(database);
+        CONTENT content = ContentOf(database);
         FileCheck check;
         std::string backup;
         EXPECT_EQ(check.Repair(path_, &backup), 0);

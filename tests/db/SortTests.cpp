@@ -82,23 +82,18 @@ ROW RandomRow(std::mt19937& random) {
     };
     using Limits = std::numeric_limits<float>;
     const auto byte = [&] { return pick(std::initializer_list<std::int8_t>{-128, -1, 0, 1, 127}); };
-    ROW row =
-        Row(pick(std::initializer_list<const char*>{"", "a", "A", "ab", "AB", "investm", "INVESTME",
-                                                    "investment", "Investment 1", "investment 2",
-                                                    "investment 10", "[", "_", "\xC3\x84pfel", "\xC3\xA4PFEL",
-                                                    "a\xC3\x84"
-                                                    "B",
-                                                    "A\xC3\x84"
-                                                    "b",
-                                                    "sixteen letters!", "SIXTEEN LETTERS?"}),
-            byte(), pick(std::initializer_list<int>{-32768, -1, 0, 1, 300, 32767}),
-            pick(std::initializer_list<int>{std::numeric_limits<int>::min(), -1, 0, 1, 256, 65536,
-                                            std::numeric_limits<int>::max()}),
-            pick(std::initializer_list<float>{Limits::quiet_NaN(), -Limits::quiet_NaN(), Limits::infinity(),
-                                              -Limits::infinity(), 0.0F, -0.0F, 1, -1, 1.5F, Limits::max(),
-                                              Limits::denorm_min(), -Limits::denorm_min()}),
-            {byte(), byte(), pick(std::initializer_list<std::int16_t>{-1, 0, 1999, 2000})},
-            {byte(), byte(), byte()});
+    ROW row = Row(pick(std::initializer_list<const char*>{
+                      "", "a", "A", "ab", "AB", "investm", "INVESTME", "investment", "Investment 1",
+                      "investment 2", "investment 10", "[", "_", "\xC3\x84pfel", "\xC3\xA4PFEL", "a\xC3\x84X",
+                      "A\xC3\x84x", "sixteen letters!", "SIXTEEN LETTERS?"}),
+                  byte(), pick(std::initializer_list<int>{-32768, -1, 0, 1, 300, 32767}),
+                  pick(std::initializer_list<int>{std::numeric_limits<int>::min(), -1, 0, 1, 256, 65536,
+                                                  std::numeric_limits<int>::max()}),
+                  pick(std::initializer_list<float>{
+                      Limits::quiet_NaN(), -Limits::quiet_NaN(), Limits::infinity(), -Limits::infinity(),
+                      0.0F, -0.0F, 1, -1, 1.5F, Limits::max(), Limits::denorm_min(), -Limits::denorm_min()}),
+                  {byte(), byte(), pick(std::initializer_list<std::int16_t>{-1, 0, 1999, 2000})},
+                  {byte(), byte(), byte()});
     if (random() % 4 == 0) {
         std::memcpy(row.name, "ab\0garbage\xFF", 12); // what follows a text's end means nothing
     }
@@ -107,10 +102,8 @@ ROW RandomRow(std::mt19937& random) {
 
 TEST_F(SortTest, OrderIsThatOfABubbleSort) {
     std::mt19937 random(20260101);
-    std::vector<ROW> rows;
-    for (int i = 0; i < 60; ++i) {
-        rows.push_back(RandomRow(random));
-    }
+    std::vector<ROW> rows(60);
+    std::generate(rows.begin(), rows.end(), [&random] { return RandomRow(random); });
     Append(rows);
     EXPECT_EQ(database_.Delete(5) + database_.Delete(59), 0);
     // One after the other, each sort begins with the order that the one before has left.
