@@ -91,6 +91,7 @@ TEST_F(TextTest, ExportOfAllAndOfTheSet) {
 
 TEST_F(TextTest, WhatIsExportedLoadsBack) {
     std::vector<ROW> rows;
+    rows.reserve(20'001);
     for (int i = 0; i < 20'000; ++i) { // several blocks, batches and lines across them
         rows.push_back(Row("row " + std::string(static_cast<std::size_t>(i % 11), 'x'), i % 7 - 3,
                            i % 1000 - 500, i * 1'000, static_cast<float>(i) / 4,
