@@ -53,8 +53,10 @@ bool Create(DATABASE& database, const std::string& path, const std::array<COLUMN
 bool MakeFolder(const std::string& folder, long records) {
     DATABASE portfolios(nullptr);
     DATABASE investments(nullptr);
+    DATABASE categories(nullptr);
     if (!Create(portfolios, folder + "/portfol.db", PortfolioColumns) ||
-        !Create(investments, folder + "/invest.db", InvestmentColumns))
+        !Create(investments, folder + "/invest.db", InvestmentColumns) ||
+        !Create(categories, folder + "/misc.db", CategoryColumns))
         return false;
     for (const char* name : {"Full", "Empty"}) {
         PORTFOLIO_DATA portfolio{};
