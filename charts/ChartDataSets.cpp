@@ -1,7 +1,9 @@
 #include "charts/ChartDataSets.h"
 
 #include <algorithm>
+#include <bit>
 #include <cstring>
+#include <functional>
 #include <new>
 #include <stdexcept>
 
@@ -43,9 +45,6 @@ std::size_t CategoryOf(std::string_view type) {
 } // namespace
 
 int ChartDataSets::GenerateDataSets(long capacity) {
-    tickers_.clear();
-    types_.clear();
-    names_.clear();
     const auto slots = static_cast<std::size_t>(std::max(capacity, LeastCapacity));
     try {
         for (CHART_DATA_SET& set : sets_) {
@@ -54,6 +53,8 @@ int ChartDataSets::GenerateDataSets(long capacity) {
             set.values.resize(slots);
             set.capacity = static_cast<std::int32_t>(slots);
         }
+        for (Places* places : {&tickers_, &types_, &names_})
+            places->assign(std::bit_ceil(slots) * 2, -1); // at most half full
     } catch (const std::bad_alloc&) {
         return 1;
     } catch (const std::length_error&) {
@@ -69,6 +70,8 @@ int ChartDataSets::AccumulateDataSet(int index, const INVESTMENT_DATA& record) {
     const std::string_view name = FieldText(record.Name);
     const std::string_view type = FieldText(record.Type);
     CHART_DATA_SET& investments = sets_[ByInvestment];
+    if (investments.capacity == 0)
+        return 0; // not generated
     if (index >= 0 && index < investments.capacity) {
         investments.values[static_cast<std::size_t>(index)] = record.Value;
         SetLabel(investments.labels[static_cast<std::size_t>(index)], name);
@@ -87,20 +90,27 @@ int ChartDataSets::AccumulateDataSet(int index, const INVESTMENT_DATA& record) {
     return 0;
 }
 
-void ChartDataSets::AddKeyed(CHART_DATA_SET& set, Slots& slots, std::string_view key, float value) {
+std::int32_t& ChartDataSets::PlaceOf(const CHART_DATA_SET& set, Places& places, std::string_view key) {
+    const std::size_t mask = places.size() - 1;
+    const std::hash<std::string_view> hash;
+    std::size_t place = hash(key) & mask;
+    while (places[place] >= 0 && key != set.labels[static_cast<std::size_t>(places[place])].data())
+        place = (place + 1) & mask;
+    return places[place];
+}
+
+void ChartDataSets::AddKeyed(CHART_DATA_SET& set, Places& places, std::string_view key, float value) {
     if (key.empty())
         return;
-    const auto found = slots.find(std::string(key));
-    if (found != slots.end()) {
-        set.values[static_cast<std::size_t>(found->second)] += value;
-        return;
+    key = key.substr(0, NameSize - 1); // as the label will be
+    std::int32_t& slot = PlaceOf(set, places, key);
+    if (slot < 0) {
+        if (set.count >= set.capacity)
+            return;
+        slot = set.count++;
+        SetLabel(set.labels[static_cast<std::size_t>(slot)], key);
     }
-    if (set.count >= set.capacity)
-        return;
-    const auto slot = static_cast<std::size_t>(set.count);
-    set.values[slot] = value;
-    SetLabel(set.labels[slot], key);
-    slots.emplace(key, set.count++);
+    set.values[static_cast<std::size_t>(slot)] += value;
 }
 
 const CHART_DATA_SET& ChartDataSets::ForChart(std::uint32_t code) const {

@@ -2,8 +2,7 @@
 
 #include <array>
 #include <cstdint>
-#include <string>
-#include <unordered_map>
+#include <string_view>
 #include <vector>
 
 #include "app/RecordLayouts.h"
@@ -59,14 +58,16 @@ class ChartDataSets {
     [[nodiscard]] const CHART_DATA_SET& ForChart(std::uint32_t code) const;
 
   private:
-    // Where each key's slice is: a scan of the slots would find the same, and takes as long as there are
-    // slices.
-    using Slots = std::unordered_map<std::string, std::int32_t>;
+    // Where each label of a set is: a hash table of slot numbers, -1 for a free place. A scan of the slots
+    // would find the same, and takes as long as there are slices.
+    using Places = std::vector<std::int32_t>;
 
-    static void AddKeyed(CHART_DATA_SET& set, Slots& slots, std::string_view key, float value);
+    // The place of the key, or the free one where it belongs. There is always one.
+    static std::int32_t& PlaceOf(const CHART_DATA_SET& set, Places& places, std::string_view key);
+    static void AddKeyed(CHART_DATA_SET& set, Places& places, std::string_view key, float value);
 
     std::array<CHART_DATA_SET, Count> sets_;
-    Slots tickers_;
-    Slots types_;
-    Slots names_;
+    Places tickers_;
+    Places types_;
+    Places names_;
 };
