@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cmath>
 
+#include "ColumnListView/LabelText.h"
 #include "util/Numbers.h"
 
 namespace {
@@ -60,6 +61,14 @@ std::string LegendLine(const char* label, float value, float total, int decimalP
         return label;
     const char* unit = decimalPlaces == 2 ? ": $" : ": ";
     return std::string(label) + unit + Fixed(value) + " " + Fixed(value / total * 100) + "%";
+}
+
+std::string FittedLegendLine(const char* label, float value, float total, int decimalPlaces, float width,
+                             const std::function<float(const std::string&)>& measure) {
+    const auto line = [&](const std::string& text) {
+        return LegendLine(text.c_str(), value, total, decimalPlaces);
+    };
+    return line(TruncatedLabel(label, width, [&](const std::string& text) { return measure(line(text)); }));
 }
 
 GrowthRects LayOutGrowth(BRect bounds, float fontHeight) {

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <array>
+#include <functional>
 #include <string>
 #include <vector>
 
@@ -42,6 +43,12 @@ struct PieSlice {
 // A legend's line. With 2 decimal places label, amount of money and share of the total, with 3 the same for a
 // plain number, with any other number of places the label alone.
 [[nodiscard]] std::string LegendLine(const char* label, float value, float total, int decimalPlaces);
+
+// The same with the label's end replaced by three dots where the line would be wider than `width`: a number
+// whose end is cut off would be another number. `measure` gives a text's width.
+[[nodiscard]] std::string FittedLegendLine(const char* label, float value, float total, int decimalPlaces,
+                                           float width,
+                                           const std::function<float(const std::string&)>& measure);
 
 // --- growth chart ---
 

@@ -15,6 +15,7 @@ constexpr float LegendGap = 5; // between colour box and text
 constexpr float LineGap = 2;   // between two lines of the legend
 constexpr float TitleScale = 1.5F;
 constexpr float MessageScale = 2;
+constexpr rgb_color Veil{216, 216, 216, 120}; // keeps texts readable over dark slices; unseen elsewhere
 
 rgb_color ColorOf(int index) {
     return PieChartColors[static_cast<std::size_t>(index) % PieChartColors.size()];
@@ -110,6 +111,14 @@ std::string PieChartView::LegendText(int index) const {
     return LegendLine(labels_[slot].data(), data_[index], total_, decimalPlaces_);
 }
 
+std::string PieChartView::LegendText(int index, BRect text) const {
+    const auto slot = static_cast<std::size_t>(index);
+    if (slot >= labels_.size() || labels_[slot][0] == '\0')
+        return {};
+    return FittedLegendLine(labels_[slot].data(), data_[index], total_, decimalPlaces_, text.Width(),
+                            [this](const std::string& line) { return StringWidth(line.c_str()); });
+}
+
 // The lines that have no room are told in place of the last one that has.
 void PieChartView::DrawLegend() {
     SetFont(be_plain_font);
@@ -118,25 +127,33 @@ void PieChartView::DrawLegend() {
     BRect box(rects_.legend.left, rects_.legend.top, rects_.legend.left + height, rects_.legend.top + height);
     BRect text(box.right + LegendGap, box.top, rects_.legend.right, box.bottom);
     const int room = static_cast<int>((rects_.legend.Height() + LineGap) / step);
-    const int shown = count_ <= room ? count_ : room - 1;
+    const int shown = count_ <= room ? count_ : std::max(room - 1, 0);
     for (int i = 0; i < shown; ++i) {
-        const std::string line = LegendText(i);
-        if (!line.empty())
-            DrawLegendLine(box, text, line.c_str(), i);
+        if (const std::string line = LegendText(i, text); !line.empty()) {
+            DrawLegendBox(box, i);
+            DrawLegendText(text, line);
+        }
         box.OffsetBy(0, step);
         text.OffsetBy(0, step);
     }
     if (shown < count_)
-        DrawText(this, &text, ("and " + std::to_string(count_ - shown) + " more").c_str(),
-                 DrawTextLeft | DrawTextMiddle);
+        DrawLegendText(text, "and " + std::to_string(count_ - shown) + " more");
 }
 
-void PieChartView::DrawLegendLine(BRect box, BRect text, const char* line, int color) {
+void PieChartView::DrawLegendBox(BRect box, int color) {
     SetHighColor(ColorOf(color));
     FillRect(box);
     SetHighColor(colors::black);
     StrokeRect(box);
-    DrawText(this, &text, line, DrawTextLeft | DrawTextMiddle);
+}
+
+void PieChartView::DrawLegendText(BRect text, const std::string& line) {
+    const float end = std::min(text.left + std::ceil(StringWidth(line.c_str())), text.right);
+    SetHighColor(Veil);
+    // Down to the next line's veil, so that no stripe shows between them.
+    FillRect({text.left, text.top, end, text.bottom + LineGap - 1});
+    SetHighColor(colors::black);
+    DrawText(this, &text, line.c_str(), DrawTextLeft | DrawTextMiddle);
 }
 
 void PieChartView::DrawEmptyMessage() {

@@ -51,11 +51,15 @@ class PieChartView : public BView {
 
   private:
     [[nodiscard]] bool HasChart() const;
+    // Empty for a slice without a label.
     [[nodiscard]] std::string LegendText(int index) const;
+    // The same as wide as the text rectangle at most.
+    [[nodiscard]] std::string LegendText(int index, BRect text) const;
     void DrawTitle();
     void DrawChart();
     void DrawLegend();
-    void DrawLegendLine(BRect box, BRect text, const char* line, int color);
+    void DrawLegendBox(BRect box, int color);
+    void DrawLegendText(BRect text, const std::string& line);
     void DrawEmptyMessage();
 
     std::string title_;

@@ -137,6 +137,30 @@ TEST(PieChart, ColorsBeginAgainAndALongLegendSaysWhatIsMissing) {
     EXPECT_TRUE(full.Has(note, colors::black));
 }
 
+TEST(PieChart, LegendTextsStayReadableAndInTheView) {
+    const BApplication application("test");
+    PieChartView view(Area);
+    std::vector<float> values(12, 0);
+    values[11] = 5e6F; // all of the pie
+    std::vector<const char*> labels(12, "A name long enough to lie on the pie");
+    labels[0] = "WWWWWWWWWWWWWWWWWWWWWWWWWWWWWWW";
+    Show(view, values, labels);
+    const Picture picture(view);
+    const BRect first = LegendBox(0);
+    for (float y = first.top; y <= first.bottom; ++y)
+        EXPECT_EQ(picture.At(Area.right, y), colors::gray) << "the percentage is cut off";
+    // At the top of a line's text, which no letter reaches, and on the pie's free half.
+    const PieEllipse pie = EllipseIn(LayOutPie(Area).chart);
+    const rgb_color veiled = picture.At(pie.center.x - pie.xRadius / 2, LegendBox(9).top - 2);
+    EXPECT_GT(veiled.red, SliceColor(11).red);
+    EXPECT_LT(veiled.red, colors::gray.red);
+    EXPECT_EQ(picture.At(pie.center.x + pie.xRadius * 0.9F, pie.center.y), SliceColor(11));
+
+    PieChartView tiny({0, 0, 60, 9}); // without room for a line
+    Show(tiny, values, labels);
+    EXPECT_FALSE(Picture(tiny).Has({0, 0, 60, 9}, SliceColor(0)));
+}
+
 TEST(PieChart, SaysWhenThereIsNothingToChart) {
     const BApplication application("test");
     PieChartView view(Area);
@@ -219,6 +243,14 @@ TEST(ChartWindow, TheMenuAndTheCheckBoxChooseWhatIsShown) {
     driver.When("first", Driver::WindowShown("Quorvan"), [&] {
         EXPECT_EQ(pie(), "Value by Investment\nAcme: $100.00 100.00%");
         EXPECT_TRUE(view("value chart view")->IsHidden());
+        EXPECT_EQ(Driver::Window("Quorvan")->windowModality(), Qt::ApplicationModal);
+        QWidget other; // the person works nowhere else meanwhile
+        QPushButton elsewhere(&other);
+        int clicks = 0;
+        QObject::connect(&elsewhere, &QPushButton::clicked, [&clicks] { ++clicks; });
+        other.show();
+        QTest::mouseClick(other.windowHandle(), Qt::LeftButton, {}, elsewhere.geometry().center());
+        EXPECT_EQ(clicks, 0);
     });
     choose("Shares by Investment");
     driver.When(

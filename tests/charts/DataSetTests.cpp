@@ -107,6 +107,10 @@ TEST(ChartGeometry, LegendLinesFollowTheDecimalPlaces) {
     EXPECT_EQ(LegendLine("Acme", 150, 400, 3), "Acme: 150.00 37.50%");
     EXPECT_EQ(LegendLine("Acme", 150, 400, 0), "Acme");
     EXPECT_EQ(LegendLine("None", 0, 400, 2), "None: $0.00 0.00%");
+    const auto letters = [](const std::string& text) { return static_cast<float>(text.size()); };
+    EXPECT_EQ(FittedLegendLine("Maple Timber", 5, 10, 2, 26, letters), "Maple Timber: $5.00 50.00%");
+    EXPECT_EQ(FittedLegendLine("Maple Timber", 5, 10, 2, 25, letters), "Maple Ti...: $5.00 50.00%");
+    EXPECT_EQ(FittedLegendLine("Maple Timber", 5, 10, 0, 8, letters), "Maple...");
     EXPECT_EQ(LegendLine("Huge", -3e38F, 3e38F, 2).substr(0, 14), "Huge: $-300000");
 }
 
