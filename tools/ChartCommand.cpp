@@ -1,11 +1,13 @@
 #include "tools/ChartCommand.h"
 
 #include <CLI/CLI.hpp>
+#include <cmath>
 #include <cstring>
 #include <filesystem>
 #include <iostream>
 #include <memory>
 #include <optional>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include "charts/ChartWindow.h"
@@ -56,15 +58,35 @@ int Fail(const std::string& sentence, int status = Failed) {
     return status;
 }
 
-// A file that exists keeps its permissions, and a link to it stays a link.
-int Write(const std::string& path, const std::string& bytes) {
+struct OutputTarget {
+    std::string path;
+    mode_t mode;
+};
+
+// A file that exists keeps its permissions, and a link to it stays a link. Nothing, with errno telling why,
+// when there is something that a picture must not replace.
+std::optional<OutputTarget> TargetOf(const std::string& path) {
     std::error_code missing;
-    const std::filesystem::path existing = std::filesystem::canonical(path, missing);
-    const std::string target = missing ? path : existing.string();
-    const mode_t mode =
-        missing ? 0644 : static_cast<mode_t>(std::filesystem::status(existing).permissions()) & 0777;
-    if (WriteWholeFile(target, target + ".part" + std::to_string(getpid()), bytes, mode,
-                       ExistingFile::Replace))
+    const std::string existing = std::filesystem::canonical(path, missing).string();
+    if (missing) {
+        const mode_t mask = umask(0);
+        umask(mask);
+        return OutputTarget{path, 0666 & ~mask};
+    }
+    struct stat status {};
+    if (stat(existing.c_str(), &status) != 0 || access(existing.c_str(), W_OK) != 0)
+        return std::nullopt;
+    if (!S_ISREG(status.st_mode)) {
+        errno = S_ISDIR(status.st_mode) ? EISDIR : EOPNOTSUPP;
+        return std::nullopt;
+    }
+    return OutputTarget{existing, status.st_mode & 0777U};
+}
+
+int Write(const std::string& path, const std::string& bytes) {
+    const std::optional<OutputTarget> target = TargetOf(path);
+    if (target && WriteWholeFile(target->path, target->path + ".part" + std::to_string(getpid()), bytes,
+                                 target->mode, ExistingFile::Replace))
         return 0;
     return Fail(path + " cannot be written: " + std::strerror(errno));
 }
@@ -97,6 +119,8 @@ int RunChart(ChartOptions& options) {
     const std::optional<PictureFormat> format = FormatOf(options.output);
     if (!format)
         return Fail("the name of the picture must end with .png, .svg or .pdf", WrongUse);
+    if (std::isnan(options.scale)) // which no range keeps out
+        return Fail("the scale must be a number", WrongUse);
     if (options.home.empty())
         options.home = DefaultHomeFolder();
     const auto investments = OpenInvestments(options.home, options.portfolio, std::cerr);
