@@ -6,6 +6,7 @@
 #include <QGridLayout>
 #include <QLabel>
 #include <QProgressBar>
+#include <QTimer>
 
 #include "platform/private/Loop.h"
 #include "platform/private/ViewPeer.h"
@@ -13,6 +14,9 @@
 namespace {
 
 constexpr int kSteps = 10000; // of the toolkit's bar, which counts in whole numbers
+// As often as an eye can follow: painting every change would slow down a worker that makes a thousand of them
+// in a second.
+constexpr int kRefreshMilliseconds = 30;
 
 // The bar with its texts above. Owns its children.
 class StatusWidget : public QWidget {
@@ -115,7 +119,9 @@ void BStatusBar::ScheduleRefresh() {
     if (refreshPending_)
         return;
     refreshPending_ = true;
-    RunOnInterfaceThread([this] { Refresh(); }, ViewAccess::Widget(this));
+    RunOnInterfaceThread(
+        [this] { QTimer::singleShot(kRefreshMilliseconds, Widget(this), [this] { Refresh(); }); },
+        ViewAccess::Widget(this));
 }
 
 void BStatusBar::Refresh() {
