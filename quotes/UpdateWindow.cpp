@@ -14,6 +14,7 @@
 #include "util/DebugLog.h"
 #include "util/InterfaceHelpers.h"
 #include "util/Numbers.h"
+#include "util/WholeFile.h"
 
 namespace {
 
@@ -21,6 +22,7 @@ constexpr const char* MainWindowTitle = "Quorvan";
 constexpr float Width = 200;
 constexpr float Height = 60;
 constexpr float Margin = 10;
+constexpr std::size_t MaxSources = 1'000'000;
 constexpr bigtime_t LockPatience = 20'000; // microseconds between looks at the stop request
 
 std::vector<int32> RecordNumbers(const ColumnListView* list) {
@@ -31,10 +33,6 @@ std::vector<int32> RecordNumbers(const ColumnListView* list) {
             numbers.push_back(static_cast<const NorvelItem*>(list->ItemAt(i))->RecordNumber());
     }
     return numbers;
-}
-
-void Log(const std::string& line) {
-    PrintDebugStatement(line.c_str(), app_state->logPath);
 }
 
 } // namespace
@@ -90,10 +88,19 @@ int32 UpdateWindow::updateThread(void* window) {
 }
 
 void UpdateWindow::UpdateAll() {
+    // Whatever is wrong with the file, GetPriceQuote tells.
+    static_cast<void>(ReadWholeFile(app_state->quoteSourcePath, sources_, MaxSources));
     for (const int32 recordNumber : recordNumbers_) {
         if (thread_stop_requested() || !UpdateOne(recordNumber))
-            return;
+            break;
     }
+    WriteLog();
+}
+
+void UpdateWindow::WriteLog() {
+    if (!log_.empty())
+        PrintDebugStatement(log_.c_str(), app_state->logPath);
+    log_.clear();
 }
 
 bool UpdateWindow::UpdateOne(int32 recordNumber) {
@@ -111,11 +118,13 @@ bool UpdateWindow::UpdateOne(int32 recordNumber) {
     }
     Log("Checking price for '" + ticker + "'\n");
     ShowTicker(ticker.c_str());
+    WriteLog();
     QuoteContext context;
     context.sourcePath = app_state->quoteSourcePath;
     context.logPath = app_state->logPath;
     context.stopFd = thread_stop_fd();
-    const float quote = GetPriceQuote(ticker.c_str(), context);
+    const float quote = sources_.empty() ? GetPriceQuote(ticker.c_str(), context)
+                                         : GetPriceQuoteFrom(sources_, ticker.c_str(), context);
     // Whatever a call that was cut short answers, it says nothing about the price.
     if (thread_stop_requested())
         return false;
@@ -130,6 +139,7 @@ bool UpdateWindow::UpdateOne(int32 recordNumber) {
 
 bool UpdateWindow::Apply(float quote, int32 recordNumber, INVESTMENT_DATA* record) {
     if (ApplyQuote(*record, quote) == QuoteOutcome::Failed) {
+        WriteLog();
         TellNotConnected();
         return false;
     }
