@@ -59,5 +59,6 @@ class UpdateWindow : public BWindow {
     DATABASE* database_;
     std::string portfolioName_;
     std::string log_;       // the worker's, not yet written
+    std::string sources_;   // the quote-source file, read once for the run; empty when it cannot be
     BMessenger mainWindow_; // found at the start, on the thread on which windows come and go
 };
