@@ -5,6 +5,7 @@
 #include <memory>
 
 #include <QApplication>
+#include <QLabel>
 #include <QMessageBox>
 #include <QPushButton>
 #include <QScreen>
@@ -25,17 +26,29 @@ struct AlertText {
     [[nodiscard]] int32 LastButton() const { return static_cast<int32>(buttons.size()) - 1; }
 };
 
-QMessageBox::Icon IconOf(alert_type type) {
+struct AlertLook {
+    QMessageBox::Icon icon;
+    const char* name; // of the icon, for who does not see it
+};
+
+AlertLook LookOf(alert_type type) {
     switch (type) {
     case B_EMPTY_ALERT:
-        return QMessageBox::NoIcon;
+        return {QMessageBox::NoIcon, ""};
     case B_WARNING_ALERT:
-        return QMessageBox::Warning;
+        return {QMessageBox::Warning, "Warning"};
     case B_STOP_ALERT:
-        return QMessageBox::Critical;
+        return {QMessageBox::Critical, "Error"};
     default:
-        return QMessageBox::Information;
+        return {QMessageBox::Information, "Information"};
     }
+}
+
+void ShowIcon(QMessageBox& box, const AlertLook& look) {
+    box.setIcon(look.icon);
+    for (QLabel* label : box.findChildren<QLabel*>())
+        if (!label->pixmap().isNull())
+            label->setAccessibleName(QString::fromUtf8(look.name));
 }
 
 // In every desktop's order of buttons, those of the action role stand as they were added.
@@ -75,7 +88,7 @@ int32 ShowAlert(const AlertText& alert, const std::function<bool()>& cancelled) 
     box.setWindowModality(Qt::ApplicationModal);
     box.setTextFormat(Qt::PlainText);
     box.setText(QString::fromStdString(alert.text));
-    box.setIcon(IconOf(alert.type));
+    ShowIcon(box, LookOf(alert.type));
     const std::vector<QPushButton*> buttons = AddButtons(box, alert);
     PlaceAbove(box, QApplication::activeWindow());
     RunDialog(box, cancelled);

@@ -13,6 +13,7 @@
 #include <QTimer>
 
 #include "platform/Window.h"
+#include "platform/private/AccessibleRoles.h"
 #include "platform/private/ApplicationPeer.h"
 #include "platform/private/Convert.h"
 #include "platform/private/KernelThreads.h"
@@ -54,6 +55,7 @@ BApplication::BApplication(const char* signature)
     // The loop ends when the application says so, not when a start-up dialog closes before the first window
     // opens.
     QApplication::setQuitOnLastWindowClosed(false);
+    NameAccessibleRoles();
     OpenInterfaceThread();
     ApplicationAccess::WatchModifiers(*peer_->toolkit);
     FontAccess::MakeSystemFonts();

@@ -18,6 +18,7 @@ BMenuBar::BMenuBar(BRect frame, const char* name, uint32 resizingMode, menu_layo
       BMenu(name, layout, std::make_unique<MenuPeer>(ViewAccess::Widget(this))),
       resizeToFit_(resizeToFit) {
     Widget(this)->setNativeMenuBar(false);
+    Widget(this)->setAccessibleName(QString::fromUtf8(BView::Name()));
     MenuPeer& peer = MenuAccess::Peer(*this);
     peer.shower = this;
     peer.itemsChanged = [this] { FitHeight(); };

@@ -129,9 +129,10 @@ BTextControl::BTextControl(BRect frame, const char* name, const char* label, con
     });
 }
 
-// A line that loses the focus as it goes must not call back.
+// A line that loses the focus as it goes must not call back. Others who want to hear of its end still do.
 BTextControl::~BTextControl() {
-    Line(this)->disconnect();
+    QObject::disconnect(Line(this), &QLineEdit::returnPressed, Line(this), nullptr);
+    QObject::disconnect(Line(this), &QLineEdit::editingFinished, Line(this), nullptr);
 }
 
 void BTextControl::Send() {

@@ -97,7 +97,7 @@ void ViewAccess::NotePointer(BView* view, BPoint where, uint32 buttons) {
 BView::BView(BRect frame, const char* name, uint32 resizingMode, uint32 flags)
     : BView(frame, name, resizingMode, flags, std::make_unique<ViewPeer>(new ViewWidget(this))) {
     peer_->widget->setAccessibleName(QString::fromUtf8(Name()));
-    peer_->widget->setFocusPolicy(flags & B_NAVIGABLE ? Qt::StrongFocus : Qt::NoFocus);
+    peer_->widget->setFocusPolicy(flags & B_NAVIGABLE ? Qt::TabFocus : Qt::NoFocus);
     ContrastWith(viewColor_, peer_->widget);
 }
 
@@ -122,7 +122,9 @@ void BView::SetName(const char* name) {
 }
 
 void BView::SetAccessibleName(const char* name) {
-    peer_->widget->setAccessibleName(QString::fromUtf8(name));
+    QWidget* worked =
+        peer_->widget->focusProxy(); // of a control in several parts: the one that a person works
+    (worked ? worked : peer_->widget.data())->setAccessibleName(QString::fromUtf8(name));
 }
 
 BLooper* BView::Looper() const {
@@ -198,6 +200,10 @@ void BView::FrameResized(float, float) {}
 void BView::MouseDown(BPoint) {}
 
 void BView::MouseUp(BPoint) {}
+
+bool BView::KeyDown(char) {
+    return false;
+}
 
 BRect BView::Frame() const {
     return frame_;

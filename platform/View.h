@@ -28,6 +28,7 @@ constexpr uint32 B_FOLLOW_ALL = B_FOLLOW_ALL_SIDES;
 
 constexpr uint32 B_WILL_DRAW = 0x01;
 constexpr uint32 B_FRAME_EVENTS = 0x02;
+// The keyboard reaches the view by Tab.
 constexpr uint32 B_NAVIGABLE = 0x04;
 
 enum drawing_mode { B_OP_COPY, B_OP_OVER };
@@ -39,6 +40,15 @@ constexpr uint32 B_TERTIARY_MOUSE_BUTTON = 4;
 constexpr uint32 B_SHIFT_KEY = 1;
 constexpr uint32 B_COMMAND_KEY = 2;
 constexpr uint32 B_CONTROL_KEY = 4;
+
+// The keys that a view hears of beside printable ASCII characters.
+constexpr char B_HOME = 0x01;
+constexpr char B_END = 0x04;
+constexpr char B_ENTER = 0x0a;
+constexpr char B_LEFT_ARROW = 0x1c;
+constexpr char B_RIGHT_ARROW = 0x1d;
+constexpr char B_UP_ARROW = 0x1e;
+constexpr char B_DOWN_ARROW = 0x1f;
 
 // The modifier keys held down as of the last event. Any thread.
 uint32 modifiers();
@@ -82,6 +92,9 @@ class BView : public BHandler {
     virtual void FrameResized(float width, float height);
     virtual void MouseDown(BPoint where);
     virtual void MouseUp(BPoint where);
+    // A key was pressed while the view has the focus (see B_NAVIGABLE), with no modifier key but Shift held.
+    // False lets the key go on to the window, where Enter and Escape have their meaning.
+    virtual bool KeyDown(char key);
     // What assistive technology calls the view; UTF-8. At first its name, or a control's label.
     void SetAccessibleName(const char* name);
     // The text that assistive technology reads for this view beside its name; UTF-8. The base has none.

@@ -33,7 +33,7 @@ class LabelledBox : public QWidget {
     void resizeEvent(QResizeEvent* event) override;
 
   private:
-    QLabel* label_;
+    QLabel* label_ = nullptr; // there is none without a text
     QWidget* field_;
     int divider_ = 0;
     bool limited_ = false;

@@ -1,5 +1,6 @@
 #include "platform/private/ViewWidget.h"
 
+#include <QKeyEvent>
 #include <QMouseEvent>
 #include <QPaintEvent>
 #include <QPainter>
@@ -12,6 +13,27 @@
 namespace {
 
 constexpr int kRepaintMilliseconds = 5;
+
+struct KeyCode {
+    int toolkit;
+    char ours;
+};
+constexpr KeyCode kKeyCodes[] = {{Qt::Key_Home, B_HOME},       {Qt::Key_End, B_END},
+                                 {Qt::Key_Return, B_ENTER},    {Qt::Key_Enter, B_ENTER},
+                                 {Qt::Key_Left, B_LEFT_ARROW}, {Qt::Key_Right, B_RIGHT_ARROW},
+                                 {Qt::Key_Up, B_UP_ARROW},     {Qt::Key_Down, B_DOWN_ARROW}};
+
+// 0 for a key that views do not hear of.
+char OurKey(const QKeyEvent& event) {
+    if (event.modifiers() & ~(Qt::ShiftModifier | Qt::KeypadModifier))
+        return 0;
+    for (const KeyCode& code : kKeyCodes)
+        if (code.toolkit == event.key())
+            return code.ours;
+    const QString text = event.text();
+    return text.size() == 1 && text[0] >= QLatin1Char(' ') && text[0] <= QLatin1Char('~') ? text[0].toLatin1()
+                                                                                          : '\0';
+}
 
 } // namespace
 
@@ -46,6 +68,14 @@ void ViewWidget::paintEvent(QPaintEvent* event) {
     const QString description = QString::fromStdString(owner_->AccessibleDescription());
     if (description != accessibleDescription())
         setAccessibleDescription(description);
+}
+
+// At once and not by message, since the answer decides who gets the key.
+void ViewWidget::keyPressEvent(QKeyEvent* event) {
+    const char key = OurKey(*event);
+    const InterfaceLock lock(owner_->Looper());
+    if (key == '\0' || !lock.IsHeld() || !owner_->KeyDown(key))
+        QWidget::keyPressEvent(event);
 }
 
 void ViewWidget::mousePressEvent(QMouseEvent* event) {

@@ -255,6 +255,18 @@ TEST(TextControls, SendOnEnterAndOnLeavingAChangedText) {
     EXPECT_EQ(stage.Received(1), Codes{1});
 }
 
+// The toolkit's own record of what assistive technology was told would keep a line that has gone.
+TEST(TextControls, LetOthersHearOfTheirEnd) {
+    Stage stage;
+    auto* text = stage.Add(new BTextControl(BRect(10, 90, 309, 92), "text", "Text", "", nullptr));
+    stage.Show();
+    bool heard = false;
+    QObject::connect(stage.Find<QLineEdit>("text"), &QObject::destroyed, [&] { heard = true; });
+    ASSERT_TRUE(stage.window->RemoveChild(text));
+    delete text;
+    EXPECT_TRUE(heard);
+}
+
 TEST(StatusBars, ShowWhatAWorkerTellsThem) {
     Stage stage;
     auto* bar = stage.Add(new BStatusBar(BRect(10, 10, 190, 50), "bar", "Checking:", " %"));
