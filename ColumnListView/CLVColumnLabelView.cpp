@@ -13,7 +13,8 @@ constexpr rgb_color kBackground{216, 216, 216, 255};
 constexpr rgb_color kLight{255, 255, 255, 255};
 constexpr rgb_color kShadow{152, 152, 152, 255};
 constexpr rgb_color kHighlight{0, 0, 229, 255};
-constexpr float kDragReach = 2; // sideways moves up to here are still a click
+constexpr float kDragReach = 2;  // sideways moves up to here are still a click
+constexpr float kWidthStep = 10; // of a key press
 
 uint32 Field(const BMessage* message, const char* name, uint32 fallback) {
     auto value = static_cast<int32>(fallback);
@@ -25,7 +26,8 @@ uint32 Field(const BMessage* message, const char* name, uint32 fallback) {
 } // namespace
 
 CLVColumnLabelView::CLVColumnLabelView(BRect frame, ColumnListView* list, const BFont* font)
-    : BView(frame, "column labels", B_FOLLOW_LEFT_RIGHT | B_FOLLOW_TOP, B_WILL_DRAW), list_(list) {
+    : BView(frame, "column labels", B_FOLLOW_LEFT_RIGHT | B_FOLLOW_TOP, B_WILL_DRAW | B_NAVIGABLE),
+      list_(list) {
     SetFont(font);
     SetViewColor(kBackground);
     font_height height;
@@ -146,6 +148,65 @@ void CLVColumnLabelView::Sort(int32 column, uint32 modifierKeys) {
         list_->SetSortKey(column);
 }
 
+// --- the keyboard ---
+
+std::vector<CLVColumn*> CLVColumnLabelView::MarkableColumns() const {
+    std::vector<CLVColumn*> columns;
+    for (CLVColumn* column : list_->ColumnsInDisplayOrder())
+        if (column->IsShown() && column->GetLabel())
+            columns.push_back(column);
+    return columns;
+}
+
+CLVColumn* CLVColumnLabelView::MarkedColumn() const {
+    const std::vector<CLVColumn*> columns = MarkableColumns();
+    const auto found = std::find(columns.begin(), columns.end(), list_->ColumnAt(marked_));
+    return found != columns.end() ? *found : columns.empty() ? nullptr : columns.front();
+}
+
+void CLVColumnLabelView::MoveMark(char key) {
+    const std::vector<CLVColumn*> columns = MarkableColumns();
+    auto at = std::find(columns.begin(), columns.end(), MarkedColumn());
+    if (key == B_HOME)
+        at = columns.begin();
+    else if (key == B_END)
+        at = columns.end() - 1;
+    else if (key == B_LEFT_ARROW && at != columns.begin())
+        --at;
+    else if (key == B_RIGHT_ARROW && at != columns.end() - 1)
+        ++at;
+    marked_ = list_->IndexOfColumn(*at);
+    list_->ScrollToColumn(**at);
+    Invalidate();
+}
+
+bool CLVColumnLabelView::KeyDown(char key) {
+    CLVColumn* column = MarkedColumn();
+    if (!column)
+        return false;
+    const bool resizable = (column->Flags() & CLVF_FIXED_WIDTH) == 0;
+    switch (key) {
+    case B_LEFT_ARROW:
+    case B_RIGHT_ARROW:
+    case B_HOME:
+    case B_END:
+        MoveMark(key);
+        return true;
+    case ' ':
+    case B_ENTER:
+        Sort(list_->IndexOfColumn(column), modifiers());
+        Invalidate();
+        return true;
+    case '+':
+    case '-':
+        if (resizable)
+            column->SetWidth(column->Width() + (key == '+' ? kWidthStep : -kWidthStep));
+        return true;
+    default:
+        return false;
+    }
+}
+
 int32 CLVColumnLabelView::PressedGroup() const {
     const std::vector<CLVColumn*>& order = list_->ColumnsInDisplayOrder();
     const auto found = std::find(order.begin(), order.end(), press_.column);
@@ -207,6 +268,10 @@ void CLVColumnLabelView::DrawCell(CLVColumn& column, BRect cell, bool joinsPrevi
         list_->IsSortKey(list_->IndexOfColumn(&column)) && column.SortMode() != CLVSortMode::None;
     column.headerRect_ = cell;
     column.DrawColumnHeader(this, cell, isKey, isPressed && press_.action != Action::Resize, ascent_);
+    if (IsFocus() && MarkedColumn() == &column) {
+        SetHighColor(kHighlight);
+        StrokeRect({cell.left + 2, cell.top + 2, cell.right - 2, cell.bottom - 2});
+    }
     ConstrainClippingRegion(nullptr);
 }
 
@@ -232,16 +297,17 @@ void CLVColumnLabelView::DrawOutline() {
     StrokeRect({left, bounds.top, left + width, bounds.bottom});
 }
 
+std::string CLVColumnLabelView::Describe(const CLVColumn& column) const {
+    std::string text = column.GetLabel();
+    if (list_->IsSortKey(list_->IndexOfColumn(&column)))
+        text += column.SortMode() == CLVSortMode::Ascending ? " (sorted ascending)" : " (sorted descending)";
+    return text;
+}
+
 std::string CLVColumnLabelView::AccessibleDescription() const {
     std::string description;
-    for (const CLVColumn* column : list_->ColumnsInDisplayOrder()) {
-        if (!column->IsShown() || !column->GetLabel())
-            continue;
-        description += description.empty() ? "Columns: " : ", ";
-        description += column->GetLabel();
-        if (list_->IsSortKey(list_->IndexOfColumn(column)))
-            description +=
-                column->SortMode() == CLVSortMode::Ascending ? " (sorted ascending)" : " (sorted descending)";
-    }
-    return description;
+    for (const CLVColumn* column : MarkableColumns())
+        description += (description.empty() ? "Columns: " : ", ") + Describe(*column);
+    const CLVColumn* marked = IsFocus() ? MarkedColumn() : nullptr;
+    return marked ? Describe(*marked) + ". " + description : description;
 }

@@ -10,8 +10,10 @@ class ColumnListView;
 class MouseWatcher;
 
 // The header row of a ColumnListView: draws one raised cell for each shown column and turns presses on cells
-// and borders into the list's operations. It keeps nothing but the press under way; columns, their places and
-// the sort keys are the list's. Its coordinates are the list's sideways, so both scroll alike.
+// and borders into the list's operations. By keyboard, reached with Tab, a mark goes from cell to cell with
+// Left, Right, Home and End; Space and Enter do what a click does, plus and minus make the column wider and
+// narrower. It keeps nothing but the press under way and the mark; columns, their places and the sort keys
+// are the list's. Its coordinates are the list's sideways, so both scroll alike.
 //
 // The container of the list owns it. Interface thread, with the window's lock held; the pointer is followed
 // by a MouseWatcher, whose messages this view answers.
@@ -30,9 +32,11 @@ class CLVColumnLabelView : public BView {
     void Draw(BRect updateRect) override;
     void MouseDown(BPoint where) override;
     void MouseUp(BPoint where) override;
+    bool KeyDown(char key) override;
     void MessageReceived(BMessage* message) override;
     void DetachedFromWindow() override;
-    // The shown columns' labels from left to right, each sort key with its direction.
+    // The shown columns' labels from left to right, each sort key with its direction; before them the marked
+    // one while the keyboard is here.
     [[nodiscard]] std::string AccessibleDescription() const override;
 
   private:
@@ -56,6 +60,13 @@ class CLVColumnLabelView : public BView {
     void DragTo(float x);
     void Sort(int32 column, uint32 modifiers);
 
+    // The shown columns that have a label, from left to right: where the keyboard's mark can stand.
+    [[nodiscard]] std::vector<CLVColumn*> MarkableColumns() const;
+    // Null while there is none to mark.
+    [[nodiscard]] CLVColumn* MarkedColumn() const;
+    void MoveMark(char key);
+    [[nodiscard]] std::string Describe(const CLVColumn& column) const;
+
     [[nodiscard]] int32 PressedGroup() const;
     void DrawCell(CLVColumn& column, BRect cell, bool joinsPrevious, bool joinsNext);
     void DrawBevel(BRect cell, bool joinsPrevious, bool joinsNext, bool resizing);
@@ -64,6 +75,7 @@ class CLVColumnLabelView : public BView {
     ColumnListView* list_;
     float ascent_; // of the label font, rounded
     Press press_;
+    int32 marked_ = 0;     // the index of the column with the keyboard's mark
     int32 pressCount_ = 0; // tells a watcher's late messages from those of the press under way
     std::unique_ptr<MouseWatcher> watcher_;
 };

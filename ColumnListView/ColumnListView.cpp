@@ -328,6 +328,12 @@ HeaderHit ColumnListView::HitTestHeader(float x) const {
     return HitHeader(Shapes(), layout_, x);
 }
 
+void ColumnListView::ScrollToColumn(const CLVColumn& column) {
+    const BRect seen = Bounds();
+    const float left = std::max(seen.left, seen.left + column.End() - seen.right);
+    ScrollTo({std::min(left, column.Begin()), seen.top});
+}
+
 BRect ColumnListView::ColumnFrame(const CLVListItem& row, const CLVColumn& column,
                                   const BRect& rowRect) const {
     const bool indents = column.pushed_ || (column.flags_ & CLVF_EXPANDER) != 0;

@@ -147,6 +147,8 @@ class ColumnListView : public BListView {
     [[nodiscard]] const std::vector<CLVColumn*>& ColumnsInDisplayOrder() const { return displayOrder_; }
     [[nodiscard]] const std::vector<DragGroup>& DragGroups() const { return dragGroups_; }
     [[nodiscard]] HeaderHit HitTestHeader(float x) const;
+    // Scrolls sideways, no further than needed, until the shown column is seen.
+    void ScrollToColumn(const CLVColumn& column);
     // Moves a drag group to the other side of another: see MoveGroup.
     void MoveDragGroup(int32 dragged, int32 target);
     // The right edge of the last shown column; -1 when none is shown.

@@ -217,6 +217,46 @@ TEST(Header, SortsByClicks) {
               "Columns: Name (sorted descending), Type (sorted ascending)");
 }
 
+TEST(Header, IsWorkedByKeys) {
+    PlainWindow w;
+    const auto key = [&](Qt::Key pressed, Qt::KeyboardModifiers with = {}) {
+        QTest::keyClick(QApplication::focusWidget(), pressed, with);
+    };
+    ASSERT_TRUE(QTest::qWaitFor([&] {
+        w.window->Activate();
+        return QApplication::activeWindow() == w.header->window();
+    }));
+    w.list->MakeFocus();
+    key(Qt::Key_Tab);
+    ASSERT_EQ(QApplication::focusWidget(), w.header);
+    EXPECT_EQ(w.HeaderPicture().pixel(23, 5), kBlue); // the status column has nothing to be worked
+    EXPECT_EQ(w.header->accessibleDescription(), "Name. Columns: Name, Type");
+    key(Qt::Key_Right);
+    key(Qt::Key_Right); // there is no further one
+    key(Qt::Key_Space);
+    EXPECT_EQ(w.Shown(), "cba");
+    key(Qt::Key_Home);
+    key(Qt::Key_Return, Qt::ShiftModifier); // a second key
+    EXPECT_EQ(w.Shown(), "cab");
+    EXPECT_EQ(w.list->PrimarySortKey(), 2);
+    key(Qt::Key_Minus);
+    key(Qt::Key_Minus);
+    EXPECT_EQ(w.Width(1), 40);
+    for (int i = 0; i < 50; i++)
+        key(Qt::Key_Plus, Qt::ShiftModifier);
+    EXPECT_EQ(w.Width(1), 540);
+    key(Qt::Key_End); // the last column is brought in sight
+    EXPECT_EQ(w.list->Bounds().right, w.list->ColumnAt(2)->End());
+    key(Qt::Key_Left);
+    EXPECT_EQ(w.list->Bounds().left, w.list->ColumnAt(1)->Begin());
+    w.Click(50); // the mouse leaves the keyboard where it is
+    EXPECT_EQ(QApplication::focusWidget(), w.header);
+    w.list->MakeFocus();
+    w.Click(50);
+    EXPECT_NE(QApplication::focusWidget(), w.header);
+    EXPECT_EQ(CountPixels(w.HeaderPicture(), w.header->rect(), kBlue), 0);
+}
+
 TEST(Header, MissesNoQuickPress) {
     PlainWindow w;
     for (int i = 0; i < 2; i++) { // both within one look of the watcher
