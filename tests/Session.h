@@ -13,6 +13,7 @@
 #include <vector>
 
 #include <fcntl.h>
+#include <sys/prctl.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -36,6 +37,7 @@ class Process {
     explicit Process(const std::vector<std::string>& command, int kept = -1) : id_(fork()) {
         if (id_ != 0)
             return;
+        prctl(PR_SET_PDEATHSIG, SIGTERM); // should the test crash
         std::vector<char*> arguments;
         arguments.reserve(command.size() + 1);
         for (const std::string& each : command)
@@ -90,10 +92,12 @@ class Server {
     std::string place_;
 };
 
-// A display server that chooses a free display by itself; it is the test's display from then on.
+// A display server that chooses a free display by itself; it is the test's display from then on. It does not
+// start afresh when a client is the last to go, just as the next one comes.
 class Display {
   public:
-    Display() : server_({"Xvfb", "-screen", "0", "1024x768x24", "-nolisten", "tcp", "-displayfd", ""}) {
+    Display()
+        : server_({"Xvfb", "-screen", "0", "1024x768x24", "-nolisten", "tcp", "-noreset", "-displayfd", ""}) {
         setenv("DISPLAY", (":" + server_.Place()).c_str(), 1);
         setenv("QT_QPA_PLATFORM", "xcb", 1);
     }
