@@ -192,9 +192,13 @@ void ValueChartView::DrawLegend() {
 }
 
 std::string ValueChartView::AccessibleDescription() const {
-    std::string description = std::string(Title) + ": " + Whole(currentValue_) + " in " +
-                              std::to_string(year_) + ", and in " + std::to_string(year_ + GrowthYears);
+    std::string description(Title);
+    description.append(": ").append(Whole(currentValue_)).append(" in ").append(std::to_string(year_));
+    description.append(", and in ").append(std::to_string(year_ + GrowthYears));
     for (std::size_t row = 0; row < RowsInUse(); ++row)
-        description += "\n" + Percent(Percentages[row]) + ": " + Whole(points_[row].back());
+        description.append("\n")
+            .append(Percent(Percentages[row]))
+            .append(": ")
+            .append(Whole(points_[row].back()));
     return description;
 }
