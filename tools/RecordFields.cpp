@@ -215,8 +215,8 @@ std::string ParseColumn(std::string_view text, COLUMN_ENTRY* column) {
         return "a column's name has 1 to 31 bytes without blanks, unlike '" + std::string(parts[0]) + "'";
     const auto* const type = std::find(TypeNames.begin(), TypeNames.end(), parts[1]);
     if (type == TypeNames.end())
-        return "'" + std::string(parts[1]) +
-               "' is none of the types string, byte, short, long, float, date, time";
+        return std::string("'").append(parts[1]).append(
+            "' is none of the types string, byte, short, long, float, date, time");
     column->type = static_cast<std::int8_t>(type - TypeNames.begin());
     column->size = -1;
     const bool hasWidth = parts.size() > 2 && !parts[2].empty();
