@@ -14,20 +14,20 @@ struct MenuState {
     bool noPortfolio, noInvestment, investments;
 };
 constexpr MenuState MenuStates[] = {
-    {1000, true, true, true},    // Settings
-    {1010, true, true, true},    // Portfolio Add
-    {1011, false, true, true},   // Edit
-    {1012, false, true, true},   // Del
-    {1013, false, false, true},  // Chart
-    {1014, false, false, true},  // Print
-    {1016, false, false, true},  // Update prices
-    {1020, false, true, true},   // Investment Add
-    {1021, false, false, true},  // Edit
-    {1022, false, false, true},  // Del
-    {1023, false, false, true},  // Cut
-    {1024, false, false, true},  // Copy
-    {1025, false, true, true},   // Paste
-    {1030, true, true, true},    // Help
+    {1000, true, true, true},   // Settings
+    {1010, true, true, true},   // Portfolio Add
+    {1011, false, true, true},  // Edit
+    {1012, false, true, true},  // Del
+    {1013, false, false, true}, // Chart
+    {1014, false, false, true}, // Print
+    {1016, false, false, true}, // Update prices
+    {1020, false, true, true},  // Investment Add
+    {1021, false, false, true}, // Edit
+    {1022, false, false, true}, // Del
+    {1023, false, false, true}, // Cut
+    {1024, false, false, true}, // Copy
+    {1025, false, true, true},  // Paste
+    {1030, true, true, true},   // Help
     {B_ABOUT_REQUESTED, true, true, true},
     {B_QUIT_REQUESTED, true, true, true},
 };
