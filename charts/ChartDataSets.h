@@ -25,18 +25,18 @@ inline constexpr std::uint32_t SharesChart = 2006;
 inline constexpr std::uint32_t GrowthChart = 2007; // the one without a data set
 struct ChartInfo {
     std::uint32_t code;
-    const char* title;
     int decimalPlaces;
+    const char* title;
 };
 inline constexpr ChartInfo Charts[] = {
-    {FirstChart, "Value by Investment", 2},
-    {2001, "Value by Ticker", 2},
-    {2002, "Value by Type", 2},
-    {2003, "Value by Category", 2},
-    {2004, "Value by Risk", 2},
-    {2005, "Value by Retirement", 2},
-    {SharesChart, "Shares by Investment", 3},
-    {GrowthChart, "Value over Time", 2},
+    {FirstChart, 2, "Value by Investment"},
+    {2001, 2, "Value by Ticker"},
+    {2002, 2, "Value by Type"},
+    {2003, 2, "Value by Category"},
+    {2004, 2, "Value by Risk"},
+    {2005, 2, "Value by Retirement"},
+    {SharesChart, 3, "Shares by Investment"},
+    {GrowthChart, 2, "Value over Time"},
 };
 
 // The slices of the seven pie charts, added up from a portfolio's investments. It reads no file and draws
