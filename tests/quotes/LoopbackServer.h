@@ -107,7 +107,8 @@ class LoopbackServer {
         thread_ = std::thread([this] { Run(); });
     }
     // The same reply for every connection.
-    explicit LoopbackServer(const Reply& reply) : LoopbackServer([reply](const std::string&) { return reply; }) {}
+    explicit LoopbackServer(const Reply& reply)
+        : LoopbackServer([reply](const std::string&) { return reply; }) {}
     LoopbackServer(const LoopbackServer&) = delete;
     LoopbackServer& operator=(const LoopbackServer&) = delete;
     ~LoopbackServer() {
