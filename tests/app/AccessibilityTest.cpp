@@ -111,6 +111,7 @@ class AccessibilityBus {
             child.path = path.path();
             children.push_back(child);
         }
+        list.endArray(); // which lets go of what beginArray made
         return children;
     }
     [[nodiscard]] Element Whole(const Element& top) {
