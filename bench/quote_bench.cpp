@@ -9,8 +9,10 @@
 #include <fstream>
 
 #include "BenchOptions.h"
+#include "quotes/LastConnection.h"
 #include "quotes/LoopbackServer.h"
 #include "quotes/QuoteRetrieval.h"
+#include "util/GatheredLog.h"
 
 namespace {
 
@@ -48,7 +50,10 @@ int Measure(const OPTIONS& options, const std::string& folder) {
     std::ofstream(sources) << "; a comment as people write it\nnet " << server.Host() << " /q?s= Last 3\n";
     QuoteContext context;
     context.sourcePath = sources.c_str();
-    context.logPath = log.c_str();
+    GatheredLog gathered(log.c_str());
+    context.log = &gathered;
+    LastConnection lastConnection;
+    context.lastConnection = &lastConnection;
     bool right = true;
     double ours = 1e9;
     double bare = 1e9;

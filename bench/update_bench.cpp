@@ -1,10 +1,13 @@
 // Prints how long a price update of the whole program takes beside a bare loop of the same requests, from the
-// first one's arrival at the server to the last one's, and with its window's coming and going; and how long a
-// mouse event waits meanwhile. The server is on loopback; the window is the program's own, on the
+// first one's arrival at the server to the last one's, and with its window's coming and going: the medians
+// of some rounds of both in turns, each on a thread of its own, since the machine's speed drifts and its
+// scheduler is in better luck at times. Then, in a run of its own, how long a mouse event waits during an
+// update. The server is on loopback; the window is the program's own, on the
 // toolkit's offscreen platform unless QT_QPA_PLATFORM says otherwise.
 //
 //   update_bench [--records N] [--rounds N] [--folder PATH]
 
+#include <algorithm>
 #include <atomic>
 #include <chrono>
 #include <cstdio>
@@ -14,6 +17,7 @@
 #include <mutex>
 #include <string>
 #include <thread>
+#include <vector>
 
 #include <QWidget>
 
@@ -103,39 +107,94 @@ class MouseProbe : public QObject {
     std::thread poster_;
 };
 
-// One update in the program, from the command to the progress window's end.
-class UpdateRun : public StepDriver {
+// What any client has to do for the same pages.
+bool AskBare(std::uint16_t port, long records) {
+    for (long i = 0; i < records; ++i) {
+        const int fd = socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0);
+        sockaddr_in address{};
+        address.sin_family = AF_INET;
+        address.sin_port = htons(port);
+        address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+        const std::string request = "GET /quote/T" + std::to_string(i) + " HTTP/1.0\n\n";
+        bool asked = connect(fd, reinterpret_cast<sockaddr*>(&address), sizeof address) == 0 &&
+                     send(fd, request.data(), request.size(), MSG_NOSIGNAL) > 0;
+        char bytes[1024];
+        while (asked && recv(fd, bytes, sizeof bytes, 0) > 0) {
+        }
+        close(fd);
+        if (!asked)
+            return false;
+    }
+    return true;
+}
+
+double Median(std::vector<double> values) {
+    const auto middle = values.begin() + static_cast<std::ptrdiff_t>(values.size() / 2);
+    std::nth_element(values.begin(), middle, values.end());
+    return values.empty() ? 0 : *middle;
+}
+
+struct Times {
+    std::vector<double> prices;
+    std::vector<double> withWindow;
+    std::vector<double> bare;
+    std::vector<double> ratios; // of each round
+    double longestWait = 0;
+    int mouseEvents = 0;
+    bool failed = false;
+};
+
+// The program's updates and the bare requests in turns, and at last an update under the mouse.
+class UpdateRuns : public StepDriver {
   public:
-    UpdateRun() {
-        When("the main window", WindowShown("Quorvan"), [this] {
-            probe_ = std::make_unique<MouseProbe>();
+    UpdateRuns(const OPTIONS& options, std::uint16_t port, Arrivals& arrivals, Times& times)
+        : options_(options), port_(port), arrivals_(arrivals), times_(times) {
+        for (int round = 0; round < options.rounds; ++round)
+            AddRound();
+        AddUpdate([this] { probe_ = std::make_unique<MouseProbe>(); },
+                  [this] {
+                      times_.longestWait = probe_->LongestWait();
+                      times_.mouseEvents = probe_->Count();
+                      probe_.reset();
+                      be_app->PostMessage(B_QUIT_REQUESTED);
+                  });
+    }
+
+  protected:
+    void Fail(const std::string& sentence) override {
+        std::fprintf(stderr, "update_bench: %s\n", sentence.c_str());
+        times_.failed = true;
+    }
+
+  private:
+    void AddUpdate(const Action& before, const Action& after) {
+        When("the main window", WindowShown("Quorvan"), [this, before] {
+            before();
             start_ = Clock::now();
             GetAppWindow(be_app, "Quorvan")->PostMessage(MessagePortfolioUpdate);
         });
         When("the progress window", WindowShown(ProgressTitle), [] {});
         When(
-            "the end", [] { return Window(ProgressTitle) == nullptr; },
-            [this] {
-                milliseconds = MillisecondsSince(start_);
-                longestWait = probe_->LongestWait();
-                mouseEvents = probe_->Count();
-                probe_.reset();
-                be_app->PostMessage(B_QUIT_REQUESTED);
-            });
+            "the end", [] { return Window(ProgressTitle) == nullptr; }, after);
+    }
+    void AddRound() {
+        AddUpdate([] {},
+                  [this] {
+                      times_.withWindow.push_back(MillisecondsSince(start_));
+                      times_.prices.push_back(arrivals_.TakeMilliseconds());
+                      std::thread([this] {
+                          if (!AskBare(port_, options_.records))
+                              times_.failed = true;
+                      }).join();
+                      times_.bare.push_back(arrivals_.TakeMilliseconds());
+                      times_.ratios.push_back(times_.prices.back() / times_.bare.back());
+                  });
     }
 
-    double milliseconds = 0;
-    double longestWait = 0;
-    int mouseEvents = 0;
-    bool failed = false;
-
-  protected:
-    void Fail(const std::string& sentence) override {
-        std::fprintf(stderr, "update_bench: %s\n", sentence.c_str());
-        failed = true;
-    }
-
-  private:
+    const OPTIONS& options_;
+    std::uint16_t port_;
+    Arrivals& arrivals_;
+    Times& times_;
     Clock::time_point start_;
     std::unique_ptr<MouseProbe> probe_;
 };
@@ -170,27 +229,6 @@ bool MakeFolder(const std::string& folder, const std::string& host, long records
     return true;
 }
 
-// What any client has to do for the same pages.
-bool AskBare(std::uint16_t port, long records) {
-    for (long i = 0; i < records; ++i) {
-        const int fd = socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0);
-        sockaddr_in address{};
-        address.sin_family = AF_INET;
-        address.sin_port = htons(port);
-        address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
-        const std::string request = "GET /quote/T" + std::to_string(i) + " HTTP/1.0\n\n";
-        bool asked = connect(fd, reinterpret_cast<sockaddr*>(&address), sizeof address) == 0 &&
-                     send(fd, request.data(), request.size(), MSG_NOSIGNAL) > 0;
-        char bytes[1024];
-        while (asked && recv(fd, bytes, sizeof bytes, 0) > 0) {
-        }
-        close(fd);
-        if (!asked)
-            return false;
-    }
-    return true;
-}
-
 } // namespace
 
 int main(int argc, char** argv) {
@@ -213,22 +251,18 @@ int main(int argc, char** argv) {
         std::fprintf(stderr, "update_bench: the folder could not be filled\n");
         return 1;
     }
-    double bare = 1e9;
-    for (int i = 0; i < options.rounds; ++i) {
-        if (!AskBare(server.Port(), options.records))
-            return 1;
-        bare = std::min(bare, arrivals.TakeMilliseconds());
-    }
     BApplication::SetExecutablePath((folder + "/quorvan").c_str());
-    UpdateRun run;
+    Times times;
+    UpdateRuns runs(options, server.Port(), arrivals, times);
     {
         NorvelApp application;
         application.Run();
     }
-    const double prices = arrivals.TakeMilliseconds();
     std::printf("%ld prices: %.1f ms, bare requests %.1f ms: %.2f x; with the window %.1f ms\n",
-                options.records, prices, bare, prices / bare, run.milliseconds);
-    std::printf("%d mouse events meanwhile, the longest wait %.1f ms\n", run.mouseEvents, run.longestWait);
+                options.records, Median(times.prices), Median(times.bare), Median(times.ratios),
+                Median(times.withWindow));
+    std::printf("%d mouse events meanwhile, the longest wait %.1f ms\n", times.mouseEvents,
+                times.longestWait);
     std::filesystem::remove_all(folder);
-    return run.failed ? 1 : 0;
+    return times.failed ? 1 : 0;
 }

@@ -2,12 +2,13 @@
 
 #include <arpa/inet.h>
 #include <cerrno>
+#include <chrono>
 #include <cstring>
 #include <netinet/in.h>
 #include <poll.h>
 #include <string_view>
 #include <sys/socket.h>
-#include <unistd.h>
+#include <utility>
 
 #include "quotes/HostField.h"
 #include "quotes/HostLookup.h"
@@ -20,17 +21,32 @@
 namespace {
 
 constexpr std::size_t BufferSize = 1024; // of the request and of each receive
-constexpr int ShortWait = 10;            // milliseconds; a longer wait is worth the time to write the log
+// A call on the socket waits no longer; then the stop descriptor is waited for as well, and the wait is worth
+// the time to write the log. To poll before every call took a tenth of the time of a request to a near
+// server.
+constexpr std::chrono::milliseconds ShortWait(10);
 
 bool MustWait() {
     return errno == EAGAIN || errno == EWOULDBLOCK || errno == EINTR;
 }
 
+bool LimitWaits(int socket) {
+    timeval limit{};
+    limit.tv_usec = std::chrono::microseconds(ShortWait).count();
+    return setsockopt(socket, SOL_SOCKET, SO_RCVTIMEO, &limit, sizeof limit) == 0 &&
+           setsockopt(socket, SOL_SOCKET, SO_SNDTIMEO, &limit, sizeof limit) == 0;
+}
+
 } // namespace
+
+PlainExchange::PlainExchange(const QuoteContext& context, QuoteReport& report)
+    : context_(context),
+      report_(report),
+      lastConnection_(context.lastConnection ? *context.lastConnection : ownLastConnection_) {}
 
 PlainExchange::~PlainExchange() {
     if (socket_ >= 0)
-        close(socket_);
+        lastConnection_.Keep(socket_);
 }
 
 float PlainExchange::Ask(const HostField& host, const char* path, QuoteScanner& scanner) {
@@ -41,14 +57,21 @@ float PlainExchange::Ask(const HostField& host, const char* path, QuoteScanner& 
         step = Connect(host.port);
     if (step == Step::Done)
         step = Send(path);
+    lastConnection_.Close();
     if (step == Step::Failed)
         return QuoteNetworkFailure;
     if (step == Step::Done)
         step = Receive(scanner);
     if (step == Step::Stopped)
-        return QuoteCancelled;
+        return EndConnection();
     report_.LogNumber("Returning price = ", scanner.Price());
     return scanner.Price();
+}
+
+float PlainExchange::EndConnection() {
+    lastConnection_.Keep(std::exchange(socket_, -1));
+    lastConnection_.Close();
+    return QuoteCancelled;
 }
 
 PlainExchange::Step PlainExchange::Fail(const char* line) {
@@ -58,20 +81,29 @@ PlainExchange::Step PlainExchange::Fail(const char* line) {
     return Step::Failed;
 }
 
+void PlainExchange::ExpectALongWait() {
+    report_.Flush();
+    lastConnection_.Close();
+}
+
 bool PlainExchange::Wait(short events) {
-    Waited waited = WaitUnlessStopped(socket_, events, context_.stopFd, ShortWait);
-    if (waited == Waited::NotYet) {
-        report_.Flush();
-        waited = WaitUnlessStopped(socket_, events, context_.stopFd);
-    }
-    return waited != Waited::Stopped;
+    ExpectALongWait();
+    return WaitUnlessStopped(socket_, events, context_.stopFd) != Waited::Stopped;
+}
+
+bool PlainExchange::IsStoppedMeanwhile() {
+    const auto now = std::chrono::steady_clock::now();
+    if (now - lastLook_ < ShortWait)
+        return false;
+    lastLook_ = now;
+    return IsStopped(context_.stopFd);
 }
 
 PlainExchange::Step PlainExchange::LookUp(const char* host) {
     in_addr address{};
     HostLookup result = HostLookup::Found;
     if (!ReadNumericAddress(host, &address)) {
-        report_.Flush();
+        ExpectALongWait();
         result = LookUpHost(host, context_.stopFd, &address);
     }
     if (result == HostLookup::Stopped)
@@ -81,15 +113,15 @@ PlainExchange::Step PlainExchange::LookUp(const char* host) {
         return Fail("gethostbyname() error");
     }
     address_ = address.s_addr;
-    report_.Log("gethostname() ok\n");
+    report_.LogText("gethostname() ok\n");
     return Step::Done;
 }
 
 PlainExchange::Step PlainExchange::Connect(std::uint16_t port) {
-    socket_ = socket(AF_INET, SOCK_STREAM | SOCK_NONBLOCK | SOCK_CLOEXEC, 0);
-    if (socket_ < 0)
+    socket_ = socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0);
+    if (socket_ < 0 || !LimitWaits(socket_))
         return Fail("socket() error");
-    report_.Log("socket created ok\n");
+    report_.LogText("socket created ok\n");
     sockaddr_in server{};
     server.sin_family = AF_INET;
     server.sin_port = htons(port);
@@ -104,8 +136,9 @@ PlainExchange::Step PlainExchange::Connect(std::uint16_t port) {
     errno = error;
     if (error != 0)
         return Fail("connect() error");
-    report_.Log("connected ok\n");
-    ReportConnection(port);
+    report_.LogText("connected ok\n");
+    if (context_.observer)
+        ReportConnection(port);
     return Step::Done;
 }
 
@@ -121,7 +154,7 @@ PlainExchange::Step PlainExchange::Send(const char* path) {
         errno = EMSGSIZE;
         return Fail("send() error");
     }
-    report_.LogWhole(request);
+    report_.LogText(request);
     std::string_view rest(request);
     while (!rest.empty()) {
         const ssize_t sent = send(socket_, rest.data(), rest.size(), MSG_NOSIGNAL);
@@ -138,20 +171,23 @@ PlainExchange::Step PlainExchange::Send(const char* path) {
 PlainExchange::Step PlainExchange::Receive(QuoteScanner& scanner) {
     char buffer[BufferSize];
     for (;;) {
-        if (!Wait(POLLIN))
-            return Step::Stopped;
         const ssize_t received = recv(socket_, buffer, sizeof buffer, 0);
-        if (received < 0 && MustWait())
+        if (received < 0 && MustWait()) {
+            if (!Wait(POLLIN))
+                return Step::Stopped;
             continue;
+        }
         if (received < 0)
             return Fail("recv() error");
         if (received == 0) {
-            report_.Log("received zero bytes\n");
+            report_.LogText("received zero bytes\n");
             return Step::Failed;
         }
         const std::string_view piece(buffer, static_cast<std::size_t>(received));
         report_.Observer().PieceReceived(piece);
         if (scanner.Scan(piece))
             return Step::Done;
+        if (IsStoppedMeanwhile())
+            return Step::Stopped;
     }
 }

@@ -1,7 +1,9 @@
 #pragma once
 
+#include <chrono>
 #include <cstdint>
-#include <string>
+
+#include "quotes/LastConnection.h"
 
 struct HostField;
 struct QuoteContext;
@@ -15,7 +17,7 @@ class QuoteScanner;
 // A local object of the look-up; what it is given is borrowed.
 class PlainExchange {
   public:
-    PlainExchange(const QuoteContext& context, QuoteReport& report) : context_(context), report_(report) {}
+    PlainExchange(const QuoteContext& context, QuoteReport& report);
     PlainExchange(const PlainExchange&) = delete;
     PlainExchange& operator=(const PlainExchange&) = delete;
     ~PlainExchange();
@@ -32,13 +34,21 @@ class PlainExchange {
     [[nodiscard]] Step Send(const char* path);
     // Failed when the page ended without a price.
     [[nodiscard]] Step Receive(QuoteScanner& scanner);
+    // For a look-up that was stopped: no other will follow.
+    [[nodiscard]] float EndConnection();
     Step Fail(const char* line);
-    // Writes the log when it takes long. False when the caller shall stop.
+    void ExpectALongWait();
+    // Waits for poll events. False when the caller shall stop.
     [[nodiscard]] bool Wait(short events);
+    // For a server that always has something to say, so that nothing is ever waited for.
+    [[nodiscard]] bool IsStoppedMeanwhile();
     void ReportConnection(std::uint16_t port) const;
 
     const QuoteContext& context_;
     QuoteReport& report_;
+    LastConnection ownLastConnection_; // for a caller that has none
+    LastConnection& lastConnection_;
     std::uint32_t address_ = 0; // in network order
     int socket_ = -1;
+    std::chrono::steady_clock::time_point lastLook_; // at the stop descriptor
 };

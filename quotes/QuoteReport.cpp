@@ -3,9 +3,10 @@
 #include <cstdarg>
 #include <cstdio>
 #include <cstring>
+#include <string>
 
 #include "util/CharacterBuffer.h"
-#include "util/DebugLog.h"
+#include "util/GatheredLog.h"
 #include "util/Numbers.h"
 
 namespace {
@@ -19,8 +20,8 @@ QuoteObserver* Nobody() {
 
 } // namespace
 
-QuoteReport::QuoteReport(const char* logPath, QuoteObserver* observer)
-    : logPath_(logPath), observer_(observer ? observer : Nobody()) {}
+QuoteReport::QuoteReport(GatheredLog* log, QuoteObserver* observer)
+    : log_(log), observer_(observer ? observer : Nobody()) {}
 
 void QuoteReport::Log(const char* format, ...) {
     char formatted[LogLineSize];
@@ -29,29 +30,28 @@ void QuoteReport::Log(const char* format, ...) {
     const int length = std::vsnprintf(formatted, sizeof formatted, format, arguments);
     va_end(arguments);
     if (length < static_cast<int>(sizeof formatted)) {
-        LogWhole(formatted);
+        LogText(formatted);
         return;
     }
     // What was cut off must not take the line's end along: the next line would run into it.
     char line[LogLineSize];
     CopyText(line, LogLineSize - 1, formatted);
     std::strcat(line, "\n");
-    LogWhole(line);
+    LogText(line);
 }
 
 void QuoteReport::LogNumber(const char* text, float value) {
     char number[64];
     FormatFixed(static_cast<double>(value), number, sizeof number, 2);
-    Log("%s%s\n", text, number);
+    LogText((std::string(text) + number).append("\n"));
 }
 
-void QuoteReport::LogWhole(const char* text) {
-    if (logPath_)
-        unwritten_ += text;
+void QuoteReport::LogText(std::string_view text) {
+    if (log_)
+        log_->Add(text);
 }
 
 void QuoteReport::Flush() {
-    if (!unwritten_.empty())
-        PrintDebugStatement(unwritten_.c_str(), logPath_);
-    unwritten_.clear();
+    if (log_)
+        log_->Write();
 }

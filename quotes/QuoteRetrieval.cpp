@@ -18,7 +18,7 @@ constexpr std::size_t MaxSourceFileSize = 16'000'000;
 
 float AskSource(const char* host, const char* path, const char* tag, int skip, const QuoteContext& context,
                 QuoteReport& report) {
-    report.Log("In GetQuote\n");
+    report.LogText("In GetQuote\n");
     if (IsStopped(context.stopFd))
         return QuoteCancelled;
     HostField server;
@@ -50,7 +50,7 @@ float AskForTicker(const QuoteSource& source, const QuoteContext& context, Quote
     if (result > 0)
         report.LogNumber("Price = ", result);
     else if (result == QuoteCancelled)
-        report.Log("cancelled\n");
+        report.LogText("cancelled\n");
     return result;
 }
 
@@ -84,7 +84,7 @@ float SearchSources(std::string_view sources, const char* ticker, const QuoteCon
 } // namespace
 
 float GetPriceQuote(const char* ticker, const QuoteContext& context) {
-    QuoteReport report(context.logPath, context.observer);
+    QuoteReport report(context.log, context.observer);
     std::string sources;
     if (!ReadWholeFile(context.sourcePath, sources, MaxSourceFileSize)) {
         report.Log("Unable to open '%s'\n", context.sourcePath);
@@ -95,12 +95,12 @@ float GetPriceQuote(const char* ticker, const QuoteContext& context) {
 }
 
 float GetPriceQuoteFrom(std::string_view sources, const char* ticker, const QuoteContext& context) {
-    QuoteReport report(context.logPath, context.observer);
+    QuoteReport report(context.log, context.observer);
     return SearchSources(sources, ticker, context, report);
 }
 
 float GetQuote(const char* host, const char* path, const char* tag, int skip, const QuoteContext& context) {
-    QuoteReport report(context.logPath, context.observer);
+    QuoteReport report(context.log, context.observer);
     return AskSource(host, path, tag, skip, context, report);
 }
 

@@ -28,10 +28,10 @@ bool QuoteScanner::Scan(std::string_view piece) {
     std::string_view rest = piece;
     if (!FindTag(rest) || !PassBrackets(rest))
         return false;
-    report_.Log("skipped ok\n");
+    report_.LogText("skipped ok\n");
     const auto token = TakeToken(rest, " \t\n<>");
     if (!token) {
-        report_.Log("value string not found\n");
+        report_.LogText("value string not found\n");
         return false;
     }
     ReadPrice(*token, rest);
@@ -44,7 +44,7 @@ bool QuoteScanner::FindTag(std::string_view& rest) {
     const std::size_t position = rest.find(tag_);
     if (position == rest.npos)
         return false;
-    report_.Log("found tag\n");
+    report_.LogText("found tag\n");
     report_.Observer().MarkerFound(rest, position);
     tagFound_ = true;
     rest.remove_prefix(position);

@@ -11,7 +11,6 @@
 #include "quotes/PriceUpdate.h"
 #include "quotes/QuoteRetrieval.h"
 #include "util/CharacterBuffer.h"
-#include "util/DebugLog.h"
 #include "util/InterfaceHelpers.h"
 #include "util/Numbers.h"
 #include "util/WholeFile.h"
@@ -44,7 +43,8 @@ UpdateWindow::UpdateWindow(BPoint leftTop, const char* portfolioName, DATABASE* 
               B_NOT_RESIZABLE | B_NOT_ZOOMABLE | B_WILL_ACCEPT_FIRST_CLICK),
       recordNumbers_(RecordNumbers(list)),
       database_(database),
-      portfolioName_(portfolioName) {
+      portfolioName_(portfolioName),
+      log_(app_state->logPath) {
     if (const BWindow* mainWindow = GetAppWindow(be_app, MainWindowTitle))
         mainWindow_ = BMessenger(mainWindow);
     AddStatusBar(static_cast<float>(recordNumbers_.size()) + 1);
@@ -94,34 +94,29 @@ void UpdateWindow::UpdateAll() {
         if (thread_stop_requested() || !UpdateOne(recordNumber))
             break;
     }
-    WriteLog();
-}
-
-void UpdateWindow::WriteLog() {
-    if (!log_.empty())
-        PrintDebugStatement(log_.c_str(), app_state->logPath);
-    log_.clear();
+    lastConnection_.Close();
+    log_.Write();
 }
 
 bool UpdateWindow::UpdateOne(int32 recordNumber) {
     INVESTMENT_DATA record;
     if (!ReadInvestment(*database_, recordNumber, &record)) {
-        Log("Database Read() error -1\n");
+        log_.Add("Database Read() error -1\n");
         return false;
     }
     const std::string ticker(FieldText(record.Ticker));
     // Without a ticker a page could only give the price of something else.
     if (ticker.empty()) {
-        Log("No ticker for '" + std::string(FieldText(record.Name)) + "'\n");
+        log_.Add("No ticker for '" + std::string(FieldText(record.Name)) + "'\n");
         ShowProgress();
         return true;
     }
-    Log("Checking price for '" + ticker + "'\n");
+    log_.Add("Checking price for '" + ticker + "'\n");
     ShowTicker(ticker.c_str());
-    WriteLog();
     QuoteContext context;
     context.sourcePath = app_state->quoteSourcePath;
-    context.logPath = app_state->logPath;
+    context.log = &log_;
+    context.lastConnection = &lastConnection_;
     context.stopFd = thread_stop_fd();
     const float quote = sources_.empty() ? GetPriceQuote(ticker.c_str(), context)
                                          : GetPriceQuoteFrom(sources_, ticker.c_str(), context);
@@ -130,7 +125,7 @@ bool UpdateWindow::UpdateOne(int32 recordNumber) {
         return false;
     char number[64];
     FormatFixed(quote, number, sizeof number, 2);
-    Log(std::string("GetPriceQuote() returned ") + number + "\n");
+    log_.Add(std::string("GetPriceQuote() returned ") + number + "\n");
     if (!Apply(quote, recordNumber, &record))
         return false;
     ShowProgress();
@@ -139,7 +134,7 @@ bool UpdateWindow::UpdateOne(int32 recordNumber) {
 
 bool UpdateWindow::Apply(float quote, int32 recordNumber, INVESTMENT_DATA* record) {
     if (ApplyQuote(*record, quote) == QuoteOutcome::Failed) {
-        WriteLog();
+        log_.Write();
         TellNotConnected();
         return false;
     }

@@ -7,6 +7,8 @@
 #include "platform/Kernel.h"
 #include "platform/Message.h"
 #include "platform/Window.h"
+#include "quotes/LastConnection.h"
+#include "util/GatheredLog.h"
 
 class BStatusBar;
 class ColumnListView;
@@ -47,10 +49,6 @@ class UpdateWindow : public BWindow {
     // False, without the lock, when the worker is to stop: then the window may be going, and its lock would
     // never come.
     [[nodiscard]] bool LockUnlessStopped();
-    // Lines for the debug log wait until somebody else writes to it: opening it takes as long as half a
-    // price.
-    void Log(const std::string& lines) { log_ += lines; }
-    void WriteLog();
     void AskForReload() const;
 
     BStatusBar* statusBar_ = nullptr; // the window's
@@ -58,7 +56,8 @@ class UpdateWindow : public BWindow {
     std::vector<int32> recordNumbers_; // of the investments to be asked for, in the list's order
     DATABASE* database_;
     std::string portfolioName_;
-    std::string log_;       // the worker's, not yet written
-    std::string sources_;   // the quote-source file, read once for the run; empty when it cannot be
-    BMessenger mainWindow_; // found at the start, on the thread on which windows come and go
+    LastConnection lastConnection_; // the worker's
+    GatheredLog log_;               // the worker's
+    std::string sources_;           // the quote-source file, read once for the run; empty when it cannot be
+    BMessenger mainWindow_;         // found at the start, on the thread on which windows come and go
 };

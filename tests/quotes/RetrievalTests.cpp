@@ -10,10 +10,12 @@
 #include "StopSwitch.h"
 #include "TemporaryFolder.h"
 #include "quotes/HostLookup.h"
+#include "quotes/LastConnection.h"
 #include "quotes/QuoteObserver.h"
 #include "quotes/QuoteReport.h"
 #include "quotes/QuoteRetrieval.h"
 #include "quotes/QuoteScanner.h"
+#include "util/GatheredLog.h"
 
 namespace {
 
@@ -36,21 +38,28 @@ class Retrieval : public testing::Test {
   protected:
     Retrieval() {
         context_.sourcePath = sourcePath_.c_str();
-        context_.logPath = logPath_.c_str();
+        context_.log = &log_;
+        context_.lastConnection = &lastConnection_;
         context_.stopFd = stop_.Fd();
     }
 
     // The answer for the ticker ABC, with the lines as the source file.
     float Quote(const std::string& lines) {
         folder_.Write("Quorvan.cfg", lines);
+        log_.Write();
         folder_.Write("log", "");
         return GetPriceQuote("ABC", context_);
     }
-    [[nodiscard]] std::string Log() const { return folder_.Read("log"); }
+    [[nodiscard]] std::string Log() {
+        log_.Write();
+        return folder_.Read("log");
+    }
 
     TemporaryFolder folder_;
     std::string sourcePath_ = folder_.File("Quorvan.cfg");
     std::string logPath_ = folder_.File("log");
+    GatheredLog log_{logPath_.c_str()};
+    LastConnection lastConnection_;
     StopSwitch stop_;
     QuoteContext context_;
 };
@@ -214,6 +223,19 @@ TEST_F(Retrieval, StopsAtOnceWhereverTheServerIs) {
     }
 }
 
+TEST_F(Retrieval, ClosesAConnectionWhileTheNextServerThinks) {
+    LoopbackServer server(Reply{{Page}, Reply::End::Hold}); // serves nobody else before the client goes
+    const std::string source = "net " + server.Host() + " /q?s= Last 3";
+    EXPECT_EQ(Quote(source), 45.375F);
+    EXPECT_EQ(Quote(source), 45.375F);
+    EXPECT_TRUE(server.WaitForEnds(1));
+    lastConnection_.Close();
+    EXPECT_TRUE(server.WaitForEnds(2));
+    context_.lastConnection = nullptr;
+    EXPECT_EQ(Quote(source), 45.375F);
+    EXPECT_TRUE(server.WaitForEnds(3));
+}
+
 TEST_F(Retrieval, StopsWhileItConnects) {
     // A server whose queue is full leaves further connections waiting.
     const LoopbackSocket server;
@@ -230,7 +252,7 @@ TEST_F(Retrieval, StopsWhileItConnects) {
     }
     auto quote =
         std::async(std::launch::async, [&] { return Quote("net " + server.Host() + " /q?s= Last 1"); });
-    while (Log().find("socket created ok\n") == std::string::npos)
+    while (folder_.Read("log").find("socket created ok\n") == std::string::npos)
         std::this_thread::yield();
     stop_.Stop();
     EXPECT_EQ(quote.get(), QuoteCancelled);

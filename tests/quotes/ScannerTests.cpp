@@ -10,6 +10,7 @@
 #include "quotes/QuoteRetrieval.h"
 #include "quotes/QuoteScanner.h"
 #include "quotes/QuoteSource.h"
+#include "util/GatheredLog.h"
 
 namespace {
 
@@ -23,7 +24,8 @@ struct Scanned {
 Scanned Scan(const std::vector<std::string>& pieces, const std::string& tag, int skip) {
     const TemporaryFolder folder;
     const std::string logPath = folder.File("log");
-    QuoteReport report(logPath.c_str(), nullptr);
+    GatheredLog log(logPath.c_str());
+    QuoteReport report(&log, nullptr);
     QuoteScanner scanner(tag, skip, report);
     for (const std::string& piece : pieces) {
         if (scanner.Scan(piece))

@@ -9,6 +9,7 @@
 #include "TemporaryFolder.h"
 #include "TlsServer.h"
 #include "quotes/QuoteRetrieval.h"
+#include "util/GatheredLog.h"
 
 namespace {
 
@@ -25,21 +26,25 @@ class Tls : public testing::Test {
         setenv("no_proxy", "*", 1);
         identity_.WriteCertificate(caFile_);
         context_.caFile = caFile_.c_str();
-        context_.logPath = logPath_.c_str();
+        context_.log = &log_;
         context_.stopFd = stop_.Fd();
     }
 
     float Quote(const std::string& host, const char* path = "/q?s=ABC") {
+        log_.Write();
         folder_.Write("log", "");
         return GetQuote(host.c_str(), path, "Last", 3, context_);
     }
-    [[nodiscard]] bool Logged(const std::string& text) const {
-        return folder_.Read("log").find(text) != std::string::npos;
+    [[nodiscard]] std::string Log() {
+        log_.Write();
+        return folder_.Read("log");
     }
+    [[nodiscard]] bool Logged(const std::string& text) { return Log().find(text) != std::string::npos; }
 
     TemporaryFolder folder_;
     std::string caFile_ = folder_.File("ca.pem");
     std::string logPath_ = folder_.File("log");
+    GatheredLog log_{logPath_.c_str()};
     TlsIdentity identity_{"IP:127.0.0.1"};
     StopSwitch stop_;
     QuoteContext context_;
@@ -52,10 +57,9 @@ TEST_F(Tls, APageIsScannedInOnePiece) {
     TlsServer server(identity_, [&](const std::string&) { return Reply{bytes}; });
     EXPECT_EQ(Quote(server.Host(), "q?s=B C#\xC3\xA4%20\n"), 45.375F);
     EXPECT_TRUE(server.Server().Requests().at(0).starts_with("GET /q?s=B%20C%23%C3%A4%20%0A HTTP/1.1\r\n"));
-    EXPECT_EQ(folder_.Read("log"), "In GetQuote\nconnected to 127.0.0.1 port " +
-                                       std::to_string(server.Server().Port()) +
-                                       "\nreceived 35 bytes\nfound tag\nskipped ok\nvalue string is '45'\n"
-                                       "Returning price = 45.38\n");
+    EXPECT_EQ(Log(), "In GetQuote\nconnected to 127.0.0.1 port " + std::to_string(server.Server().Port()) +
+                         "\nreceived 35 bytes\nfound tag\nskipped ok\nvalue string is '45'\n"
+                         "Returning price = 45.38\n");
 }
 
 TEST_F(Tls, WhatTheServerRefusesIsNoPrice) {
@@ -90,7 +94,7 @@ TEST_F(Tls, WhatTheServerRefusesIsNoPrice) {
     for (const auto& c : cases) {
         redirects = c.redirects;
         EXPECT_EQ(Quote(server.Host(), c.path), c.price) << c.path;
-        EXPECT_TRUE(Logged(c.log)) << folder_.Read("log");
+        EXPECT_TRUE(Logged(c.log)) << Log();
     }
     EXPECT_TRUE(plain.Requests().empty());
 }
@@ -101,23 +105,23 @@ TEST_F(Tls, AConnectionThatCannotBeTrustedIsAFailure) {
     const TlsIdentity otherName("DNS:quotes.example");
     TlsServer unknown(stranger, answer);
     EXPECT_EQ(Quote(unknown.Host()), QuoteNetworkFailure);
-    EXPECT_TRUE(Logged("https error: SSL certificate problem")) << folder_.Read("log");
+    EXPECT_TRUE(Logged("https error: SSL certificate problem")) << Log();
     TlsServer misnamed(otherName, answer);
     otherName.WriteCertificate(caFile_);
     EXPECT_EQ(Quote(misnamed.Host()), QuoteNetworkFailure);
-    EXPECT_TRUE(Logged("no alternative certificate subject name matches")) << folder_.Read("log");
+    EXPECT_TRUE(Logged("no alternative certificate subject name matches")) << Log();
     EXPECT_TRUE(unknown.Server().Requests().empty() && misnamed.Server().Requests().empty());
 }
 
 TEST_F(Tls, NoConnectionIsAFailureAndNoNameIsNoPrice) {
     const LoopbackSocket refusing;
     EXPECT_EQ(Quote("https://" + refusing.Host()), QuoteNetworkFailure);
-    EXPECT_TRUE(Logged("https error: Failed to connect")) << folder_.Read("log");
+    EXPECT_TRUE(Logged("https error: Failed to connect")) << Log();
     EXPECT_EQ(Quote("https://no..such..host"), NoQuote);
-    EXPECT_TRUE(Logged("https error: Could not resolve host")) << folder_.Read("log");
+    EXPECT_TRUE(Logged("https error: Could not resolve host")) << Log();
     TlsServer broken(identity_, [](const std::string&) { return Reply{{Page}, Reply::End::Reset}; });
     EXPECT_EQ(Quote(broken.Host()), QuoteNetworkFailure);
-    EXPECT_TRUE(Logged("https error: ")) << folder_.Read("log");
+    EXPECT_TRUE(Logged("https error: ")) << Log();
 }
 
 TEST_F(Tls, StopsAtOnceWhereverTheServerIs) {
