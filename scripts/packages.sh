@@ -14,6 +14,8 @@ test_packages+=(desktop-file-utils appstream librsvg2-bin libxml2-utils libglib2
 test_packages+=(at-spi2-core dbus-daemon man-db groff-base)
 # For scripts/tidy.sh.
 tidy_packages=(clang-tidy clang-tools)
+# For scripts/coverage.sh.
+coverage_packages=(gcovr)
 # For scripts/fuzz.sh.
 fuzz_packages=(clang)
 
