@@ -1,5 +1,6 @@
 #include "app/NorvelApp.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <cstring>
 #include <system_error>
@@ -190,6 +191,24 @@ void NorvelApp::OpenDatabases(std::string& complaints) {
     state_.categories = open("misc.db", HoldsCategories, nullptr); // which the program never changes
     if (backup_)
         backup_->Prepare();
+    if (!lookOnly_ && state_.portfolios->IsOpen() && state_.investments->IsOpen())
+        RestoreLostPortfolios(complaints);
+}
+
+void NorvelApp::RestoreLostPortfolios(std::string& complaints) {
+    constexpr std::size_t named = 5;
+    const std::vector<std::string> names = RestorePortfolios(*state_.portfolios, *state_.investments);
+    if (names.empty())
+        return;
+    std::string list;
+    for (std::size_t i = 0; i < std::min(names.size(), named); ++i)
+        list += (i == 0 ? "\"" : ", \"") + names[i] + "\"";
+    if (names.size() > named)
+        list += " and " + std::to_string(names.size() - named) + " more";
+    complaints +=
+        "There are investments of portfolios that were not in the list. These portfolios are in the "
+        "list again: " +
+        list + ".\n";
 }
 
 void NorvelApp::MessageReceived(BMessage* message) {

@@ -1,9 +1,11 @@
 #include "app/PortfolioRules.h"
 
 #include <cstddef>
+#include <cstdint>
 #include <string_view>
-#include <vector>
+#include <unordered_set>
 
+#include "db/LoweredText.h"
 #include "util/CharacterBuffer.h"
 
 namespace {
@@ -49,6 +51,26 @@ bool DeleteSelected(DATABASE& database) {
     return all;
 }
 
+// Calls visit(record) for each record that can be read, in the order of the file.
+template <class Record, class Visit>
+void ForEachRecord(DATABASE& database, Visit visit) {
+    DATABASE_HEADER header;
+    database.GetHeaderInfo(&header);
+    for (std::int32_t i = 0; i < header.recordCount; ++i) {
+        Record record{};
+        if (database.Read(i, &record) == 1)
+            visit(record);
+    }
+}
+
+// A name as queries compare it.
+std::string Lowered(std::string_view name) {
+    std::string lowered(name);
+    for (char& c : lowered)
+        c = static_cast<char>(LoweredByte(static_cast<std::uint8_t>(c)));
+    return lowered;
+}
+
 } // namespace
 
 bool HoldsPortfolios(DATABASE& database) {
@@ -91,6 +113,23 @@ bool AddPortfolio(DATABASE& portfolios, const char* name) {
     PORTFOLIO_DATA record;
     CopyTextZeroed(record.Name, name);
     return portfolios.Append(&record) >= 0;
+}
+
+std::vector<std::string> RestorePortfolios(DATABASE& portfolios, DATABASE& investments) {
+    std::unordered_set<std::string> listed;
+    ForEachRecord<PORTFOLIO_DATA>(
+        portfolios, [&](const PORTFOLIO_DATA& record) { listed.insert(Lowered(FieldText(record.Name))); });
+    std::vector<std::string> restored;
+    std::string last; // most often the next investment is of the same portfolio
+    ForEachRecord<INVESTMENT_DATA>(investments, [&](const INVESTMENT_DATA& record) {
+        if (FieldText(record.Portfolio) == last)
+            return;
+        last = FieldText(record.Portfolio);
+        if (CanBePortfolioName(last.c_str()) && listed.insert(Lowered(last)).second &&
+            AddPortfolio(portfolios, last.c_str()))
+            restored.push_back(last);
+    });
+    return restored;
 }
 
 bool CanBePortfolioName(const char* name) {

@@ -4,6 +4,7 @@
 #include <cstring>
 #include <span>
 #include <string>
+#include <vector>
 
 #include "app/RecordLayouts.h"
 #include "db/Database.h"
@@ -72,10 +73,15 @@ void ForEachCategoryEntry(DATABASE& categories, const char* category, Visit visi
 // could not be written.
 [[nodiscard]] bool AddPortfolio(DATABASE& portfolios, const char* name);
 
+// Lists again every portfolio that has investments but no record of its own, since those could not be seen:
+// so after a renaming that was cut short, or when the file of the portfolios is lost or of another day.
+// Returns the names added; one that could not be written is not among them.
+[[nodiscard]] std::vector<std::string> RestorePortfolios(DATABASE& portfolios, DATABASE& investments);
+
 // Gives the portfolio and all its investments a new name. False, with nothing changed, when there is no
 // portfolio of the old name, or the new one cannot be one (CanBePortfolioName). The portfolio's own record
 // changes first, then each investment: should one not be written, or the program be killed, every record is
-// wholly old or wholly new, and those not reached keep the old name.
+// wholly old or wholly new, and those not reached keep the old name (see RestorePortfolios).
 [[nodiscard]] bool RenamePortfolio(DATABASE& portfolios, DATABASE& investments, const char* oldName,
                                    const char* newName);
 

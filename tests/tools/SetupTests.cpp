@@ -117,7 +117,7 @@ TEST_F(SetupTest, TheFirstTextFilesCanBeReadByTheProgram) {
     settings.ReadString("GENERAL", "Password", "missing", text);
     EXPECT_STREQ(text, "");
     settings.ReadString("GENERAL", "IsConnectedURL", "", text);
-    EXPECT_STREQ(text, "localhost");
+    EXPECT_STREQ(text, "127.0.0.1");
     for (int column = 0; column <= 10; ++column)
         EXPECT_GE(settings.ReadInt("DISPLAY", ("ColumnWidth" + std::to_string(column)).c_str(), 0), 20)
             << column;

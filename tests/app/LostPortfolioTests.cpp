@@ -1,0 +1,51 @@
+// Investments whose portfolio is not in the list: the program lists it again at its start.
+#include <gtest/gtest.h>
+
+#include "Program.h"
+#include "app/PortfolioRules.h"
+
+namespace {
+
+TEST(LostPortfolios, AreListedAgainByTheNamesOfTheirInvestments) {
+    const DataFolder folder;
+    folder.AddPortfolio("Kept");
+    folder.AddPortfolio("\xC3\x84"
+                        "ra");
+    const char* portfolios[] = {"KEPT",
+                                "Lost",
+                                "kept",
+                                "lost",
+                                "\xC3\x84"
+                                "RA",
+                                "",
+                                "a\tb",
+                                "Gone",
+                                "Lost"};
+    for (const char* portfolio : portfolios)
+        folder.AddInvestment(MakeInvestment(portfolio, "n"));
+    DATABASE portfolioFile(folder.File("portfol.db").c_str());
+    DATABASE investmentFile(folder.File("invest.db").c_str());
+    investmentFile.Delete(7);
+    EXPECT_EQ(RestorePortfolios(portfolioFile, investmentFile), (Texts{"Lost"}));
+    EXPECT_EQ(folder.Portfolios(), (Texts{"Kept",
+                                          "\xC3\x84"
+                                          "ra",
+                                          "Lost"}));
+    EXPECT_EQ(RestorePortfolios(portfolioFile, investmentFile), Texts{});
+    EXPECT_EQ(SelectInvestments(investmentFile, "Lost"), 3);
+}
+
+TEST(LostPortfolios, AreNamedAtTheStart) {
+    Program program;
+    program.AddPortfolio("New");
+    program.AddInvestment(MakeInvestment("New", "renamed"));
+    program.AddInvestment(MakeInvestment("Old", "not reached"));
+    program.Answer("There are investments of portfolios that were not in the list. These portfolios are in "
+                   "the list again: \"Old\".",
+                   "Ok");
+    program.Expect({"not reached"}).Select("New").Expect({"renamed"}).Close();
+    EXPECT_EQ(program.Run(), 0);
+    EXPECT_EQ(program.Portfolios(), (Texts{"New", "Old"}));
+}
+
+} // namespace
