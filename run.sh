@@ -26,7 +26,7 @@ for argument in "$@"; do
     case $argument in
     --sample | --desktop) options+=("$argument") ;;
     -h | --help) usage && exit 0 ;;
-    -*) usage >&2 && exit 2 ;;
+    -*) echo "run.sh: there is no option $argument" >&2 && usage >&2 && exit 2 ;;
     *)
         [ -z "$folder" ] || { usage >&2 && exit 2; }
         folder=$argument
@@ -53,7 +53,7 @@ quietly "the build could not be prepared" \
     cmake -S "$here" --preset release -B "$build" -DQUORVAN_BENCH=OFF
 targets=(quorvan quorvan-cli)
 [ -n "${DISPLAY:-}${WAYLAND_DISPLAY:-}" ] || targets+=(quorvan-tour)
-quietly "the build failed" cmake --build "$build" --parallel "$(nproc)" --target "${targets[@]}"
+with_progress "the build failed" cmake --build "$build" --parallel "$(nproc)" --target "${targets[@]}"
 
 "$build/tools/quorvan-cli" setup "$folder" "${options[@]}" --program "$build/app/quorvan" --update-program ||
     fail "the folder $folder could not be made ready"

@@ -177,6 +177,9 @@ int InvestmentDialog::OnOK() {
     case InvestmentCheck::NoName:
         Warn("You must enter a Name!");
         return 0;
+    case InvestmentCheck::NotPlain:
+        Warn("Shares or price is not a plain number such as 1250.5!");
+        return 0;
     case InvestmentCheck::TooLarge:
         Warn("Shares or price is too large!");
         return 0;

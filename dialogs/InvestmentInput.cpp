@@ -1,6 +1,7 @@
 #include "dialogs/InvestmentInput.h"
 
 #include <cmath>
+#include <cstring>
 #include <limits>
 
 #include "util/CharacterBuffer.h"
@@ -9,13 +10,17 @@
 
 namespace {
 
-// False when the number is beyond a record's single precision, where it would be stored as infinite.
-bool ReadAmount(const std::string& text, float* amount) {
+InvestmentCheck ReadAmount(const std::string& text, float* amount) {
     double number = 0;
-    if (!ReadDecimal(text.c_str(), &number) || std::fabs(number) > std::numeric_limits<float>::max())
-        return false;
+    const char* rest = nullptr;
+    const bool inRange = ReadDecimal(text.c_str(), &number, &rest);
+    if (rest != text.c_str() && rest[std::strspn(rest, " \t")] != '\0')
+        return InvestmentCheck::NotPlain;
+    // In a record's single precision it would be stored as infinite.
+    if (!inRange || std::fabs(number) > std::numeric_limits<float>::max())
+        return InvestmentCheck::TooLarge;
     *amount = static_cast<float>(number);
-    return true;
+    return InvestmentCheck::Accepted;
 }
 
 dbDATE Today() {
@@ -37,8 +42,11 @@ InvestmentCheck FillInvestment(const InvestmentInput& input, INVESTMENT_DATA* re
         return InvestmentCheck::NoName;
     float shares = 0;
     float price = 0;
-    if (!ReadAmount(input.shares, &shares) || !ReadAmount(input.price, &price) ||
-        !std::isfinite(shares * price))
+    for (const InvestmentCheck check : {ReadAmount(input.shares, &shares), ReadAmount(input.price, &price)}) {
+        if (check != InvestmentCheck::Accepted)
+            return check;
+    }
+    if (!std::isfinite(shares * price))
         return InvestmentCheck::TooLarge;
     CopyTextZeroed(record->Name, input.name);
     CopyTextZeroed(record->Ticker, input.ticker);

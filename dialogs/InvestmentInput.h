@@ -19,6 +19,8 @@ struct InvestmentInput {
 enum class InvestmentCheck {
     Accepted,
     NoName,
+    NotPlain, // shares or price begins with a number and goes on: "44,50" or "12 3/8" must not become 44 or
+              // 12
     TooLarge, // shares, price or their product is beyond what a record can hold
 };
 

@@ -47,6 +47,23 @@ install_missing() {
         fail "these packages could not be installed: ${missing[*]}"
 }
 
+# with_progress SENTENCE BUILD_COMMAND...: as quietly, but tells every tenth of the way.
+with_progress() {
+    local sentence=$1 log status percent last=0
+    shift
+    log=$(mktemp)
+    NINJA_STATUS='%p ' "$@" 2>&1 | tee "$log" | while read -r percent _; do
+        if [[ $percent =~ ^([0-9]+)%$ ]] && ((BASH_REMATCH[1] >= last + 10)); then
+            last=$((BASH_REMATCH[1] / 10 * 10))
+            echo "  $last %"
+        fi
+    done
+    status=${PIPESTATUS[0]}
+    [ "$status" -eq 0 ] || tail -n 60 "$log" >&2
+    rm -f "$log"
+    [ "$status" -eq 0 ] || fail "$sentence"
+}
+
 # quietly SENTENCE COMMAND...: runs the command and shows its output only when it fails, with the sentence.
 quietly() {
     local sentence=$1 log

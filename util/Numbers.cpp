@@ -73,8 +73,10 @@ void FormatNumber(float value, char* out, int decimals) {
     *end = '\0';
 }
 
-bool ReadDecimal(const char* text, double* value) {
+bool ReadDecimal(const char* text, double* value, const char** rest) {
     *value = 0;
+    if (rest)
+        *rest = text;
     text += std::strspn(text, " \t\n\v\f\r");
     const bool negative = *text == '-';
     if (*text == '-' || *text == '+')
@@ -84,6 +86,8 @@ bool ReadDecimal(const char* text, double* value) {
         return true;
     double magnitude = 0;
     const auto [end, error] = std::from_chars(text, text + std::strlen(text), magnitude);
+    if (rest && end != text)
+        *rest = end;
     if (error == std::errc::result_out_of_range) {
         // Too small or too large: the reader does not say which.
         const std::string_view number(text, static_cast<std::size_t>(end - text));

@@ -22,5 +22,6 @@ void FormatNumber(float value, char* out, int decimals);
 
 // Reads the decimal number at the start of `text`: leading white space, a sign, digits with an optional point
 // and exponent; what follows it is ignored. Stores 0 when there is none (so for "inf" and "nan") and when it
-// is too small for a double. False, with 0 stored, when it is beyond a double's range.
-[[nodiscard]] bool ReadDecimal(const char* text, double* value);
+// is too small for a double. False, with 0 stored, when it is beyond a double's range. `rest`, unless null,
+// is set to what follows the number, or to `text` when there is none.
+[[nodiscard]] bool ReadDecimal(const char* text, double* value, const char** rest = nullptr);

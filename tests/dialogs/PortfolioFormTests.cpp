@@ -142,9 +142,16 @@ TEST_F(FormTest, AnInvestmentIsEnteredByKeyboardAlone) {
                   Key(Qt::Key_Return);
               })
         .Answer("Shares or price is too large!", "Ok")
+        .When("corrected badly", FocusIn(title),
+              [title] {
+                  Driver::Window(title)->findChild<QLineEdit*>("shares control")->setFocus();
+                  TypeOver("2,5");
+                  Key(Qt::Key_Return);
+              })
+        .Answer("Shares or price is not a plain number such as 1250.5!", "Ok")
         .When("corrected", FocusIn(title), [title] {
             Driver::Window(title)->findChild<QLineEdit*>("shares control")->setFocus();
-            TypeOver("2.5 and more");
+            TypeOver("2.5");
             auto* retirement = Driver::Window(title)->findChild<QCheckBox*>("retirement check");
             retirement->setFocus();
             Key(Qt::Key_Space);
@@ -213,9 +220,10 @@ TEST(InvestmentInput, AmountsAreNumbersARecordCanHold) {
     } cases[] = {
         {"12.5", "2", InvestmentCheck::Accepted, 25},   {"abc", "10", InvestmentCheck::Accepted, 0},
         {"inf", "nan", InvestmentCheck::Accepted, 0},   {"", "3", InvestmentCheck::Accepted, 0},
-        {" -2x", "1.5", InvestmentCheck::Accepted, -3}, {"1e-60", "1e30", InvestmentCheck::Accepted, 0},
+        {" -2 ", "1.5", InvestmentCheck::Accepted, -3}, {"1e-60", "1e30", InvestmentCheck::Accepted, 0},
         {"1e39", "1", InvestmentCheck::TooLarge, 7},    {"1", "-1e999", InvestmentCheck::TooLarge, 7},
-        {"1e30", "1e30", InvestmentCheck::TooLarge, 7},
+        {"1e30", "1e30", InvestmentCheck::TooLarge, 7}, {"1", "44,50", InvestmentCheck::NotPlain, 7},
+        {"1,250.5", "2", InvestmentCheck::NotPlain, 7}, {"1", "12 3/8", InvestmentCheck::NotPlain, 7},
     };
     for (const auto& each : cases) {
         INVESTMENT_DATA record{};
