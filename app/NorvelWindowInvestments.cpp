@@ -135,9 +135,10 @@ void NorvelWindow::OnInvestmentEdit() {
         TellNotSaved();
         return;
     }
+    // The new row first: then the keyboard stays on it when the old one goes.
+    investmentList_->AddItem(CreateNewInvestmentItem(record, number), index + 1);
     investmentList_->RemoveItem(index);
     delete row;
-    investmentList_->AddItem(CreateNewInvestmentItem(record, number), index);
     investmentList_->Select(index, true);
     DisplayTotalValue(-1);
 }

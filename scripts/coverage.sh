@@ -10,7 +10,6 @@ install_missing "${build_packages[@]}" "${run_packages[@]}" "${display_packages[
 quietly "the build could not be prepared" cmake --preset coverage
 quietly "the build failed" cmake --build --preset coverage
 find build/coverage -name '*.gcda' -delete
-# A test that limits the size of files limits that of the counts as well, which must not be heard of.
-export GCOV_ERROR_FILE=/dev/null
-quietly "tests failed" ctest --preset coverage
+# Where a test limits the size of files, the counts would be cut short as well.
+quietly "tests failed" ctest --preset coverage -E 'AFullDisk|OneClearSentence|TheRoomEnds'
 gcovr --root . --exclude 'tests/' --exclude 'tour/' --exclude 'fuzz/' --exclude 'build/' "$@" build/coverage

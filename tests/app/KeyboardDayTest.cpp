@@ -154,7 +154,9 @@ TEST(KeyboardDay, NeedsNoMouse) {
         Type("Cypress");
         Key(Qt::Key_Return);
     });
-    day.Expect({"Acme", "Birch", "Cypress"});
+    day.Expect({"Acme", "Birch", "Cypress"}).Then("the row that was edited", [] {
+        EXPECT_EQ(Program::RowsWidget()->currentIndex().row(), 2);
+    });
     // Two rows go to the other portfolio.
     day.ToTheList().Press(Qt::Key_Home).Press(Qt::Key_Down, Qt::ShiftModifier).Choose(Qt::Key_I, Qt::Key_C);
     day.Expect({"Cypress"})
