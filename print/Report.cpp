@@ -1,9 +1,13 @@
 #include "print/Report.h"
 
+#include <filesystem>
+#include <string>
+
 #include "app/PortfolioRules.h"
 #include "platform/PrintJob.h"
 #include "platform/Window.h"
 #include "print/PrinterView.h"
+#include "util/InterfaceHelpers.h"
 
 namespace {
 
@@ -30,12 +34,27 @@ class HiddenPage {
     bool attached_;
 };
 
+// The toolkit's dialog asks before a file is chosen that exists; a report into the file that was chosen
+// before must not take another portfolio's place unasked either.
+bool MayWrite(const BMessage& settings) {
+    const char* file = "";
+    std::error_code error;
+    if (settings.FindString("output file", &file) != B_OK || !std::filesystem::is_regular_file(file, error))
+        return true;
+    const bool no =
+        YesNoBox((std::string("The file ") + file + " exists. Replace it by this report?").c_str());
+    return !no;
+}
+
 bool ConfigureJob(BPrintJob& job, std::unique_ptr<BMessage>& settings) {
     if (settings) {
         job.SetSettings(settings.get());
-        return true;
+        if (MayWrite(*settings))
+            return true;
+    } else if (job.ConfigPage() != B_OK) {
+        return false;
     }
-    if (job.ConfigPage() != B_OK || job.ConfigJob() != B_OK)
+    if (job.ConfigJob() != B_OK)
         return false;
     settings.reset(job.Settings());
     return true;

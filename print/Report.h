@@ -23,7 +23,8 @@ enum class ReportResult {
                                        DATABASE& investments);
 
 // Makes the whole job for a window, which must be locked. Without kept settings it shows the page dialog and
-// the job dialog, and keeps what was chosen there; otherwise it asks nothing. Settings that could not be
-// printed with are dropped, so that the next job asks again.
+// the job dialog, and keeps what was chosen there; otherwise it only asks before it replaces a file, and
+// shows the job dialog for another one. Settings that could not be printed with are dropped, so that the next
+// job asks again.
 [[nodiscard]] ReportResult RunReportJob(BWindow* window, const char* portfolio, DATABASE& investments,
                                         std::unique_ptr<BMessage>& settings);

@@ -54,8 +54,22 @@ TEST(Print, AsksOnceAndNothingAfterACancel) {
     ExpectPrinted(program, file, "Timber");
     program.Select("Empty one").Expect({}).Send(PrintCommand);
     ExpectPrinted(program, file, "Empty one");
+    // A file that is there is not replaced unasked; another one may be named.
+    const std::string other = prints.File("other.pdf");
+    program.Then("in the way", [&] { prints.Write("report.pdf", "kept"); }).Send(PrintCommand);
+    const std::string replaceFirst = "The file " + file + " exists. Replace it by this report?";
+    program.Answer(replaceFirst.c_str(), "No");
+    Answer(program, "print dialog", true, other);
+    ExpectPrinted(program, other, "Empty one");
+    program.Then("kept", [&] { EXPECT_EQ(prints.Read("report.pdf"), "kept"); });
+    program.Then("in the way again", [&] { prints.Write("other.pdf", "replaced"); }).Send(PrintCommand);
+    const std::string replaceOther = "The file " + other + " exists. Replace it by this report?";
+    program.Answer(replaceOther.c_str(), "Yes");
+    program.When(
+        "the new report", [=, &prints] { return prints.Read("other.pdf").starts_with("%PDF"); }, [] {});
+    ExpectPrinted(program, other, "Empty one");
     // A place that is gone is told of, and asked for anew.
-    program.Then("gone", [&] { std::filesystem::remove(prints.Path()); })
+    program.Then("gone", [&] { std::filesystem::remove_all(prints.Path()); })
         .Send(PrintCommand)
         .Answer("The report could not be printed! Is the printer there, or the file protected?", "Ok");
     program.Send(PrintCommand);
