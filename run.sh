@@ -47,7 +47,11 @@ fi
 install_missing "${packages[@]}"
 
 build=$here/build/run
-echo "Building Quorvan (the first time takes some minutes)"
+if [ -e "$build" ]; then
+    echo "Building what has changed of Quorvan"
+else
+    echo "Building Quorvan, which takes some minutes the first time"
+fi
 # Nothing but the program is built, so the packages of the benchmarks are not needed.
 quietly "the build could not be prepared" \
     cmake -S "$here" --preset release -B "$build" -DQUORVAN_BENCH=OFF

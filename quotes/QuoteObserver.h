@@ -19,6 +19,8 @@ class QuoteObserver {
     virtual void SourceTried(const QuoteSource& /*source*/) {}
     // A line of the source file cannot be used; lines count from 1.
     virtual void SourceSkipped(int /*line*/, const char* /*reason*/) {}
+    // What follows this line of the source file, which is too short for a source, is not read.
+    virtual void ListEnded(int /*line*/) {}
     // There is a connection to this server, named by address and port.
     virtual void Connected(const char* /*server*/) {}
     // The exchange ended without a whole page for the reason given.

@@ -66,8 +66,10 @@ float SearchSources(std::string_view sources, const char* ticker, const QuoteCon
     for (Line line = reader.Next(); line != Line::EndOfFile && !EndsTheSearch(result); line = reader.Next()) {
         // A line that is no source, be it the last, takes back what the source before it answered.
         result = NoQuote;
-        if (line == Line::EndOfList)
+        if (line == Line::EndOfList) {
+            report.Observer().ListEnded(reader.LineNumber());
             break;
+        }
         if (line == Line::Skipped && !reader.Problem())
             continue;
         QuoteSource source;

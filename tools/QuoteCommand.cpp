@@ -38,19 +38,21 @@ std::string CheckTicker(const std::string& ticker) {
 }
 
 int RunQuote(const QuoteOptions& options) {
-    QuoteTrace trace(std::cerr);
     const std::string home = options.home.empty() ? DefaultHomeFolder() : options.home;
     const std::string sourcePath = home + "/Quorvan.cfg";
     QuoteContext context;
     context.sourcePath = sourcePath.c_str();
-    context.observer = &trace;
     bool all = true;
     for (const std::string& ticker : options.tickers) {
+        QuoteTrace trace(std::cerr);
+        context.observer = &trace;
         std::cerr << ticker << ": looking in " << (options.source.empty() ? sourcePath : "the given line")
                   << '\n';
         const float price = options.source.empty()
                                 ? GetPriceQuote(ticker.c_str(), context)
                                 : GetPriceQuoteFrom(options.source, ticker.c_str(), context);
+        if (price == NoQuote && !trace.AskedAny())
+            std::cerr << "there is no source to ask\n";
         char number[64];
         FormatFixed(static_cast<double>(price), number, sizeof number, 2);
         std::cout << ticker << '\t' << number << std::endl;

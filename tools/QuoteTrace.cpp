@@ -42,6 +42,7 @@ std::string Number(double value, int decimals) {
 } // namespace
 
 void QuoteTrace::SourceTried(const QuoteSource& source) {
+    askedAny_ = true;
     marker_ = source.tag;
     beginning_.clear();
     lastBytes_.clear();
@@ -54,6 +55,10 @@ void QuoteTrace::SourceTried(const QuoteSource& source) {
 
 void QuoteTrace::SourceSkipped(int line, const char* reason) {
     output_ << "line " << line << " is no source: " << reason << '\n';
+}
+
+void QuoteTrace::ListEnded(int line) {
+    output_ << "line " << line << " ends the list, since it is empty or too short for a source\n";
 }
 
 void QuoteTrace::Connected(const char* server) {

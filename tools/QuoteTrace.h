@@ -16,6 +16,7 @@ class QuoteTrace : public QuoteObserver {
 
     void SourceTried(const QuoteSource& source) override;
     void SourceSkipped(int line, const char* reason) override;
+    void ListEnded(int line) override;
     void Connected(const char* server) override;
     void Failed(const char* reason) override;
     void PieceReceived(std::string_view piece) override;
@@ -24,11 +25,15 @@ class QuoteTrace : public QuoteObserver {
                    double fraction) override;
     void SourceAnswered(float result) override;
 
+    // Whether a source was asked so far.
+    [[nodiscard]] bool AskedAny() const { return askedAny_; }
+
   private:
     void TellWhatIsMissing();
     [[nodiscard]] bool CrossesPieces(std::string_view piece) const;
 
     std::ostream& output_;
+    bool askedAny_ = false;
     // Of the source being asked:
     std::string marker_;
     std::string beginning_;      // of the page

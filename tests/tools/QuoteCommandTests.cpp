@@ -92,6 +92,12 @@ TEST_F(QuoteCommand, TriesALine) {
 }
 
 TEST_F(QuoteCommand, SaysWhatIsWrong) {
+    // An empty line ends the list; nothing behind it is asked.
+    folder_.Write("home/Quorvan.cfg", "; comment\n\n" + Source("/q?s=", "Last", 2) + "\n");
+    EXPECT_EQ(Run("--home home ABC"), 1);
+    EXPECT_EQ(trace_, "ABC: looking in home/Quorvan.cfg\n"
+                      "line 2 ends the list, since it is empty or too short for a source\n"
+                      "there is no source to ask\n");
     EXPECT_EQ(Run("--home nowhere ABC"), 1);
     EXPECT_EQ(output_, "ABC\t-3.00\n");
     EXPECT_TRUE(Traced("failed: the file nowhere/Quorvan.cfg cannot be read\n")) << trace_;
