@@ -212,6 +212,9 @@ void BWindow::FrameResized(float, float) {}
 void BWindow::Quit() {
     if (!IsHidden())
         Hide();
+    // A window manager that sees an alert and the window below it go together may leave none active.
+    if (QWidget* before = peer_->activeBefore; before && before->isVisible())
+        before->activateWindow();
     BLooper::Quit();
 }
 
