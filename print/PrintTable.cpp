@@ -13,7 +13,9 @@ constexpr float HeadingLines = 1.25F;
 constexpr float CellInset = 5; // from the column's line
 constexpr float LineWidth = 1;
 constexpr float RowGap = 5;
-constexpr float RightSlack = 2; // what placed text leaves at the right
+constexpr float LeastNumberSize = 1; // points
+constexpr float LeastTextSize = 7;   // smaller than this, a text is better cut than unreadable
+constexpr float RightSlack = 2;      // what placed text leaves at the right
 
 float FontHeightOf(const BView* view) {
     BFont font;
@@ -90,25 +92,24 @@ void PRINT_TABLE::DrawText(const char* cells, int cellStride) {
         const std::string text(whole.substr(0, whole.find('\0')));
         if (columns_[i].alignment & DrawTextRight) {
             cell.right -= CellInset;
-            DrawNumber(cell, text.c_str());
+            DrawFitting(cell, text.c_str(), columns_[i].alignment, LeastNumberSize);
         } else {
             cell.left += CellInset;
             cell.right -= LineWidth; // the edge itself is the line's
-            ::DrawText(view_, &cell, text.c_str(),
-                       static_cast<uint8>(columns_[i].alignment | DrawTextMiddle));
+            DrawFitting(cell, text.c_str(), columns_[i].alignment, LeastTextSize);
         }
     }
     rowPosition_ += fontHeight_ + RowGap;
 }
 
-void PRINT_TABLE::DrawNumber(const BRect& cell, const char* text) const {
+void PRINT_TABLE::DrawFitting(const BRect& cell, const char* text, std::uint32_t alignment, float leastSize) const {
     BFont usual;
     view_->GetFont(&usual);
     BFont font = usual;
-    while (font.StringWidth(text) > cell.Width() - RightSlack && font.Size() > 1)
+    while (font.StringWidth(text) > cell.Width() - RightSlack && font.Size() > leastSize)
         font.SetSize(font.Size() - 1);
     view_->SetFont(&font);
-    ::DrawText(view_, &cell, text, DrawTextRight | DrawTextMiddle);
+    ::DrawText(view_, &cell, text, static_cast<uint8>(alignment | DrawTextMiddle));
     view_->SetFont(&usual);
 }
 

@@ -29,8 +29,9 @@ class PRINT_TABLE {
     // Draws the heading row, 1.25 lines high: labels in white on black.
     void DrawHeader();
     // Draws one row; cell i is the NUL-terminated text at cells + i * cellStride, and at most cellStride
-    // bytes of it. A cell is cut at its column's edge, but a right-aligned one, being a number, is drawn
-    // smaller instead: a number without its last digits is another number.
+    // bytes of it. What is too wide for its column is drawn smaller; a text that would be too small to read
+    // is cut at the column's edge, a right-aligned cell, being a number, never: without its last digits it
+    // would be another number.
     void DrawText(const char* cells, int cellStride);
     // Draws the line at each column's edge and the one below the last row.
     void DrawGridLines();
@@ -49,7 +50,8 @@ class PRINT_TABLE {
 
   private:
     void LayOut(float tableWidth);
-    void DrawNumber(const BRect& cell, const char* text) const;
+    // Smaller than usual when it is too wide, down to that size.
+    void DrawFitting(const BRect& cell, const char* text, std::uint32_t alignment, float leastSize) const;
 
     BView* view_;
     float left_;

@@ -137,20 +137,24 @@ TEST_F(ReportTest, ShowsTitlesTableAndFooter) {
     EXPECT_NEAR(Word("Mine").left + Word("Mine").right, page_.Width(), 2);
 }
 
-TEST_F(ReportTest, CutsACellAtItsColumnAndKeepsEveryDigit) {
+TEST_F(ReportTest, MakesWideCellsFitAndCutsWhatWouldBeTooSmall) {
     const std::string longName(31, 'W');
+    const std::string longAgent(31, 'M');
     INVESTMENT_DATA record = MakeInvestment("Mine", longName, 1, 1234567.5F);
-    record.Ticker[0] = '\0';
+    CopyText(record.Agent, longAgent);
+    record.Risk[0] = '\0';
     folder_.AddInvestment(record);
     ASSERT_EQ(Print("Mine"), ReportResult::Printed);
     const PdfWord name = Word(longName);
-    const float m = (Word("Bank").left - name.left) / 62; // both begin 5 points inside their columns
-    const float ticker = 24 * m;
-    const float middle = (name.top + name.bottom) / 2;
-    EXPECT_GT(name.right, ticker + 10); // the text goes on unseen
-    EXPECT_LT(Darkest(ticker - 8, ticker - 1, middle), 100);
-    EXPECT_LT(Darkest(ticker, ticker + 1, middle), 100); // the line between
-    EXPECT_GT(Darkest(ticker + 2, 32 * m - 1, middle), 200);
+    const PdfWord agent = Word(longAgent);
+    const float m = (agent.left - name.left) / 62; // both begin 5 points inside their columns
+    EXPECT_LT(name.right, 24 * m);                 // small enough to fit
+    const float risk = 74 * m;
+    const float middle = (agent.top + agent.bottom) / 2;
+    EXPECT_GT(agent.right, risk + 10); // the text goes on unseen
+    EXPECT_LT(Darkest(risk - 8, risk - 1, middle), 100);
+    EXPECT_LT(Darkest(risk, risk + 1, middle), 100); // the line between
+    EXPECT_GT(Darkest(risk + 2, 81 * m - 1, middle), 200);
     EXPECT_EQ(Count("1,234,567.50"), 2);
     EXPECT_GT(Word("1,234,567.50").left, 42 * m);
     EXPECT_LT(Word("1,234,567.50").right, 52 * m - 5);
