@@ -38,6 +38,12 @@ if [ -z "$folder" ]; then
     folder=$HOME/Quorvan
 fi
 
+existing=$folder
+until [ -e "$existing" ]; do
+    existing=$(dirname "$existing")
+done
+[ -d "$existing" ] && [ -w "$existing" ] || fail "the folder $folder cannot be made, or not be written"
+
 packages=("${build_packages[@]}" "${run_packages[@]}")
 if [ -z "${DISPLAY:-}${WAYLAND_DISPLAY:-}" ]; then
     packages+=("${display_packages[@]}")

@@ -41,6 +41,7 @@ struct AppState {
     // Whole records in the order in which they were copied; null and 0 when empty.
     std::unique_ptr<INVESTMENT_DATA[], FreeMemory> clipboard;
     int32 clipboardCount = 0;
+    bool clipboardIsOnlyCopy = false; // cut, and not pasted since
 };
 
 // Null when there is no application object.

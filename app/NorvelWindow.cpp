@@ -99,6 +99,10 @@ NorvelWindow::~NorvelWindow() {
     be_app->PostMessage(B_QUIT_REQUESTED);
 }
 
+bool NorvelWindow::QuitRequested() {
+    return MayForgetClipboard();
+}
+
 void NorvelWindow::Quit() {
     Lock(); // the application quits its windows from outside their handlers
     ClearInvestmentList();

@@ -31,6 +31,7 @@ class NorvelWindow : public BWindow {
     void MessageReceived(BMessage* message) override;
     void MenusBeginning() override;
     // Deletes the rows first.
+    bool QuitRequested() override;
     void Quit() override;
 
     // The sum of the Value of the current portfolio's investments, which are left as the investment
@@ -98,6 +99,8 @@ class NorvelWindow : public BWindow {
     void ClearInvestmentList();
     // Shows total when it is 0 or more, else the current portfolio's.
     void DisplayTotalValue(float total);
+    // Whether what was cut and never pasted may go: the person is asked, since nothing else has it.
+    [[nodiscard]] static bool MayForgetClipboard();
     // Copies the selected investments to the clipboard; true when it now holds all of them.
     bool CopySelection();
     void RemoveSelectedRows();

@@ -179,13 +179,23 @@ void NorvelWindow::RemoveSelectedRows() {
     }
 }
 
+bool NorvelWindow::MayForgetClipboard() {
+    if (!app_state->clipboardIsOnlyCopy)
+        return true;
+    const bool no = YesNoBox("What you cut has not been pasted yet, and would be lost. Go on all the same?");
+    return !no;
+}
+
 bool NorvelWindow::CopySelection() {
     const std::vector<NorvelItem*> selected = SelectedItems(investmentList_);
     if (selected.empty()) {
         MessageBox("You must select a(n) investment(s) to cut or copy.", B_INFO_ALERT);
         return false;
     }
+    if (!MayForgetClipboard())
+        return false;
     AppState& state = *app_state;
+    state.clipboardIsOnlyCopy = false;
     state.clipboardCount = 0;
     state.clipboard.reset(
         static_cast<INVESTMENT_DATA*>(std::calloc(selected.size(), sizeof(INVESTMENT_DATA))));
@@ -208,17 +218,21 @@ void NorvelWindow::OnInvestmentCopy() {
 }
 
 void NorvelWindow::OnInvestmentCut() {
-    if (CopySelection())
-        OnInvestmentDelete();
+    if (!CopySelection())
+        return;
+    app_state->clipboardIsOnlyCopy = true;
+    OnInvestmentDelete();
 }
 
 void NorvelWindow::OnInvestmentPaste() {
-    const AppState& state = *app_state;
+    AppState& state = *app_state;
     if (state.clipboardCount <= 0 || currentPortfolio_[0] == '\0')
         return;
-    if (!AppendCopies(*state.investments,
-                      {state.clipboard.get(), static_cast<std::size_t>(state.clipboardCount)},
-                      currentPortfolio_))
+    if (AppendCopies(*state.investments,
+                     {state.clipboard.get(), static_cast<std::size_t>(state.clipboardCount)},
+                     currentPortfolio_))
+        state.clipboardIsOnlyCopy = false;
+    else
         TellNotSaved();
     LoadInvestmentList();
 }

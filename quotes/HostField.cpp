@@ -6,12 +6,15 @@
 
 namespace {
 
-constexpr std::string_view TlsPrefix = "https://";
 constexpr std::uint16_t TlsPort = 443;
 
-bool BeginsWithTlsPrefix(std::string_view text) {
-    const std::string start(text.substr(0, TlsPrefix.size()));
-    return strcmpi(start.c_str(), TlsPrefix.data()) == 0;
+// Takes the prefix off, in any letter case; false when it is not there.
+bool TakePrefix(std::string_view* text, std::string_view prefix) {
+    const std::string start(text->substr(0, prefix.size()));
+    if (strcmpi(start.c_str(), prefix.data()) != 0)
+        return false;
+    text->remove_prefix(prefix.size());
+    return true;
 }
 
 bool ParsePort(std::string_view text, std::uint16_t* port) {
@@ -23,10 +26,11 @@ bool ParsePort(std::string_view text, std::uint16_t* port) {
 
 bool ParseHostField(std::string_view text, HostField* host) {
     *host = {};
-    if (BeginsWithTlsPrefix(text)) {
+    if (TakePrefix(&text, "https://")) {
         host->tls = true;
         host->port = TlsPort;
-        text.remove_prefix(TlsPrefix.size());
+    } else {
+        TakePrefix(&text, "http://"); // as a browser shows it
     }
     const std::size_t colon = text.find(':');
     if (colon != text.npos && !ParsePort(text.substr(colon + 1), &host->port))

@@ -11,7 +11,8 @@ struct HostField {
     bool tls = false;
 };
 
-// Reads a host field: NAME (port 80), NAME:PORT, https://NAME (port 443) or https://NAME:PORT. False when it
+// Reads a host field: NAME (port 80), NAME:PORT, https://NAME (port 443) or https://NAME:PORT; "http://" before
+// the first two says the same. False when it
 // is none of them: the port is no number from 1 to 65535, or the name is empty or has characters that belong
 // to other parts of an address.
 [[nodiscard]] bool ParseHostField(std::string_view text, HostField* host);

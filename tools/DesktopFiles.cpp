@@ -213,7 +213,10 @@ bool RemoveDesktopFiles(const std::string& program, const std::string& dataFolde
     const std::string path = EntryFile.Path(dataFolder);
     std::string present;
     if (Work::Look(path, present) == Work::Found::Ours && ValueOf(present, "TryExec") != EntryText(program)) {
-        work.Say("kept", path, "it starts " + ValueOf(present, "TryExec"));
+        work.Say("kept", path,
+                 "it starts " + ValueOf(present, "TryExec") +
+                     "; setup that folder with --remove-desktop, or this one with "
+                     "--desktop first");
         return true;
     }
     for (const DesktopFile& file : DesktopFilesInOrder)

@@ -79,4 +79,16 @@ TEST(Program, IsRefusedAFolderUntilItsHolderHasGoneHoweverItWent) {
     EXPECT_FALSE(third.HasEnded());
 }
 
+TEST(Program, AnswersWithoutADisplay) {
+    const std::pair<const char*, int> cases[] = {
+        {"", 1}, {"--help", 0}, {"--version", 0}, {"--help me", 0}, {"nonsense", 2}};
+    for (const auto& [arguments, status] : cases) {
+        const std::string command = "env -u DISPLAY -u WAYLAND_DISPLAY -u QT_QPA_PLATFORM " QUORVAN_PROGRAM
+                                    " " +
+                                    std::string(arguments) + " >/dev/null 2>&1";
+        const int result = std::system(command.c_str());
+        EXPECT_TRUE(WIFEXITED(result) && WEXITSTATUS(result) == status) << arguments;
+    }
+}
+
 } // namespace

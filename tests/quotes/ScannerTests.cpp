@@ -223,7 +223,9 @@ TEST(HostField, NamesAServer) {
         {"quotes.example:+80", ""},
         {":80", ""},
         {"https://", ""},
-        {"http://quotes.example", ""},
+        {"http://quotes.example", "quotes.example 80"},
+        {"Http://quotes.example:81", "quotes.example 81"},
+        {"http://https://quotes.example", ""},
         {"https://quotes.example/", ""},
         {"https://user@quotes.example", ""},
     };
