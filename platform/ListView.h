@@ -39,10 +39,10 @@ class BListItem {
   private:
     friend struct ListAccess;
 
+    BListView* list_ = nullptr; // the list that shows the row
     float height_ = 0;
     uint32 outlineLevel_;
     int32 index_ = -1; // place in the list when the row came or was sorted; a hint, checked before use
-    BListView* list_ = nullptr; // the list that shows the row
     bool selected_ = false;
     bool expanded_;
 };

@@ -41,6 +41,7 @@ TEST(DesktopFiles, AreWhatDesktopsExpect) {
 TEST(DesktopFiles, WindowsShowTheIconSharpAtEverySize) {
     const TemporaryFolder folder;
     folder.Write("icon.svg", std::string(ProgramIcon()));
+    const std::string render = "cd '" + folder.Path() + "' && rsvg-convert icon.svg -o picture.png -w ";
     const BApplication application("test");
     ASSERT_FALSE(BApplication::SetDesktopIdentity(DesktopId, "no picture"));
     EXPECT_TRUE(QApplication::windowIcon().isNull());
@@ -55,12 +56,9 @@ TEST(DesktopFiles, WindowsShowTheIconSharpAtEverySize) {
         EXPECT_EQ(shown.pixel(size / 2 - 1, ring), qRgb(255, 255, 255)) << size;
         EXPECT_EQ(shown.pixel(size / 2, ring), qRgb(255, 184, 28)) << size;
         // Another renderer draws the same picture, so nothing in it is one toolkit's own.
-        const std::string picture = folder.File(std::to_string(size) + ".png");
-        const std::string number = std::to_string(size);
-        ASSERT_EQ(Complaints(folder, "rsvg-convert -w " + number + " -h " + number + " -o '" + picture +
-                                         "' '" + folder.File("icon.svg") + "'"),
-                  "");
-        const QImage other = QImage(QString::fromStdString(picture)).convertToFormat(QImage::Format_RGB32);
+        ASSERT_EQ(Complaints(folder, render + std::to_string(size)), "");
+        const QImage other =
+            QImage(QString::fromStdString(folder.File("picture.png"))).convertToFormat(QImage::Format_RGB32);
         int differing = 0;
         for (int y = 0; y < size; ++y)
             for (int x = 0; x < size; ++x)

@@ -7,16 +7,16 @@
 namespace {
 
 struct Run {
-    int firstRow, lastRow, firstColumn, lastColumn;
+    std::size_t firstRow, lastRow, firstColumn, lastColumn;
 };
 
 StatusImageData Filled(int colour, const std::vector<Run>& runs) {
     StatusImageData image;
     image.fill(TransparentPixel);
     for (const Run& run : runs) {
-        for (int row = run.firstRow; row <= run.lastRow; ++row) {
-            for (int column = run.firstColumn; column <= run.lastColumn; ++column)
-                image.at(static_cast<std::size_t>(row * 16 + column)) = static_cast<std::uint8_t>(colour);
+        for (std::size_t row = run.firstRow; row <= run.lastRow; ++row) {
+            for (std::size_t column = run.firstColumn; column <= run.lastColumn; ++column)
+                image.at(row * 16 + column) = static_cast<std::uint8_t>(colour);
         }
     }
     return image;
