@@ -1,11 +1,13 @@
 #pragma once
 
+#include <algorithm>
 #include <filesystem>
 #include <fstream>
 #include <iterator>
 #include <stdexcept>
 #include <stdlib.h>
 #include <string>
+#include <vector>
 
 // A folder of the test's own, removed with everything in it at the end.
 class TemporaryFolder {
@@ -34,6 +36,18 @@ class TemporaryFolder {
         return {std::istreambuf_iterator<char>(file), {}};
     }
     [[nodiscard]] bool Has(const std::string& name) const { return std::filesystem::exists(File(name)); }
+    // The names of what lies in it, in alphabetical order.
+    [[nodiscard]] std::vector<std::string> Names() const {
+        std::vector<std::string> names;
+        for (const auto& entry : std::filesystem::directory_iterator(path_))
+            names.push_back(entry.path().filename().string());
+        std::sort(names.begin(), names.end());
+        return names;
+    }
+    void Clear() const {
+        std::filesystem::remove_all(path_);
+        std::filesystem::create_directory(path_);
+    }
 
   private:
     std::string path_;

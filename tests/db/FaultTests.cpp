@@ -1,11 +1,8 @@
-#include <gtest/gtest.h>
-
 #include <functional>
 #include <memory>
 
-#include <sys/wait.h>
-
 #include "FaultyFiles.h"
+#include "InChild.h"
 #include "SampleFile.h"
 #include "db/Compaction.h"
 #include "db/FileCheck.h"
@@ -90,17 +87,8 @@ class FaultTest : public testing::Test {
   protected:
     // A fresh file, opened through the operations that meet faults.
     std::unique_ptr<DATABASE> Fresh() {
-        std::filesystem::remove_all(folder_.Path());
-        std::filesystem::create_directory(folder_.Path());
-        {
-            DATABASE database(nullptr);
-            EXPECT_EQ(CreateRows(database, path_), 0);
-            for (int i = 0; i < 150; ++i) {
-                const ROW row = Row("row " + std::to_string(i), 0, i % 140);
-                EXPECT_EQ(database.Append(&row), i);
-            }
-            EXPECT_EQ(database.Delete(1) + database.Lock(3), 0);
-        }
+        folder_.Clear();
+        MakeRows(path_, 150, 3);
         return std::make_unique<DATABASE>(path_.c_str(), files_);
     }
 
@@ -182,16 +170,12 @@ TEST_F(FaultTest, KilledAtAnyCallLeavesTheOldContentOrTheNew) {
             for (int at = 0; killed; ++at) {
                 SCOPED_TRACE(std::string(operation.name) + " call " + std::to_string(at));
                 auto database = Fresh();
-                const pid_t child = fork();
-                ASSERT_GE(child, 0);
-                if (child == 0) {
+                const int result = ResultInChild([&] {
                     files_.Arm(fault, at);
-                    _exit(operation.run(*database) >= 0 ? 0 : 1);
-                }
-                int status = 0;
-                ASSERT_EQ(waitpid(child, &status, 0), child);
-                killed = WIFSIGNALED(status);
-                EXPECT_TRUE(killed || (at > 0 && WEXITSTATUS(status) == 0));
+                    return operation.run(*database) >= 0 ? 0 : 1;
+                });
+                killed = result < 0;
+                EXPECT_TRUE(killed || (at > 0 && result == 0));
                 const CONTENT found = Reopened();
                 EXPECT_TRUE(found == changed || (killed && IsUnfinished(found, old, changed, operation)));
                 // What was left behind the counted records is no obstacle, and does not come back.
@@ -213,9 +197,9 @@ TEST_F(FaultTest, CodesNameTheOperationThatFailed) {
     for (const auto& failure : cases) {
         auto database = Fresh();
         files_.Arm(Fault::HalfThenError, failure.call, EIO);
-        EXPECT_EQ(Operations[failure.operation].run(*database), -1);
+        EXPECT_EQ(Code(*database, Operations[failure.operation].run(*database)), failure.code)
+            << Operations[failure.operation].name;
         EXPECT_TRUE(files_.Disarm());
-        EXPECT_EQ(database->GetLastError(nullptr), failure.code) << Operations[failure.operation].name;
     }
 }
 
@@ -223,9 +207,8 @@ TEST_F(FaultTest, CreateThatFailsLeavesNoFile) {
     for (int call = 0; call < 3; ++call) {
         DATABASE database(nullptr, files_);
         files_.Arm(Fault::HalfThenError, call);
-        EXPECT_EQ(CreateRows(database, folder_.File("new.db")), -1);
+        EXPECT_EQ(Code(database, CreateRows(database, folder_.File("new.db"))), 1109);
         EXPECT_TRUE(files_.Disarm());
-        EXPECT_EQ(database.GetLastError(nullptr), 1109);
         EXPECT_FALSE(folder_.Has("new.db"));
     }
 }
@@ -239,8 +222,7 @@ TEST_F(FaultTest, FileThatMayOnlyBeReadIsRead) {
         ASSERT_TRUE(database.IsReadOnly());
         EXPECT_EQ(database.Query("Name contains row", QueryMode::New), 149);
         for (const OPERATION& operation : Operations) {
-            EXPECT_EQ(operation.run(database) == -1, operation.changesFile) << operation.name;
-            EXPECT_EQ(database.GetLastError(nullptr) != 0, operation.changesFile);
+            EXPECT_EQ(Code(database, operation.run(database)) != 0, operation.changesFile) << operation.name;
         }
         EXPECT_EQ(ContentOf(database), content);
         EXPECT_EQ(Reopened(), content);

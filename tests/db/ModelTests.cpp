@@ -1,5 +1,3 @@
-#include <gtest/gtest.h>
-
 #include <algorithm>
 #include <cstdio>
 #include <cstdlib>
@@ -11,11 +9,8 @@
 
 namespace {
 
-constexpr int Steps = 8000;
-constexpr long MostRecords = 40;
-
 // One random operation after another on a file and on the model, compared after each.
-class ModelTest : public testing::Test {
+class ModelTest : public RowsTest {
   protected:
     void SetUp() override {
         const char* wanted = std::getenv("QUORVAN_MODEL_SEED");
@@ -23,7 +18,6 @@ class ModelTest : public testing::Test {
                                             : std::random_device{}();
         std::printf("QUORVAN_MODEL_SEED=%u\n", seed);
         random_.seed(seed);
-        ASSERT_EQ(CreateRows(database_, path_), 0);
         head_ = folder_.Read("rows.db");
     }
 
@@ -34,8 +28,9 @@ class ModelTest : public testing::Test {
     }
     long AnyNumber() { return Pick(static_cast<int>(model_.Size()) + 2) - 1; }
     ROW AnyRow() {
-        return Row(Any(Names), Any(Numbers), Any(Numbers), Any(Numbers), Any(Prices), Any(Days), Any(Times));
+        return Row(Any(Names), Any(Numbers), Any(Numbers), Any(Numbers), AnyPrice(), Any(Days), Any(Times));
     }
+    float AnyPrice() { return std::strtof(Any(Prices), nullptr); }
     MODEL_STATEMENT AnyQuery();
     MODEL_STATEMENT AnySet();
 
@@ -56,18 +51,17 @@ class ModelTest : public testing::Test {
     void TextOutAndIn();
     void WholeFile();
     void CompareAll();
+    void Run(int steps, long mostRecords);
 
     static constexpr const char* Names[] = {
         "", "a", "B fund", "b FUND", "Fund \xC3\x84", "fund \xC3\xA4", "fifteen letters", "sixteen letters!"};
     static constexpr int Numbers[] = {-300, -128, -2, -1, 0, 1, 2, 3, 100, 40000};
-    static constexpr float Prices[] = {-1.5F, 0, 0.125F, 2, 1e30F};
+    static constexpr const char* Prices[] = {"-1.5", "0", "0.125", "2", "1e30"};
     static constexpr dbDATE Days[] = {{0, 0, 0}, {31, 12, 1999}, {29, 2, 2000}, {1, 1, 2001}, {70, 1, -5}};
     static constexpr dbTIME Times[] = {{0, 0, 0}, {59, 59, 23}, {30, 15, 9}, {-1, 70, -3}};
 
-    TemporaryFolder folder_;
-    std::string path_ = folder_.File("rows.db");
-    DATABASE database_{nullptr};
     RecordModel model_;
+    long mostRecords_ = 0;
     std::mt19937 random_;
     std::string head_; // of the new file
     std::deque<std::string> trace_;
@@ -75,36 +69,20 @@ class ModelTest : public testing::Test {
 
 MODEL_STATEMENT ModelTest::AnyQuery() {
     static constexpr const char* operators[] = {"=", "!=", "<", "<=", ">", ">=", "contains"};
-    MODEL_STATEMENT query{Pick(7), Any(operators), Any(Names), 0};
+    const std::string name = Any(Names);
     const int number = Any(Numbers);
-    const float price = Any(Prices);
-    char text[32] = "";
-    switch (query.column) {
-    case 0:
-        query.value = query.value.empty() ? "x" : query.value;
-        return query;
-    case 1:
-    case 2:
-    case 3:
-        query.number = query.column == 1   ? static_cast<std::int8_t>(number)
-                       : query.column == 2 ? static_cast<std::int16_t>(number)
-                                           : number;
-        query.value = std::to_string(number);
-        return query;
-    case 4:
-        query.number = price;
-        std::snprintf(text, sizeof(text), "%g", static_cast<double>(price));
-        break;
-    case 5:
-        query.number = 2000 * 65536 + 2 * 256 + 29;
-        std::snprintf(text, sizeof(text), "20000229");
-        break;
-    default:
-        query.number = 9 * 65536 + 15 * 256 + 30;
-        std::snprintf(text, sizeof(text), "091530");
-    }
-    query.value = text;
-    return query;
+    const std::string digits = std::to_string(number);
+    const char* price = Any(Prices);
+    const std::pair<std::string, double> values[] = {{name.empty() ? "x" : name, 0},
+                                                     {digits, static_cast<std::int8_t>(number)},
+                                                     {digits, static_cast<std::int16_t>(number)},
+                                                     {digits, number},
+                                                     {price, std::strtof(price, nullptr)},
+                                                     {"20000229", 2000 * 65536 + 2 * 256 + 29},
+                                                     {"091530", 9 * 65536 + 15 * 256 + 30}};
+    const int column = Pick(7);
+    const auto& [text, value] = values[column];
+    return {column, Any(operators), text, value};
 }
 
 MODEL_STATEMENT ModelTest::AnySet() {
@@ -124,56 +102,45 @@ MODEL_STATEMENT ModelTest::AnySet() {
 void ModelTest::ChangeRecords() {
     const ROW row = AnyRow();
     const long n = AnyNumber();
-    switch (Pick(4)) {
+    switch (Pick(model_.Size() < mostRecords_ ? 4 : 2)) {
     case 0:
-        if (model_.Size() < MostRecords) {
-            Expect("Append", model_.Append({row}), database_.Append(&row));
-        }
-        break;
-    case 1:
-        if (model_.Size() < MostRecords) {
-            std::vector<ROW> rows(static_cast<std::size_t>(Pick(5)), row);
-            std::generate(rows.begin(), rows.end(), [this] { return AnyRow(); });
-            Expect("AppendAll", model_.Append(rows),
-                   database_.AppendAll(rows.data(), sizeof(ROW), static_cast<std::int32_t>(rows.size())));
-        }
-        break;
-    case 2:
         Expect("Write " + std::to_string(n), model_.Write(n, row), database_.Write(n, &row));
         break;
-    default:
+    case 1:
         Expect("Update", model_.Update(row), database_.Update(&row));
+        break;
+    case 2:
+        Expect("Append", model_.Append({row}), database_.Append(&row));
+        break;
+    default:
+        std::vector<ROW> rows(static_cast<std::size_t>(Pick(5)));
+        std::generate(rows.begin(), rows.end(), [this] { return AnyRow(); });
+        Expect("AppendAll", model_.Append(rows),
+               database_.AppendAll(rows.data(), sizeof(ROW), static_cast<std::int32_t>(rows.size())));
     }
 }
 
 void ModelTest::MarkRecord() {
+    static constexpr struct {
+        const char* name;
+        OUTCOME (RecordModel::*expected)(long);
+        int (DATABASE::*found)(long);
+    } marks[] = {{"Delete ", &RecordModel::Delete, &DATABASE::Delete},
+                 {"UnDelete ", &RecordModel::UnDelete, &DATABASE::UnDelete},
+                 {"Lock ", &RecordModel::Lock, &DATABASE::Lock},
+                 {"UnLock ", &RecordModel::UnLock, &DATABASE::UnLock},
+                 {"IsLocked ", &RecordModel::IsLocked, &DATABASE::IsLocked}};
     const long n = AnyNumber();
-    const std::string number = " " + std::to_string(n);
-    ROW expected{};
-    ROW found{};
-    switch (Pick(7)) {
-    case 0:
-        Expect("Delete" + number, model_.Delete(n), database_.Delete(n));
-        break;
-    case 1:
-        Expect("UnDelete" + number, model_.UnDelete(n), database_.UnDelete(n));
-        break;
-    case 2:
-        Expect("Lock" + number, model_.Lock(n), database_.Lock(n));
-        break;
-    case 3:
-        Expect("UnLock" + number, model_.UnLock(n), database_.UnLock(n));
-        break;
-    case 4:
-        Expect("IsLocked" + number, model_.IsLocked(n), database_.IsLocked(n));
-        break;
-    case 5:
-        Expect("Read" + number, model_.Read(n, &expected), database_.Read(n, &found));
-        break;
-    default:
-        Expect("UnBufferedRead" + number, model_.Read(n, &expected), database_.UnBufferedRead(n, &found));
+    if (const int kind = Pick(7); kind < 5) {
+        const auto& mark = marks[kind];
+        Expect(mark.name + std::to_string(n), (model_.*mark.expected)(n), (database_.*mark.found)(n));
+    } else {
+        ROW expected{};
+        ROW found{};
+        Expect((kind == 5 ? "Read " : "UnBufferedRead ") + std::to_string(n), model_.Read(n, &expected),
+               kind == 5 ? database_.Read(n, &found) : database_.UnBufferedRead(n, &found));
+        EXPECT_EQ(BytesOf(found), BytesOf(expected));
     }
-    EXPECT_EQ(BytesOf(found), BytesOf(expected));
 }
 
 void ModelTest::Select() {
@@ -211,33 +178,23 @@ void ModelTest::Select() {
 }
 
 void ModelTest::WalkOn() {
-    const int kind = Pick(4);
-    long expected = -1;
+    const struct {
+        const char* name;
+        long start, step;
+        void* (DATABASE::*move)(long*);
+    } walks[] = {{"QueryGetFirst", 0, 1, &DATABASE::QueryGetFirst},
+                 {"QueryGetNext", -1, 1, &DATABASE::QueryGetNext},
+                 {"QueryGetLast", model_.Size() - 1, -1, &DATABASE::QueryGetLast},
+                 {"QueryGetPrev", -1, -1, &DATABASE::QueryGetPrev}};
+    const auto& walk = Any(walks);
+    const long expected = model_.Walk(walk.start, walk.step);
     long found = -1;
-    const void* data = nullptr;
-    switch (kind) {
-    case 0:
-        expected = model_.Walk(0, 1);
-        data = database_.QueryGetFirst(&found);
-        break;
-    case 1:
-        expected = model_.Walk(-1, 1);
-        data = database_.QueryGetNext(&found);
-        break;
-    case 2:
-        expected = model_.Walk(model_.Size() - 1, -1);
-        data = database_.QueryGetLast(&found);
-        break;
-    default:
-        expected = model_.Walk(-1, -1);
-        data = database_.QueryGetPrev(&found);
-    }
-    Expect("walk " + std::to_string(kind), {expected, 0}, found);
+    const void* data = (database_.*walk.move)(&found);
+    Expect(walk.name, {expected, 0}, found);
     ASSERT_EQ(data != nullptr, expected >= 0);
-    if (data != nullptr) {
-        const std::size_t at = static_cast<std::size_t>(expected) * (sizeof(ROW) + 1) + 1;
-        EXPECT_EQ(std::string(static_cast<const char*>(data), sizeof(ROW)),
-                  model_.Bytes().substr(at, sizeof(ROW)));
+    if (ROW row{}; data != nullptr) {
+        model_.Read(expected, &row);
+        EXPECT_EQ(BytesOf(*static_cast<const ROW*>(data)), BytesOf(row));
     }
 }
 
@@ -248,7 +205,7 @@ void ModelTest::TextOutAndIn() {
     const std::string lines = model_.Export(all, &rows);
     Expect("Export", {static_cast<long>(rows.size()), 0}, database_.Export(text.c_str(), all ? 1 : 0, "\t"));
     EXPECT_EQ(folder_.Read("rows.txt"), lines);
-    if (model_.Size() < MostRecords) {
+    if (model_.Size() < mostRecords_) {
         std::transform(rows.begin(), rows.end(), rows.begin(), RecordModel::Reloaded);
         model_.Append(rows);
         Expect("Load", {static_cast<long>(rows.size()), 0}, database_.Load(text.c_str(), "\t\n"));
@@ -256,14 +213,14 @@ void ModelTest::TextOutAndIn() {
 }
 
 void ModelTest::WholeFile() {
-    const int kind = model_.Size() > MostRecords ? 0 : Pick(5);
+    const int kind = model_.Size() > mostRecords_ ? 0 : Pick(5);
     if (kind < 2 && !model_.IsHeaderWritten()) {
         model_.SetHeaderWriting(true);
         Expect("header on", {}, database_.SetImmediateHeaderWrite(1));
     }
     switch (kind) {
     case 0:
-        for (long n = 0; n < model_.Size() && model_.Size() > MostRecords; n += 2) {
+        for (long n = 0; n < model_.Size() && model_.Size() > mostRecords_; n += 2) {
             Expect("Delete " + std::to_string(n), model_.Delete(n), database_.Delete(n));
         }
         model_.Compress();
@@ -274,7 +231,8 @@ void ModelTest::WholeFile() {
         Expect("Open", {}, database_.Open(path_.c_str()));
         break;
     case 2: {
-        const int kilobytes = Pick(3);
+        static constexpr int sizes[] = {0, 1, 3, 6};
+        const int kilobytes = Any(sizes);
         Expect("SetReadCache " + std::to_string(kilobytes), {}, database_.SetReadCache(kilobytes));
         break;
     }
@@ -296,6 +254,7 @@ void ModelTest::CompareAll() {
     DATABASE_HEADER header{};
     database_.GetHeaderInfo(&header);
     EXPECT_EQ(std::pair(header.recordCount, header.deletedCount), model_.Counts());
+    EXPECT_EQ(database_.GetNumberOfActiveRecords(), header.recordCount - header.deletedCount);
     EXPECT_EQ(database_.IsQueryActive(), model_.IsQueryActive());
     for (long n = -1; n <= model_.Size(); ++n) {
         EXPECT_EQ(database_.ConvertPhysToLogRecordNumber(n), model_.LogicalNumber(n)) << n;
@@ -310,31 +269,39 @@ void ModelTest::CompareAll() {
     EXPECT_TRUE(bytes == expected) << "at byte " << differs - bytes.begin() << " of the file";
 }
 
-TEST_F(ModelTest, LongRandomRunBesideAPlainModel) {
-    for (int step = 0; step < Steps && !HasFailure(); ++step) {
+void ModelTest::Run(int steps, long mostRecords) {
+    static constexpr std::pair<int, void (ModelTest::*)()> operations[] = {
+        {25, &ModelTest::ChangeRecords}, {50, &ModelTest::MarkRecord},   {75, &ModelTest::Select},
+        {95, &ModelTest::WalkOn},        {97, &ModelTest::TextOutAndIn}, {100, &ModelTest::WholeFile}};
+    mostRecords_ = mostRecords;
+    for (int step = 0; step < steps && !HasFailure(); ++step) {
         const int kind = Pick(100);
-        if (kind < 25) {
-            ChangeRecords();
-        } else if (kind < 50) {
-            MarkRecord();
-        } else if (kind < 75) {
-            Select();
-        } else if (kind < 95) {
-            WalkOn();
-        } else if (kind < 97) {
-            TextOutAndIn();
-        } else {
-            WholeFile();
+        for (const auto& [below, operation] : operations) {
+            if (kind < below) {
+                (this->*operation)();
+                break;
+            }
         }
         CompareAll();
         if (HasFailure()) {
-            std::ostringstream operations;
-            for (const std::string& operation : trace_) {
-                operations << operation << '\n';
-            }
-            ADD_FAILURE() << "step " << step << ", after\n" << operations.str();
+            std::ostringstream last;
+            std::copy(trace_.begin(), trace_.end(), std::ostream_iterator<std::string>(last, "\n"));
+            ADD_FAILURE() << "step " << step << ", after\n" << last.str();
         }
     }
+}
+
+TEST_F(ModelTest, LongRandomRunBesideAPlainModel) {
+    Run(8000, 40);
+}
+
+// So many records that the cache reads ahead, and not all of them at once.
+TEST_F(ModelTest, RandomRunOnALargerFile) {
+    for (int i = 0; i < 400; ++i) {
+        const ROW row = AnyRow();
+        Expect("Append", model_.Append({row}), database_.Append(&row));
+    }
+    Run(800, 500);
 }
 
 } // namespace

@@ -1,5 +1,4 @@
-#include <gtest/gtest.h>
-
+#include <climits>
 #include <random>
 
 #include "SampleFile.h"
@@ -9,46 +8,30 @@ namespace {
 
 using Numbers = std::vector<long>;
 
-class QueryTest : public testing::Test {
+class QueryTest : public RowsTest {
   protected:
-    void SetUp() override {
-        ASSERT_EQ(CreateRows(database_, folder_.File("rows.db")), 0);
-        const ROW rows[] = {
+    QueryTest() {
+        Append({
             Row("My Fund", -5, 300, 70000, 1.5F, {31, 12, 1998}, {59, 59, 11}),
             Row("growth stock", 7, -300, -70000, 10.25F, {1, 1, 1999}, {0, 0, 12}),
             Row("GROWTH", 127, 0, 4, -2, {15, 6, 2001}, {30, 15, 23}),
             Row("", 0, 1, 5, 0, {0, 0, 0}, {0, 0, 0}),
             Row("Exactly 16 chars", 1, 2, 3, 4, {28, 2, 2000}, {1, 0, 0}), // no room for a terminator
-        };
-        for (const ROW& row : rows) {
-            ASSERT_GE(database_.Append(&row), 0);
-        }
+        });
     }
 
-    Numbers Find(const char* statement, int mode = QueryMode::New) {
-        const long count = database_.Query(statement, mode);
-        EXPECT_GE(count, 0) << statement;
+    Numbers Find(const std::string& statement) {
+        const long count = database_.Query(statement.c_str(), QueryMode::New);
         Numbers found = Walked(database_);
         EXPECT_EQ(count, static_cast<long>(found.size())) << statement;
         return found;
     }
-
-    TemporaryFolder folder_;
-    DATABASE database_{nullptr};
 };
 
-TEST_F(QueryTest, SelectsByEveryTypeAndOperator) {
-    const struct {
-        const char* statement;
-        Numbers found;
-    } cases[] = {
-        {"Name = my fund", {0}},
+// What the operators find is compared with a plain model elsewhere; here is how values are read.
+TEST_F(QueryTest, TakesValuesAsTheyAreWritten) {
+    const std::pair<const char*, Numbers> cases[] = {
         {"  Name\t=\nMY FUND", {0}},
-        {"Name != My Fund", {1, 2, 3, 4}},
-        {"Name < growth", {3, 4}},
-        {"Name <= growth", {2, 3, 4}},
-        {"Name > GROWTH", {0, 1}},
-        {"Name >= growth", {0, 1, 2}},
         {"Name = growth ", {}},
         {"Name = exactly 16 chars", {4}},
         {"Name = exactly 16 charsx", {}},
@@ -57,38 +40,20 @@ TEST_F(QueryTest, SelectsByEveryTypeAndOperator) {
         {"Name contains 16 chars", {4}},
         {"Name contains  stock", {1}}, // the second blank belongs to the value
         {"Name contains x", {4}},
-        {"Tag = -5", {0}},
-        {"Tag > 6", {1, 2}},
         {"Tag = 251", {0}}, // 8 bits of it
-        {"Small <= -300", {1}},
         {"Small = 65836", {0}},
-        {"Count >= 70000", {0}},
-        {"Count < -1", {1}},
         {"Count = 4294967300", {2}},
-        {"Price = 10.25", {1}},
         {"Price = 1025e-2", {1}},
-        {"Price < -1.5", {2}},
         {"Price > 1e300", {}},
         {"Price = number", {3}},
-        {"Day >= 19990101", {1, 2, 4}},
-        {"Day = 19981231", {0}},
         {"Day > 2000", {2, 4}}, // no month and no day come before all of them
         {"Day = x", {3}},
-        {"At < 120000", {0, 3, 4}},
         {"At = 23:15", {}},
         {"At > 23", {2}},
     };
-    for (int kilobytes : {256, 0}) {
-        ASSERT_EQ(database_.SetReadCache(kilobytes), 0);
-        for (const auto& query : cases) {
-            EXPECT_EQ(Find(query.statement), query.found) << query.statement;
-        }
+    for (const auto& [statement, found] : cases) {
+        EXPECT_EQ(Find(statement), found) << statement;
     }
-    database_.SetCaseSensitivity(1);
-    EXPECT_EQ(Find("Name = My Fund"), Numbers{0});
-    EXPECT_EQ(Find("Name = my fund"), Numbers{});
-    EXPECT_EQ(Find("Name contains GROW"), Numbers{2});
-    EXPECT_EQ(Find("Name < a"), (Numbers{0, 2, 3, 4}));
 }
 
 TEST_F(QueryTest, RefusesAndKeepsTheSet) {
@@ -113,16 +78,12 @@ TEST_F(QueryTest, RefusesAndKeepsTheSet) {
         {"Name = x" + std::string(120, '\t'), QueryMode::New, 1608},
     };
     ASSERT_EQ(Find("Name contains growth"), (Numbers{1, 2}));
-    for (const auto& refused : cases) {
-        EXPECT_EQ(database_.Query(refused.statement.c_str(), refused.mode), -1) << refused.statement;
-        EXPECT_EQ(database_.GetLastError(nullptr), refused.code) << refused.statement;
-        EXPECT_EQ(Walked(database_), (Numbers{1, 2}));
+    for (const auto& [statement, mode, code] : cases) {
+        EXPECT_EQ(CodeOf(database_.Query(statement.c_str(), mode)), code) << statement;
+        EXPECT_EQ(Walked(database_), (Numbers{1, 2})) << statement;
     }
-    EXPECT_EQ(Find(("Name = " + token31).c_str()), Numbers{});
-    EXPECT_EQ(Find(("Name = x" + std::string(119, '\t')).c_str()), Numbers{});
-    DATABASE fresh(folder_.File("rows.db").c_str());
-    EXPECT_EQ(fresh.Query("Price > 1", QueryMode::And), -1);
-    EXPECT_EQ(fresh.GetLastError(nullptr), 1607);
+    EXPECT_EQ(Find("Name = " + token31), Numbers{});
+    EXPECT_EQ(Find("Name = x" + std::string(119, '\t')), Numbers{});
 }
 
 TEST(Statement, IsSplitIntoTokens) {
@@ -159,79 +120,15 @@ TEST(Statement, IsSplitIntoTokens) {
     EXPECT_EQ(WholeNumber("99999999999999999999"), INT64_MAX);
 }
 
-TEST_F(QueryTest, AndNarrowsOrWidens) {
-    EXPECT_EQ(Find("Tag > 0"), (Numbers{1, 2, 4}));
-    EXPECT_EQ(Find("Price > 0", QueryMode::And), (Numbers{1, 4}));
-    EXPECT_EQ(Find("Name = my fund", QueryMode::Or), (Numbers{0, 1, 4}));
-    ASSERT_EQ(database_.Delete(1), 0);
-    const ROW late = Row("my fund", 1, 1, 1, 1);
-    ASSERT_EQ(database_.Append(&late), 5);
-    EXPECT_EQ(Find("Price > -9", QueryMode::Or), (Numbers{0, 2, 3, 4}))
-        << "deleted and later records stay out";
-    EXPECT_EQ(Find("Price > -9"), (Numbers{0, 2, 3, 4, 5}));
-    EXPECT_EQ(Find("", QueryMode::And), (Numbers{0, 2, 3, 4, 5})) << "an empty statement selects all";
-}
-
-TEST_F(QueryTest, WalkFollowsTheSet) {
-    long number = -1;
-    ASSERT_EQ(database_.Query("Name >= growth", QueryMode::New), 3); // 0, 1 and 2
-    ASSERT_NE(database_.QueryGetNext(&number), nullptr);
-    EXPECT_EQ(number, 1) << "without a first call the walk begins after slot 0";
-    ASSERT_NE(database_.QueryGetFirst(&number), nullptr);
-    EXPECT_EQ(database_.ConvertPhysToLogRecordNumber(2), 2);
-    ASSERT_EQ(database_.Delete(1), 0);
-    EXPECT_EQ(database_.ConvertPhysToLogRecordNumber(2), 1);
-    EXPECT_EQ(database_.ConvertPhysToLogRecordNumber(1), -1);
-    EXPECT_EQ(database_.ConvertPhysToLogRecordNumber(-1), -1);
-    auto* row = static_cast<ROW*>(database_.QueryGetNext(&number));
-    ASSERT_NE(row, nullptr);
-    EXPECT_EQ(number, 2);
-    row->price = 99;
-    EXPECT_EQ(database_.Update(row), 0) << "the walk makes its record the current one";
-    EXPECT_EQ(database_.QueryGetNext(nullptr), nullptr);
-    EXPECT_EQ(database_.QueryGetNext(nullptr), nullptr);
-    const ROW late = Row("late");
-    ASSERT_EQ(database_.Append(&late), 5);
-    ASSERT_NE(database_.QueryGetLast(&number), nullptr);
-    EXPECT_EQ(number, 2) << "a record appended since is outside the set";
-    ASSERT_NE(database_.QueryGetPrev(&number), nullptr);
-    EXPECT_EQ(number, 0);
-    EXPECT_EQ(database_.QueryGetPrev(nullptr), nullptr);
-    for (auto [start, step] : {std::pair<long, long>{1, 0}, {LONG_MAX, 1}, {-1, LONG_MAX}, {-1, LONG_MIN}}) {
-        EXPECT_EQ(database_.QueryGetXXX(start, step, nullptr), nullptr) << start << " " << step;
-    }
-    EXPECT_EQ(database_.Query("Price = 99", QueryMode::New), 1);
-}
-
-TEST_F(QueryTest, RecordsDeletedElsewhereDropOutOfTheWalk) {
+TEST_F(QueryTest, WalkKeepsWithinTheSetOfTheMoment) {
     ASSERT_EQ(database_.SetReadCache(0), 0);
     ASSERT_EQ(database_.QueryReset(), 5);
-    DATABASE other(folder_.File("rows.db").c_str());
-    ASSERT_EQ(other.Delete(3), 0);
-    EXPECT_EQ(Walked(database_), (Numbers{0, 1, 2, 4}));
+    ASSERT_EQ(DATABASE(path_.c_str()).Delete(3), 0);
+    EXPECT_EQ(Walked(database_), (Numbers{0, 1, 2, 4})) << "a record deleted elsewhere drops out";
     EXPECT_EQ(database_.ConvertPhysToLogRecordNumber(4), 3);
-}
-
-TEST_F(QueryTest, RefreshAndReset) {
-    EXPECT_EQ(database_.IsQueryActive(), 0);
-    ASSERT_EQ(database_.Delete(3), 0);
-    Find("Price >= -2");
-    EXPECT_EQ(database_.IsQueryActive(), 0) << "all active records match";
-    Find("Name contains growth", QueryMode::And);
-    EXPECT_EQ(database_.IsQueryActive(), 1);
-    const ROW late = Row("Growth too");
-    ASSERT_EQ(database_.Append(&late), 5);
-    database_.QueryRefresh();
-    EXPECT_EQ(Walked(database_), (Numbers{1, 2, 5}));
-    EXPECT_EQ(database_.Query(nullptr, QueryMode::New), 5);
-    EXPECT_EQ(database_.IsQueryActive(), 0);
-    database_.QueryRefresh();
-    EXPECT_EQ(Walked(database_), (Numbers{0, 1, 2, 4, 5}));
-    for (long n : {0, 1, 2, 4, 5}) {
-        ASSERT_EQ(database_.Delete(n), 0);
+    for (auto [start, step] : {std::pair<long, long>{3, 0}, {LONG_MAX, 1}, {-1, LONG_MAX}, {-1, LONG_MIN}}) {
+        EXPECT_EQ(database_.QueryGetXXX(start, step, nullptr), nullptr) << start << " " << step;
     }
-    EXPECT_EQ(Find("Price > -9"), Numbers{});
-    EXPECT_EQ(database_.QueryGetFirst(nullptr), nullptr);
 }
 
 // Every way to compare texts agrees with the comparison of two plain strings, whatever the column's width and

@@ -3,13 +3,12 @@
 #include <algorithm>
 #include <cstdio>
 #include <cstdlib>
+#include <numeric>
+#include <sstream>
 
 namespace {
 
-constexpr std::uint8_t Active = 0;
-constexpr std::uint8_t Deleted = 1;
-constexpr std::uint8_t Locked = 2;
-enum { Name, Tag, Small, Count, Price, Day, At };
+enum { Name, Tag, Small, Count, Price, Day, Clock };
 
 // A to Z in small letters up to the first byte beyond ASCII.
 std::string Lowered(std::string text) {
@@ -60,15 +59,20 @@ int MonthLength(int year, int month) {
     return lengths[month - 1] + (month == 2 && leap ? 1 : 0);
 }
 
+// Keeps a part between its least and most by taking from the part above it, or giving to it.
+void Carry(int* part, int least, int most, int* above) {
+    for (; *part > most; *part -= most - least + 1, ++*above) {
+    }
+    for (; *part < least; *part += most - least + 1, --*above) {
+    }
+}
+
 dbDATE Valid(dbDATE date) {
     int year = date.year;
     int month = +date.month;
     int day = +date.day;
     const auto carry = [&] {
-        for (; month > 12; month -= 12, ++year) {
-        }
-        for (; month < 1; month += 12, --year) {
-        }
+        Carry(&month, 1, 12, &year);
         year = static_cast<std::int16_t>(year);
     };
     carry();
@@ -88,14 +92,8 @@ dbTIME Valid(dbTIME time) {
     int second = +time.second;
     int minute = +time.minute;
     int hour = +time.hour;
-    for (; second > 59; second -= 60, ++minute) {
-    }
-    for (; second < 0; second += 60, --minute) {
-    }
-    for (; minute > 59; minute -= 60, ++hour) {
-    }
-    for (; minute < 0; minute += 60, --hour) {
-    }
+    Carry(&second, 0, 59, &minute);
+    Carry(&minute, 0, 59, &hour);
     hour += hour >= 24 ? -24 : hour < 0 ? 24 : 0;
     return {static_cast<std::int8_t>(second), static_cast<std::int8_t>(minute),
             static_cast<std::int8_t>(hour)};
@@ -224,9 +222,13 @@ OUTCOME RecordModel::Append(const std::vector<ROW>& rows) {
     return {first, 0};
 }
 
+int RecordModel::Refusal(long n, int beyond, int deleted) const {
+    return !Has(n) ? beyond : records_[static_cast<std::size_t>(n)].status == Deleted ? deleted : 0;
+}
+
 OUTCOME RecordModel::Read(long n, ROW* row) {
-    if (!Has(n) || At(n).status == Deleted) {
-        return {-1, Has(n) ? 1202 : 1201};
+    if (const int code = Refusal(n, 1201, 1202)) {
+        return {-1, code};
     }
     *row = At(n).row;
     current_ = n;
@@ -234,8 +236,8 @@ OUTCOME RecordModel::Read(long n, ROW* row) {
 }
 
 OUTCOME RecordModel::Write(long n, const ROW& row) {
-    if (!Has(n) || At(n).status == Deleted) {
-        return {-1, Has(n) ? 1303 : 1302};
+    if (const int code = Refusal(n, 1302, 1303)) {
+        return {-1, code};
     }
     At(n) = {row, Active};
     current_ = n;
@@ -243,8 +245,8 @@ OUTCOME RecordModel::Write(long n, const ROW& row) {
 }
 
 OUTCOME RecordModel::Delete(long n) {
-    if (!Has(n) || At(n).status == Deleted) {
-        return {-1, Has(n) ? 1403 : 1402};
+    if (const int code = Refusal(n, 1402, 1403)) {
+        return {-1, code};
     }
     At(n).status = Deleted;
     current_ = -1;
@@ -253,39 +255,20 @@ OUTCOME RecordModel::Delete(long n) {
     return {};
 }
 
-OUTCOME RecordModel::UnDelete(long n) {
-    if (!Has(n) || At(n).status != Deleted) {
-        return {-1, Has(n) ? 1503 : 1502};
+OUTCOME RecordModel::Mark(long n, Status from, Status to, int beyond, int deleted, int other) {
+    if (!Has(n) || At(n).status != from) {
+        const int code = Refusal(n, beyond, deleted);
+        return {-1, code != 0 ? code : other};
     }
-    At(n).status = Active;
+    At(n).status = to;
     current_ = n;
     WriteCounts();
     return {};
 }
 
-OUTCOME RecordModel::Lock(long n) {
-    if (!Has(n) || At(n).status != Active) {
-        return {-1, !Has(n) ? 2302 : At(n).status == Deleted ? 2301 : 2303};
-    }
-    At(n).status = Locked;
-    current_ = n;
-    return {};
-}
-
-OUTCOME RecordModel::UnLock(long n) {
-    if (!Has(n) || At(n).status != Locked) {
-        return {-1, !Has(n) ? 2402 : At(n).status == Deleted ? 2401 : 2403};
-    }
-    At(n).status = Active;
-    current_ = n;
-    return {};
-}
-
-OUTCOME RecordModel::IsLocked(long n) const {
-    if (!Has(n) || records_[static_cast<std::size_t>(n)].status == Deleted) {
-        return {-1, Has(n) ? 2501 : 2502};
-    }
-    return {records_[static_cast<std::size_t>(n)].status == Locked ? 1 : 0, 0};
+OUTCOME RecordModel::IsLocked(long n) {
+    const int code = Refusal(n, 2502, 2501);
+    return code != 0 ? OUTCOME{-1, code} : OUTCOME{At(n).status == Locked ? 1 : 0, 0};
 }
 
 bool RecordModel::Matches(const ROW& row, const MODEL_STATEMENT& query) const {
@@ -410,41 +393,41 @@ long RecordModel::Walk(long start, long step) {
     return -1;
 }
 
-std::string RecordModel::Export(bool all, std::vector<ROW>* exported) {
-    exported->clear();
-    if (all) {
-        for (const RECORD& record : records_) {
-            if (record.status != Deleted) {
-                exported->push_back(record.row);
-            }
-        }
-    } else {
-        for (long n = Walk(0, 1); n >= 0; n = Walk(-1, 1)) {
-            exported->push_back(At(n).row);
-        }
+std::vector<long> RecordModel::Walked() {
+    std::vector<long> numbers;
+    for (long n = Walk(0, 1); n >= 0; n = Walk(-1, 1)) {
+        numbers.push_back(n);
     }
+    return numbers;
+}
+
+std::string RecordModel::Export(bool all, std::vector<ROW>* exported) {
+    std::vector<long> numbers(records_.size());
+    std::iota(numbers.begin(), numbers.end(), 0);
+    exported->clear();
     std::string text;
-    for (const ROW& row : *exported) {
-        text += Line(row);
+    for (const long n : all ? numbers : Walked()) {
+        if (At(n).status != Deleted) {
+            exported->push_back(At(n).row);
+            text += Line(At(n).row);
+        }
     }
     return text;
 }
 
 ROW RecordModel::Reloaded(const ROW& row) {
-    const float price = row.price;
-    char text[100];
-    std::snprintf(text, sizeof(text), "%.2f", static_cast<double>(price));
-    ROW loaded = Row(NameOf(row).empty() ? " " : NameOf(row).substr(0, 15), std::to_string(row.tag)[0],
-                     row.small, row.count, std::strtof(text, nullptr));
-    std::snprintf(text, sizeof(text), "%04d%02d%02d", row.day.year, row.day.month, row.day.day);
-    const std::vector<int> date = Groups(text, {4, 2, 2});
-    loaded.day = {static_cast<std::int8_t>(date[2]), static_cast<std::int8_t>(date[1]),
-                  static_cast<std::int16_t>(date[0])};
-    std::snprintf(text, sizeof(text), "%02d%02d%02d", row.at.hour, row.at.minute, row.at.second);
-    const std::vector<int> time = Groups(text, {2, 2, 2});
-    loaded.at = {static_cast<std::int8_t>(time[2]), static_cast<std::int8_t>(time[1]),
-                 static_cast<std::int8_t>(time[0])};
-    return loaded;
+    std::istringstream line(Line(row));
+    std::string fields[7];
+    for (std::string& field : fields) {
+        std::getline(line, field, '\t');
+    }
+    const std::vector<int> date = Groups(fields[Day], {4, 2, 2});
+    const std::vector<int> time = Groups(fields[Clock], {2, 2, 2});
+    const auto byte = [](int part) { return static_cast<std::int8_t>(part); };
+    return Row(fields[Name].substr(0, 15), fields[Tag][0], row.small, row.count,
+               std::strtof(fields[Price].c_str(), nullptr),
+               {byte(date[2]), byte(date[1]), static_cast<std::int16_t>(date[0])},
+               {byte(time[2]), byte(time[1]), byte(time[0])});
 }
 
 void RecordModel::Compress() {

@@ -26,9 +26,10 @@ struct MODEL_STATEMENT {
 // looked at one by one, a sort is a bubble sort. It knows nothing of bytes but those it expects in the file.
 class RecordModel {
   public:
+    enum Status : std::uint8_t { Active, Deleted, Locked };
     struct RECORD {
         ROW row;
-        std::uint8_t status;
+        Status status;
     };
 
     OUTCOME Append(const std::vector<ROW>& rows);
@@ -36,15 +37,16 @@ class RecordModel {
     OUTCOME Write(long n, const ROW& row);
     OUTCOME Update(const ROW& row) { return current_ < 0 ? OUTCOME{-1, 2101} : Write(current_, row); }
     OUTCOME Delete(long n);
-    OUTCOME UnDelete(long n);
-    OUTCOME Lock(long n);
-    OUTCOME UnLock(long n);
-    OUTCOME IsLocked(long n) const;
+    OUTCOME UnDelete(long n) { return Mark(n, Deleted, Active, 1502, 0, 1503); }
+    OUTCOME Lock(long n) { return Mark(n, Active, Locked, 2302, 2301, 2303); }
+    OUTCOME UnLock(long n) { return Mark(n, Locked, Active, 2402, 2401, 2403); }
+    OUTCOME IsLocked(long n);
     OUTCOME Query(const MODEL_STATEMENT* statement, int mode);
     OUTCOME QueryUpdate(const MODEL_STATEMENT& statement);
     OUTCOME Sort(int column);
     // The walk's next record; -1 at the end.
     long Walk(long start, long step);
+    std::vector<long> Walked();
     // The lines of all active records, or of those of the walk.
     std::string Export(bool all, std::vector<ROW>* exported);
     // What becomes of a row that is exported and loaded again, byte columns as numbers.
@@ -71,6 +73,10 @@ class RecordModel {
     [[nodiscard]] long SetSize() const;
     OUTCOME Reset();
     void WriteCounts();
+    // The code for a record that is not there or deleted; 0 for any other.
+    [[nodiscard]] int Refusal(long n, int beyond, int deleted) const;
+    // Gives a record of one status another one.
+    OUTCOME Mark(long n, Status from, Status to, int beyond, int deleted, int other);
     RECORD& At(long n) { return records_[static_cast<std::size_t>(n)]; }
 
     std::vector<RECORD> records_;

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <gtest/gtest.h>
+
 #include <cstring>
 #include <optional>
 #include <string>
@@ -53,6 +55,32 @@ inline int CreateRows(DATABASE& database, const std::string& path) {
     return database.Create(path.c_str(), "rows", static_cast<int>(columns.size()), columns.data());
 }
 
+// A file of rows of which record 1 is deleted and one is locked.
+inline void MakeRows(const std::string& path, int count, long locked = 2) {
+    DATABASE database(nullptr);
+    ASSERT_EQ(CreateRows(database, path), 0);
+    for (int i = 0; i < count; ++i) {
+        const ROW row = Row("row " + std::to_string(i), 0, i % 140);
+        ASSERT_EQ(database.Append(&row), i);
+    }
+    ASSERT_EQ(database.Delete(1) + database.Lock(locked), 0);
+}
+
+constexpr std::size_t FirstColumn = 52;
+constexpr std::size_t DataStartOfRows = FirstColumn + 44 * 7;
+constexpr std::size_t RowLength = sizeof(ROW) + 1;
+
+inline std::string With(std::string bytes, std::size_t at, const std::string& other) {
+    return bytes.replace(at, other.size(), other);
+}
+
+// The error code of an operation that failed with this result; 0 of one that succeeded without an error.
+inline int Code(DATABASE& database, long result) {
+    const int code = database.GetLastError(nullptr);
+    EXPECT_EQ(result < 0, code != 0) << result << " and code " << code;
+    return code;
+}
+
 inline std::string BytesOf(const ROW& row) {
     return {reinterpret_cast<const char*>(&row), sizeof(row)};
 }
@@ -65,7 +93,7 @@ inline CONTENT ContentOf(DATABASE& database) {
     database.GetHeaderInfo(&header);
     CONTENT content;
     for (long i = 0; i < header.recordCount; ++i) {
-        std::string data(static_cast<std::size_t>(header.recordLength), '\0');
+        std::string data(static_cast<std::size_t>(header.recordLength) - 1, '\0');
         content.emplace_back();
         if (database.Read(i, data.data()) == 1) {
             content.back() = data;
@@ -85,3 +113,23 @@ inline std::vector<long> Walked(DATABASE& database) {
     }
     return numbers;
 }
+
+// A new file of rows.
+class RowsTest : public testing::Test {
+  protected:
+    RowsTest() { EXPECT_EQ(CreateRows(database_, path_), 0); }
+
+    void Append(const std::vector<ROW>& rows) {
+        EXPECT_GE(database_.AppendAll(rows.data(), sizeof(ROW), static_cast<std::int32_t>(rows.size())), 0);
+    }
+    int CodeOf(long result) { return Code(database_, result); }
+    ROW At(long n) {
+        ROW row{};
+        EXPECT_EQ(database_.UnBufferedRead(n, &row), 1) << n;
+        return row;
+    }
+
+    TemporaryFolder folder_;
+    std::string path_ = folder_.File("rows.db");
+    DATABASE database_{nullptr};
+};

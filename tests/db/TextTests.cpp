@@ -1,35 +1,28 @@
-#include <gtest/gtest.h>
-
 #include <limits>
 
 #include "SampleFile.h"
 
 namespace {
 
-class TextTest : public testing::Test {
+class TextTest : public RowsTest {
   protected:
-    TextTest() { EXPECT_EQ(CreateRows(database_, folder_.File("rows.db")), 0); }
-
-    void Write(const std::string& text) const { folder_.Write("rows.txt", text); }
-    std::string Text() const { return folder_.Read("rows.txt"); }
     long Load(const std::string& text, const char* separators = "\t\n") {
-        Write(text);
-        return database_.Load(path_.c_str(), separators);
+        folder_.Write("rows.txt", text);
+        return database_.Load(text_.c_str(), separators);
+    }
+    // Makes a file of other columns and loads a text into it.
+    long LoadInto(const std::vector<COLUMN_ENTRY>& columns, const std::string& text, const char* separators) {
+        const auto count = static_cast<int>(columns.size());
+        EXPECT_EQ(database_.Create(folder_.File("other.db").c_str(), "", count, columns.data()), 0);
+        return Load(text, separators);
     }
     std::string LineOf(const ROW& row, const char* separator = "|") const {
         std::string line;
         database_.FormatRecordData(&line, &row, separator);
         return line;
     }
-    ROW Record(long n) {
-        ROW row{};
-        EXPECT_EQ(database_.Read(n, &row), 1);
-        return row;
-    }
 
-    TemporaryFolder folder_;
-    std::string path_ = folder_.File("rows.txt");
-    DATABASE database_{nullptr};
+    std::string text_ = folder_.File("rows.txt");
 };
 
 TEST_F(TextTest, FieldsAsText) {
@@ -62,59 +55,36 @@ TEST_F(TextTest, LinesAreAsDocumented) {
     const std::size_t end = text.rfind("```");
     const std::size_t begin = text.rfind("```\n", end - 1) + 4;
     const std::string example = text.substr(begin, end - begin);
-    DATABASE database(nullptr);
-    const COLUMN_ENTRY columns[] = {Column("Name", ColumnType::String, 8), Column("Kind", ColumnType::Byte),
-                                    Column("Price", ColumnType::Float), Column("Bought", ColumnType::Date),
-                                    Column("Sold", ColumnType::Time)};
-    ASSERT_EQ(database.Create(folder_.File("example.db").c_str(), "", 5, columns), 0);
-    Write(example);
-    EXPECT_EQ(database.Load(path_.c_str(), "|\n"), 2);
-    EXPECT_EQ(database.Query("Bought = 19990105", QueryMode::New), 1);
-    EXPECT_EQ(database.Query("Price = 12.25", QueryMode::And), 1);
-    database.SetByteOutputFormat(1);
-    EXPECT_EQ(database.Export(path_.c_str(), 1, "|"), 2);
-    EXPECT_EQ(Text(), example);
+    ASSERT_EQ(LoadInto({Column("Name", ColumnType::String, 8), Column("Kind", ColumnType::Byte),
+                        Column("Price", ColumnType::Float), Column("Bought", ColumnType::Date),
+                        Column("Sold", ColumnType::Time)},
+                       example, "|\n"),
+              2);
+    EXPECT_EQ(database_.Query("Bought = 19990105", QueryMode::New), 1);
+    EXPECT_EQ(database_.Query("Price = 12.25", QueryMode::And), 1);
+    database_.SetByteOutputFormat(1);
+    EXPECT_EQ(database_.Export(text_.c_str(), 1, "|"), 2);
+    EXPECT_EQ(folder_.Read("rows.txt"), example);
 }
 
-TEST_F(TextTest, ExportOfAllAndOfTheSet) {
-    const std::vector<ROW> rows = {Row("c"), Row("b", 1), Row("gone"), Row("a", 1)};
-    EXPECT_EQ(database_.AppendAll(rows.data(), sizeof(ROW), 4), 0);
-    EXPECT_EQ(database_.Delete(2), 0);
-    EXPECT_EQ(database_.Query("Tag = 1", QueryMode::New), 2);
-    EXPECT_EQ(database_.SortBy("Name", 0), 0);
-    Write(std::string(100'000, 'x')); // is replaced, whole
-    EXPECT_EQ(database_.Export(path_.c_str(), 0, "\t"), 2);
-    EXPECT_EQ(Text(), LineOf(rows[3], "\t") + LineOf(rows[1], "\t"));
-    EXPECT_EQ(database_.Export(path_.c_str(), 1, "\t"), 3);
-    EXPECT_EQ(Text(), LineOf(rows[0], "\t") + LineOf(rows[1], "\t") + LineOf(rows[3], "\t"));
-}
-
+// Several blocks, batches and lines across them.
 TEST_F(TextTest, WhatIsExportedLoadsBack) {
     std::vector<ROW> rows;
-    rows.reserve(20'001);
-    for (int i = 0; i < 20'000; ++i) { // several blocks, batches and lines across them
-        rows.push_back(Row("row " + std::string(static_cast<std::size_t>(i % 11), 'x'), i % 7 - 3,
-                           i % 1000 - 500, i * 1'000, static_cast<float>(i) / 4,
-                           {5, 1, static_cast<std::int16_t>(1900 + i % 300)},
-                           {30, 15, static_cast<std::int8_t>(i % 24)}));
+    for (int i = 0; i < 20'000; ++i) {
+        rows.push_back(Row("row " + std::string(static_cast<std::size_t>(i % 11), 'x'), i % 7, i % 1000 - 500,
+                           i * 1'000, static_cast<float>(i) / 4));
     }
-    rows.push_back(Row("big", 10, 0, 0, -std::numeric_limits<float>::max()));
-    EXPECT_EQ(database_.AppendAll(rows.data(), sizeof(ROW), static_cast<std::int32_t>(rows.size())), 0);
+    rows.push_back(Row("big", 1, 0, 0, -std::numeric_limits<float>::max()));
+    Append(rows);
+    const auto count = static_cast<long>(rows.size());
+    EXPECT_EQ(database_.Export(text_.c_str(), 1, "\t"), count);
+    EXPECT_EQ(database_.Load(text_.c_str(), "\t\n"), count);
     const CONTENT content = ContentOf(database_);
-    EXPECT_EQ(database_.Export(path_.c_str(), 1, "\t"), static_cast<long>(rows.size()));
-    DATABASE copy(nullptr);
-    ASSERT_EQ(CreateRows(copy, folder_.File("copy.db")), 0);
-    EXPECT_EQ(copy.Load(path_.c_str(), "\t\n"), static_cast<long>(rows.size()));
-    EXPECT_EQ(copy.Update(&rows.back()), 0) << "the last one is current";
-    CONTENT expected = content;
-    for (auto& record : expected) { // a byte is read as the first character of its number
-        ROW row{};
-        std::memcpy(&row, record->data(), sizeof(row));
-        row.tag = row.tag < 0 ? '-' : row.tag == 10 ? '1' : static_cast<std::int8_t>('0' + row.tag);
-        std::memcpy(record->data(), &row, sizeof(row));
+    EXPECT_EQ(database_.Update(&rows.back()), 0) << "the last one is current";
+    for (std::size_t i = 0; i < rows.size(); ++i) {
+        rows[i].tag = static_cast<std::int8_t>('0' + rows[i].tag); // read as its number's first character
+        ASSERT_EQ(content[rows.size() + i], BytesOf(rows[i])) << i;
     }
-    std::memcpy(expected.back()->data(), &rows.back(), sizeof(ROW));
-    EXPECT_EQ(ContentOf(copy), expected);
 }
 
 TEST_F(TextTest, FieldsOfALine) {
@@ -136,7 +106,7 @@ TEST_F(TextTest, FieldsOfALine) {
         const std::string first = "1\t1\t1\t1\t1\t1\t1\n"; // passes the check, and leaves nothing in the next
         const long number = static_cast<long>(ContentOf(database_).size());
         EXPECT_EQ(Load(first + field.line), 2);
-        EXPECT_EQ(BytesOf(Record(number + 1)), BytesOf(field.row)) << field.line;
+        EXPECT_EQ(BytesOf(At(number + 1)), BytesOf(field.row)) << field.line;
     }
 }
 
@@ -160,71 +130,69 @@ TEST_F(TextTest, LinesOfAFile) {
     };
     for (const auto& file : cases) {
         const std::size_t before = ContentOf(database_).size();
-        EXPECT_EQ(Load(file.text, file.separators), file.loaded) << file.text;
-        EXPECT_EQ(database_.GetLastError(nullptr), file.code) << file.text;
+        const long loaded = Load(file.text, file.separators);
+        EXPECT_EQ(CodeOf(loaded), file.code) << file.text;
+        EXPECT_EQ(loaded, file.loaded) << file.text;
         EXPECT_EQ(ContentOf(database_).size(), before + static_cast<std::size_t>(std::max(file.loaded, 0L)));
     }
 }
 
-TEST_F(TextTest, NewlineThatDoesNotSeparateBelongsToTheLastField) {
-    DATABASE database(nullptr);
-    const COLUMN_ENTRY columns[] = {Column("A", ColumnType::String, 4), Column("B", ColumnType::String, 4)};
-    ASSERT_EQ(database.Create(folder_.File("two.db").c_str(), "", 2, columns), 0);
-    Write("a,b\nc,d");
-    EXPECT_EQ(database.Load(path_.c_str(), ","), 2);
-    char data[8];
-    EXPECT_EQ(database.Read(0, data), 1);
-    EXPECT_STREQ(data + 4, "b\n");
-}
-
-TEST_F(TextTest, LongLineIsReadInPieces) {
-    DATABASE database(nullptr);
-    const COLUMN_ENTRY column = Column("A", ColumnType::String, 8);
-    ASSERT_EQ(database.Create(folder_.File("one.db").c_str(), "", 1, &column), 0);
-    ASSERT_EQ(database.CalculateIOBufferSize(), 11); // pieces of 10 characters
-    Write("abcdefghijklmnopqrstuvwxy\nz\n0123456789\n");
-    EXPECT_EQ(database.Load(path_.c_str(), "\n"), 5);
-    for (long i = 0; const char* text : {"abcdefg", "klmnopq", "uvwxy", "z", "0123456"}) {
-        char data[8];
-        EXPECT_EQ(database.Read(i++, data), 1);
-        EXPECT_STREQ(data, text);
+// The first column's texts after a load.
+TEST_F(TextTest, LinesAreCutAsTheyAreRead) {
+    const COLUMN_ENTRY eight = Column("A", ColumnType::String, 8);
+    const COLUMN_ENTRY four = Column("A", ColumnType::String, 4);
+    const struct {
+        std::vector<COLUMN_ENTRY> columns;
+        const char* text;
+        const char* separators;
+        std::vector<std::string> fields; // of the last column
+    } cases[] = {
+        // A newline that does not separate belongs to the last field.
+        {{four, four}, "a,b\nc,d", ",", {"b\n", "d"}},
+        // A long line is read in pieces of ten characters.
+        {{eight},
+         "abcdefghijklmnopqrstuvwxy\nz\n0123456789\n",
+         "\n",
+         {"abcdefg", "klmnopq", "uvwxy", "z", "0123456"}},
+    };
+    for (const auto& file : cases) {
+        EXPECT_EQ(LoadInto(file.columns, file.text, file.separators), static_cast<long>(file.fields.size()));
+        for (long i = 0; const std::string& field : file.fields) {
+            char data[8];
+            EXPECT_EQ(database_.Read(i++, data), 1);
+            EXPECT_STREQ(file.columns.size() == 1 ? data : data + 4, field.c_str());
+        }
+        std::filesystem::remove(folder_.File("other.db"));
     }
+    EXPECT_EQ(database_.CalculateIOBufferSize(), 11);
 }
 
 TEST_F(TextTest, LineThatExportWroteIsNotReadInPieces) {
-    DATABASE database(nullptr);
-    const COLUMN_ENTRY column = Column("A", ColumnType::Float);
-    ASSERT_EQ(database.Create(folder_.File("one.db").c_str(), "", 1, &column), 0);
+    ASSERT_EQ(LoadInto({Column("A", ColumnType::Float)}, "", "\n"), 0);
     const float lowest[2] = {-std::numeric_limits<float>::max()};
     float data[2] = {};
-    EXPECT_EQ(database.Append(lowest), 0);
-    EXPECT_EQ(database.Export(path_.c_str(), 1, "\n"), 1);
-    EXPECT_GT(std::filesystem::file_size(path_), static_cast<std::size_t>(database.CalculateIOBufferSize()));
-    EXPECT_EQ(database.Load(path_.c_str(), "\n"), 1);
-    EXPECT_EQ(database.Read(1, data), 1);
+    EXPECT_EQ(database_.Append(lowest), 0);
+    EXPECT_EQ(database_.Export(text_.c_str(), 1, "\n"), 1);
+    EXPECT_GT(std::filesystem::file_size(text_), static_cast<std::size_t>(database_.CalculateIOBufferSize()));
+    EXPECT_EQ(database_.Load(text_.c_str(), "\n"), 1);
+    EXPECT_EQ(database_.Read(1, data), 1);
     EXPECT_EQ(data[0], lowest[0]);
 }
 
 TEST_F(TextTest, PathsThatAreRefused) {
-    EXPECT_EQ(Load("a|1|1|1|1|1|1\n", "|\n"), 1);
-    const std::string data = folder_.File("rows.db");
-    std::filesystem::create_symlink(data, folder_.File("link"));
+    const std::string line = "a|1|1|1|1|1|1\n";
+    EXPECT_EQ(Load(line, "|\n"), 1);
+    std::filesystem::create_symlink(path_, folder_.File("link"));
     const CONTENT content = ContentOf(database_);
-    for (const std::string& path : {data, folder_.File("link"), folder_.File(""), folder_.File("no/file")}) {
-        EXPECT_EQ(database_.Load(path.c_str(), "|\n"), -1) << path;
-        EXPECT_EQ(database_.GetLastError(nullptr), 1801) << path;
-        EXPECT_EQ(database_.Export(path.c_str(), 1, "|"), -1) << path;
-        EXPECT_EQ(database_.GetLastError(nullptr), 1901) << path;
+    for (const std::string& path : {path_, folder_.File("link"), folder_.File(""), folder_.File("no/file")}) {
+        EXPECT_EQ(CodeOf(database_.Load(path.c_str(), "|\n")), 1801) << path;
+        EXPECT_EQ(CodeOf(database_.Export(path.c_str(), 1, "|")), 1901) << path;
     }
     EXPECT_EQ(ContentOf(database_), content);
-    // Without a data file no text is touched.
-    const std::string text = Text();
     DATABASE closed(nullptr);
-    EXPECT_EQ(closed.Export(path_.c_str(), 1, "|"), -1);
-    EXPECT_EQ(closed.GetLastError(nullptr), 1908);
-    EXPECT_EQ(closed.Load(path_.c_str(), "|"), -1);
-    EXPECT_EQ(closed.GetLastError(nullptr), 1808);
-    EXPECT_EQ(Text(), text);
+    EXPECT_EQ(Code(closed, closed.Export(text_.c_str(), 1, "|")), 1908);
+    EXPECT_EQ(Code(closed, closed.Load(text_.c_str(), "|")), 1808);
+    EXPECT_EQ(folder_.Read("rows.txt"), line) << "without a data file no text is touched";
 }
 
 } // namespace
