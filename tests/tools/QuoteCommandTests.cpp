@@ -1,11 +1,6 @@
 #include <gtest/gtest.h>
 
-#include <cstdlib>
-#include <filesystem>
-#include <string>
-#include <sys/wait.h>
-
-#include "TemporaryFolder.h"
+#include "Shell.h"
 #include "quotes/LoopbackServer.h"
 
 namespace {
@@ -14,23 +9,13 @@ class QuoteCommand : public testing::Test {
   protected:
     QuoteCommand() { std::filesystem::create_directory(folder_.File("home")); }
 
-    int Run(const std::string& arguments) {
-        const std::string command =
-            "cd '" + folder_.Path() + "' && '" + QUORVAN_CLI "' quote " + arguments + " >out 2>err";
-        const int status = std::system(command.c_str());
-        output_ = folder_.Read("out");
-        trace_ = folder_.Read("err");
-        return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
-    }
+    int Run(const std::string& arguments) { return folder_.Run("'" QUORVAN_CLI "' quote " + arguments); }
     // A source on the server, with the page's text before the marker.
     std::string Source(const std::string& path, const std::string& marker, int skip) const {
         return "net " + server_.Host() + " " + path + " " + marker + " " + std::to_string(skip);
     }
-    bool Traced(const std::string& text) const { return trace_.find(text) != std::string::npos; }
 
-    TemporaryFolder folder_;
-    std::string output_;
-    std::string trace_;
+    Shell folder_;
     LoopbackServer server_{[](const std::string& request) {
         if (request.find("XYZ") != std::string::npos)
             return Reply{{"HTTP/1.0 301 Moved\r\nLocation: https://\x1B[2J\xFF\r\n\r\n"}};
@@ -43,30 +28,29 @@ TEST_F(QuoteCommand, ShowsWhatEachSourceGives) {
                                       "two fields\n" +
                                           Source("/q?s=", "Last", 2) + "\n");
     EXPECT_EQ(Run("--home home ABC"), 0);
-    EXPECT_EQ(output_, "ABC\t45.38\n");
+    EXPECT_EQ(folder_.Output(), "ABC\t45.38\n");
     const std::string host = server_.Host();
     const std::string port = std::to_string(server_.Port());
-    EXPECT_EQ(trace_, "ABC: looking in home/Quorvan.cfg\n"
-                      "source one: asking no..such..host for /q?s=ABC, marker 'Last', skip 2\n"
-                      "  failed: gethostbyname() error: the name does not resolve\n"
-                      "  no price, -4.00\n"
-                      "line 2 is no source: it has fewer than five fields\n"
-                      "source net: asking " +
-                          host + " for /q?s=ABC, marker 'Last', skip 2\n  connected to 127.0.0.1 port " +
-                          port + "\n  marker found: ..." + std::string(56, 'a') +
-                          "\\x1B[2J[Last]\\\\\\n</td><b>45 3/8</b>" + std::string(40, 'z') +
-                          "...\n"
-                          "  price text '45' read as 45.0000\n"
-                          "  behind it '3/8</b>" +
-                          std::string(53, 'z') + "': fraction 0.3750\n  price 45.38\n");
+    EXPECT_EQ(folder_.Errors(), "ABC: looking in home/Quorvan.cfg\n"
+                                "source one: asking no..such..host for /q?s=ABC, marker 'Last', skip 2\n"
+                                "  failed: gethostbyname() error: the name does not resolve\n"
+                                "  no price, -4.00\n"
+                                "line 2 is no source: it has fewer than five fields\n"
+                                "source net: asking " +
+                                    host +
+                                    " for /q?s=ABC, marker 'Last', skip 2\n  connected to 127.0.0.1 port " +
+                                    port + "\n  marker found: ..." + std::string(56, 'a') +
+                                    "\\x1B[2J[Last]\\\\\\n</td><b>45 3/8</b>" + std::string(40, 'z') +
+                                    "...\n"
+                                    "  price text '45' read as 45.0000\n"
+                                    "  behind it '3/8</b>" +
+                                    std::string(53, 'z') + "': fraction 0.3750\n  price 45.38\n");
     EXPECT_EQ(Run("--home home XYZ ABC"), 1);
-    EXPECT_EQ(output_, "XYZ\t-4.00\nABC\t45.38\n");
-    EXPECT_TRUE(
-        Traced("  marker not found in the 47 bytes received, which begin: HTTP/1.0 301 Moved\\r\\nLocation: "
-               "https://\\x1B[2J\\xFF\\r\\n\\r\\n\n"))
-        << trace_;
-    const auto files = std::filesystem::directory_iterator(folder_.File("home"));
-    EXPECT_EQ(std::distance(begin(files), end(files)), 1);
+    EXPECT_EQ(folder_.Output(), "XYZ\t-4.00\nABC\t45.38\n");
+    EXPECT_TRUE(folder_.Complains(
+        "  marker not found in the 47 bytes received, which begin: HTTP/1.0 301 Moved\\r\\nLocation: "
+        "https://\\x1B[2J\\xFF\\r\\n\\r\\n\n"));
+    EXPECT_EQ(folder_.Names(), std::vector<std::string>{"home"});
 }
 
 TEST_F(QuoteCommand, TriesALine) {
@@ -86,8 +70,8 @@ TEST_F(QuoteCommand, TriesALine) {
     };
     for (const auto& c : cases) {
         EXPECT_EQ(Run("--source '" + c.source + "' ABC"), c.status) << c.source;
-        EXPECT_EQ(output_, c.output) << c.source;
-        EXPECT_TRUE(Traced(c.trace)) << trace_;
+        EXPECT_EQ(folder_.Output(), c.output) << c.source;
+        EXPECT_TRUE(folder_.Complains(c.trace));
     }
 }
 
@@ -95,12 +79,12 @@ TEST_F(QuoteCommand, SaysWhatIsWrong) {
     // An empty line ends the list; nothing behind it is asked.
     folder_.Write("home/Quorvan.cfg", "; comment\n\n" + Source("/q?s=", "Last", 2) + "\n");
     EXPECT_EQ(Run("--home home ABC"), 1);
-    EXPECT_EQ(trace_, "ABC: looking in home/Quorvan.cfg\n"
-                      "line 2 ends the list, since it is empty or too short for a source\n"
-                      "there is no source to ask\n");
+    EXPECT_EQ(folder_.Errors(), "ABC: looking in home/Quorvan.cfg\n"
+                                "line 2 ends the list, since it is empty or too short for a source\n"
+                                "there is no source to ask\n");
     EXPECT_EQ(Run("--home nowhere ABC"), 1);
-    EXPECT_EQ(output_, "ABC\t-3.00\n");
-    EXPECT_TRUE(Traced("failed: the file nowhere/Quorvan.cfg cannot be read\n")) << trace_;
+    EXPECT_EQ(folder_.Output(), "ABC\t-3.00\n");
+    EXPECT_TRUE(folder_.Complains("failed: the file nowhere/Quorvan.cfg cannot be read\n"));
     for (const char* arguments :
          {"", "''", "--home", "\"$(printf 'A\\tB')\"", "--home home --source 'n h /q Last 2' A"})
         EXPECT_EQ(Run(arguments), 2) << arguments;

@@ -1,18 +1,13 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
-#include <cstdlib>
 #include <cstring>
-#include <filesystem>
 #include <map>
 #include <set>
 #include <sstream>
-#include <string>
-#include <sys/wait.h>
 #include <unistd.h>
-#include <vector>
 
-#include "TemporaryFolder.h"
+#include "Shell.h"
 #include "app/RecordLayouts.h"
 #include "db/Database.h"
 #include "util/CharacterBuffer.h"
@@ -29,18 +24,9 @@ class SetupTest : public testing::Test {
 
     // Runs quorvan-cli with the words of `arguments`; `before` is shell text in front of it.
     int Run(const std::string& arguments, const std::string& before = "") {
-        const std::string command =
-            "cd '" + folder_.Path() + "' && " + before + "'" + QUORVAN_CLI "' " + arguments + " >out 2>err";
-        const int status = std::system(command.c_str());
-        output_ = folder_.Read("out");
-        errors_ = folder_.Read("err");
-        return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+        return folder_.Run(before + "'" QUORVAN_CLI "' " + arguments);
     }
-    int Setup(const std::string& more = "") {
-        return Run("setup home --program '" + folder_.File("built") + "' " + more);
-    }
-
-    bool Says(const std::string& line) const { return output_.find(line + "\n") != std::string::npos; }
+    int Setup(const std::string& more = "") { return Run("setup home --program built " + more); }
 
     // Every file of the new folder with its content and the time of its last change.
     std::map<std::string, std::pair<std::string, fs::file_time_type>> Files() const {
@@ -54,44 +40,35 @@ class SetupTest : public testing::Test {
     }
 
     template <class Record>
-    std::vector<Record> Records(const char* name) const {
+    std::vector<Record> Records(const char* name, int length) const {
         DATABASE database(folder_.File(std::string("home/") + name).c_str());
         EXPECT_TRUE(database.IsOpen() && !database.IsDamaged()) << name;
         DATABASE_HEADER header{};
         database.GetHeaderInfo(&header);
+        EXPECT_EQ(header.recordLength, length);
         std::vector<Record> records(static_cast<std::size_t>(header.recordCount));
         for (std::size_t i = 0; i < records.size(); ++i)
             EXPECT_EQ(database.Read(static_cast<long>(i), &records[i]), 1);
         return records;
     }
-    int RecordLength(const char* name) const {
-        DATABASE_HEADER header{};
-        DATABASE(folder_.File(std::string("home/") + name).c_str()).GetHeaderInfo(&header);
-        return header.recordLength;
-    }
 
-    TemporaryFolder folder_;
-    std::string output_;
-    std::string errors_;
+    Shell folder_;
 };
 
 TEST_F(SetupTest, MakesAFolderThatRuns) {
-    ASSERT_EQ(Setup(), 0) << errors_;
+    ASSERT_EQ(Setup(), 0) << folder_.Errors();
     std::set<std::string> names;
     for (const auto& [name, file] : Files()) {
         names.insert(name.substr(5).starts_with("help/pictures/") ? "help/pictures" : name.substr(5));
-        EXPECT_NE(output_.find("made  " + name.substr(5)), std::string::npos) << output_;
+        EXPECT_TRUE(folder_.Says("made  " + name.substr(5)));
     }
     EXPECT_EQ(names,
               (std::set<std::string>{"portfol.db", "invest.db", "misc.db", "Quorvan.ini", "Quorvan.cfg",
                                      "quorvan", "quorvan-cli", "help/Quorvan.html", "help/pictures"}));
-    EXPECT_EQ(Records<PORTFOLIO_DATA>("portfol.db").size(), 0U);
-    EXPECT_EQ(Records<INVESTMENT_DATA>("invest.db").size(), 0U);
-    EXPECT_EQ(RecordLength("portfol.db"), 33);
-    EXPECT_EQ(RecordLength("invest.db"), 231);
-    EXPECT_EQ(RecordLength("misc.db"), 65);
+    EXPECT_EQ(Records<PORTFOLIO_DATA>("portfol.db", 33).size(), 0U);
+    EXPECT_EQ(Records<INVESTMENT_DATA>("invest.db", 231).size(), 0U);
     std::map<std::string, int> categories;
-    for (const CATEGORY_DATA& entry : Records<CATEGORY_DATA>("misc.db"))
+    for (const CATEGORY_DATA& entry : Records<CATEGORY_DATA>("misc.db", 65))
         ++categories[entry.Category];
     EXPECT_GE(categories["Type"], 5);
     EXPECT_GE(categories["Agent"], 3);
@@ -103,15 +80,9 @@ TEST_F(SetupTest, MakesAFolderThatRuns) {
     EXPECT_EQ(fs::status(folder_.File("home/Quorvan.ini")).permissions(),
               fs::perms{0600}); // a password goes there
     for (const char* name : {"Quorvan.ini", "Quorvan.cfg", "help/Quorvan.html"}) {
-        std::ifstream resource(std::string(QUORVAN_RESOURCES "/") + name);
-        std::stringstream content;
-        content << resource.rdbuf();
-        EXPECT_EQ(folder_.Read(std::string("home/") + name), content.str());
+        folder_.Run(std::string("cmp home/") + name + " '" QUORVAN_RESOURCES "/" + name + "'");
+        EXPECT_EQ(folder_.Output() + folder_.Errors(), "");
     }
-}
-
-TEST_F(SetupTest, TheFirstTextFilesCanBeReadByTheProgram) {
-    ASSERT_EQ(Setup(), 0) << errors_;
     const INI_FILEx settings(folder_.File("home/Quorvan.ini").c_str());
     char text[64];
     settings.ReadString("GENERAL", "Password", "missing", text);
@@ -137,21 +108,21 @@ TEST_F(SetupTest, NeverChangesAFileThatExists) {
     fs::remove(folder_.File("home/Quorvan.cfg"));
     fs::create_symlink("nowhere", folder_.File("home/Quorvan.cfg"));
     const auto before = Files();
-    EXPECT_EQ(Setup("--sample"), 0) << errors_;
+    EXPECT_EQ(Setup("--sample"), 0) << folder_.Errors();
     EXPECT_EQ(Files(), before);
     EXPECT_FALSE(folder_.Has("home/nowhere"));
-    EXPECT_EQ(output_.find("made"), std::string::npos) << output_;
-    EXPECT_TRUE(Says("kept  Quorvan.ini"));
-    EXPECT_NE(output_.find("kept  quorvan: it differs"), std::string::npos);
-    EXPECT_NE(output_.find("no sample"), std::string::npos);
+    EXPECT_EQ(folder_.Output().find("made"), std::string::npos) << folder_.Output();
+    EXPECT_TRUE(folder_.Says("kept  Quorvan.ini\n"));
+    EXPECT_TRUE(folder_.Says("kept  quorvan: it differs"));
+    EXPECT_TRUE(folder_.Says("no sample"));
     // What is missing is made anew, without a sample while the other data file has its own.
     fs::remove(folder_.File("home/invest.db"));
     EXPECT_EQ(Setup("--sample"), 0);
-    EXPECT_TRUE(Says("made  invest.db: empty"));
+    EXPECT_TRUE(folder_.Says("made  invest.db: empty\n"));
     EXPECT_EQ(Setup("--update-program"), 0);
     EXPECT_EQ(folder_.Read("home/quorvan"), "a program");
-    EXPECT_TRUE(Says("made  help/Quorvan.html: brought up to date"));
-    EXPECT_TRUE(Says("kept  help/pictures/main-window.png"));
+    EXPECT_TRUE(folder_.Says("made  help/Quorvan.html: brought up to date\n"));
+    EXPECT_TRUE(folder_.Says("kept  help/pictures/main-window.png\n"));
     EXPECT_EQ(folder_.Read("home/Quorvan.ini"), "mine");
 }
 
@@ -159,7 +130,7 @@ TEST_F(SetupTest, LeavesABackupItsPlace) {
     ASSERT_EQ(Setup("--sample"), 0);
     fs::rename(folder_.File("home/invest.db"), folder_.File("home/invest.bak"));
     ASSERT_EQ(Setup(), 0);
-    EXPECT_TRUE(Says("kept  invest.bak"));
+    EXPECT_TRUE(folder_.Says("kept  invest.bak\n"));
     EXPECT_FALSE(folder_.Has("home/invest.db"));
 }
 
@@ -172,11 +143,11 @@ std::string Movement(const INVESTMENT_DATA& record) {
 }
 
 TEST_F(SetupTest, TheSampleIsVaried) {
-    ASSERT_EQ(Setup("--sample"), 0) << errors_;
+    ASSERT_EQ(Setup("--sample"), 0) << folder_.Errors();
     std::map<std::string, int> investments;
     std::set<std::string> portfolios, movements, risks, kinds;
     bool fractions = false;
-    for (const INVESTMENT_DATA& record : Records<INVESTMENT_DATA>("invest.db")) {
+    for (const INVESTMENT_DATA& record : Records<INVESTMENT_DATA>("invest.db", 231)) {
         ++investments[record.Portfolio];
         movements.insert(Movement(record));
         risks.insert(record.Risk);
@@ -194,7 +165,7 @@ TEST_F(SetupTest, TheSampleIsVaried) {
         EXPECT_LT(FieldText(record.Name).size(), sizeof record.Name - 1);
         EXPECT_LT(FieldText(record.Ticker).size(), sizeof record.Ticker - 1);
     }
-    for (const PORTFOLIO_DATA& record : Records<PORTFOLIO_DATA>("portfol.db")) {
+    for (const PORTFOLIO_DATA& record : Records<PORTFOLIO_DATA>("portfol.db", 33)) {
         portfolios.insert(record.Name);
         EXPECT_GE(investments[record.Name], 15) << record.Name;
     }
@@ -208,7 +179,7 @@ TEST_F(SetupTest, TheSampleIsVaried) {
 }
 
 TEST_F(SetupTest, FailsWithOneClearSentence) {
-    const std::string program = " --program '" + folder_.File("built") + "'";
+    const std::string program = " --program built";
     const struct {
         std::string arguments;
         int status;
@@ -221,14 +192,11 @@ TEST_F(SetupTest, FailsWithOneClearSentence) {
                  {"", 2, "subcommand"},
                  {"setup", 2, "FOLDER"},
                  {"setup home --simple", 2, "--simple"}};
-    for (const auto& c : cases) {
-        EXPECT_EQ(Run(c.arguments), c.status) << c.arguments;
-        EXPECT_NE(errors_.find(c.sentence), std::string::npos) << errors_;
-        EXPECT_TRUE(c.status == 2 || errors_.find('\n') == errors_.size() - 1) << errors_;
-    }
+    for (const auto& c : cases)
+        EXPECT_TRUE(folder_.Fails("'" QUORVAN_CLI "' " + c.arguments, c.status, c.sentence));
     EXPECT_FALSE(folder_.Has(std::string(109, 'd')));
     EXPECT_EQ(Run("setup --help"), 0);
-    EXPECT_NE(output_.find("--sample"), std::string::npos);
+    EXPECT_TRUE(folder_.Says("--sample"));
 }
 
 TEST_F(SetupTest, LeavesAFolderInUseAlone) {
@@ -236,31 +204,26 @@ TEST_F(SetupTest, LeavesAFolderInUseAlone) {
     FolderLock lock;
     ASSERT_EQ(lock.Take(folder_.File("home"), "quorvan"), FolderLock::Outcome::Taken);
     EXPECT_EQ(Setup("--sample"), 1);
-    EXPECT_NE(errors_.find("is in use by quorvan (process " + std::to_string(getpid()) + " on "),
-              std::string::npos)
-        << errors_;
+    EXPECT_TRUE(folder_.Complains("is in use by quorvan (process " + std::to_string(getpid()) + " on "));
     EXPECT_EQ(Files().size(), 1U); // the lock
     lock.Release();
-    EXPECT_EQ(Setup(), 0) << errors_;
+    EXPECT_EQ(Setup(), 0) << folder_.Errors();
     EXPECT_FALSE(folder_.Has("home/Quorvan.lock"));
     folder_.Write("home/Quorvan.lock", "program: quorvan\nprocess: 17\nhost: elsewhere\n");
     EXPECT_EQ(Setup(), 1);
-    EXPECT_NE(errors_.find("delete " + folder_.File("home/Quorvan.lock")), std::string::npos) << errors_;
+    EXPECT_TRUE(folder_.Complains("delete " + folder_.File("home/Quorvan.lock")));
 }
 
 TEST_F(SetupTest, AFullDiskLeavesNoPartOfAFile) {
     // Room for the settings, for neither the help nor the sample.
-    EXPECT_EQ(Run("setup home --sample --program '" + folder_.File("built") + "'", "ulimit -f 8; "), 1);
-    EXPECT_NE(errors_.find("invest.db cannot be made"), std::string::npos) << errors_;
-    EXPECT_NE(errors_.find("help/Quorvan.html cannot be made: File too large"), std::string::npos) << errors_;
-    std::set<std::string> names;
-    for (const auto& [name, file] : Files())
-        names.insert(name);
-    EXPECT_EQ(names, (std::set<std::string>{"home/misc.db", "home/Quorvan.ini", "home/Quorvan.cfg",
-                                            "home/quorvan"}));
-    EXPECT_EQ(Setup("--sample"), 0) << errors_;
-    EXPECT_TRUE(Says("made  invest.db: sample investments"));
-    EXPECT_TRUE(Says("kept  Quorvan.ini"));
+    EXPECT_EQ(Run("setup home --sample --program built", "ulimit -f 8; "), 1);
+    EXPECT_TRUE(folder_.Complains("invest.db cannot be made"));
+    EXPECT_TRUE(folder_.Complains("help/Quorvan.html cannot be made: File too large"));
+    EXPECT_EQ(folder_.Run("cd home && ls && rmdir help/pictures help"), 0);
+    EXPECT_EQ(folder_.Output(), "Quorvan.cfg\nQuorvan.ini\nhelp\nmisc.db\nquorvan\n");
+    EXPECT_EQ(Setup("--sample"), 0) << folder_.Errors();
+    EXPECT_TRUE(folder_.Says("made  invest.db: sample investments\n"));
+    EXPECT_TRUE(folder_.Says("kept  Quorvan.ini\n"));
 }
 
 } // namespace

@@ -68,6 +68,7 @@ TEST(FolderLock, OfAKilledProcessIsNoObstacle) {
 TEST(FolderLock, DoubtsWhatTheSystemsLockDoesNotTell) {
     WaitingChild ended([] {});
     ended.Kill();
+    const std::string alive = LockText(OwnHost(), getpid());
     const struct {
         const char* what;
         FolderLock::LockCall call;
@@ -75,30 +76,27 @@ TEST(FolderLock, DoubtsWhatTheSystemsLockDoesNotTell) {
         Outcome outcome;
     } cases[] = {
         {"another computer", FolderLock::LockBySystem, LockText("elsewhere", 17), Outcome::Doubtful},
-        {"alive, but does not hold it", FolderLock::LockBySystem, LockText(OwnHost(), getpid()),
-         Outcome::Taken},
+        {"alive, but does not hold it", FolderLock::LockBySystem, alive, Outcome::Taken},
         {"cut off", FolderLock::LockBySystem, "program: quor", Outcome::Taken},
         {"long and binary", FolderLock::LockBySystem, std::string(100000, '\1'), Outcome::Taken},
         {"no locks, nobody", NoLocks, "", Outcome::Taken},
-        {"no locks, alive", NoLocks, LockText(OwnHost(), getpid()), Outcome::Doubtful},
+        {"no locks, alive", NoLocks, alive, Outcome::Doubtful},
         {"no locks, ended", NoLocks, LockText(OwnHost(), ended.Id()), Outcome::Taken},
         {"no locks, another computer", NoLocks, LockText("elsewhere", ended.Id()), Outcome::Doubtful},
     };
     for (const auto& each : cases) {
+        SCOPED_TRACE(each.what);
         const TemporaryFolder folder;
         folder.Write("Quorvan.lock", each.text);
         FolderLock lock(each.call);
-        EXPECT_EQ(lock.Take(folder.Path(), "quorvan"), each.outcome) << each.what;
-        EXPECT_EQ(lock.IsTaken(), each.outcome == Outcome::Taken) << each.what;
-        if (each.outcome == Outcome::Taken) {
-            EXPECT_NE(folder.Read("Quorvan.lock").find("host: " + OwnHost() + "\n"), std::string::npos);
-            EXPECT_LT(folder.Read("Quorvan.lock").size(), 400U) << each.what;
-            continue;
+        EXPECT_EQ(lock.Take(folder.Path(), "quorvan"), each.outcome);
+        EXPECT_EQ(lock.IsTaken(), each.outcome == Outcome::Taken);
+        if (each.outcome == Outcome::Doubtful) {
+            EXPECT_EQ(folder.Read("Quorvan.lock"), each.text);
+            EXPECT_EQ(lock.Take(folder.Path(), "quorvan", FolderLock::Doubt::PassOver), Outcome::Taken);
         }
-        EXPECT_EQ(folder.Read("Quorvan.lock"), each.text) << each.what;
-        EXPECT_EQ(lock.Take(folder.Path(), "quorvan", FolderLock::Doubt::PassOver), Outcome::Taken)
-            << each.what;
-        EXPECT_NE(folder.Read("Quorvan.lock"), each.text) << each.what;
+        EXPECT_NE(folder.Read("Quorvan.lock").find("host: " + OwnHost() + "\n"), std::string::npos);
+        EXPECT_LT(folder.Read("Quorvan.lock").size(), 400U);
     }
 }
 
@@ -116,23 +114,17 @@ TEST(FolderLock, DescribesItsHolderInOneLine) {
 TEST(FolderLock, FailsWhereItsFileCannotBe) {
     const TemporaryFolder folder;
     folder.Write("other", "text");
-    const struct {
-        const char* what;
-        std::function<void(const std::string&)> make;
-        int error;
-    } cases[] = {
-        {"folder", [](const std::string& path) { std::filesystem::create_directory(path); }, EINVAL},
-        {"pipe", [](const std::string& path) { mkfifo(path.c_str(), 0600); }, EINVAL},
-        {"link",
-         [&](const std::string& path) { std::filesystem::create_symlink(folder.File("other"), path); },
-         EINVAL},
-    };
-    for (const auto& each : cases) {
-        each.make(folder.File("Quorvan.lock"));
+    const std::string path = folder.File("Quorvan.lock");
+    const std::pair<const char*, std::function<void()>> cases[] = {
+        {"folder", [&] { std::filesystem::create_directory(path); }},
+        {"pipe", [&] { mkfifo(path.c_str(), 0600); }},
+        {"link", [&] { std::filesystem::create_symlink(folder.File("other"), path); }}};
+    for (const auto& [what, make] : cases) {
+        make();
         FolderLock lock;
-        EXPECT_EQ(lock.Take(folder.Path(), "quorvan"), Outcome::Failed) << each.what;
-        EXPECT_EQ(lock.Error(), each.error) << each.what;
-        EXPECT_TRUE(std::filesystem::remove(folder.File("Quorvan.lock"))) << each.what;
+        EXPECT_EQ(lock.Take(folder.Path(), "quorvan"), Outcome::Failed) << what;
+        EXPECT_EQ(lock.Error(), EINVAL) << what;
+        EXPECT_TRUE(std::filesystem::remove(path)) << what;
     }
     EXPECT_EQ(folder.Read("other"), "text");
     FolderLock lock;
@@ -159,7 +151,7 @@ TEST(FolderLock, InAFolderThatMayOnlyBeReadIsSeenAllTheSame) {
     ASSERT_EQ(lock.Take(folder.Path(), "quorvan"), Outcome::Taken);
     std::filesystem::permissions(folder.File("Quorvan.lock"), std::filesystem::perms{0444});
     EXPECT_EQ(ResultAsOrdinaryUser(take), 1);
-    EXPECT_EQ(std::distance(std::filesystem::directory_iterator(folder.Path()), {}), 1);
+    EXPECT_EQ(folder.Names(), std::vector<std::string>{"Quorvan.lock"});
 }
 
 // Taking, releasing and removing the file must never leave two inside.
@@ -196,15 +188,13 @@ TEST(FolderLock, LetsOneOfManyInAtATime) {
 
 TEST(FolderProbe, FindsThatTheRoomEnds) {
     const TemporaryFolder folder;
-    EXPECT_EQ(TryWritingIn(folder.Path()), 0);
-    EXPECT_EQ(ResultInChild([&] {
-                  // The most that the process may write to a file, which then ends as on a full disk.
-                  const rlimit room{1000, 1000};
-                  setrlimit(RLIMIT_FSIZE, &room);
-                  return TryWritingIn(folder.Path());
-              }),
-              ENOSPC);
-    EXPECT_TRUE(std::filesystem::is_empty(folder.Path()));
+    const auto tryInLittleRoom = [&] { // to the process the end of its room is that of a full disk
+        const rlimit room{1000, 1000};
+        setrlimit(RLIMIT_FSIZE, &room);
+        return TryWritingIn(folder.Path());
+    };
+    EXPECT_EQ(ResultInChild(tryInLittleRoom), ENOSPC);
+    EXPECT_EQ(folder.Names(), std::vector<std::string>{});
 }
 
 } // namespace

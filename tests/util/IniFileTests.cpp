@@ -64,21 +64,18 @@ TEST_F(IniFileTest, ReadsNumbers) {
         EXPECT_EQ(Settings().ReadInt("D", key, 50), number) << key;
 }
 
-TEST_F(IniFileTest, CutsAValueAtTheBuffer) {
+TEST_F(IniFileTest, CutsAtTheBufferAndLongLinesIntoSeveral) {
     folder_.Write(Name, "[G]\nPassword=12345678901234\xC3\xA4z\n");
     char small[16];
     Settings().ReadString("G", "Password", "", small);
     EXPECT_STREQ(small, "12345678901234");
     Settings().ReadString("G", "none", "a default that is too long", small);
     EXPECT_STREQ(small, "a default that ");
-}
-
-TEST_F(IniFileTest, LongLinesAreSeveralLines) {
-    const std::string first = "Key=" + std::string(123, 'v');
-    folder_.Write(Name, "[G]\n" + first + "Other=tail\n");
+    const std::string longest = "[G]\nKey=" + std::string(123, 'v') + "Other=tail\n";
+    folder_.Write(Name, longest);
     EXPECT_EQ(Value("G", "Key"), std::string(123, 'v'));
     EXPECT_EQ(Value("G", "Other"), "tail");
-    EXPECT_EQ(After("[G]\n" + first + "Other=tail\n", "G", "Key", "x"), "[G]\nKey=x\nOther=tail\n");
+    EXPECT_EQ(After(longest, "G", "Key", "x"), "[G]\nKey=x\nOther=tail\n");
 }
 
 TEST_F(IniFileTest, WritesInPlace) {
@@ -111,22 +108,13 @@ TEST_F(IniFileTest, RefusesWhatCouldNotBeReadBack) {
     const std::string content = "[G]\nK=1\n";
     folder_.Write(Name, content);
     const std::string longest(124, 'v');
-    const std::string tooLong(125, 'v');
-    const std::string section(62, 's');
-    const struct {
-        const char *section, *key, *value;
-    } cases[] = {{"G", "K", tooLong.c_str()},
-                 {"G", "K", "a\nb"},
-                 {"G", "K", "a\r"},
-                 {"G", "K", "\x1B[2J"},
-                 {"G", "K=", "v"},
-                 {"G", ";K", "v"},
-                 {"G", "[K", "v"},
-                 {"G", "", "v"},
-                 {"G\n", "K", "v"},
-                 {section.c_str(), "K", "v"}};
-    for (const auto& c : cases) {
-        EXPECT_EQ(Settings().WriteString(c.section, c.key, c.value), 1) << c.key << c.value;
+    const std::string cases[][3] = {{"G", "K", longest + "v"}, {"G", "K", "a\nb"},
+                                    {"G", "K", "a\r"},         {"G", "K", "\x1B[2J"},
+                                    {"G", "K=", "v"},          {"G", ";K", "v"},
+                                    {"G", "[K", "v"},          {"G", "", "v"},
+                                    {"G\n", "K", "v"},         {std::string(62, 's'), "K", "v"}};
+    for (const auto& [section, key, value] : cases) {
+        EXPECT_EQ(Settings().WriteString(section.c_str(), key.c_str(), value.c_str()), 1) << key << value;
         EXPECT_EQ(folder_.Read(Name), content);
     }
     EXPECT_EQ(Settings().WriteString("G", "K", longest.c_str()), 0);
@@ -149,14 +137,13 @@ TEST_F(IniFileTest, AMissingFileGivesDefaultsAndIsNotCreated) {
 TEST_F(IniFileTest, AFailedWriteKeepsTheOldSettings) {
     const std::string content = "[G]\nK=1\n" + std::string(5000, ';');
     folder_.Write(Name, content);
-    // No space left half-way.
     std::signal(SIGXFSZ, SIG_IGN);
-    rlimit limit{};
-    getrlimit(RLIMIT_FSIZE, &limit);
-    const rlimit small{4096, limit.rlim_max};
+    rlimit usual{};
+    getrlimit(RLIMIT_FSIZE, &usual);
+    const rlimit small{4096, usual.rlim_max};
     ASSERT_EQ(setrlimit(RLIMIT_FSIZE, &small), 0);
     EXPECT_EQ(Settings().WriteString("G", "K", "v"), 1);
-    ASSERT_EQ(setrlimit(RLIMIT_FSIZE, &limit), 0);
+    ASSERT_EQ(setrlimit(RLIMIT_FSIZE, &usual), 0);
     EXPECT_EQ(folder_.Read(Name), content);
     EXPECT_FALSE(folder_.Has("ini_file.tmp"));
     // The temporary cannot be created.

@@ -12,34 +12,27 @@
 
 namespace {
 
-std::string Changed(std::string text, const std::function<void(char*)>& change) {
-    change(text.data());
-    text.resize(std::strlen(text.data()));
-    return text;
-}
-
-TEST(Strings, TrimTakesTrailingBlanksAndLineFeedsOnly) {
-    const std::pair<const char*, const char*> cases[] = {
-        {"abc \n", "abc"},  {"   ", ""},          {"", ""},
-        {"abc\t", "abc\t"}, {"abc\r\n", "abc\r"}, {"  a b \n \n", "  a b"}};
-    for (const auto& [text, trimmed] : cases)
-        EXPECT_EQ(Changed(text, Trim), trimmed) << text;
-}
-
-TEST(Strings, CaseStopsAtTheFirstByteBeyondAscii) {
-    EXPECT_EQ(Changed("ABC[Z@`{", strlwr), "abc[z@`{");
-    EXPECT_EQ(Changed("abc`z{@[", strupr), "ABC`Z{@[");
-    EXPECT_EQ(Changed("A\xC3\x84"
-                      "BC",
-                      strlwr),
-              "a\xC3\x84"
-              "BC");
-    EXPECT_EQ(Changed("a\xC3\xA4"
-                      "bc",
-                      strupr),
-              "A\xC3\xA4"
-              "bc");
-    EXPECT_EQ(Changed("a/b/", [](char* text) { ReplaceCharacter(text, '/', '_'); }), "a_b_");
+TEST(Strings, AreChangedInPlace) {
+    const auto replace = [](char* text) { ReplaceCharacter(text, '/', '_'); };
+    const struct {
+        std::function<void(char*)> change;
+        const char *text, *changed;
+    } cases[] = {{Trim, "abc \n", "abc"},
+                 {Trim, "   ", ""},
+                 {Trim, "", ""},
+                 {Trim, "abc\t", "abc\t"},
+                 {Trim, "abc\r\n", "abc\r"},
+                 {Trim, "  a b \n \n", "  a b"},
+                 {strlwr, "ABC[Z@`{", "abc[z@`{"},
+                 {strupr, "abc`z{@[", "ABC`Z{@["},
+                 {strlwr, "A\xC3\x84Z", "a\xC3\x84Z"}, // the first byte beyond ASCII ends it
+                 {strupr, "a\xC3\xA4z", "A\xC3\xA4z"},
+                 {replace, "a/b/", "a_b_"}};
+    for (const auto& c : cases) {
+        std::string text = c.text;
+        c.change(text.data());
+        EXPECT_STREQ(text.c_str(), c.changed) << c.text;
+    }
 }
 
 TEST(Strings, ComparesWithoutLetterCase) {
@@ -58,10 +51,9 @@ TEST(Strings, ComparesWithoutLetterCase) {
                  {longText + "A", longText + "a", 0},
                  {longText + "a", longText + "b", -1}};
     for (const auto& c : cases) {
-        const int forward = strcmpi(c.a.c_str(), c.b.c_str());
-        EXPECT_EQ((forward > 0) - (forward < 0), c.sign) << c.a << " " << c.b;
-        const int backward = strcmpi(c.b.c_str(), c.a.c_str());
-        EXPECT_EQ((backward > 0) - (backward < 0), -c.sign) << c.b << " " << c.a;
+        const auto sign = [](int number) { return (number > 0) - (number < 0); };
+        EXPECT_EQ(sign(strcmpi(c.a.c_str(), c.b.c_str())), c.sign) << c.a << " " << c.b;
+        EXPECT_EQ(sign(strcmpi(c.b.c_str(), c.a.c_str())), -c.sign) << c.b << " " << c.a;
     }
 }
 
@@ -84,14 +76,15 @@ TEST(CharacterBuffer, CutsBetweenWholeCharacters) {
                  {"a\xFF\xFF", 2, "a\xFF"}};
     for (const auto& c : cases) {
         EXPECT_EQ(CutToBytes(c.text, c.bytes), c.kept) << c.text << " " << c.bytes;
-        char buffer[16];
-        std::memset(buffer, '#', sizeof buffer);
-        EXPECT_EQ(CopyText(buffer, c.bytes + 1, c.text), std::strlen(c.text) <= c.bytes);
-        EXPECT_STREQ(buffer, c.kept);
-        EXPECT_EQ(buffer[c.bytes + 1], '#');
-        EXPECT_EQ(FormatInto(buffer, c.bytes + 1, "%s", c.text), std::strlen(c.text) <= c.bytes);
-        EXPECT_STREQ(buffer, c.kept);
-        EXPECT_EQ(buffer[c.bytes + 1], '#');
+        const bool whole = std::strlen(c.text) <= c.bytes;
+        for (const bool format : {false, true}) {
+            std::string buffer(16, '#');
+            EXPECT_EQ(format ? FormatInto(buffer.data(), c.bytes + 1, "%s", c.text)
+                             : CopyText(buffer.data(), c.bytes + 1, c.text),
+                      whole);
+            EXPECT_STREQ(buffer.c_str(), c.kept);
+            EXPECT_EQ(buffer[c.bytes + 1], '#');
+        }
     }
     char untouched = '#';
     EXPECT_FALSE(CopyText(&untouched, 0, "a"));
