@@ -68,65 +68,70 @@ rgb_color SliceColor(std::size_t index) {
     return PieChartColors[index % PieChartColors.size()];
 }
 
-void Show(PieChartView& view, const std::vector<float>& values, const std::vector<const char*>& labels) {
-    view.SetTitle("Title");
-    ASSERT_EQ(view.SetData(values.data(), static_cast<int>(values.size())), 0);
-    for (std::size_t i = 0; i < labels.size(); ++i)
-        EXPECT_EQ(view.SetLegendLabel(static_cast<int>(i), labels[i]), 0);
-}
+class PieChart : public testing::Test {
+  protected:
+    Picture Show(const std::vector<float>& values, const std::vector<const char*>& labels, float scale = 1) {
+        return Show(view_, values, labels, scale);
+    }
+    Picture Show(PieChartView& view, const std::vector<float>& values, const std::vector<const char*>& labels,
+                 float scale = 1) {
+        values_ = values;
+        view.SetTitle("Title");
+        EXPECT_EQ(view.SetData(values_.data(), static_cast<int>(values_.size())), 0);
+        for (std::size_t i = 0; i < labels.size(); ++i)
+            EXPECT_EQ(view.SetLegendLabel(static_cast<int>(i), labels[i]), 0);
+        return Picture(view, scale);
+    }
+
+    std::vector<float> values_; // which the view reads as long as it shows them
+    BApplication application_{"test"};
+    PieChartView view_{Area};
+    const PieEllipse pie_ = EllipseIn(LayOutPie(Area).chart);
+};
+
+class GrowthChart : public testing::Test {
+  protected:
+    BApplication application_{"test"};
+    const BRect graph_ = LayOutGrowth(Area, ::GetFontHeight(be_plain_font)).graph;
+};
 
 } // namespace
 
-TEST(PieChart, SlicesRunCounterClockwiseFromThreeOClock) {
-    const BApplication application("test");
-    PieChartView view(Area);
-    // The last one's sweep is out of the legend's way.
-    const std::vector<float> values = {1, 2, 1, 4};
-    Show(view, values, {"", "", "", ""});
+TEST_F(PieChart, SlicesRunCounterClockwiseFromThreeOClock) {
     for (const float scale : {1.0F, 2.0F}) {
-        const Picture picture(view, scale);
+        // The last one's sweep is out of the legend's way.
+        const Picture picture = Show({1, 2, 1, 4}, {"", "", "", ""}, scale);
+        EXPECT_EQ(picture.Width(), static_cast<int>(scale) * Picture(view_).Width());
         const double middles[] = {22.5, 90, 157.5, 270};
         for (std::size_t i = 0; i < std::size(middles); ++i)
             EXPECT_EQ(picture.AtAngle(middles[i]), SliceColor(i)) << i;
-        const PieEllipse pie = EllipseIn(LayOutPie(Area).chart);
-        EXPECT_EQ(picture.At(pie.center.x, pie.center.y + pie.yRadius + 3), colors::dark_gray);
-        EXPECT_EQ(picture.At(pie.center.x, pie.center.y - pie.yRadius - 4), colors::gray);
+        EXPECT_EQ(picture.At(pie_.center.x, pie_.center.y + pie_.yRadius + 3), colors::dark_gray);
+        EXPECT_EQ(picture.At(pie_.center.x, pie_.center.y - pie_.yRadius - 4), colors::gray);
         EXPECT_TRUE(picture.Has(LayOutPie(Area).title, colors::black));
     }
-    EXPECT_EQ(Picture(view, 2).Width(), 2 * Picture(view).Width());
 }
 
-TEST(PieChart, LegendLinesKeepStepWithTheirSlices) {
-    const BApplication application("test");
-    PieChartView view(Area);
-    const std::vector<float> values = {1, 1, 0, 1};
-    Show(view, values, {"First", "", "Nothing", "A label of thirty-one bytes, aaa"});
-    const Picture picture(view);
+TEST_F(PieChart, LegendLinesKeepStepWithTheirSlices) {
+    const Picture picture = Show({1, 1, 0, 1}, {"First", "", "Nothing", "A label of thirty-one bytes, aaa"});
     const rgb_color boxes[] = {SliceColor(0), colors::gray, SliceColor(2), SliceColor(3)};
     for (int i = 0; i < 4; ++i) {
         const BRect box = LegendBox(i);
         EXPECT_EQ(picture.At(box.left, box.top), boxes[i]) << i;
         EXPECT_EQ(picture.At(box.right, box.bottom), boxes[i]) << i;
     }
-    EXPECT_EQ(view.AccessibleDescription(), "Title\nFirst: $1.00 33.33%\nNothing: $0.00 0.00%\n"
-                                            "A label of thirty-one bytes, aa: $1.00 33.33%");
-    EXPECT_EQ(view.SetLegendLabel(4, "too many"), 1);
-    EXPECT_EQ(view.SetLegendLabel(-1, "none"), 1);
+    EXPECT_EQ(view_.AccessibleDescription(), "Title\nFirst: $1.00 33.33%\nNothing: $0.00 0.00%\n"
+                                             "A label of thirty-one bytes, aa: $1.00 33.33%");
+    EXPECT_EQ(view_.SetLegendLabel(4, "too many"), 1);
+    EXPECT_EQ(view_.SetLegendLabel(-1, "none"), 1);
 }
 
-TEST(PieChart, ColorsBeginAgainAndALongLegendSaysWhatIsMissing) {
-    const BApplication application("test");
-    PieChartView view(Area);
-    const std::vector<float> values(17, 1);
-    Show(view, values, std::vector<const char*>(17, "x"));
-    const Picture picture(view);
+TEST_F(PieChart, ColorsBeginAgainAndALongLegendSaysWhatIsMissing) {
+    const Picture picture = Show(std::vector<float>(17, 1), std::vector<const char*>(17, "x"));
     EXPECT_EQ(picture.AtAngle(16.5 / 17 * 360), SliceColor(0));
     const BRect last = LegendBox(16);
     EXPECT_EQ(picture.At(last.left, last.top), SliceColor(0));
 
-    const std::vector<float> many(60, 1);
-    Show(view, many, std::vector<const char*>(60, "x"));
-    const Picture full(view);
+    const Picture full = Show(std::vector<float>(60, 1), std::vector<const char*>(60, "x"));
     const float step = LegendBox(1).top - LegendBox(0).top;
     const int room = static_cast<int>((LayOutPie(Area).legend.Height() + 2) / step);
     EXPECT_EQ(full.At(LegendBox(room - 2).left, LegendBox(room - 2).top), SliceColor(room - 2));
@@ -137,78 +142,60 @@ TEST(PieChart, ColorsBeginAgainAndALongLegendSaysWhatIsMissing) {
     EXPECT_TRUE(full.Has(note, colors::black));
 }
 
-TEST(PieChart, LegendTextsStayReadableAndInTheView) {
-    const BApplication application("test");
-    PieChartView view(Area);
+TEST_F(PieChart, LegendTextsStayReadableAndInTheView) {
     std::vector<float> values(12, 0);
     values[11] = 5e6F; // all of the pie
     std::vector<const char*> labels(12, "A name long enough to lie on the pie");
     labels[0] = "WWWWWWWWWWWWWWWWWWWWWWWWWWWWWWW";
-    Show(view, values, labels);
-    const Picture picture(view);
+    const Picture picture = Show(values, labels);
     const BRect first = LegendBox(0);
     for (const float y : {2.0F, 4.0F, 6.0F, 8.0F, 10.0F})
         EXPECT_EQ(picture.At(Area.right, first.top + y), colors::gray) << "the percentage is cut off";
     // At the top of a line's text, which no letter reaches, and on the pie's free half.
-    const PieEllipse pie = EllipseIn(LayOutPie(Area).chart);
-    const rgb_color veiled = picture.At(pie.center.x - pie.xRadius / 2, LegendBox(9).top - 2);
+    const rgb_color veiled = picture.At(pie_.center.x - pie_.xRadius / 2, LegendBox(9).top - 2);
     EXPECT_GT(veiled.red, SliceColor(11).red);
     EXPECT_LT(veiled.red, colors::gray.red);
-    EXPECT_EQ(picture.At(pie.center.x + pie.xRadius * 0.9F, pie.center.y), SliceColor(11));
+    EXPECT_EQ(picture.At(pie_.center.x + pie_.xRadius * 0.9F, pie_.center.y), SliceColor(11));
 
     PieChartView tiny({0, 0, 60, 9}); // without room for a line
-    Show(tiny, values, labels);
-    EXPECT_FALSE(Picture(tiny).Has({0, 0, 60, 9}, SliceColor(0)));
+    EXPECT_FALSE(Show(tiny, values, labels).Has({0, 0, 60, 9}, SliceColor(0)));
 }
 
-TEST(PieChart, SaysWhenThereIsNothingToChart) {
-    const BApplication application("test");
-    PieChartView view(Area);
-    const float zeros[] = {0, 0, 0};
-    const float canceling[] = {5, -5, 0};
-    const float noNumbers[] = {1, std::nanf(""), 2};
-    const struct {
-        const float* values;
-        int count;
-    } cases[] = {{nullptr, 0}, {zeros, 0}, {zeros, 3}, {canceling, 3}, {noNumbers, 3}};
-    for (const auto& each : cases) {
-        view.SetData(each.values, each.count);
-        const Picture picture(view);
-        EXPECT_TRUE(picture.Has({100, 170, 250, 200}, colors::black));
-        EXPECT_FALSE(picture.Has(LegendBox(0), SliceColor(0)));
+TEST_F(PieChart, SaysWhenThereIsNothingToChart) {
+    for (const std::vector<float>& values :
+         std::vector<std::vector<float>>{{}, {0, 0, 0}, {5, -5, 0}, {1, std::nanf(""), 2}}) {
+        const Picture picture = Show(values, {});
+        EXPECT_TRUE(picture.Has({100, 170, 250, 200}, colors::black)) << values.size();
+        EXPECT_FALSE(picture.Has(LegendBox(0), SliceColor(0))) << values.size();
     }
 }
 
-TEST(GrowthChart, LinesRunFromTheCornerToTheirValues) {
-    const BApplication application("test");
+TEST_F(GrowthChart, LinesRunFromTheCornerToTheirValues) {
     ValueChartView view(Area, 1000);
-    const BRect graph = LayOutGrowth(Area, ::GetFontHeight(be_plain_font)).graph;
     const auto at = [&](float x, float y) { return BRect(x - 3, y - 3, x + 2, y + 3); };
     const auto end = [&](float value, float maximum) {
-        return graph.bottom - (value - 1000) * graph.Height() / (maximum - 1000);
+        return graph_.bottom - (value - 1000) * graph_.Height() / (maximum - 1000);
     };
     const Picture all(view);
-    EXPECT_TRUE(all.Has(at(graph.right, graph.top + 3), colors::magenta));
-    EXPECT_TRUE(all.Has(at(graph.right, end(95'396, 264'698)), colors::yellow));
-    EXPECT_TRUE(all.Has(at(graph.left + 4, graph.bottom), colors::magenta)); // the last one lies on top
-    EXPECT_EQ(all.At(graph.left + 10, graph.top + 10), (rgb_color{205, 168, 157, 255}));
+    EXPECT_TRUE(all.Has(at(graph_.right, graph_.top + 3), colors::magenta));
+    EXPECT_TRUE(all.Has(at(graph_.right, end(95'396, 264'698)), colors::yellow));
+    EXPECT_TRUE(all.Has(at(graph_.left + 4, graph_.bottom), colors::magenta)); // the last one lies on top
+    EXPECT_EQ(all.At(graph_.left + 10, graph_.top + 10), (rgb_color{205, 168, 157, 255}));
 
     view.Toggle20And25Percent();
     const Picture some(view);
     EXPECT_FALSE(some.Has(Area, colors::magenta));
     EXPECT_FALSE(some.Has(Area, colors::yellow));
-    EXPECT_TRUE(some.Has(at(graph.right, graph.top + 3), colors::blue));
-    EXPECT_TRUE(some.Has(at(graph.right, end(10'835, 32'919)), colors::green));
+    EXPECT_TRUE(some.Has(at(graph_.right, graph_.top + 3), colors::blue));
+    EXPECT_TRUE(some.Has(at(graph_.right, end(10'835, 32'919)), colors::green));
     view.Toggle20And25Percent();
     EXPECT_TRUE(Picture(view).Has(Area, colors::magenta));
 }
 
-TEST(GrowthChart, DrawsWithoutGrowth) {
-    const BApplication application("test");
+TEST_F(GrowthChart, DrawsWithoutGrowth) {
     for (const float value : {0.0F, -100.0F, 3e38F, std::nanf("")}) {
         ValueChartView view(Area, value);
-        const BRect graph = LayOutGrowth(Area, ::GetFontHeight(be_plain_font)).graph;
-        EXPECT_TRUE(Picture(view).Has(graph, {205, 168, 157, 255})) << value;
+        EXPECT_TRUE(Picture(view).Has(graph_, {205, 168, 157, 255})) << value;
     }
 }
 
