@@ -86,17 +86,13 @@ MODEL_STATEMENT ModelTest::AnyQuery() {
 }
 
 MODEL_STATEMENT ModelTest::AnySet() {
-    static constexpr const char* operators[] = {"=", "+", "-", "*", "/", "~"};
-    static constexpr int packed[] = {1, 256, 65536, -1, 131006725, 0};
-    MODEL_STATEMENT set{Pick(7), Any(operators), "", 0};
-    if (set.column == 0) {
-        set.value = Any(Names);
-        set.value = set.value.empty() ? "longer than the column is" : set.value;
-        return set;
+    static constexpr const char* operators[] = {"=", "+", "~"};
+    const std::string name = Any(Names);
+    const int number = Any(Numbers);
+    if (Pick(2) == 0) {
+        return {0, Any(operators), name.empty() ? "longer than the column is" : name, 0};
     }
-    set.number = set.column >= 5 ? Any(packed) : Any(Numbers);
-    set.value = std::to_string(static_cast<int>(set.number));
-    return set;
+    return {3, Any(operators), std::to_string(number), static_cast<double>(number)};
 }
 
 void ModelTest::ChangeRecords() {

@@ -37,8 +37,7 @@ TEST_F(QueryUpdateTest, RefusesAndChangesNothing) {
     EXPECT_EQ(folder_.Read("rows.db"), start_);
 }
 
-// Ordinary changes are compared with a plain model elsewhere.
-TEST_F(QueryUpdateTest, NumbersWrapAndDivideAsTheirTypesDo) {
+TEST_F(QueryUpdateTest, ChangesEveryTypeByEveryOperator) {
     const auto tag = [](const ROW& row) { return static_cast<double>(row.tag); };
     const auto small = [](const ROW& row) { return static_cast<double>(row.small); };
     const auto count = [](const ROW& row) { return static_cast<double>(row.count); };
@@ -49,19 +48,26 @@ TEST_F(QueryUpdateTest, NumbersWrapAndDivideAsTheirTypesDo) {
         double first, second; // of records 0 and 1
     } cases[] = {
         {"Tag = 300", tag, 44, 44},
+        {"Tag + 100", tag, -56, -28},
+        {"Tag - 1", tag, 99, 127},
         {"Tag * 3", tag, 44, -128},
         {"Tag / 7", tag, 14, -18},
         {"Tag / -1", tag, -100, -128},
         {"Tag / 0", tag, 100, -128},
         {"Small + 40000", small, 4464, 7232},
+        {"Small * -1", small, -30000, -32768},
         {"Small / -1", small, -30000, -32768},
+        {"Count / 3", count, 3, INT_MIN / 3},
         {"Count / -1", count, -10, INT_MIN},
         {"Count / word", count, 10, INT_MIN},
         {"Count - 1", count, 9, INT_MAX},
         {"Count * 2147483647", count, -10, INT_MIN},
         {"Count = 4294967297", count, 1, 1},
         {"Price = 0.1", price, 0.1F, 0.1F},
+        {"Price + 1", price, 2.5, -1},
         {"Price - 0.5", price, 1, -2.5},
+        {"Price * 2", price, 3, -4},
+        {"Price / 4", price, 0.375, -0.5},
         {"Price / 0", price, INFINITY, -INFINITY},
         {"Price = 1e99", price, INFINITY, INFINITY},
     };
@@ -78,10 +84,15 @@ TEST_F(QueryUpdateTest, ChangesDatesAndTimesByParts) {
         long record;
         const char* query; // then selects exactly that record
     } cases[] = {
+        {"Day + 1", 0, "Day = 20000101"},
         {"Day + 256", 2, "Day = 19990303"}, // 31 February is carried one step
         {"Day + -1", 1, "Day = 19980514"},  // each part loses one
-        {"Day * 2", 1, "Day = 19990615"},   {"At + 90", 0, "At = 110100"}, {"At + 1", 2, "At = 000000"},
-        {"At - 1", 1, "At = 235959"},       {"At / 5", 0, "At = 105930"},
+        {"Day - 65536", 1, "Day = 19980615"},
+        {"Day * 2", 1, "Day = 19990615"},
+        {"At + 90", 0, "At = 110100"},
+        {"At + 1", 2, "At = 000000"},
+        {"At - 1", 1, "At = 235959"},
+        {"At / 5", 0, "At = 105930"},
     };
     for (const auto& change : cases) {
         Change(change.statement);

@@ -53,107 +53,13 @@ bool Holds(const std::string& op, const T& a, const T& b) {
                         : a >= b;
 }
 
-int MonthLength(int year, int month) {
-    static const int lengths[] = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
-    const bool leap = year % 4 == 0 && (year % 100 != 0 || year % 400 == 0);
-    return lengths[month - 1] + (month == 2 && leap ? 1 : 0);
-}
-
-// Keeps a part between its least and most by taking from the part above it, or giving to it.
-void Carry(int* part, int least, int most, int* above) {
-    for (; *part > most; *part -= most - least + 1, ++*above) {
-    }
-    for (; *part < least; *part += most - least + 1, --*above) {
-    }
-}
-
-dbDATE Valid(dbDATE date) {
-    int year = date.year;
-    int month = +date.month;
-    int day = +date.day;
-    const auto carry = [&] {
-        Carry(&month, 1, 12, &year);
-        year = static_cast<std::int16_t>(year);
-    };
-    carry();
-    if (const int length = MonthLength(year, month); day > length) {
-        day -= length;
-        ++month;
-        carry();
-    } else if (day < 1) {
-        --month;
-        carry();
-        day += MonthLength(year, month);
-    }
-    return {static_cast<std::int8_t>(day), static_cast<std::int8_t>(month), static_cast<std::int16_t>(year)};
-}
-
-dbTIME Valid(dbTIME time) {
-    int second = +time.second;
-    int minute = +time.minute;
-    int hour = +time.hour;
-    Carry(&second, 0, 59, &minute);
-    Carry(&minute, 0, 59, &hour);
-    hour += hour >= 24 ? -24 : hour < 0 ? 24 : 0;
-    return {static_cast<std::int8_t>(second), static_cast<std::int8_t>(minute),
-            static_cast<std::int8_t>(hour)};
-}
-
-// Integers wrap at their width; dividing one by 0 changes nothing.
-template <class T>
-void Change(const std::string& op, T* field, std::int64_t wanted) {
-    const std::int64_t value = +static_cast<T>(wanted);
-    const std::int64_t old = +*field;
-    const std::int64_t changed = op == "="    ? value
-                                 : op == "+"  ? old + value
-                                 : op == "-"  ? old - value
-                                 : op == "*"  ? old * value
-                                 : value != 0 ? old / value
-                                              : old;
-    *field = static_cast<T>(changed);
-}
-
-float ChangedFloat(const std::string& op, float field, float value) {
-    return op == "="   ? value
-           : op == "+" ? value + field
-           : op == "-" ? field - value
-           : op == "*" ? value * field
-                       : field / value;
-}
-
 void ChangeField(ROW* row, const MODEL_STATEMENT& set) {
-    const auto whole = static_cast<std::int64_t>(set.number);
-    if (set.column >= Day && (set.op == "*" || set.op == "/")) {
-        return;
-    }
-    const auto changed = [&](auto field, std::int64_t value) { // fields of a packed record have no address
-        Change(set.op, &field, value);
-        return field;
-    };
-    switch (set.column) {
-    case Name:
+    if (set.column == Name) {
         std::memset(row->name, 0, sizeof(row->name));
         set.value.copy(row->name, sizeof(row->name) - 1);
-        break;
-    case Tag:
-        row->tag = changed(row->tag, whole);
-        break;
-    case Small:
-        row->small = changed(static_cast<std::int16_t>(row->small), whole);
-        break;
-    case Count:
-        row->count = changed(static_cast<std::int32_t>(row->count), whole);
-        break;
-    case Price:
-        row->price = ChangedFloat(set.op, row->price, static_cast<float>(set.number));
-        break;
-    case Day:
-        row->day = Valid(dbDATE{changed(row->day.day, whole), changed(row->day.month, whole >> 8),
-                                changed(static_cast<std::int16_t>(row->day.year), whole >> 16)});
-        break;
-    default:
-        row->at = Valid(dbTIME{changed(row->at.second, whole), changed(row->at.minute, whole >> 8),
-                               changed(row->at.hour, whole >> 16)});
+    } else {
+        row->count = static_cast<std::int32_t>(static_cast<std::int64_t>(set.number) +
+                                               (set.op == "+" ? row->count : 0));
     }
 }
 
@@ -324,7 +230,7 @@ OUTCOME RecordModel::Query(const MODEL_STATEMENT* query, int mode) {
 }
 
 OUTCOME RecordModel::QueryUpdate(const MODEL_STATEMENT& set) {
-    if (std::string("=+-*/").find(set.op) == std::string::npos) {
+    if (set.op != "=" && set.op != "+") {
         return {-1, 2201};
     }
     if (set.column == Name && set.op != "=") {

@@ -23,7 +23,8 @@ struct MODEL_STATEMENT {
 };
 
 // A data file of ROWs as DATABASE documents it, in plain memory and by the plainest means: every record is
-// looked at one by one, a sort is a bubble sort. It knows nothing of bytes but those it expects in the file.
+// looked at one by one, a sort is a bubble sort. It sets names and counts, and adds to counts. It knows
+// nothing of bytes but those it expects in the file.
 class RecordModel {
   public:
     enum Status : std::uint8_t { Active, Deleted, Locked };
