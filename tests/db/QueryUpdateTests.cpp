@@ -136,24 +136,4 @@ TEST_F(QueryUpdateTest, DoesNotWritePastNarrowColumns) {
     }
 }
 
-TEST_F(QueryUpdateTest, ReachesEveryRecordOfALargeSet) {
-    std::vector<ROW> rows;
-    for (int i = 0; i < 20000; ++i) {
-        rows.push_back(Row(i % 7 == 0 ? "seven" : "none", 0, i % 100, i));
-    }
-    Append(rows);
-    for (int kilobytes : {256, 1, 0}) {
-        ASSERT_EQ(database_.SetReadCache(kilobytes), 0);
-        for (const char* statement : {"Name = seven", "Small < 50", "Small = 3"}) {
-            const long count = database_.Query(statement, QueryMode::New);
-            ASSERT_GT(count, 0);
-            ASSERT_EQ(database_.QueryUpdate("Price + 1"), count);
-        }
-    }
-    for (int i = 0; i < 20000; ++i) {
-        const int hits = (i % 7 == 0 ? 3 : 0) + (i % 100 < 50 ? 3 : 0) + (i % 100 == 3 ? 3 : 0);
-        ASSERT_EQ(static_cast<int>(At(i + 3).price), hits) << i;
-    }
-}
-
 } // namespace

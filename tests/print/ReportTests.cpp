@@ -161,29 +161,31 @@ TEST_F(ReportTest, MakesWideCellsFitAndCutsWhatWouldBeTooSmall) {
 }
 
 TEST_F(ReportTest, IsOnePageHoweverManyInvestmentsThereAre) {
+    const struct {
+        int more;
+        const char* total;
+        const char* count;
+    } cases[] = {{0, " $0.00 Name", " 0 investments "},
+                 {1, " $20.50 Name", " 1 investment "},
+                 {199, " $4100.00 Name", " of 200 investments "}};
     long all = 0;
-    for (const long more : {0, 1, 199}) {
-        for (long i = 0; i < more; ++i)
+    for (const auto& each : cases) {
+        for (int i = 0; i < each.more; ++i)
             folder_.AddInvestment(MakeInvestment("Mine", "n", 2, 10.25F));
-        all += more;
+        all += each.more;
         ASSERT_EQ(Print("Mine"), ReportResult::Printed);
         EXPECT_EQ(PdfPages(file_), 1);
-        const std::string text = Text();
-        const long rows = Count("TICK");
-        if (all < 200) {
-            EXPECT_EQ(rows, all);
-            EXPECT_NE(text.find(all == 0 ? " $0.00 Name" : " $20.50 Name"), std::string::npos) << text;
-            EXPECT_NE(text.find(all == 0 ? " 0 investments " : " 1 investment "), std::string::npos) << text;
-        } else {
-            // All that are whole above the footer count; one more may be half behind it.
-            const std::size_t of = text.find(" of 200 investments ");
-            ASSERT_NE(of, std::string::npos) << text;
-            const long shown = std::stol(text.substr(text.rfind(' ', of - 1)));
-            EXPECT_GT(shown, 30);
-            EXPECT_TRUE(rows == shown || rows == shown + 1) << rows << " rows, " << shown;
-            EXPECT_LT(words_[words_.size() - 20].bottom, page_.bottom);
-        }
+        EXPECT_NE(Text().find(each.total), std::string::npos) << Text();
+        EXPECT_NE(Text().find(each.count), std::string::npos) << Text();
+        EXPECT_TRUE(all == 200 || Count("TICK") == all) << Count("TICK");
     }
+    // All that are whole above the footer count; one more may be half behind it.
+    const long rows = Count("TICK");
+    const std::size_t of = Text().find(" of 200 ");
+    const long shown = std::stol(Text().substr(Text().rfind(' ', of - 1)));
+    EXPECT_GT(shown, 30);
+    EXPECT_TRUE(rows == shown || rows == shown + 1) << rows << " rows, " << shown;
+    EXPECT_LT(words_[words_.size() - 20].bottom, page_.bottom);
 }
 
 TEST_F(ReportTest, TheTableFitsThePage) {
