@@ -189,6 +189,13 @@ TEST_F(DamageTest, AppendKeepsRecordsBehindTheCountedOnes) {
     EXPECT_EQ(folder_.Read("rows.db"), With(intact_, 36, "\x01"));
 }
 
+TEST_F(DamageTest, CountThatIsTooLowStaysInItsRange) {
+    folder_.Write("rows.db", With(intact_, 40, std::string(1, '\0')));
+    DATABASE database(path_.c_str());
+    EXPECT_EQ(database.UnDelete(1), 0);
+    EXPECT_EQ(database.GetNumberOfActiveRecords(), 4);
+}
+
 TEST_F(DamageTest, NarrowColumnsAreNotReadPastTheirEnd) {
     std::string bytes = With(intact_, FirstColumn + 44 * 3 + 34, "\x02"); // Count keeps 2 of its 4 bytes
     for (std::size_t i = 0; i < 4; ++i) {

@@ -152,6 +152,10 @@ TEST(FolderLock, InAFolderThatMayOnlyBeReadIsSeenAllTheSame) {
     std::filesystem::permissions(folder.File("Quorvan.lock"), std::filesystem::perms{0444});
     EXPECT_EQ(ResultAsOrdinaryUser(take), 1);
     EXPECT_EQ(folder.Names(), std::vector<std::string>{"Quorvan.lock"});
+    lock.Release();
+    folder.Write("Quorvan.lock", LockText(OwnHost(), getpid()));
+    std::filesystem::permissions(folder.File("Quorvan.lock"), std::filesystem::perms{0444});
+    EXPECT_EQ(ResultAsOrdinaryUser(take), 100 + EACCES) << "nobody holds it";
 }
 
 // Taking, releasing and removing the file must never leave two inside.
