@@ -102,7 +102,8 @@ void PRINT_TABLE::DrawText(const char* cells, int cellStride) {
     rowPosition_ += fontHeight_ + RowGap;
 }
 
-void PRINT_TABLE::DrawFitting(const BRect& cell, const char* text, std::uint32_t alignment, float leastSize) const {
+void PRINT_TABLE::DrawFitting(const BRect& cell, const char* text, std::uint32_t alignment,
+                              float leastSize) const {
     BFont usual;
     view_->GetFont(&usual);
     BFont font = usual;
