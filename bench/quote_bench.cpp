@@ -5,6 +5,7 @@
 
 #include <cstdio>
 #include <cstring>
+#include <exception>
 #include <filesystem>
 #include <fstream>
 
@@ -43,7 +44,7 @@ bool AskBarely(std::uint16_t port) {
     return read;
 }
 
-int Measure(const OPTIONS& options, const std::string& folder) {
+int MeasureIn(const std::string& folder, const OPTIONS& options) {
     LoopbackServer server(Reply{{Page()}});
     const std::string sources = folder + "/Quorvan.cfg";
     const std::string log = folder + "/Quorvan.log";
@@ -78,21 +79,27 @@ int Measure(const OPTIONS& options, const std::string& folder) {
     return right ? 0 : 1;
 }
 
-} // namespace
-
-int main(int argc, char** argv) {
-    OPTIONS options(500);
-    if (!ReadOptions(argc, argv, &options)) {
-        std::fprintf(stderr, "usage: quote_bench [--records N] [--rounds N] [--folder PATH]\n");
-        return 2;
-    }
+int Measure(const OPTIONS& options) {
     std::string folder = options.folder + "/quote_bench.XXXXXX";
     if (mkdtemp(folder.data()) == nullptr) {
         std::perror(folder.c_str());
         return 1;
     }
-    const int result = Measure(options, folder);
-    std::error_code error; // left behind, the folder does no harm
-    std::filesystem::remove_all(folder, error);
+    const int result = MeasureIn(folder, options);
+    std::filesystem::remove_all(folder);
     return result;
+}
+
+} // namespace
+
+int main(int argc, char** argv) try {
+    OPTIONS options(500);
+    if (!ReadOptions(argc, argv, &options)) {
+        std::fprintf(stderr, "usage: quote_bench [--records N] [--rounds N] [--folder PATH]\n");
+        return 2;
+    }
+    return Measure(options);
+} catch (const std::exception& error) {
+    std::fprintf(stderr, "quote_bench: %s\n", error.what());
+    return 1;
 }

@@ -12,6 +12,7 @@
 #include <chrono>
 #include <cstdio>
 #include <cstdlib>
+#include <exception>
 #include <filesystem>
 #include <fstream>
 #include <mutex>
@@ -229,23 +230,14 @@ bool MakeFolder(const std::string& folder, const std::string& host, long records
     return true;
 }
 
-} // namespace
-
-int main(int argc, char** argv) {
-    setenv("QT_QPA_PLATFORM", "offscreen", 0);
-    OPTIONS options(500);
-    if (!ReadOptions(argc, argv, &options)) {
-        std::fprintf(stderr, "usage: update_bench [--records N] [--rounds N] [--folder PATH]\n");
-        return 2;
-    }
+int Measure(const OPTIONS& options) {
     const std::string folder = options.folder + "/quorvan-update-bench";
     std::filesystem::remove_all(folder);
     std::filesystem::create_directories(folder);
     Arrivals arrivals;
-    const Reply page{{"HTTP/1.0 200 OK\r\n\r\n<td>Last Trade</td><td><b>45 3/8</b></td>"}};
     LoopbackServer server([&](const std::string&) {
         arrivals.Note();
-        return page;
+        return Reply{{"HTTP/1.0 200 OK\r\n\r\n<td>Last Trade</td><td><b>45 3/8</b></td>"}};
     });
     if (!MakeFolder(folder, server.Host(), options.records)) {
         std::fprintf(stderr, "update_bench: the folder could not be filled\n");
@@ -265,4 +257,19 @@ int main(int argc, char** argv) {
                 times.longestWait);
     std::filesystem::remove_all(folder);
     return times.failed ? 1 : 0;
+}
+
+} // namespace
+
+int main(int argc, char** argv) try {
+    setenv("QT_QPA_PLATFORM", "offscreen", 0);
+    OPTIONS options(500);
+    if (!ReadOptions(argc, argv, &options)) {
+        std::fprintf(stderr, "usage: update_bench [--records N] [--rounds N] [--folder PATH]\n");
+        return 2;
+    }
+    return Measure(options);
+} catch (const std::exception& error) {
+    std::fprintf(stderr, "update_bench: %s\n", error.what());
+    return 1;
 }
