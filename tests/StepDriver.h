@@ -8,6 +8,8 @@
 #include <QAbstractButton>
 #include <QApplication>
 #include <QDeadlineTimer>
+#include <QLineEdit>
+#include <QMenuBar>
 #include <QMessageBox>
 #include <QTest>
 
@@ -38,6 +40,11 @@ class StepDriver : public QObject {
         return *this;
     }
 
+    // Waits until it is so.
+    StepDriver& Await(std::string what, Condition condition) {
+        return When(std::move(what), std::move(condition), [] {});
+    }
+
     // Waits for an alert with this text and presses one of its buttons.
     StepDriver& Answer(const char* text, const char* button) {
         return When(
@@ -58,6 +65,46 @@ class StepDriver : public QObject {
     }
     static Condition WindowShown(const char* title) {
         return [title] { return Window(title) != nullptr; };
+    }
+    // The menu that is open; null when there is none.
+    static QMenu* OpenMenu() { return qobject_cast<QMenu*>(QApplication::activePopupWidget()); }
+    // The field that the keyboard is in; null when there is none.
+    static QLineEdit* Field() { return qobject_cast<QLineEdit*>(QApplication::focusWidget()); }
+    // To the open menu or what else has the keyboard.
+    static void Key(Qt::Key key, Qt::KeyboardModifiers with = {}) {
+        for (QWidget* at : {QApplication::activePopupWidget(), QApplication::focusWidget(),
+                            QApplication::activeModalWidget()})
+            if (at)
+                return QTest::keyClick(at, key, with);
+        self_->Fail("nothing has the keyboard");
+    }
+    // Types any letters, also those that no key of the test's keyboard has, and then the key if one is given.
+    static void Type(const char* text, Qt::Key last = Qt::Key_unknown) {
+        for (const QChar letter : QString::fromUtf8(text))
+            QTest::sendKeyEvent(QTest::Click, QApplication::focusWidget(), Qt::Key_unknown, QString(letter),
+                                Qt::NoModifier);
+        if (last != Qt::Key_unknown)
+            Key(last);
+    }
+    // The same, over all that is in the field.
+    static void TypeOver(const char* text, Qt::Key last = Qt::Key_unknown) {
+        Key(Qt::Key_A, Qt::ControlModifier);
+        Key(Qt::Key_Delete);
+        Type(text, last);
+    }
+    // Clicks a menu's title in the window's menu bar.
+    static void ClickTitle(const QWidget* window, const char* title) {
+        auto* bar = window->findChild<QMenuBar*>();
+        for (QAction* action : bar->actions())
+            if (action->menu()->objectName() == title)
+                QTest::mouseClick(bar, Qt::LeftButton, {}, bar->actionGeometry(action).center());
+    }
+    // Clicks an item of the open menu.
+    static void ClickItem(const char* label) {
+        QMenu* menu = OpenMenu();
+        for (QAction* item : menu->actions())
+            if (item->objectName() == label)
+                QTest::mouseClick(menu, Qt::LeftButton, {}, menu->actionGeometry(item).center());
     }
     // Clicks a button found by its name; without such a button the step after it will wait in vain.
     static void Press(QWidget* window, const char* button) {

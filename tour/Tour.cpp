@@ -50,47 +50,14 @@ bool MainWindowIsFree() {
     return MainWindow() && !QApplication::activeModalWidget() && !QApplication::activePopupWidget();
 }
 
-QMenu* OpenMenu() {
-    return qobject_cast<QMenu*>(QApplication::activePopupWidget());
-}
-
-void Type(const char* text) {
-    auto* field = qobject_cast<QLineEdit*>(QApplication::focusWidget());
-    if (!field)
-        return; // what was to be typed will be missed
-    field->selectAll();
-    QTest::keyClicks(field, QString::fromUtf8(text));
-}
-
 // Into the field with the focus and those after it.
 void TypeInto(std::initializer_list<const char*> texts) {
     for (const char* text : texts) {
         if (text != *texts.begin())
             QTest::keyClick(QApplication::focusWidget(), Qt::Key_Tab);
-        if (!qobject_cast<QLineEdit*>(QApplication::focusWidget()))
+        if (!StepDriver::Field())
             QTest::keyClick(QApplication::focusWidget(), Qt::Key_Tab); // a button beside a field
-        Type(text);
-    }
-}
-
-void PressKey(Qt::Key key) {
-    QTest::keyClick(
-        QApplication::focusWidget() ? QApplication::focusWidget() : QApplication::activeModalWidget(), key);
-}
-
-void ClickMenuTitle(const char* title) {
-    auto* bar = MainWindow()->findChild<QMenuBar*>();
-    for (QAction* action : bar->actions()) {
-        if (action->menu()->objectName() == title)
-            QTest::mouseClick(bar, Qt::LeftButton, {}, bar->actionGeometry(action).center());
-    }
-}
-
-void ClickMenuItem(const char* label) {
-    QMenu* menu = OpenMenu();
-    for (QAction* item : menu->actions()) {
-        if (item->objectName() == label)
-            QTest::mouseClick(menu, Qt::LeftButton, {}, menu->actionGeometry(item).center());
+        StepDriver::TypeOver(text);
     }
 }
 
@@ -136,8 +103,7 @@ void Tour::Then(const std::string& what, Action action) {
 }
 
 void Tour::Until(const std::string& what, const Condition& condition) {
-    When(
-        what, [condition] { return MainWindowIsFree() && condition(); }, [] {});
+    Await(what, [condition] { return MainWindowIsFree() && condition(); });
 }
 
 void Tour::Shoot(const std::string& picture) {
@@ -151,43 +117,38 @@ void Tour::InDialog(const char* title, const std::string& picture, Action action
         const QWidget* modal = QApplication::activeModalWidget();
         return modal && modal->windowTitle() == QString::fromUtf8(title);
     };
-    When(std::string("dialog ") + title, shown, [] {});
+    Await(std::string("dialog ") + title, shown);
     Shoot(picture);
     When(std::string("dialog ") + title, shown, std::move(action));
 }
 
 void Tour::Choose(const char* menu, const char* item) {
-    Then(std::string("menu ") + menu, [menu] { ClickMenuTitle(menu); });
-    When(
-        std::string(menu) + " > " + item, [] { return OpenMenu() != nullptr; },
-        [item] { ClickMenuItem(item); });
+    Then(std::string("menu ") + menu, [menu] { ClickTitle(MainWindow(), menu); });
+    When(std::string(menu) + " > " + item, OpenMenu, [item] { ClickItem(item); });
 }
 
 void Tour::AlertAndAnswer(const char* text, const std::string& picture, const char* button) {
-    When(
-        std::string("alert: ") + text,
-        [text] { return Alert() && Alert()->text() == QString::fromUtf8(text); }, [] {});
+    Await(std::string("alert: ") + text,
+          [text] { return Alert() && Alert()->text() == QString::fromUtf8(text); });
     Shoot(picture);
     Answer(text, button);
 }
 
 void Tour::LookAtMenus() {
     for (const char* menu : {"File", "Portfolio", "Investment", "Help"}) {
-        Then(std::string("menu ") + menu, [menu] { ClickMenuTitle(menu); });
-        When(
-            std::string("menu ") + menu + " is open", [] { return OpenMenu() != nullptr; }, [] {});
+        Then(std::string("menu ") + menu, [menu] { ClickTitle(MainWindow(), menu); });
+        Await(std::string("menu ") + menu + " is open", OpenMenu);
         Shoot(std::string("menu-") + menu);
-        When(
-            std::string("close menu ") + menu, [] { return OpenMenu() != nullptr; },
-            [] { QTest::keyClick(OpenMenu(), Qt::Key_Escape); });
+        When(std::string("close menu ") + menu, OpenMenu,
+             [] { QTest::keyClick(OpenMenu(), Qt::Key_Escape); });
     }
 }
 
 void Tour::LookAtDialogs() {
     Choose("File", "Settings");
-    InDialog("Settings", "settings", [] { PressKey(Qt::Key_Escape); });
+    InDialog("Settings", "settings", [] { Key(Qt::Key_Escape); });
     Choose("Portfolio", "Edit");
-    InDialog("Edit Portfolio", "portfolio-edit", [] { PressKey(Qt::Key_Escape); });
+    InDialog("Edit Portfolio", "portfolio-edit", [] { Key(Qt::Key_Escape); });
     Choose("Portfolio", "Del");
     AlertAndAnswer("Are you sure you want to delete this portfolio?", "portfolio-delete", "No");
     Choose("Help", "About Quorvan...");
@@ -196,28 +157,19 @@ void Tour::LookAtDialogs() {
 
 void Tour::AddAnInvestment() {
     Choose("Portfolio", "Add");
-    InDialog("Add a Portfolio", "portfolio-add", [] {
-        Type(NewPortfolio);
-        PressKey(Qt::Key_Return);
-    });
+    InDialog("Add a Portfolio", "portfolio-add", [] { TypeOver(NewPortfolio, Qt::Key_Return); });
     Until("the new portfolio is empty", [] { return RowsShown() == 0; });
     Then("the Add button", [] { Press(MainWindow(), "add button"); });
-    When(
-        "the investment form", [] { return qobject_cast<QLineEdit*>(QApplication::focusWidget()); },
-        [] {
-            TypeInto({"Hornbeam Mills", "HORN", "Stock", "25", "41.5"});
-        });
-    InDialog("Add an Investment", "investment-add", [] { PressKey(Qt::Key_Return); });
+    When("the investment form", Field, [] { TypeInto({"Hornbeam Mills", "HORN", "Stock", "25", "41.5"}); });
+    InDialog("Add an Investment", "investment-add", [] { Key(Qt::Key_Return); });
     Until("what was added is shown and in its file", [this] {
         DATABASE file((folder_ + "/invest.db").c_str());
         return RowsShown() == 1 && SelectInvestments(file, NewPortfolio) == 1;
     });
     Then("the selector", [] { ClickMenuField(MainWindow()); });
-    When(
-        "the selector's menu", [] { return OpenMenu() != nullptr; }, [] {});
+    Await("the selector's menu", OpenMenu);
     Shoot("portfolio-selector");
-    When(
-        "back to the sample", [] { return OpenMenu() != nullptr; }, [] { ClickMenuItem(SamplePortfolio); });
+    When("back to the sample", OpenMenu, [] { ClickItem(SamplePortfolio); });
 }
 
 void Tour::UpdatePrices() {
@@ -249,10 +201,8 @@ void Tour::LookAtCharts() {
     };
     for (const ChartStop& chart : Charts) {
         When("the chart menu", shown, [] { ClickMenuField(QApplication::activeModalWidget()); });
-        When(
-            std::string("choose ") + chart.title, [] { return OpenMenu() != nullptr; },
-            [&chart] { ClickMenuItem(chart.title); });
-        When(std::string("chart ") + chart.title, shown, [] {});
+        When(std::string("choose ") + chart.title, OpenMenu, [&chart] { ClickItem(chart.title); });
+        Await(std::string("chart ") + chart.title, shown);
         Shoot(chart.picture);
     }
     When("close the charts", shown, [] { QApplication::activeModalWidget()->close(); });
@@ -269,7 +219,7 @@ void Tour::PrintReport() {
             return dialog && dialog->objectName() == name;
         };
     };
-    When("page set-up", shown("page setup dialog"), [] {});
+    Await("page set-up", shown("page setup dialog"));
     Shoot("page-setup");
     When("page set-up", shown("page setup dialog"), accept);
     When("print set-up", shown("print dialog"), [file] {
