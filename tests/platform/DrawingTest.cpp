@@ -41,33 +41,36 @@ struct Shown {
     QImage Picture(double density = 1) const {
         QImage image((QSizeF(100, 100) * density).toSize(), QImage::Format_RGB32);
         image.setDevicePixelRatio(density);
+        Toolkit()->render(&image);
+        return image;
+    }
+    static QWidget* Toolkit() {
         for (QWidget* widget : QApplication::topLevelWidgets())
             if (widget->objectName() == QLatin1String("picture"))
-                widget->render(&image);
-        return image;
+                return widget;
+        return nullptr;
     }
 
     BWindow* window;
     Canvas* canvas;
 };
 
-// Compares single pixels; each line of the table is one place and the colour expected there.
-struct Pixel {
-    int x, y;
-    QRgb color;
-};
-void ExpectPixels(const QImage& picture, std::initializer_list<Pixel> pixels) {
+// That all these pixels have the colour.
+void ExpectColor(QRgb color, const QImage& picture, std::initializer_list<QPoint> pixels) {
     ASSERT_FALSE(picture.isNull());
-    for (const Pixel& pixel : pixels)
-        EXPECT_EQ(picture.pixel(pixel.x, pixel.y) & 0xFFFFFF, pixel.color)
-            << "at " << pixel.x << ", " << pixel.y << std::hex << " found "
-            << picture.pixel(pixel.x, pixel.y);
+    for (const QPoint pixel : pixels)
+        EXPECT_EQ(picture.pixel(pixel), 0xFF000000 | color) << "at " << pixel.x() << ", " << pixel.y();
 }
+
+constexpr QRgb kRedPixel = 0xFF0000;
+constexpr QRgb kBluePixel = 0x0000FF;
+constexpr QRgb kBlackPixel = 0x000000;
+constexpr QRgb kWhitePixel = 0xFFFFFF;
 
 } // namespace
 
 TEST(Drawing, ShapesCoverTheirInclusiveRectangles) {
-    BApplication application("test");
+    const BApplication application("test");
     const Shown shown([](BView* view) {
         view->SetHighColor(kRed);
         view->FillRect({10, 10, 19, 19});
@@ -81,32 +84,17 @@ TEST(Drawing, ShapesCoverTheirInclusiveRectangles) {
         view->ConstrainClippingRegion(nullptr);
         view->FillRect({98, 0, 99, 1});
     });
-    ExpectPixels(shown.Picture(), {{10, 10, 0xFF0000},
-                                   {19, 19, 0xFF0000},
-                                   {20, 19, 0xFFFFFF},
-                                   {9, 10, 0xFFFFFF},
-                                   {30, 10, 0xFF0000},
-                                   {39, 19, 0xFF0000},
-                                   {31, 11, 0xFFFFFF},
-                                   {40, 10, 0xFFFFFF},
-                                   {50, 10, 0xFF0000},
-                                   {59, 10, 0xFF0000},
-                                   {60, 10, 0xFFFFFF},
-                                   {50, 11, 0xFFFFFF},
-                                   // the first quarter lies right of and above the centre
-                                   {58, 52, 0x0000FF},
-                                   {42, 52, 0xFFFFFF},
-                                   {58, 68, 0xFFFFFF},
-                                   {42, 68, 0xFFFFFF},
-                                   {80, 80, 0x0000FF},
-                                   {84, 84, 0x0000FF},
-                                   {85, 84, 0xFFFFFF},
-                                   {79, 80, 0xFFFFFF},
-                                   {98, 0, 0x0000FF}});
+    const QImage picture = shown.Picture();
+    ExpectColor(kRedPixel, picture, {{10, 10}, {19, 19}, {30, 10}, {39, 19}, {50, 10}, {59, 10}});
+    ExpectColor(kWhitePixel, picture,
+                {{20, 19}, {9, 10}, {31, 11}, {40, 10}, {60, 10}, {50, 11}, {85, 84}, {79, 80}});
+    // The first quarter lies right of and above the centre.
+    ExpectColor(kBluePixel, picture, {{58, 52}, {80, 80}, {84, 84}, {98, 0}});
+    ExpectColor(kWhitePixel, picture, {{42, 52}, {58, 68}, {42, 68}});
 }
 
 TEST(Drawing, BitmapsKeepTheirTransparentPixels) {
-    BApplication application("test");
+    const BApplication application("test");
     BBitmap bitmap(BRect(0, 0, 1, 0), B_CMAP8);
     const uint8 pixels[] = {0, B_TRANSPARENT_MAGIC_CMAP8};
     bitmap.SetBits(pixels, 2, 0, B_CMAP8);
@@ -121,12 +109,13 @@ TEST(Drawing, BitmapsKeepTheirTransparentPixels) {
         view->SetLowColor(kRed);
         view->DrawBitmap(&bitmap, BPoint(20, 10));
     });
-    ExpectPixels(shown.Picture(),
-                 {{10, 10, 0x000000}, {11, 10, 0x0000FF}, {20, 10, 0x000000}, {21, 10, 0xFF0000}});
+    ExpectColor(kBlackPixel, shown.Picture(), {{10, 10}, {20, 10}});
+    ExpectColor(kBluePixel, shown.Picture(), {{11, 10}});
+    ExpectColor(kRedPixel, shown.Picture(), {{21, 10}});
 }
 
 TEST(Drawing, BitmapsStaySharpOnDenseScreens) {
-    BApplication application("test");
+    const BApplication application("test");
     BBitmap bitmap(BRect(0, 0, 2, 0), B_CMAP8);
     const uint8 pixels[] = {0, B_TRANSPARENT_MAGIC_CMAP8, 0};
     bitmap.SetBits(pixels, 3, 0, B_CMAP8);
@@ -134,21 +123,17 @@ TEST(Drawing, BitmapsStaySharpOnDenseScreens) {
         view->SetDrawingMode(B_OP_OVER);
         view->DrawBitmap(&bitmap, BPoint(10, 10));
     });
-    ExpectPixels(shown.Picture(2), {{19, 20, 0xFFFFFF},
-                                    {20, 20, 0x000000},
-                                    {21, 21, 0x000000},
-                                    {22, 20, 0xFFFFFF},
-                                    {23, 21, 0xFFFFFF},
-                                    {24, 20, 0x000000},
-                                    {25, 21, 0x000000},
-                                    {26, 20, 0xFFFFFF}});
+    const QImage dense = shown.Picture(2);
+    ExpectColor(kBlackPixel, dense, {{20, 20}, {21, 21}, {24, 20}, {25, 21}});
+    ExpectColor(kWhitePixel, dense, {{19, 20}, {22, 20}, {23, 21}, {26, 20}});
     // Between two whole densities only the pixels that two share are mixed: here there is one such at each
     // side of the middle.
-    ExpectPixels(shown.Picture(1.5), {{15, 15, 0x000000}, {18, 15, 0x000000}, {14, 15, 0xFFFFFF}});
+    ExpectColor(kBlackPixel, shown.Picture(1.5), {{15, 15}, {18, 15}});
+    ExpectColor(kWhitePixel, shown.Picture(1.5), {{14, 15}});
 }
 
 TEST(Drawing, OutsideAPaintPassItOnlyAsksForOne) {
-    BApplication application("test");
+    const BApplication application("test");
     const Shown shown([](BView* view) { view->FillRect({0, 0, 9, 9}); });
     ASSERT_TRUE(QTest::qWaitFor([&] { return shown.canvas->draws > 0; }));
     QCoreApplication::processEvents();
@@ -156,17 +141,14 @@ TEST(Drawing, OutsideAPaintPassItOnlyAsksForOne) {
     shown.canvas->FillRect({50, 50, 59, 59});
     EXPECT_EQ(shown.canvas->draws, before);
     ASSERT_TRUE(QTest::qWaitFor([&] { return shown.canvas->draws > before; }));
-    ExpectPixels(shown.Picture(), {{5, 5, 0x000000}, {55, 55, 0xFFFFFF}});
+    ExpectColor(kBlackPixel, shown.Picture(), {{5, 5}});
+    ExpectColor(kWhitePixel, shown.Picture(), {{55, 55}});
 }
 
 TEST(Views, FollowTheirParentsEdges) {
-    BApplication application("test");
-    auto* window = new BWindow(BRect(0, 0, 99, 99), "edges", B_TITLED_WINDOW, 0);
-    struct Case {
-        uint32 mode;
-        BRect after; // of (10, 10, 29, 29) when the window grows by 40 and 20
-    };
-    const Case cases[] = {
+    const BApplication application("test");
+    const std::pair<uint32, BRect> cases[] = {
+        // and where the view is then
         {B_FOLLOW_LEFT | B_FOLLOW_TOP, {10, 10, 29, 29}},
         {B_FOLLOW_RIGHT | B_FOLLOW_BOTTOM, {50, 30, 69, 49}},
         {B_FOLLOW_ALL_SIDES, {10, 10, 69, 49}},
@@ -174,19 +156,18 @@ TEST(Views, FollowTheirParentsEdges) {
         {B_FOLLOW_LEFT | B_FOLLOW_BOTTOM, {10, 30, 29, 49}},
         {B_FOLLOW_H_CENTER | B_FOLLOW_V_CENTER, {30, 20, 49, 39}},
     };
-    std::vector<BView*> views;
-    for (const Case& row : cases) {
-        views.push_back(new BView(BRect(10, 10, 29, 29), "", row.mode, 0));
-        window->AddChild(views.back());
+    for (const auto& [mode, after] : cases) {
+        auto* window = new BWindow(BRect(0, 0, 99, 99), "edges", B_TITLED_WINDOW, 0);
+        auto* view = new BView(BRect(10, 10, 29, 29), "", mode, 0);
+        window->AddChild(view);
+        window->ResizeBy(40, 20);
+        EXPECT_EQ(view->Frame(), after) << std::hex << mode;
+        window->Quit();
     }
-    window->ResizeBy(40, 20);
-    for (std::size_t i = 0; i < views.size(); i++)
-        EXPECT_EQ(views[i]->Frame(), cases[i].after) << "row " << i;
-    window->Quit();
 }
 
 TEST(Views, PressesComeAsMessagesWithTheirDetails) {
-    BApplication application("test");
+    const BApplication application("test");
     class Pressed : public BView {
       public:
         Pressed() : BView(BRect(10, 10, 59, 59), "pressed", B_FOLLOW_NONE, B_WILL_DRAW) {}
@@ -202,11 +183,8 @@ TEST(Views, PressesComeAsMessagesWithTheirDetails) {
     const Shown shown([](BView*) {});
     auto* view = new Pressed;
     shown.canvas->AddChild(view);
-    QWidget* widget = nullptr;
-    for (QWidget* candidate : QApplication::allWidgets())
-        if (candidate->objectName() == QLatin1String("pressed"))
-            widget = candidate;
-    ASSERT_NE(widget, nullptr);
+    auto* widget = shown.Toolkit()->findChild<QWidget*>("pressed");
+    ASSERT_TRUE(widget);
     QTest::mousePress(widget, Qt::LeftButton, Qt::ShiftModifier, QPoint(5, 7));
     ASSERT_TRUE(QTest::qWaitFor([&] { return view->place == BPoint(5, 7); }));
     EXPECT_EQ(view->keys, static_cast<int32>(B_SHIFT_KEY));

@@ -11,11 +11,9 @@
 #include <QScrollBar>
 
 #include "Stage.h"
-#include "platform/Kernel.h"
+#include "Worker.h"
 #include "platform/ListView.h"
 #include "platform/ScrollView.h"
-
-using Codes = std::vector<uint32>;
 
 namespace {
 
@@ -130,18 +128,19 @@ struct Twins {
         if (!In(rows, row))
             rows.insert(rows.begin() + at, row);
     }
-    void Remove(Row* row) {
-        EXPECT_EQ(stage.list->RemoveItem(row), In(rows, row));
+    void Forget(Row* row) {
         std::erase(rows, row);
         std::erase(selected, row);
     }
+    void Remove(Row* row) {
+        EXPECT_EQ(stage.list->RemoveItem(row), In(rows, row));
+        Forget(row);
+    }
     void RemoveSomeOfTheFirstSelected() {
-        for (int32 first = stage.list->CurrentSelection(); first >= 0 && Pick(3) > 0;
-             first = stage.list->CurrentSelection()) {
+        for (int32 first = 0; (first = stage.list->CurrentSelection()) >= 0 && Pick(3) > 0;) {
             Row* gone = rows[static_cast<std::size_t>(first)];
             EXPECT_EQ(stage.list->RemoveItem(first), gone);
-            std::erase(rows, gone);
-            std::erase(selected, gone);
+            Forget(gone);
         }
     }
     void Select(Row* row) {
@@ -260,6 +259,23 @@ TEST(Lists, AreWorkedWithKeysAndPointer) {
     EXPECT_EQ(stage.Selected(), Indexes{99 - 42});
 }
 
+TEST(Lists, OfOneSelectionKeepToOneAndTellIt) {
+    ListStage stage(10, B_SINGLE_SELECTION_LIST);
+    stage.Show();
+    stage.Click(2);
+    stage.Click(4, Qt::ControlModifier);
+    EXPECT_EQ(stage.Selected(), Indexes{4});
+    stage.Key(Qt::Key_Up, Qt::ShiftModifier);
+    EXPECT_EQ(stage.Selected(), Indexes{3});
+    QAccessibleInterface* list = QAccessible::queryAccessibleInterface(stage.Widget());
+    ASSERT_TRUE(list);
+    EXPECT_EQ(list->role(), QAccessible::List);
+    EXPECT_EQ(list->text(QAccessible::Name), "list");
+    ASSERT_EQ(list->childCount(), 10);
+    EXPECT_EQ(list->child(3)->text(QAccessible::Name), "row 3");
+    EXPECT_TRUE(list->child(3)->state().selected && !list->child(2)->state().selected);
+}
+
 TEST(Lists, InvokeOnceForADoubleClickOrEnter) {
     ListStage stage(10);
     stage.Show();
@@ -282,16 +298,6 @@ TEST(Lists, InvokeOnceForADoubleClickOrEnter) {
     stage.Key(Qt::Key_Return); // the row with the keyboard's mark
     EXPECT_EQ(stage.Received(1), Codes{kInvoked});
     EXPECT_EQ(stage.Selected(), Indexes{1});
-}
-
-TEST(Lists, OfOneSelectionKeepToOne) {
-    ListStage stage(10, B_SINGLE_SELECTION_LIST);
-    stage.Show();
-    stage.Click(2);
-    stage.Click(4, Qt::ControlModifier);
-    EXPECT_EQ(stage.Selected(), Indexes{4});
-    stage.Key(Qt::Key_Up, Qt::ShiftModifier);
-    EXPECT_EQ(stage.Selected(), Indexes{3});
 }
 
 TEST(Lists, ScrollByWhateverMeansAndTellOnce) {
@@ -372,53 +378,30 @@ TEST(Lists, LayOutRowsOfDifferentHeightsAndFollowTheFont) {
     BFont big;
     big.SetSize(40);
     stage.list->SetFont(&big);
-    font_height height;
-    big.GetHeight(&height);
     EXPECT_GT(stage.rows[0]->Height(), 40);
     EXPECT_EQ(stage.list->ItemFrame(1).top, stage.rows[0]->Height());
     stage.list->RemoveItem(&tall);
-}
-
-TEST(Lists, AreReadByAssistiveTechnology) {
-    ListStage stage(5);
-    stage.Show();
-    stage.list->Select(3);
-    QAccessibleInterface* list = QAccessible::queryAccessibleInterface(stage.Widget());
-    ASSERT_TRUE(list);
-    EXPECT_EQ(list->role(), QAccessible::List);
-    EXPECT_EQ(list->text(QAccessible::Name), "list");
-    ASSERT_EQ(list->childCount(), 5);
-    EXPECT_EQ(list->child(3)->text(QAccessible::Name), "row 3");
-    EXPECT_TRUE(list->child(3)->state().selected);
-    EXPECT_FALSE(list->child(2)->state().selected);
 }
 
 // What a person does while a worker has the window's lock waits, in its order.
 TEST(Lists, HoldInputBackWhileAWorkerHasTheLock) {
     ListStage stage(10);
     stage.Show();
-    struct Shared {
-        RecordingWindow* window;
-        sem_id locked = create_sem(0, "locked");
-        sem_id unlock = create_sem(0, "unlock");
-    } shared{stage.window};
-    const thread_id worker = spawn_thread(
-        [](void* data) -> int32 {
-            const auto* both = static_cast<Shared*>(data);
-            both->window->Lock();
-            release_sem(both->locked);
-            acquire_sem(both->unlock);
-            both->window->Unlock();
-            return 0;
-        },
-        "worker", B_NORMAL_PRIORITY, &shared);
-    resume_thread(worker);
-    acquire_sem(shared.locked);
+    const sem_id locked = create_sem(0, "locked");
+    const sem_id unlock = create_sem(0, "unlock");
+    const Worker worker([&] {
+        stage.window->Lock();
+        release_sem(locked);
+        acquire_sem(unlock);
+        stage.window->Unlock();
+        return 0;
+    });
+    acquire_sem(locked);
     stage.Click(2);
     stage.Key(Qt::Key_Down);
     stage.Key(Qt::Key_Down, Qt::ShiftModifier);
     EXPECT_EQ(stage.Selected(), Indexes{});
-    release_sem(shared.unlock);
+    release_sem(unlock);
     EXPECT_TRUE(QTest::qWaitFor([&] { return stage.list->CurrentSelection(1) == 4; }));
     EXPECT_EQ(stage.Selected(), (Indexes{3, 4}));
 }

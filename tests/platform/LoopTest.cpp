@@ -1,5 +1,6 @@
 // Loopers, semaphores and threads on a real application object.
 #include <atomic>
+#include <numeric>
 #include <string>
 #include <vector>
 
@@ -8,164 +9,136 @@
 #include <gtest/gtest.h>
 #include <poll.h>
 
+#include "Worker.h"
 #include "platform/Application.h"
-#include "platform/Kernel.h"
 #include "platform/Window.h"
 
 namespace {
 
 constexpr bigtime_t kSecond = 1000000;
 
-// Notes what it receives; runs what a test gives it inside the handler.
+using Log = std::vector<uint32>;
+
+// Notes what it receives; then runs what a test gives it inside the handler.
 class Recorder : public BLooper {
   public:
-    explicit Recorder(std::vector<uint32>& log) : log_(log) {}
+    explicit Recorder(Log& log) : log_(log) {}
 
     void MessageReceived(BMessage* message) override {
         log_.push_back(message->what);
         if (inside)
-            inside(message);
-        BLooper::MessageReceived(message);
+            inside(message->what);
     }
 
-    std::function<void(BMessage*)> inside;
+    std::function<void(uint32)> inside;
 
   private:
-    std::vector<uint32>& log_;
+    Log& log_;
 };
 
-// A worker that does one thing; its result is there after Join.
-class Worker {
-  public:
-    explicit Worker(std::function<int32()> work) : work_(std::move(work)) {
-        id_ = spawn_thread([](void* data) { return static_cast<Worker*>(data)->work_(); }, "worker",
-                           suggest_thread_priority(), this);
-        resume_thread(id_);
+class Loopers : public testing::Test {
+  protected:
+    ~Loopers() override {
+        for (Recorder* recorder : {first_, second_})
+            if (recorder)
+                recorder->Quit();
     }
-    thread_id Id() const { return id_; }
 
-  private:
-    std::function<int32()> work_;
-    thread_id id_;
+    BApplication application_{"test"};
+    Log log_, otherLog_;
+    Recorder* first_ = new Recorder(log_);
+    Recorder* second_ = new Recorder(otherLog_);
 };
 
-} // namespace
-
-TEST(Loopers, HandleMessagesInOrderAlsoWhenPostedFromAWorker) {
-    BApplication application("test");
-    std::vector<uint32> log;
-    auto* looper = new Recorder(log);
-    Worker worker([&] {
-        for (uint32 code = 1; code <= 200; code++)
-            looper->PostMessage(code);
+TEST_F(Loopers, HandleMessagesInOrderAlsoWhenPostedFromAWorker) {
+    Log posted(200);
+    std::iota(posted.begin(), posted.end(), 1);
+    const Worker worker([&] {
+        for (const uint32 code : posted)
+            first_->PostMessage(code);
         return 0;
     });
-    ASSERT_TRUE(QTest::qWaitFor([&] { return log.size() == 200; }));
-    for (uint32 code = 1; code <= 200; code++)
-        EXPECT_EQ(log[code - 1], code);
-    looper->Quit();
+    EXPECT_TRUE(QTest::qWaitFor([&] { return log_ == posted; }));
 }
 
-TEST(Loopers, AWaitingHandlerHoldsBackItsOwnMessagesOnly) {
-    BApplication application("test");
-    std::vector<uint32> waiting;
-    std::vector<uint32> other;
-    auto* first = new Recorder(waiting);
-    auto* second = new Recorder(other);
+TEST_F(Loopers, AWaitingHandlerHoldsBackItsOwnMessagesOnly) {
     const sem_id sem = create_sem(0, "wait");
-    std::size_t seenWhileWaiting = 0;
+    Log seenWhileWaiting;
     status_t waited = B_OK;
-    first->inside = [&](BMessage* message) {
-        if (message->what != 1)
+    first_->inside = [&](uint32 code) {
+        if (code != 1)
             return;
         waited = acquire_sem(sem);
-        seenWhileWaiting = waiting.size();
+        seenWhileWaiting = log_;
     };
-    second->inside = [&](BMessage*) { delete_sem(sem); };
-    first->PostMessage(1);
-    first->PostMessage(2);
-    QTimer::singleShot(20, [&] { second->PostMessage(7); });
-    ASSERT_TRUE(QTest::qWaitFor([&] { return waiting.size() == 2; }));
+    second_->inside = [&](uint32) { delete_sem(sem); };
+    first_->PostMessage(1);
+    first_->PostMessage(2);
+    QTimer::singleShot(20, [&] { second_->PostMessage(7); });
+    ASSERT_TRUE(QTest::qWaitFor([&] { return log_.size() == 2; }));
     EXPECT_EQ(waited, B_BAD_SEM_ID);
-    EXPECT_EQ(seenWhileWaiting, 1U) << "the second message must wait for the first handler's return";
-    EXPECT_EQ(other, std::vector<uint32>{7});
-    first->Quit();
-    second->Quit();
+    EXPECT_EQ(seenWhileWaiting, Log{1}) << "the second message must wait for the first handler's return";
+    EXPECT_EQ(otherLog_, Log{7});
 }
 
-TEST(Loopers, LockIsRecursiveAndTimesOutForOthers) {
-    BApplication application("test");
-    std::vector<uint32> log;
-    auto* looper = new Recorder(log);
-    ASSERT_TRUE(looper->Lock());
-    ASSERT_TRUE(looper->Lock());
+TEST_F(Loopers, LockIsRecursiveAndTimesOutForOthers) {
+    ASSERT_TRUE(first_->Lock() && first_->Lock());
     std::atomic<int> tried{0};
     std::atomic<status_t> whileHeld{B_OK};
     std::atomic<status_t> afterwards{B_ERROR};
-    Worker worker([&] {
-        whileHeld = looper->LockWithTimeout(2000);
+    const Worker worker([&] {
+        whileHeld = first_->LockWithTimeout(2000);
         tried = 1;
-        afterwards = looper->LockWithTimeout(10 * kSecond);
-        looper->Unlock();
+        afterwards = first_->LockWithTimeout(10 * kSecond);
+        first_->Unlock();
         tried = 2;
         return 0;
     });
     ASSERT_TRUE(QTest::qWaitFor([&] { return tried == 1; }));
     EXPECT_EQ(whileHeld, B_TIMED_OUT);
-    looper->Unlock();
-    EXPECT_TRUE(looper->IsLocked());
-    looper->Unlock();
-    EXPECT_FALSE(looper->IsLocked());
+    first_->Unlock();
+    EXPECT_TRUE(first_->IsLocked());
+    first_->Unlock();
+    EXPECT_FALSE(first_->IsLocked());
     ASSERT_TRUE(QTest::qWaitFor([&] { return tried == 2; }));
     EXPECT_EQ(afterwards, B_OK);
-    looper->Quit();
 }
 
-TEST(Loopers, AMessageWaitsWhileAWorkerHoldsTheLockAndTheInterfaceGoesOn) {
-    BApplication application("test");
-    std::vector<uint32> log;
-    std::vector<uint32> free;
-    auto* held = new Recorder(log);
-    auto* other = new Recorder(free);
+TEST_F(Loopers, AMessageWaitsWhileAWorkerHoldsTheLockAndTheInterfaceGoesOn) {
     const sem_id release = create_sem(0, "release");
     std::atomic<bool> locked{false};
-    Worker worker([&] {
-        held->Lock();
+    const Worker worker([&] {
+        first_->Lock();
         locked = true;
         acquire_sem(release);
-        held->Unlock();
+        first_->Unlock();
         return 0;
     });
     ASSERT_TRUE(QTest::qWaitFor([&] { return locked.load(); }));
-    held->PostMessage(1);
-    other->PostMessage(2);
-    ASSERT_TRUE(QTest::qWaitFor([&] { return free.size() == 1; }));
-    EXPECT_TRUE(log.empty());
+    first_->PostMessage(1);
+    second_->PostMessage(2);
+    ASSERT_TRUE(QTest::qWaitFor([&] { return otherLog_.size() == 1; }));
+    EXPECT_TRUE(log_.empty());
     release_sem(release);
-    EXPECT_TRUE(QTest::qWaitFor([&] { return log.size() == 1; }));
+    EXPECT_TRUE(QTest::qWaitFor([&] { return log_.size() == 1; }));
     delete_sem(release);
-    held->Quit();
-    other->Quit();
 }
 
-TEST(Loopers, MessagesToWhatIsGoneAreDropped) {
-    BApplication application("test");
-    std::vector<uint32> log;
-    auto* looper = new Recorder(log);
+TEST_F(Loopers, MessagesToWhatIsGoneAreDropped) {
     auto* handler = new BHandler("handler");
-    const BMessenger toLooper(looper);
-    looper->PostMessage(1, handler);
+    const BMessenger toLooper(first_);
+    first_->PostMessage(1, handler);
     delete handler;
-    looper->PostMessage(2);
-    looper->inside = [&](BMessage*) { looper->Quit(); };
+    first_->PostMessage(2);
+    first_->inside = [&](uint32) { std::exchange(first_, nullptr)->Quit(); };
     ASSERT_TRUE(QTest::qWaitFor([&] { return !toLooper.IsValid(); }));
-    EXPECT_EQ(log, std::vector<uint32>{2});
+    EXPECT_EQ(log_, Log{2});
     EXPECT_EQ(toLooper.SendMessage(BMessage(3)), B_BAD_VALUE);
     EXPECT_EQ(toLooper.LockTargetWithTimeout(1000), B_BAD_VALUE);
 }
 
 TEST(Semaphores, CountTimeOutAndVanish) {
-    BApplication application("test");
+    const BApplication application("test");
     const sem_id sem = create_sem(1, "count");
     EXPECT_EQ(acquire_sem_etc(sem, 1, B_RELATIVE_TIMEOUT, 0), B_OK);
     EXPECT_EQ(acquire_sem_etc(sem, 1, B_RELATIVE_TIMEOUT, 0), B_WOULD_BLOCK);
@@ -179,40 +152,33 @@ TEST(Semaphores, CountTimeOutAndVanish) {
 }
 
 TEST(Threads, KillEndsEveryKindOfWaitAndThreadsReturnTheirResults) {
-    BApplication application("test");
+    const BApplication application("test");
     const sem_id sem = create_sem(0, "never");
-    std::atomic<int> begun{0};
-    std::atomic<status_t> slept{B_OK};
-    std::atomic<status_t> acquired{B_OK};
-    std::atomic<int> polled{0};
-    const auto begin = [&] { begun++; };
-    Worker sleeper([&] {
-        begin();
-        slept = snooze(3600 * kSecond);
-        return 0;
-    });
-    Worker acquirer([&] {
-        begin();
-        acquired = acquire_sem(sem);
-        return 0;
-    });
-    Worker poller([&] {
-        begin();
-        pollfd stop{thread_stop_fd(), POLLIN, 0};
-        polled = poll(&stop, 1, -1);
-        return 0;
-    });
-    ASSERT_TRUE(QTest::qWaitFor([&] { return begun == 3; }));
-    for (const Worker* worker : {&sleeper, &acquirer, &poller})
-        EXPECT_EQ(kill_thread(worker->Id()), B_OK);
-    EXPECT_EQ(slept, B_INTERRUPTED);
-    EXPECT_EQ(acquired, B_INTERRUPTED);
-    EXPECT_EQ(polled, 1);
-    EXPECT_EQ(kill_thread(sleeper.Id()), B_BAD_THREAD_ID);
+    const std::function<int32()> waits[] = {
+        [] { return snooze(3600 * kSecond); },
+        [sem] { return acquire_sem(sem); },
+        [] {
+            pollfd stop{thread_stop_fd(), POLLIN, 0};
+            return poll(&stop, 1, -1) == 1 ? B_INTERRUPTED : B_ERROR;
+        },
+    };
+    for (const auto& wait : waits) {
+        std::atomic<status_t> result{B_OK};
+        std::atomic<bool> begun{false};
+        const Worker worker([&] {
+            begun = true;
+            result = wait();
+            return 0;
+        });
+        ASSERT_TRUE(QTest::qWaitFor([&] { return begun.load(); }));
+        EXPECT_EQ(kill_thread(worker.Id()), B_OK);
+        EXPECT_EQ(result, B_INTERRUPTED) << &wait - waits;
+        EXPECT_EQ(kill_thread(worker.Id()), B_BAD_THREAD_ID);
+    }
     EXPECT_FALSE(thread_stop_requested());
 
     std::atomic<bool> go{false};
-    Worker answer([&] {
+    const Worker answer([&] {
         while (!go)
             snooze(1000);
         return 42;
@@ -224,48 +190,53 @@ TEST(Threads, KillEndsEveryKindOfWaitAndThreadsReturnTheirResults) {
     delete_sem(sem);
 }
 
+// As a modal dialog does, it takes its semaphore with it.
+class Modal : public BWindow {
+  public:
+    explicit Modal(sem_id sem)
+        : BWindow(BRect(0, 0, 50, 50), "modal", B_FLOATING_WINDOW_LOOK, B_MODAL_APP_WINDOW_FEEL, 0),
+          sem_(sem) {}
+    ~Modal() override { delete_sem(sem_); }
+
+  private:
+    sem_id sem_;
+};
+
+// Its handler waits for a modal one.
+class Waiting : public BWindow {
+  public:
+    explicit Waiting(bool& returned)
+        : BWindow(BRect(0, 0, 50, 50), "waiting", B_TITLED_WINDOW, 0), returned_(returned) {}
+    void MessageReceived(BMessage* message) override {
+        if (message->what != 1) {
+            BWindow::MessageReceived(message);
+            return;
+        }
+        const sem_id sem = create_sem(0, "modal");
+        (new Modal(sem))->Show();
+        EXPECT_EQ(be_app->CountWindows(), 2);
+        do
+            UpdateIfNeeded();
+        while (acquire_sem_etc(sem, 1, B_RELATIVE_TIMEOUT, 50000) != B_BAD_SEM_ID);
+        returned_ = true;
+    }
+
+  private:
+    bool& returned_;
+};
+
 TEST(Application, QuitsFromInsideADialogsWaitAndKeepsTheDecimalPoint) {
     setenv("LC_ALL", "de_DE.UTF-8", 1);
     BApplication application("test");
     EXPECT_EQ(localeconv()->decimal_point, std::string("."));
-    class Waiting : public BWindow {
-      public:
-        Waiting(sem_id sem, bool& returned)
-            : BWindow(BRect(0, 0, 50, 50), "waiting", B_TITLED_WINDOW, 0), sem_(sem), returned_(returned) {}
-        void MessageReceived(BMessage* message) override {
-            if (message->what != 1) {
-                BWindow::MessageReceived(message);
-                return;
-            }
-            while (acquire_sem_etc(sem_, 1, B_RELATIVE_TIMEOUT, 50000) != B_BAD_SEM_ID)
-                UpdateIfNeeded();
-            returned_ = true;
-        }
-
-      private:
-        sem_id sem_;
-        bool& returned_;
-    };
-    // As a modal dialog does, the window takes the semaphore with it.
-    class Modal : public BWindow {
-      public:
-        explicit Modal(sem_id sem)
-            : BWindow(BRect(0, 0, 50, 50), "modal", B_FLOATING_WINDOW_LOOK, B_MODAL_APP_WINDOW_FEEL, 0),
-              sem_(sem) {}
-        ~Modal() override { delete_sem(sem_); }
-
-      private:
-        sem_id sem_;
-    };
-    const sem_id sem = create_sem(0, "modal");
     bool returned = false;
-    auto* window = new Waiting(sem, returned);
+    auto* window = new Waiting(returned);
     window->Show();
-    (new Modal(sem))->Show();
-    EXPECT_EQ(application.CountWindows(), 2);
     window->PostMessage(1);
     QTimer::singleShot(50, [&] { application.PostMessage(B_QUIT_REQUESTED); });
     application.Run();
     EXPECT_TRUE(returned);
     EXPECT_EQ(application.CountWindows(), 0);
 }
+
+} // namespace

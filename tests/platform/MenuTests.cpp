@@ -7,19 +7,17 @@
 
 #include "Driver.h"
 #include "Stage.h"
+#include "Worker.h"
 #include "platform/Alert.h"
-#include "platform/Kernel.h"
 #include "platform/MenuBar.h"
 #include "platform/MenuField.h"
 #include "platform/TextControl.h"
 
-using Codes = std::vector<uint32>;
-
 namespace {
 
 QMenu* OpenMenu() {
-    EXPECT_TRUE(QTest::qWaitFor([] { return QApplication::activePopupWidget() != nullptr; }));
-    return qobject_cast<QMenu*>(QApplication::activePopupWidget());
+    EXPECT_TRUE(QTest::qWaitFor([] { return Driver::OpenMenu() != nullptr; }));
+    return Driver::OpenMenu();
 }
 
 // Two items, the second one marked.
@@ -40,8 +38,11 @@ class Looper : public BLooper {
 
 } // namespace
 
-TEST(MenuBars, AskTheirWindowAndSendToTheItemsTarget) {
-    Stage stage;
+using MenuBars = StageTest;
+using MenuFields = StageTest;
+using Alerts = StageTest;
+
+TEST_F(MenuBars, AskTheirWindowAndSendToTheItemsTarget) {
     auto* looper = new Looper;
     auto* file = new BMenu("File");
     file->AddItem(new BMenuItem("Save & <b>go</b>", new BMessage(1)));
@@ -52,7 +53,7 @@ TEST(MenuBars, AskTheirWindowAndSendToTheItemsTarget) {
     auto* more = new BMenu("More");
     more->AddItem(new BMenuItem("Deep", new BMessage(3)));
     file->AddItem(more);
-    auto* bar = stage.Add(new BMenuBar(BRect(0, 0, 0, 0), "menu bar"));
+    auto* bar = Add(new BMenuBar(BRect(0, 0, 0, 0), "menu bar"));
     const float emptyHeight = bar->Frame().Height();
     bar->AddItem(file);
     EXPECT_GT(bar->Frame().Height(), emptyHeight);
@@ -60,22 +61,22 @@ TEST(MenuBars, AskTheirWindowAndSendToTheItemsTarget) {
     EXPECT_EQ(bar->FindItem(3), more->ItemAt(0));
     EXPECT_EQ(bar->FindItem("File")->Submenu(), file);
     EXPECT_FALSE(file->AddItem(quit)); // is in a menu
-    stage.Show();
+    Show();
 
-    auto* widget = stage.Find<QMenuBar>("menu bar");
-    QTest::keyClick(stage.Toolkit(), Qt::Key_F, Qt::AltModifier);
+    auto* widget = Find<QMenuBar>("menu bar");
+    QTest::keyClick(Toolkit(), Qt::Key_F, Qt::AltModifier);
     QMenu* open = OpenMenu();
     ASSERT_TRUE(open);
-    EXPECT_EQ(stage.window->menusBegun, 1);
+    EXPECT_EQ(window->menusBegun, 1);
     EXPECT_EQ(widget->actions().first()->text(), "&File");
     auto* first = open->findChild<QAction*>("Save & <b>go</b>");
     ASSERT_TRUE(first);
     EXPECT_EQ(first->text(), "&Save && <b>go</b>");
     QTest::mouseClick(open, Qt::LeftButton, {}, open->actionGeometry(first).center());
-    EXPECT_EQ(stage.Received(1), Codes{1});
+    EXPECT_EQ(Received(1), Codes{1});
 
-    stage.Activate(); // the test platform takes the menu for the active window
-    QTest::keyClick(stage.Toolkit(), Qt::Key_Q, Qt::ControlModifier);
+    Activate(); // the test platform takes the menu for the active window
+    QTest::keyClick(Toolkit(), Qt::Key_Q, Qt::ControlModifier);
     EXPECT_TRUE(QTest::qWaitFor([&] { return looper->last == 2; }));
     file->SetTargetForItems(looper);
     open->actions().last()->menu()->actions().first()->trigger();
@@ -89,15 +90,14 @@ TEST(MenuBars, AskTheirWindowAndSendToTheItemsTarget) {
     looper->Quit();
 }
 
-TEST(MenuFields, ShowTheMarkedItem) {
-    Stage stage;
+TEST_F(MenuFields, ShowTheMarkedItem) {
     auto* menu = Portfolios();
-    auto* field = stage.Add(new BMenuField(BRect(0, 20, 300, 22), "portfolio", "Portfolio:", menu));
+    auto* field = Add(new BMenuField(BRect(0, 20, 300, 22), "portfolio", "Portfolio:", menu));
     field->SetDivider(80);
     int changes = 0;
     field->SetTextChangedHook([&] { changes++; });
-    stage.Show();
-    auto* button = stage.Find<QPushButton>("portfolio");
+    Show();
+    auto* button = Find<QPushButton>("portfolio");
     EXPECT_EQ(button->text(), "Second && last");
     EXPECT_EQ(field->MenuItem(), menu->ItemAt(1));
     EXPECT_LT(field->VisibleRight(), 300);
@@ -125,14 +125,13 @@ TEST(MenuFields, ShowTheMarkedItem) {
     EXPECT_EQ(changes, 3);
 }
 
-TEST(MenuFields, AreOpenedAndChosenFromByKeyAndPointer) {
-    Stage stage;
+TEST_F(MenuFields, AreOpenedAndChosenFromByKeyAndPointer) {
     auto* menu = Portfolios();
-    auto* field = stage.Add(new BMenuField(BRect(0, 20, 300, 22), "portfolio", "Portfolio:", menu));
+    auto* field = Add(new BMenuField(BRect(0, 20, 300, 22), "portfolio", "Portfolio:", menu));
     field->MakeFocus();
-    stage.Show();
+    Show();
     EXPECT_TRUE(field->IsFocus());
-    auto* button = stage.Find<QPushButton>("portfolio");
+    auto* button = Find<QPushButton>("portfolio");
     for (const Qt::Key key : {Qt::Key_Down, Qt::Key_Up, Qt::Key_Space, Qt::Key_Return}) {
         menu->ItemAt(1)->SetMarked(true);
         QTest::keyClick(QApplication::focusWidget(), key);
@@ -144,85 +143,68 @@ TEST(MenuFields, AreOpenedAndChosenFromByKeyAndPointer) {
         EXPECT_TRUE(menu->ItemAt(0)->IsMarked());
         EXPECT_FALSE(menu->ItemAt(1)->IsMarked());
         EXPECT_EQ(button->text(), "First");
-        EXPECT_EQ(stage.Received(1), Codes{1});
+        EXPECT_EQ(Received(1), Codes{1});
     }
     QTest::mousePress(button, Qt::LeftButton);
     QMenu* open = OpenMenu();
     ASSERT_TRUE(open);
     QTest::mouseClick(open, Qt::LeftButton, {}, open->actionGeometry(open->actions()[0]).center());
-    EXPECT_EQ(stage.Received(1), Codes{1}); // choosing the marked one again
+    EXPECT_EQ(Received(1), Codes{1}); // choosing the marked one again
     EXPECT_TRUE(menu->ItemAt(0)->IsMarked());
     field->SetEnabled(false);
     QTest::mousePress(button, Qt::LeftButton);
     EXPECT_EQ(QApplication::activePopupWidget(), nullptr);
 }
 
-TEST(MenuFields, WithoutRoomForATextShowAnArrowAndAreCalledAfterTheirNeighbour) {
-    Stage stage;
-    stage.Add(new BTextControl(BRect(10, 50, 279, 60), "type", "Type", "", nullptr));
-    stage.Add(new BMenuField(BRect(280, 48, 300, 60), "choices", "", Portfolios()));
-    stage.Show();
-    const auto* button = stage.Find<QPushButton>("choices");
+TEST_F(MenuFields, WithoutRoomForATextShowAnArrowAndAreCalledAfterTheirNeighbour) {
+    Add(new BTextControl(BRect(10, 50, 279, 60), "type", "Type", "", nullptr));
+    Add(new BMenuField(BRect(280, 48, 300, 60), "choices", "", Portfolios()));
+    Show();
+    const auto* button = Find<QPushButton>("choices");
     EXPECT_EQ(button->geometry().left(), 0);
     EXPECT_LE(button->width(), 21);
     EXPECT_EQ(button->text(), "");
     EXPECT_EQ(button->accessibleName(), "Type choices");
 }
 
-namespace {
-
-struct Asked {
-    const char* press; // a button's name; empty for Escape
-    int32 answer;
-};
-
-} // namespace
-
-TEST(Alerts, AnswerWithTheButtonPressed) {
-    const BApplication application("test");
-    for (const Asked& asked : {Asked{"Yes", 0}, Asked{"Perhaps", 1}, Asked{"No", 2}, Asked{"", 2}}) {
+TEST_F(Alerts, AnswerWithTheButtonPressed) {
+    for (const auto& [button, answer] : {std::pair{"Yes", 0}, {"Perhaps", 1}, {"No", 2}, {"Escape", 2}}) {
         auto* alert =
             new BAlert("", "Go <b>on</b> & on?", "Yes", "Perhaps", "No", B_WIDTH_AS_USUAL, B_STOP_ALERT);
         Driver driver;
-        driver.When(
-            "alert", [] { return Driver::Alert() != nullptr; },
-            [&] {
-                const QMessageBox* box = Driver::Alert();
-                EXPECT_EQ(box->objectName(), "alert");
-                EXPECT_EQ(box->icon(), QMessageBox::Critical);
-                EXPECT_EQ(box->textFormat(), Qt::PlainText);
-                const auto place = [&](const char* name) { return box->findChild<QPushButton*>(name)->x(); };
-                EXPECT_LT(place("Yes"), place("Perhaps"));
-                EXPECT_LT(place("Perhaps"), place("No"));
-                EXPECT_TRUE(box->findChild<QPushButton*>("No")->isDefault());
-                if (*asked.press)
-                    Driver::Press(Driver::Alert(), asked.press);
-                else
-                    QTest::keyClick(Driver::Alert(), Qt::Key_Escape);
-            });
-        EXPECT_EQ(alert->Go(), asked.answer);
+        driver.When("alert", Driver::Alert, [&, button = button] {
+            QMessageBox* box = Driver::Alert();
+            EXPECT_EQ(box->objectName(), "alert");
+            EXPECT_EQ(box->icon(), QMessageBox::Critical);
+            EXPECT_EQ(box->textFormat(), Qt::PlainText);
+            const auto place = [&](const char* name) { return box->findChild<QPushButton*>(name)->x(); };
+            EXPECT_LT(place("Yes"), place("Perhaps"));
+            EXPECT_LT(place("Perhaps"), place("No"));
+            EXPECT_TRUE(box->findChild<QPushButton*>("No")->isDefault());
+            if (std::string("Escape") == button)
+                QTest::keyClick(box, Qt::Key_Escape);
+            else
+                Driver::Press(box, button);
+        });
+        EXPECT_EQ(alert->Go(), answer) << button;
     }
 }
 
-TEST(Alerts, BlockTheirCallerAloneAndEndWithItsStop) {
-    Stage stage;
-    stage.Show();
-    const auto ask = [](void*) { return (new BAlert("", "From a worker", "Yes", "No"))->Go(); };
+TEST_F(Alerts, BlockTheirCallerAloneAndEndWithItsStop) {
+    Show();
+    const auto ask = [] { return (new BAlert("", "From a worker", "Yes", "No"))->Go(); };
     const auto shown = [] { return Driver::Alert() != nullptr; };
-    const thread_id answered = spawn_thread(ask, "worker", B_NORMAL_PRIORITY, nullptr);
-    const thread_id stopped = spawn_thread(ask, "worker", B_NORMAL_PRIORITY, nullptr);
     Driver driver;
-    driver.When("alert", shown, [&] { stage.window->PostMessage(5); });
+    driver.When("alert", shown, [&] { window->PostMessage(5); });
     driver.When(
-        "message", [&] { return !stage.window->received.empty(); },
-        [] { Driver::Press(Driver::Alert(), "Yes"); });
-    resume_thread(answered);
+        "message", [&] { return !window->received.empty(); }, [] { Driver::Press(Driver::Alert(), "Yes"); });
+    const Worker answered(ask);
     int32 answer = -1;
-    EXPECT_EQ(wait_for_thread(answered, &answer), B_OK);
+    EXPECT_EQ(wait_for_thread(answered.Id(), &answer), B_OK);
     EXPECT_EQ(answer, 0);
-    EXPECT_EQ(stage.Received(1), Codes{5});
+    EXPECT_EQ(Received(1), Codes{5});
+    const Worker stopped(ask);
     bool ended = false;
-    driver.When("alert", shown, [&] { ended = kill_thread(stopped) == B_OK; });
-    resume_thread(stopped);
+    driver.When("alert", shown, [&] { ended = kill_thread(stopped.Id()) == B_OK; });
     EXPECT_TRUE(QTest::qWaitFor([&] { return ended && !shown(); }));
 }

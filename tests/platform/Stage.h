@@ -1,6 +1,6 @@
 #pragma once
 
-#include <string>
+#include <functional>
 #include <utility>
 #include <vector>
 
@@ -13,6 +13,8 @@
 #include "platform/View.h"
 #include "platform/Window.h"
 
+using Codes = std::vector<uint32>;
+
 // A window that keeps the codes of what its controls send.
 class RecordingWindow : public BWindow {
   public:
@@ -20,11 +22,14 @@ class RecordingWindow : public BWindow {
 
     void MessageReceived(BMessage* message) override {
         received.push_back(message->what);
+        if (inside)
+            inside(message->what);
         BWindow::MessageReceived(message);
     }
     void MenusBeginning() override { menusBegun++; }
 
-    std::vector<uint32> received;
+    Codes received;
+    std::function<void(uint32)> inside; // what a test wants done in the handler
     int menusBegun = 0;
 };
 
@@ -59,7 +64,7 @@ struct Stage {
         return Toolkit()->findChild<Widget*>(QString::fromUtf8(name));
     }
     // What has been received since the last call, as soon as there are as many messages.
-    std::vector<uint32> Received(std::size_t count) {
+    Codes Received(std::size_t count) {
         EXPECT_TRUE(QTest::qWaitFor([&] { return window->received.size() >= count; }));
         QTest::qWait(0);
         return std::exchange(window->received, {});
@@ -68,3 +73,6 @@ struct Stage {
     BApplication application{"test"};
     RecordingWindow* window;
 };
+
+// A test whose controls stand on a stage.
+class StageTest : public testing::Test, protected Stage {};
