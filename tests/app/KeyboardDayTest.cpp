@@ -2,23 +2,7 @@
 // Escape.
 #include "Program.h"
 
-#include <QLineEdit>
-#include <QMenu>
-
 namespace {
-
-void Key(Qt::Key key, Qt::KeyboardModifiers with = {}) {
-    QWidget* at =
-        QApplication::activePopupWidget() ? QApplication::activePopupWidget() : QApplication::focusWidget();
-    ASSERT_TRUE(at);
-    QTest::keyClick(at, key, with);
-}
-
-void Type(const char* text) {
-    for (const QChar letter : QString::fromUtf8(text))
-        QTest::sendKeyEvent(QTest::Click, QApplication::focusWidget(), Qt::Key_unknown, QString(letter),
-                            Qt::NoModifier);
-}
 
 // Whether keys reach the window. There is no window manager here to pass them on when another window goes.
 bool HasKeys(QWidget* window) {
@@ -33,53 +17,53 @@ bool MainHasKeys() {
     return !QApplication::activeModalWidget() && HasKeys(Program::Main()) && QApplication::focusWidget();
 }
 
-class KeyboardDay : public Program {
-  public:
-    KeyboardDay& Press(Qt::Key key, Qt::KeyboardModifiers with = {}) {
+class KeyboardDay : public testing::Test, protected Program {
+  protected:
+    using Program::Run;
+
+    void Press(Qt::Key key, Qt::KeyboardModifiers with = {}) {
         When("the main window's keys", MainHasKeys, [key, with] { Key(key, with); });
-        return *this;
+    }
+    // In the menu that is opened next.
+    void PressInMenu(std::vector<Qt::Key> keys) {
+        When(
+            "a menu", [] { return OpenMenu() && OpenMenu()->activeAction(); },
+            [keys = std::move(keys)] {
+                for (const Qt::Key key : keys)
+                    Key(key);
+            });
     }
     // Opens a menu by its letter and takes the item with the letter.
-    KeyboardDay& Choose(Qt::Key menu, Qt::Key item) {
+    void Choose(Qt::Key menu, Qt::Key item) {
         Press(menu, Qt::AltModifier);
-        When(
-            "a menu", [] { return QApplication::activePopupWidget() != nullptr; }, [item] { Key(item); });
-        return *this;
+        PressInMenu({item});
     }
-    // As soon as the keyboard is in a dialog with this title.
-    KeyboardDay& In(const char* title, Action action) {
+    // As soon as the keyboard is in a dialog or an alert with this title or text.
+    void In(const char* title, Action action) {
         When(
             std::string("dialog: ") + title,
             [title] {
                 QWidget* dialog = QApplication::activeModalWidget();
-                return dialog && dialog->windowTitle() == title && HasKeys(dialog);
+                return dialog && (Alert() ? Alert()->text() : dialog->windowTitle()) == title &&
+                       HasKeys(dialog);
             },
             std::move(action));
-        return *this;
     }
-    KeyboardDay& AddPortfolioByKeys(const char* name) {
-        Choose(Qt::Key_P, Qt::Key_A).In("Add a Portfolio", [name] {
-            Type(name);
-            Key(Qt::Key_Return);
-        });
-        return Showing(name);
+    void AddPortfolioByKeys(const char* name) {
+        Choose(Qt::Key_P, Qt::Key_A);
+        In("Add a Portfolio", [name] { Type(name, Qt::Key_Return); });
+        Showing(name);
     }
-    KeyboardDay& AddByKeys(const char* name, const char* shares) {
-        Choose(Qt::Key_I, Qt::Key_A).In("Add an Investment", [name, shares] {
+    void AddByKeys(const char* name, const char* shares) {
+        Choose(Qt::Key_I, Qt::Key_A);
+        In("Add an Investment", [name, shares] {
             Type(name);
             Key(Qt::Key_S, Qt::AltModifier); // to Shares
-            Type(shares);
-            Key(Qt::Key_Tab);
-            Type("2");
-            Key(Qt::Key_Tab); // Risk: opened by Down, High is below the marked Med
+            Type(shares, Qt::Key_Tab);
+            Type("2", Qt::Key_Tab); // to Risk: opened by Down, High is below the marked Med
             Key(Qt::Key_Down);
         });
-        When(
-            "the risks", [] { return QApplication::activePopupWidget() != nullptr; },
-            [] {
-                Key(Qt::Key_Down);
-                Key(Qt::Key_Return);
-            });
+        PressInMenu({Qt::Key_Down, Qt::Key_Return});
         In("Add an Investment", [] { Key(Qt::Key_E, Qt::AltModifier); }); // Retirement
         When(
             "the check mark",
@@ -89,98 +73,79 @@ class KeyboardDay : public Program {
                     ->isChecked();
             },
             [] { Key(Qt::Key_Return); });
-        return *this;
     }
-    KeyboardDay& Expect(const Texts& names) {
-        Program::Expect(names);
-        return *this;
+    void Showing(const char* portfolio) {
+        Await(std::string("portfolio ") + portfolio, [portfolio] {
+            const BMenuItem* marked = Selector()->FindMarked();
+            return marked && marked->Label() == std::string(portfolio) && !QApplication::activeModalWidget();
+        });
     }
-    KeyboardDay& Showing(const char* portfolio) {
-        When(
-            std::string("portfolio ") + portfolio,
-            [portfolio] {
-                const BMenuItem* marked = Selector()->FindMarked();
-                return marked && marked->Label() == std::string(portfolio) &&
-                       !QApplication::activeModalWidget();
-            },
-            [] {});
-        return *this;
-    }
-    // In the selector's menu, which a key has opened, goes up or down from the marked portfolio.
-    KeyboardDay& Switch(Qt::Key way, const char* portfolio) {
-        When(
-            "the selector's menu",
-            [] {
-                const auto* menu = qobject_cast<QMenu*>(QApplication::activePopupWidget());
-                return menu && menu->activeAction();
-            },
-            [way] {
-                Key(way);
-                Key(Qt::Key_Return);
-            });
-        return Showing(portfolio);
-    }
-    KeyboardDay& ToTheList() {
+    void ToTheList() {
         When("to the list", MainHasKeys, [] {
             for (int steps = 0; steps < 10 && QApplication::focusWidget() != RowsWidget(); ++steps)
                 Key(Qt::Key_Tab);
             EXPECT_EQ(QApplication::focusWidget(), RowsWidget());
         });
-        return *this;
     }
 };
 
-TEST(KeyboardDay, NeedsNoMouse) {
-    KeyboardDay day;
-    day.AddPortfolioByKeys("Later").AddPortfolioByKeys("Now");
-    day.AddByKeys("Birch", "10").Expect({"Birch"});
-    day.AddByKeys("Acme", "20").Expect({"Birch", "Acme"});
-    day.AddByKeys("Cedar", "5").Expect({"Birch", "Acme", "Cedar"});
-    day.Then("risk and retirement", [] {
-        EXPECT_STREQ(Program::Row(0)->Text(9), "High");
-        EXPECT_STREQ(Program::Row(0)->Text(8), "yes");
-        EXPECT_EQ(Program::Total(), "Total Value: $70.00");
+TEST_F(KeyboardDay, NeedsNoMouse) {
+    AddPortfolioByKeys("Later");
+    AddPortfolioByKeys("Now");
+    Texts all;
+    for (const auto& [name, shares] : {std::pair{"Birch", "10"}, {"Acme", "20"}, {"Cedar", "5"}}) {
+        AddByKeys(name, shares);
+        all.emplace_back(name);
+        Expect(all);
+    }
+    Expect(all, "$70.00").Then("risk and retirement", [] {
+        EXPECT_STREQ(Row(0)->Text(9), "High");
+        EXPECT_STREQ(Row(0)->Text(8), "yes");
     });
     // The list's header comes after the list, and its first column is the name.
-    day.ToTheList().Press(Qt::Key_Tab).Press(Qt::Key_Space).Expect({"Acme", "Birch", "Cedar"});
+    ToTheList();
+    Press(Qt::Key_Tab);
+    Press(Qt::Key_Space);
+    Expect({"Acme", "Birch", "Cedar"});
     // Enter edits the row that a typed letter has found; Escape leaves it as it was.
-    day.ToTheList().Press(Qt::Key_Home).Press(Qt::Key_C).Press(Qt::Key_Return);
-    day.In("Edit this Investment", [] {
-        Type("not kept");
-        Key(Qt::Key_Escape);
-    });
-    day.Expect({"Acme", "Birch", "Cedar"}).Press(Qt::Key_Return);
-    day.In("Edit this Investment", [] {
-        Type("Cypress");
-        Key(Qt::Key_Return);
-    });
-    day.Expect({"Acme", "Birch", "Cypress"}).Then("the row that was edited", [] {
-        EXPECT_EQ(Program::RowsWidget()->currentIndex().row(), 2);
+    ToTheList();
+    for (const Qt::Key key : {Qt::Key_Home, Qt::Key_C, Qt::Key_Return})
+        Press(key);
+    In("Edit this Investment", [] { Type("not kept", Qt::Key_Escape); });
+    Expect({"Acme", "Birch", "Cedar"});
+    Press(Qt::Key_Return);
+    In("Edit this Investment", [] { Type("Cypress", Qt::Key_Return); });
+    Expect({"Acme", "Birch", "Cypress"}).Then("the row that was edited", [] {
+        EXPECT_EQ(RowsWidget()->currentIndex().row(), 2);
     });
     // Two rows go to the other portfolio.
-    day.ToTheList().Press(Qt::Key_Home).Press(Qt::Key_Down, Qt::ShiftModifier).Choose(Qt::Key_I, Qt::Key_C);
-    day.Expect({"Cypress"})
-        .Press(Qt::Key_O, Qt::AltModifier)
-        .Switch(Qt::Key_Up, "Later")
-        .Expect({})
-        .Choose(Qt::Key_I, Qt::Key_P);
-    day.Expect({"Acme", "Birch"}).Press(Qt::Key_Down).Switch(Qt::Key_Down, "Now").Expect({"Cypress"});
+    ToTheList();
+    Press(Qt::Key_Home);
+    Press(Qt::Key_Down, Qt::ShiftModifier);
+    Choose(Qt::Key_I, Qt::Key_C);
+    Expect({"Cypress"});
+    Press(Qt::Key_O, Qt::AltModifier); // the selector
+    PressInMenu({Qt::Key_Up, Qt::Key_Return});
+    Showing("Later");
+    Expect({});
+    Choose(Qt::Key_I, Qt::Key_P);
+    Expect({"Acme", "Birch"});
+    Press(Qt::Key_Down);
+    PressInMenu({Qt::Key_Down, Qt::Key_Return});
+    Showing("Now");
+    Expect({"Cypress"});
     // Buttons by their letters: the charts, and back by Escape.
-    day.Press(Qt::Key_C, Qt::AltModifier).In("Quorvan", [] {
-        QTest::keyClick(QApplication::activeModalWidget(), Qt::Key_Escape);
-    });
-    day.Choose(Qt::Key_P, Qt::Key_D);
+    Press(Qt::Key_C, Qt::AltModifier);
+    In("Quorvan", [] { QTest::keyClick(QApplication::activeModalWidget(), Qt::Key_Escape); });
+    Choose(Qt::Key_P, Qt::Key_D);
     for (const char* question : {"Are you sure you want to delete this portfolio?", "Are you really sure?"})
-        day.When(
-            question,
-            [question] {
-                return Driver::Alert() && Driver::Alert()->text() == question && HasKeys(Driver::Alert());
-            },
-            [] { QTest::keyClick(Driver::Alert(), Qt::Key_Y, Qt::AltModifier); });
-    day.Showing("Later").Expect({"Acme", "Birch"}).Press(Qt::Key_Q, Qt::ControlModifier);
-    day.Run();
-    EXPECT_EQ(day.Portfolios(), Texts{"Later"});
-    EXPECT_EQ(day.Investments(), (Texts{"Later/Acme", "Later/Birch"}));
+        In(question, [] { QTest::keyClick(Alert(), Qt::Key_Y, Qt::AltModifier); });
+    Showing("Later");
+    Expect({"Acme", "Birch"});
+    Press(Qt::Key_Q, Qt::ControlModifier);
+    Run();
+    EXPECT_EQ(Portfolios(), Texts{"Later"});
+    EXPECT_EQ(Investments(), (Texts{"Later/Acme", "Later/Birch"}));
 }
 
 } // namespace

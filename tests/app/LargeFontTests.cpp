@@ -5,7 +5,6 @@
 
 #include <QAbstractButton>
 #include <QLabel>
-#include <QLineEdit>
 
 #include "ColumnListView/CLVColumn.h"
 #include "tools/FirstFiles.h"
@@ -74,11 +73,10 @@ TEST(LargeFont, NothingIsCutOff) {
         ExpectColumnsWide();
         Program::List()->Select(9); // the longest type and many shares
     });
-    openAndLook(1021, "Edit this Investment");
+    openAndLook(MessageInvestmentEdit, "Edit this Investment");
     openAndLook(1000, "Settings");
-    openAndLook(1011, "Edit Portfolio");
-    program.Close();
-    program.Run();
+    openAndLook(MessagePortfolioEdit, "Edit Portfolio");
+    program.RunAndClose();
 
     // Saved for this size, the widths are the same at the next start.
     const INI_FILEx settings(program.File("Quorvan.ini").c_str());
@@ -86,8 +84,8 @@ TEST(LargeFont, NothingIsCutOff) {
     EXPECT_EQ(settings.ReadInt("DISPLAY", "TextSize", 0), 19);
     EXPECT_EQ(saved, std::lround(185 * 19 / 12.0F));
     EXPECT_EQ(settings.ReadInt("DISPLAY", "ColumnWidth0", 0), 20);
-    program.Then("again", [saved] { EXPECT_EQ(Program::List()->ColumnAt(1)->Width(), saved); }).Close();
-    program.Run();
+    program.Then("again", [saved] { EXPECT_EQ(Program::List()->ColumnAt(1)->Width(), saved); });
+    program.RunAndClose();
 }
 
 } // namespace

@@ -8,29 +8,17 @@ namespace {
 
 TEST(LostPortfolios, AreListedAgainByTheNamesOfTheirInvestments) {
     const DataFolder folder;
-    folder.AddPortfolio("Kept");
-    folder.AddPortfolio("\xC3\x84"
-                        "ra");
-    const char* portfolios[] = {"KEPT",
-                                "Lost",
-                                "kept",
-                                "lost",
-                                "\xC3\x84"
-                                "RA",
-                                "",
-                                "a\tb",
-                                "Gone",
-                                "Lost"};
-    for (const char* portfolio : portfolios)
+    const std::string umlaut = "\xC3\x84";
+    for (const std::string& name : {std::string("Kept"), umlaut + "ra"})
+        folder.AddPortfolio(name);
+    for (const std::string& portfolio :
+         Texts{"KEPT", "Lost", "kept", "lost", umlaut + "RA", "", "a\tb", "Gone", "Lost"})
         folder.AddInvestment(MakeInvestment(portfolio, "n"));
     DATABASE portfolioFile(folder.File("portfol.db").c_str());
     DATABASE investmentFile(folder.File("invest.db").c_str());
     investmentFile.Delete(7);
     EXPECT_EQ(RestorePortfolios(portfolioFile, investmentFile), (Texts{"Lost"}));
-    EXPECT_EQ(folder.Portfolios(), (Texts{"Kept",
-                                          "\xC3\x84"
-                                          "ra",
-                                          "Lost"}));
+    EXPECT_EQ(folder.Portfolios(), (Texts{"Kept", umlaut + "ra", "Lost"}));
     EXPECT_EQ(RestorePortfolios(portfolioFile, investmentFile), Texts{});
     EXPECT_EQ(SelectInvestments(investmentFile, "Lost"), 3);
 }
@@ -43,8 +31,8 @@ TEST(LostPortfolios, AreNamedAtTheStart) {
     program.Answer("There are investments of portfolios that were not in the list. These portfolios are in "
                    "the list again: \"Old\".",
                    "Ok");
-    program.Expect({"not reached"}).Select("New").Expect({"renamed"}).Close();
-    EXPECT_EQ(program.Run(), 0);
+    program.Expect({"not reached"}).Select("New").Expect({"renamed"});
+    EXPECT_EQ(program.RunAndClose(), 0);
     EXPECT_EQ(program.Portfolios(), (Texts{"New", "Old"}));
 }
 

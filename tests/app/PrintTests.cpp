@@ -2,13 +2,10 @@
 #include "Program.h"
 
 #include <QDialog>
-#include <QLineEdit>
 
 #include "Pdf.h"
 
 namespace {
-
-constexpr uint32 PrintCommand = 1014;
 
 // A step that answers one of the two dialogs.
 void Answer(Program& program, const char* dialog, bool accept, const std::string& file = "") {
@@ -42,9 +39,9 @@ TEST(Print, AsksOnceAndNothingAfterACancel) {
     program.AddInvestment(MakeInvestment("Full one", "Timber", 12345.5F, 100));
     const TemporaryFolder prints;
     const std::string file = prints.File("report.pdf");
-    program.Expect({"Timber"}).Send(PrintCommand);
+    program.Expect({"Timber"}).Send(MessagePortfolioPrint);
     Answer(program, "page setup dialog", false);
-    program.Send(PrintCommand);
+    program.Send(MessagePortfolioPrint);
     Answer(program, "page setup dialog", true);
     Answer(program, "print dialog", false, file);
     program.Then("nothing printed", [=] { EXPECT_FALSE(std::filesystem::exists(file)); });
@@ -52,30 +49,29 @@ TEST(Print, AsksOnceAndNothingAfterACancel) {
     Answer(program, "page setup dialog", true);
     Answer(program, "print dialog", true, file);
     ExpectPrinted(program, file, "Timber");
-    program.Select("Empty one").Expect({}).Send(PrintCommand);
+    program.Select("Empty one").Expect({}).Send(MessagePortfolioPrint);
     ExpectPrinted(program, file, "Empty one");
     // A file that is there is not replaced unasked; another one may be named.
     const std::string other = prints.File("other.pdf");
-    program.Then("in the way", [&] { prints.Write("report.pdf", "kept"); }).Send(PrintCommand);
+    program.Then("in the way", [&] { prints.Write("report.pdf", "kept"); }).Send(MessagePortfolioPrint);
     const std::string replaceFirst = "The file " + file + " exists. Replace it by this report?";
     program.Answer(replaceFirst.c_str(), "No");
     Answer(program, "print dialog", true, other);
     ExpectPrinted(program, other, "Empty one");
     program.Then("kept", [&] { EXPECT_EQ(prints.Read("report.pdf"), "kept"); });
-    program.Then("in the way again", [&] { prints.Write("other.pdf", "replaced"); }).Send(PrintCommand);
+    program.Then("in the way again", [&] { prints.Write("other.pdf", "replaced"); })
+        .Send(MessagePortfolioPrint);
     const std::string replaceOther = "The file " + other + " exists. Replace it by this report?";
     program.Answer(replaceOther.c_str(), "Yes");
-    program.When(
-        "the new report", [=, &prints] { return prints.Read("other.pdf").starts_with("%PDF"); }, [] {});
+    program.Await("the new report", [=, &prints] { return prints.Read("other.pdf").starts_with("%PDF"); });
     ExpectPrinted(program, other, "Empty one");
     // A place that is gone is told of, and asked for anew.
     program.Then("gone", [&] { std::filesystem::remove_all(prints.Path()); })
-        .Send(PrintCommand)
+        .Send(MessagePortfolioPrint)
         .Answer("The report could not be printed! Is the printer there, or the file protected?", "Ok");
-    program.Send(PrintCommand);
+    program.Send(MessagePortfolioPrint);
     Answer(program, "page setup dialog", false);
-    program.Close();
-    program.Run();
+    program.RunAndClose();
 }
 
 } // namespace

@@ -5,14 +5,13 @@
 #include <vector>
 
 #include <QAbstractItemView>
-#include <QMenuBar>
-#include <QScrollBar>
 
 #include "ColumnListView/BetterScrollView.h"
 #include "ColumnListView/ColumnListView.h"
 #include "DataFolder.h"
 #include "Driver.h"
 #include "app/AppState.h"
+#include "app/MessageCodes.h"
 #include "app/NorvelApp.h"
 #include "app/NorvelItem.h"
 #include "app/NorvelWindow.h"
@@ -22,6 +21,12 @@
 #include "util/InterfaceHelpers.h"
 
 using Texts = std::vector<std::string>;
+
+inline dbDATE Today() {
+    dbDATE date{};
+    DATABASE(nullptr).SetToCurrentDate(&date);
+    return date;
+}
 
 // The program in a folder of the test's own: fill the folder, give the driver its steps, and Run.
 class Program : public DataFolder, public Driver {
@@ -33,6 +38,11 @@ class Program : public DataFolder, public Driver {
         NorvelApp application;
         application.Run();
         return application.ExitStatus();
+    }
+    // The same, with a last step that closes the main window.
+    int RunAndClose() {
+        Close();
+        return Run();
     }
     // A step as soon as the main window is shown and nothing keeps the person out of it.
     Program& Then(std::string what, Action action) {
@@ -59,13 +69,26 @@ class Program : public DataFolder, public Driver {
         });
         return *this;
     }
-    // A step that waits until the list shows these investments, by name and in this order.
-    Program& Expect(const Texts& names) {
+    // A step that selects these rows of the list and no others.
+    Program& Mark(std::vector<int32> rows) {
+        Then("mark rows", [rows = std::move(rows)] {
+            Locked([&] {
+                List()->DeselectAll();
+                for (const int32 row : rows)
+                    List()->Select(row, true);
+            });
+        });
+        return *this;
+    }
+    // A step that waits until the list shows these investments, by name and in this order; then, if one is
+    // given, the total must be this.
+    Program& Expect(const Texts& names, const std::string& total = "") {
         std::string what = "rows:";
         for (const std::string& name : names)
             what += " " + name;
         When(
-            what, [names] { return Main() && Names() == names; }, [] {});
+            what, [names] { return Main() && Names() == names; },
+            [=] { EXPECT_TRUE(total.empty() || Total() == "Total Value: " + total) << what << Total(); });
         return *this;
     }
 
@@ -91,10 +114,12 @@ class Program : public DataFolder, public Driver {
         return names;
     }
     static QAbstractItemView* RowsWidget() { return Main()->findChild<QAbstractItemView*>(); }
-    static void ClickRow(int32 index, Qt::KeyboardModifiers keys = {}) {
+    static QPoint PlaceOfRow(int32 index) {
         const BRect frame = List()->ItemFrame(index);
-        QTest::mouseClick(RowsWidget()->viewport(), Qt::LeftButton, keys,
-                          QPoint(30, static_cast<int>((frame.top + frame.bottom) / 2)));
+        return {30, static_cast<int>((frame.top + frame.bottom) / 2)};
+    }
+    static void ClickRow(int32 index, Qt::KeyboardModifiers keys = {}) {
+        QTest::mouseClick(RowsWidget()->viewport(), Qt::LeftButton, keys, PlaceOfRow(index));
     }
     // Changes to the list want its window's lock.
     static void Locked(const Action& change) {

@@ -8,21 +8,45 @@
 
 namespace {
 
-TEST(Program, StartsFromItsFolderAndEndsByItsMenuKey) {
-    const DataFolder folder;
-    std::filesystem::copy(QUORVAN_PROGRAM, folder.File("quorvan"));
-    folder.AddPortfolio("A");
-    folder.AddInvestment(MakeInvestment("A", "first"));
-    folder.AddInvestment(MakeInvestment("A", "second"));
-    DATABASE(folder.File("invest.db").c_str()).Delete(0);
+class BuiltProgram : public testing::Test, protected DataFolder {
+  protected:
+    void SetUp() override {
+        std::filesystem::copy(QUORVAN_PROGRAM, File("quorvan"));
+        ASSERT_TRUE(display_.IsReady()) << "Xvfb did not start";
+    }
+    [[nodiscard]] std::unique_ptr<Process> Start() const {
+        return std::make_unique<Process>(std::vector{File("quorvan")});
+    }
+    static std::string WindowOf(const Process& program) {
+        return Output("xdotool search --onlyvisible --pid " + std::to_string(program.Id()) + " 2>/dev/null");
+    }
+    // Presses a key until the program ends. There is no window manager to give its window the focus.
+    static bool EndsBy(const char* key, Process& program) {
+        return WaitUntil([&] {
+            Output("xdotool windowfocus " + WindowOf(program) + " 2>&1");
+            Output(std::string("xdotool key ") + key + " 2>&1");
+            return program.HasEnded();
+        });
+    }
+    [[nodiscard]] bool IsHeldBy(const Process& program) const {
+        return Read("Quorvan.lock").find("process: " + std::to_string(program.Id()) + "\n") !=
+               std::string::npos;
+    }
 
-    const Display display;
-    ASSERT_TRUE(display.IsReady()) << "Xvfb did not start";
-    Process program({folder.File("quorvan")});
+  private:
+    Display display_;
+};
+
+TEST_F(BuiltProgram, StartsFromItsFolderAndEndsByItsMenuKey) {
+    AddPortfolio("A");
+    AddInvestment(MakeInvestment("A", "first"));
+    AddInvestment(MakeInvestment("A", "second"));
+    DATABASE(File("invest.db").c_str()).Delete(0);
+    const auto program = Start();
     std::string window;
     ASSERT_TRUE(WaitUntil([&] {
         window = Output("xdotool search --onlyvisible --name '^Quorvan$' 2>/dev/null");
-        return !window.empty() || program.HasEnded();
+        return !window.empty() || program->HasEnded();
     }));
     ASSERT_FALSE(window.empty());
     EXPECT_NE(Output("xdotool getwindowgeometry " + window + " | grep Geometry").find("501x201"),
@@ -30,53 +54,32 @@ TEST(Program, StartsFromItsFolderAndEndsByItsMenuKey) {
     // What a task bar finds the desktop entry and the icon by.
     EXPECT_EQ(Output("xprop -id " + window + " WM_CLASS"), "WM_CLASS(STRING) = \"quorvan\", \"Quorvan\"");
     EXPECT_EQ(Output("xprop -id " + window + " -notype 32c ' = $0\\n' _NET_WM_ICON"), "_NET_WM_ICON = 16");
-    // There is no window manager to give it the focus.
-    EXPECT_TRUE(WaitUntil([&] {
-        Output("xdotool windowfocus " + window + " 2>&1");
-        Output("xdotool key ctrl+q 2>&1");
-        return program.HasEnded();
-    }));
-    EXPECT_TRUE(program.EndedWell());
+    EXPECT_TRUE(EndsBy("ctrl+q", *program));
+    EXPECT_TRUE(program->EndedWell());
 
-    EXPECT_EQ(folder.RecordSlots("invest.db"), 1);
-    EXPECT_EQ(folder.Investments(), std::vector<std::string>{"A/second"});
-    EXPECT_NE(folder.Read("Quorvan.ini").find("ColumnWidth10=50\n"), std::string::npos);
+    EXPECT_EQ(RecordSlots("invest.db"), 1);
+    EXPECT_EQ(Investments(), std::vector<std::string>{"A/second"});
+    EXPECT_NE(Read("Quorvan.ini").find("ColumnWidth10=50\n"), std::string::npos);
 }
 
-std::string WindowOf(const Process& program) {
-    return Output("xdotool search --onlyvisible --pid " + std::to_string(program.Id()) + " 2>/dev/null");
-}
-
-TEST(Program, IsRefusedAFolderUntilItsHolderHasGoneHoweverItWent) {
-    const DataFolder folder;
-    std::filesystem::copy(QUORVAN_PROGRAM, folder.File("quorvan"));
-    const Display display;
-    ASSERT_TRUE(display.IsReady()) << "Xvfb did not start";
-    auto first = std::make_unique<Process>(std::vector{folder.File("quorvan")});
+TEST_F(BuiltProgram, IsRefusedAFolderUntilItsHolderHasGoneHoweverItWent) {
+    const auto first = Start();
     ASSERT_TRUE(WaitUntil([&] { return !WindowOf(*first).empty() || first->HasEnded(); }));
-    const std::string text = folder.Read("Quorvan.lock");
-    EXPECT_NE(text.find("process: " + std::to_string(first->Id()) + "\n"), std::string::npos);
+    const std::string text = Read("Quorvan.lock");
+    EXPECT_TRUE(IsHeldBy(*first)) << text;
 
-    Process second({folder.File("quorvan")});
-    EXPECT_TRUE(WaitUntil([&] {
-        Output("xdotool windowfocus " + WindowOf(second) + " 2>&1"); // the alert
-        Output("xdotool key Return 2>&1");
-        return second.HasEnded();
-    }));
-    EXPECT_FALSE(second.EndedWell());
+    const auto second = Start();
+    EXPECT_TRUE(EndsBy("Return", *second)); // the alert
+    EXPECT_FALSE(second->EndedWell());
     EXPECT_FALSE(first->HasEnded());
-    EXPECT_EQ(folder.Read("Quorvan.lock"), text);
+    EXPECT_EQ(Read("Quorvan.lock"), text);
 
     kill(first->Id(), SIGKILL);
     EXPECT_TRUE(WaitUntil([&] { return first->HasEnded(); }));
-    EXPECT_EQ(folder.Read("Quorvan.lock"), text);
-    Process third({folder.File("quorvan")});
-    EXPECT_TRUE(WaitUntil([&] {
-        return folder.Read("Quorvan.lock").find("process: " + std::to_string(third.Id()) + "\n") !=
-                   std::string::npos &&
-               !WindowOf(third).empty();
-    }));
-    EXPECT_FALSE(third.HasEnded());
+    EXPECT_EQ(Read("Quorvan.lock"), text);
+    const auto third = Start();
+    EXPECT_TRUE(WaitUntil([&] { return IsHeldBy(*third) && !WindowOf(*third).empty(); }));
+    EXPECT_FALSE(third->HasEnded());
 }
 
 TEST(Program, AnswersWithoutADisplay) {

@@ -5,10 +5,8 @@
 #include <cmath>
 #include <limits>
 
-#include <sys/wait.h>
-#include <unistd.h>
-
 #include "DataFolder.h"
+#include "InChild.h"
 #include "app/InvestmentTexts.h"
 #include "app/PortfolioRules.h"
 #include "db/FaultyFiles.h"
@@ -17,9 +15,11 @@ namespace {
 
 using Texts = std::vector<std::string>;
 
-std::string Price(float price, const char* type) {
+// What a formatter makes of its values.
+template <class Formatter, class... Values>
+std::string TextOf(Formatter format, Values... values) {
     FigureText text;
-    FormatPrice(price, type, text);
+    format(values..., text);
     return text;
 }
 
@@ -28,7 +28,7 @@ TEST(InvestmentTexts, APriceIsInFractionsForStocks) {
     constexpr float infinite = std::numeric_limits<float>::infinity();
     const struct {
         float price;
-        const char* type;
+        std::string type;
         const char* text;
     } cases[] = {
         {12.375F, "Stock", "12 3/8"},
@@ -44,14 +44,8 @@ TEST(InvestmentTexts, APriceIsInFractionsForStocks) {
         {12.375F, "", "12.38"},
         {0.125F, "Bond", "0.12"},
         {12.5F, "sto ck", "12.50"},
-        {12.5F,
-         "\xC3\x9C"
-         "berstock",
-         "12 1/2"}, // as stored behind a letter that has no ASCII case
-        {12.5F,
-         "\xC3\x9C"
-         "berSTOCK",
-         "12.50"},
+        {12.5F, std::string("\xC3\x9C") + "berstock", "12 1/2"}, // behind a letter that has no ASCII case
+        {12.5F, std::string("\xC3\x9C") + "berSTOCK", "12.50"},
         {huge, "stock", "340282346638528"},
         {huge, "Fund", "340282346638528"},
         {infinite, "stock", "inf"},
@@ -59,25 +53,21 @@ TEST(InvestmentTexts, APriceIsInFractionsForStocks) {
         {std::nanf(""), "stock", "nan"},
     };
     for (const auto& each : cases)
-        EXPECT_EQ(Price(each.price, each.type), each.text) << each.type;
+        EXPECT_EQ(TextOf(FormatPrice, each.price, each.type.c_str()), each.text) << each.type;
 }
 
 TEST(InvestmentTexts, FiguresAreCutToTheirSize) {
-    FigureText text;
-    const auto shares = [&](float value) { return FormatShares(value, text), std::string(text); };
-    const auto value = [&](float number) { return FormatValue(number, text), std::string(text); };
-    const auto day = [&](dbDATE date) { return FormatDay(date, text), std::string(text); };
-    EXPECT_EQ(shares(1.0005F), "1.000"); // just below in binary
-    EXPECT_EQ(shares(-2.5F), "-2.500");
-    EXPECT_EQ(shares(1e20F), "100000002004087");
-    EXPECT_EQ(value(1234.5F), "1234.50");
-    EXPECT_EQ(value(12345.5F), "12,345.50");
-    EXPECT_EQ(value(123456784.F), "123,456,784.00");
-    EXPECT_EQ(value(1234567936.F), "1,234,567,936.0");
-    EXPECT_EQ(day({3, 3, 2001}), "03-03-2001");
-    EXPECT_EQ(day({25, 12, 1999}), "12-25-1999");
-    EXPECT_EQ(day({0, 0, 0}), "00-00-0000");
-    EXPECT_EQ(day({-128, -128, -32768}), "-128--128--3276");
+    EXPECT_EQ(TextOf(FormatShares, 1.0005F), "1.000"); // just below in binary
+    EXPECT_EQ(TextOf(FormatShares, -2.5F), "-2.500");
+    EXPECT_EQ(TextOf(FormatShares, 1e20F), "100000002004087");
+    EXPECT_EQ(TextOf(FormatValue, 1234.5F), "1234.50");
+    EXPECT_EQ(TextOf(FormatValue, 12345.5F), "12,345.50");
+    EXPECT_EQ(TextOf(FormatValue, 123456784.F), "123,456,784.00");
+    EXPECT_EQ(TextOf(FormatValue, 1234567936.F), "1,234,567,936.0");
+    EXPECT_EQ(TextOf(FormatDay, dbDATE{3, 3, 2001}), "03-03-2001");
+    EXPECT_EQ(TextOf(FormatDay, dbDATE{25, 12, 1999}), "12-25-1999");
+    EXPECT_EQ(TextOf(FormatDay, dbDATE{0, 0, 0}), "00-00-0000");
+    EXPECT_EQ(TextOf(FormatDay, dbDATE{-128, -128, -32768}), "-128--128--3276");
 }
 
 TEST(InvestmentTexts, TheMoveDependsOnTheRecordAlone) {
@@ -131,6 +121,21 @@ TEST(PortfolioRules, OnlyFilesOfTheProgramsLayoutAreTaken) {
     }
 }
 
+// A folder with these portfolios and an investment "n" of each of these.
+struct FilledFolder : DataFolder {
+    FilledFolder(const Texts& names, const Texts& holders) {
+        for (const std::string& name : names)
+            AddPortfolio(name);
+        for (const std::string& holder : holders)
+            AddInvestment(MakeInvestment(holder, "n"));
+    }
+};
+struct OpenFolder : FilledFolder {
+    using FilledFolder::FilledFolder;
+    DATABASE portfolios{File("portfol.db").c_str()};
+    DATABASE investments{File("invest.db").c_str()};
+};
+
 TEST(PortfolioRules, AWalkVisitsThePortfoliosInvestmentsInRecordOrder) {
     const DataFolder folder;
     folder.AddInvestment(MakeInvestment("My Fund", "a", 1, 0.1F));
@@ -155,118 +160,89 @@ TEST(PortfolioRules, AWalkVisitsThePortfoliosInvestmentsInRecordOrder) {
     INVESTMENT_DATA record;
     EXPECT_TRUE(ReadInvestment(file, 3, &record));
     EXPECT_STREQ(record.Name, "d");
-    EXPECT_FALSE(ReadInvestment(file, 1, &record));
-    EXPECT_FALSE(ReadInvestment(file, 5, &record));
+    EXPECT_FALSE(ReadInvestment(file, 1, &record) || ReadInvestment(file, 5, &record));
 }
 
 TEST(PortfolioRules, DeletingTakesAllOfThatNameAndNothingElse) {
-    const DataFolder folder;
-    for (const char* name : {"A", "b c", "a", "A\tx"})
-        folder.AddPortfolio(name);
-    for (const char* portfolio : {"A", "b c", "a", "A", "AA"})
-        folder.AddInvestment(MakeInvestment(portfolio, "n"));
-    DATABASE portfolios(folder.File("portfol.db").c_str());
-    DATABASE investments(folder.File("invest.db").c_str());
-
+    OpenFolder folder({"A", "b c", "a", "A\tx"}, {"A", "b c", "a", "A", "AA"});
     // A name that no query can hold must not be taken for the part of it that one can.
     for (const char* name : {"A\tx", "A\n", "", "none"})
-        EXPECT_TRUE(DeletePortfolio(portfolios, investments, name));
-    EXPECT_EQ(portfolios.GetNumberOfActiveRecords(), 4);
-    EXPECT_EQ(investments.GetNumberOfActiveRecords(), 5);
+        EXPECT_TRUE(DeletePortfolio(folder.portfolios, folder.investments, name));
+    EXPECT_EQ(folder.portfolios.GetNumberOfActiveRecords(), 4);
+    EXPECT_EQ(folder.investments.GetNumberOfActiveRecords(), 5);
 
-    EXPECT_TRUE(DeletePortfolio(portfolios, investments, "A"));
+    EXPECT_TRUE(DeletePortfolio(folder.portfolios, folder.investments, "A"));
     EXPECT_EQ(folder.Portfolios(), (Texts{"b c", "A\tx"}));
     EXPECT_EQ(folder.Investments(), (Texts{"b c/n", "AA/n"}));
 }
 
 TEST(PortfolioRules, ARenameTakesEveryInvestmentAlong) {
-    const DataFolder folder;
-    for (const char* name : {"Old", "Other"})
-        folder.AddPortfolio(name);
-    for (const char* portfolio : {"old", "Other", "Old", "Old one"})
-        folder.AddInvestment(MakeInvestment(portfolio, "n"));
-    DATABASE portfolios(folder.File("portfol.db").c_str());
-    DATABASE investments(folder.File("invest.db").c_str());
-    EXPECT_TRUE(RenamePortfolio(portfolios, investments, "Old", "  New name"));
-    EXPECT_EQ(folder.Portfolios(), (Texts{"  New name", "Other"}));
-    EXPECT_EQ(folder.Investments(), (Texts{"  New name/n", "Other/n", "  New name/n", "Old one/n"}));
-    EXPECT_TRUE(RenamePortfolio(portfolios, investments, "Other", "Alone"));
-    EXPECT_FALSE(RenamePortfolio(portfolios, investments, "Old", "x"));
-    EXPECT_FALSE(RenamePortfolio(portfolios, investments, "A\tx", "x"));
-    // A name that the investments could not take must not be given to the portfolio alone.
-    for (const char* name : {"", "a\tb", "a name of more than 31 characters"})
-        EXPECT_FALSE(RenamePortfolio(portfolios, investments, "Alone", name)) << name;
+    OpenFolder folder({"Old", "Other"}, {"old", "Other", "Old", "Old one"});
+    const struct {
+        const char* from;
+        const char* to;
+        bool done;
+    } cases[] = {
+        {"Old", "  New name", true},
+        {"Other", "Alone", true},
+        {"Old", "x", false},
+        {"A\tx", "x", false},
+        // What the investments could not take must not be given to the portfolio alone.
+        {"Alone", "", false},
+        {"Alone", "a\tb", false},
+        {"Alone", "a name of more than 31 characters", false},
+    };
+    for (const auto& each : cases)
+        EXPECT_EQ(RenamePortfolio(folder.portfolios, folder.investments, each.from, each.to), each.done)
+            << each.from << " to " << each.to;
     EXPECT_EQ(folder.Portfolios(), (Texts{"  New name", "Alone"}));
-}
-
-// Runs the command in a child that is killed before its at-th change of a file; false when it came to its
-// end.
-template <class Command>
-bool KilledAt(const DataFolder& folder, int at, Command command) {
-    const pid_t child = fork();
-    if (child == 0) {
-        FaultyFiles files;
-        DATABASE portfolios(folder.File("portfol.db").c_str(), files);
-        DATABASE investments(folder.File("invest.db").c_str(), files);
-        files.Arm(Fault::KilledBefore, at);
-        _exit(command(portfolios, investments) ? 0 : 1);
-    }
-    int status = 0;
-    waitpid(child, &status, 0);
-    return WIFSIGNALED(status);
+    EXPECT_EQ(folder.Investments(), (Texts{"  New name/n", "Alone/n", "  New name/n", "Old one/n"}));
 }
 
 TEST(PortfolioRules, KilledAnywhereARenameLosesNoInvestmentAndADeleteNoOther) {
-    const auto fill = [](const DataFolder& folder) {
-        for (const char* name : {"Other", "Old"})
-            folder.AddPortfolio(name);
-        // Far enough apart that they are written one by one.
-        for (int i = 0; i < 120; ++i)
-            folder.AddInvestment(MakeInvestment(i % 40 == 0 ? "Old" : "Other", "n"));
-    };
-    bool killed = true;
-    for (int at = 0; killed; ++at) {
-        const DataFolder folder;
-        fill(folder);
-        killed = KilledAt(folder, at, [](DATABASE& portfolios, DATABASE& investments) {
-            return RenamePortfolio(portfolios, investments, "Old", "New");
-        });
-        const Texts all = folder.Investments();
-        const auto count = [&](const char* text) { return std::count(all.begin(), all.end(), text); };
-        EXPECT_EQ(count("Other/n"), 117) << at;
-        EXPECT_EQ(count("Old/n") + count("New/n"), 3) << at;
-        EXPECT_TRUE(killed || (at > 3 && count("New/n") == 3));
-        EXPECT_EQ(folder.Portfolios().front(), "Other");
-        EXPECT_EQ(folder.Portfolios().back(), at == 0 ? "Old" : "New");
-    }
-    killed = true;
-    for (int at = 0; killed; ++at) {
-        const DataFolder folder;
-        fill(folder);
-        killed = KilledAt(folder, at, [](DATABASE& portfolios, DATABASE& investments) {
-            return DeletePortfolio(portfolios, investments, "old");
-        });
-        const Texts all = folder.Investments();
-        EXPECT_EQ(std::count(all.begin(), all.end(), "Other/n"), 117) << at;
-        EXPECT_TRUE(killed || (at > 3 && all.size() == 117));
+    // Far enough apart that they are written one by one.
+    Texts holders(120, "Other");
+    holders[0] = holders[40] = holders[80] = "Old";
+    for (const bool renames : {true, false}) {
+        bool killed = true;
+        for (int at = 0; killed; ++at) {
+            SCOPED_TRACE((renames ? "rename, killed at " : "delete, killed at ") + std::to_string(at));
+            const FilledFolder folder({"Other", "Old"}, holders);
+            const int result = ResultInChild([&] {
+                FaultyFiles files;
+                DATABASE portfolios(folder.File("portfol.db").c_str(), files);
+                DATABASE investments(folder.File("invest.db").c_str(), files);
+                files.Arm(Fault::KilledBefore, at);
+                return renames ? RenamePortfolio(portfolios, investments, "Old", "New")
+                               : DeletePortfolio(portfolios, investments, "old");
+            });
+            killed = result == -1;
+            const Texts all = folder.Investments();
+            const auto count = [&](const char* text) { return std::count(all.begin(), all.end(), text); };
+            EXPECT_EQ(count("Other/n"), 117);
+            EXPECT_EQ(folder.Portfolios().front(), "Other");
+            if (renames) {
+                EXPECT_EQ(count("Old/n") + count("New/n"), 3);
+                EXPECT_EQ(folder.Portfolios().back(), at == 0 ? "Old" : "New");
+            }
+            EXPECT_TRUE(killed || (at > 3 && count("Old/n") == 0));
+        }
     }
 }
 
 TEST(PortfolioRules, CopiesDifferInTheirPortfolioAlone) {
-    const DataFolder folder;
+    OpenFolder folder({}, {});
     INVESTMENT_DATA copied = MakeInvestment("A much longer name than below", "Fund");
     copied.PrevPrice = 3;
     copied.QuoteError = 1;
-    const INVESTMENT_DATA both[] = {copied, MakeInvestment("Other", "Second")};
-    DATABASE file(folder.File("invest.db").c_str());
-    EXPECT_TRUE(AppendCopies(file, both, "New one"));
+    EXPECT_TRUE(
+        AppendCopies(folder.investments, std::array{copied, MakeInvestment("Other", "n")}, "New one"));
 
     INVESTMENT_DATA record;
-    ASSERT_TRUE(ReadInvestment(file, 0, &record));
-    INVESTMENT_DATA expected = copied;
-    CopyTextZeroed(expected.Portfolio, "New one");
-    EXPECT_EQ(std::memcmp(&record, &expected, offsetof(INVESTMENT_DATA, Unused)), 0);
-    EXPECT_EQ(folder.Investments(), (Texts{"New one/Fund", "New one/Second"}));
+    ASSERT_TRUE(ReadInvestment(folder.investments, 0, &record));
+    CopyTextZeroed(copied.Portfolio, "New one");
+    EXPECT_EQ(std::memcmp(&record, &copied, offsetof(INVESTMENT_DATA, Unused)), 0);
+    EXPECT_EQ(folder.Investments(), (Texts{"New one/Fund", "New one/n"}));
 }
 
 } // namespace

@@ -34,11 +34,10 @@ class BackupTest : public testing::Test {
     BackupTest() {
         SetDay(22);
         folder_.AddPortfolio("A");
-        folder_.AddInvestment(MakeInvestment("A", "first"));
         // Longer than what is copied at a time.
         DATABASE invest(folder_.File("invest.db").c_str());
-        const INVESTMENT_DATA record = MakeInvestment("A", "another");
-        for (int i = 0; i < 1500; ++i)
+        const INVESTMENT_DATA record = MakeInvestment("A", "first");
+        for (int i = 0; i < 1501; ++i)
             invest.Append(&record);
     }
     [[nodiscard]] std::unique_ptr<DailyBackup> MakeBackup(FileOperations& files = SystemFiles()) const {
@@ -63,6 +62,7 @@ TEST_F(BackupTest, TheFirstChangeOfADayKeepsWhatTheFilesHeld) {
     BackedUpFiles files(*backup);
     DATABASE invest(folder_.File("invest.db").c_str(), files);
     backup->Prepare();
+    Names kept;
     for (const int day : {22, 23, 25}) {
         SetDay(day);
         const std::string date = ".2026-11-" + std::to_string(day);
@@ -70,17 +70,15 @@ TEST_F(BackupTest, TheFirstChangeOfADayKeepsWhatTheFilesHeld) {
         for (long record = day; record < day + 3; ++record)
             ASSERT_EQ(invest.Delete(record), 0);
         EXPECT_NE(folder_.Read("invest.db"), before);
+        for (long record = day; record < day + 3; ++record)
+            ASSERT_EQ(invest.UnDelete(record), 0);
+        EXPECT_EQ(MakeBackup()->Keep(), 0); // as after a new start on that day
         EXPECT_TRUE(folder_.Read("backups/invest.db" + date) == before) << date;
         EXPECT_TRUE(folder_.Read("backups/portfol.db" + date) == folder_.Read("portfol.db")) << date;
-        ASSERT_EQ(invest.UnDelete(day), 0);
-        ASSERT_EQ(invest.UnDelete(day + 1), 0);
-        ASSERT_EQ(invest.UnDelete(day + 2), 0);
-        // As after a new start on that day.
-        EXPECT_EQ(MakeBackup()->Keep(), 0);
-        EXPECT_TRUE(folder_.Read("backups/invest.db" + date) == before) << date;
+        kept.insert(kept.begin() + std::ssize(kept) / 2, "invest.db" + date);
+        kept.push_back("portfol.db" + date);
     }
-    EXPECT_EQ(Kept(), (Names{"invest.db.2026-11-22", "invest.db.2026-11-23", "invest.db.2026-11-25",
-                             "portfol.db.2026-11-22", "portfol.db.2026-11-23", "portfol.db.2026-11-25"}));
+    EXPECT_EQ(Kept(), kept);
     EXPECT_EQ(std::filesystem::status(folder_.File("backups/invest.db.2026-11-23")).permissions(),
               std::filesystem::perms{0640});
 }
@@ -91,7 +89,7 @@ TEST_F(BackupTest, WithoutAChangeThereIsNone) {
         BackedUpFiles files(*backup);
         DATABASE invest(folder_.File("invest.db").c_str(), files);
         backup->Prepare();
-        EXPECT_EQ(invest.Query("Name = first", QueryMode::New), 1);
+        EXPECT_EQ(invest.Query("Name = first", QueryMode::New), 1501);
         EXPECT_EQ(invest.Compress(0), 0);
     }
     EXPECT_EQ(Kept(), Names{});
@@ -107,25 +105,25 @@ TEST_F(BackupTest, AFileWithoutOthersIsKeptAlone) {
 
 TEST_F(BackupTest, TheOldestGoAndNothingElse) {
     std::filesystem::create_directory(folder_.File("backups"));
-    const Names others = {"invest.db.2019-13-01",
-                          "invest.db.2019-02-30",
-                          "invest.db.2019-01-01.txt",
-                          "invest.db.2019-1-01",
-                          "other.db.2019-01-01",
-                          "ainvest.db.2019-01-01",
-                          "invest.db",
-                          "notes"};
-    Names expected = others;
-    for (const std::string& name : others)
-        folder_.Write("backups/" + name, "mine");
+    Names expected = {"ainvest.db.2019-01-01",
+                      "invest.db",
+                      "invest.db.2019-01-01.txt",
+                      "invest.db.2019-02-30",
+                      "invest.db.2019-1-01",
+                      "invest.db.2019-13-01",
+                      "notes",
+                      "other.db.2019-01-01"};
+    for (const std::string& other : expected)
+        folder_.Write("backups/" + other, "mine");
+    int count = 0;
     for (const char* day : {"2019-12-31", "2024-02-29", "2026-11-01", "2026-11-02", "2026-11-03",
-                            "2026-11-04", "2026-11-05", "2026-11-06", "2999-01-01"})
+                            "2026-11-04", "2026-11-05", "2026-11-06", "2999-01-01"}) {
         folder_.Write(std::string("backups/invest.db.") + day, "old");
+        if (++count > 3) // with today's there are seven
+            expected.push_back(std::string("invest.db.") + day);
+    }
     EXPECT_EQ(MakeBackup()->Keep(), 0);
-    for (const char* day :
-         {"2026-11-02", "2026-11-03", "2026-11-04", "2026-11-05", "2026-11-06", "2026-11-22", "2999-01-01"})
-        expected.push_back(std::string("invest.db.") + day);
-    expected.emplace_back("portfol.db.2026-11-22");
+    expected.insert(expected.end(), {"invest.db.2026-11-22", "portfol.db.2026-11-22"});
     std::sort(expected.begin(), expected.end());
     EXPECT_EQ(Kept(), expected);
 }
@@ -138,17 +136,19 @@ TEST_F(BackupTest, AFailureIsToldOnceADayAndTheChangeIsMade) {
     backup->Prepare();
     BackedUpFiles files(*backup);
     DATABASE invest(folder_.File("invest.db").c_str(), files);
-    EXPECT_EQ(invest.Delete(0), 0);
-    EXPECT_EQ(invest.Delete(1), 0);
+    const auto deletesOn = [&](int day, long record) {
+        SetDay(day);
+        EXPECT_EQ(invest.Delete(record), 0);
+    };
+    deletesOn(22, 0);
+    deletesOn(22, 1);
     EXPECT_EQ(backup->Keep(), ENOTDIR);
     EXPECT_EQ(told, std::vector<int>{ENOTDIR});
-    SetDay(23);
-    EXPECT_EQ(invest.Delete(2), 0);
+    deletesOn(23, 2);
     EXPECT_EQ(told, (std::vector<int>{ENOTDIR, ENOTDIR}));
     EXPECT_EQ(folder_.Read("backups"), "in the way");
     std::filesystem::remove(folder_.File("backups"));
-    SetDay(24);
-    EXPECT_EQ(invest.Delete(3), 0);
+    deletesOn(24, 3);
     EXPECT_EQ(told.size(), 2U);
     EXPECT_EQ(Kept().size(), 2U);
 }
@@ -175,14 +175,11 @@ TEST_F(BackupTest, IsCompleteOrAbsentWhateverFails) {
             ASSERT_LT(at, 100);
             std::filesystem::remove_all(folder_.File("backups"));
             result = ResultInChild([&] { return keep(fault, at); });
-            const Names kept = Kept();
-            const bool killed = result == -1;
-            for (const std::string& name : kept) {
-                const bool part = name.ends_with(".part");
-                EXPECT_TRUE(part ? killed || fault == Fault::Broken
-                                 : complete("invest.db", invest) || complete("portfol.db", portfol))
+            for (const std::string& name : Kept())
+                EXPECT_TRUE(name.ends_with(".part")
+                                ? result == -1 || fault == Fault::Broken
+                                : complete("invest.db", invest) || complete("portfol.db", portfol))
                     << name << " after call " << at;
-            }
             const bool both = complete("invest.db", invest) && complete("portfol.db", portfol);
             EXPECT_TRUE(both || result != 0) << "call " << at;
             EXPECT_EQ(MakeBackup()->Keep(), 0);
@@ -193,47 +190,45 @@ TEST_F(BackupTest, IsCompleteOrAbsentWhateverFails) {
     EXPECT_EQ(folder_.Read("invest.db"), invest);
 }
 
-bool HoldsAnything(DATABASE& /*database*/) {
-    return true;
-}
-
 TEST(DataFileOpening, SaysWhatIsWrongByName) {
     const DataFolder folder;
     folder.AddInvestment(MakeInvestment("A", "first"));
     const std::string whole = folder.Read("invest.db");
     const std::string path = folder.File("invest.db");
     ReadOnlyFiles readOnly;
+    const auto any = [](DATABASE&) { return true; };
     const auto noneOfOurs = [](DATABASE&) { return false; };
+    const auto nothing = [] {};
     const struct {
-        const char* what;
+        std::string what;
         std::function<void()> spoil;
-        bool (*holds)(DATABASE&);
-        FileOperations& operations;
-        bool opens;
         std::string said;
+        bool opens = false;
+        bool (*holds)(DATABASE&) = [](DATABASE&) { return true; };
+        FileOperations& operations = SystemFiles();
     } cases[] = {
-        {"sound", [] {}, HoldsAnything, SystemFiles(), true, ""},
-        {"missing", [&] { std::filesystem::remove(path); }, HoldsAnything, SystemFiles(), false,
-         "invest.db is missing. \"quorvan-cli setup " + folder.Path() + "\" makes a new one.\n"},
+        {"sound", nothing, "", true},
+        {"missing", [&] { std::filesystem::remove(path); },
+         "is missing. \"quorvan-cli setup " + folder.Path() + "\" makes a new one.\n"},
         {"its backup cannot be put back", [&] { std::filesystem::rename(path, folder.File("invest.bak")); },
-         HoldsAnything, readOnly, false,
-         "invest.db is missing, but its backup with the extension .bak is there.\n"},
+         "is missing, but its backup with the extension .bak is there.\n", false, any, readOnly},
         {"a folder",
          [&] {
              std::filesystem::remove(path);
              std::filesystem::create_directory(path);
          },
-         HoldsAnything, SystemFiles(), false, "invest.db cannot be opened: it is no file.\n"},
-        {"text", [&] { folder.Write("invest.db", "hello"); }, HoldsAnything, SystemFiles(), false,
-         "invest.db is no data file, or its beginning is damaged. It is left as it is.\n"},
-        {"another layout", [] {}, noneOfOurs, SystemFiles(), false,
-         "invest.db holds other records than Quorvan's. It is left as it is.\n"},
-        {"cut off", [&] { folder.Write("invest.db", whole.substr(0, whole.size() - 5)); }, HoldsAnything,
-         SystemFiles(), true,
-         "invest.db is damaged: what can be read of it is shown. \"quorvan-cli db " + path +
-             " check\" tells what is wrong.\n"},
-        {"read-only", [] {}, HoldsAnything, readOnly, true,
-         "invest.db cannot be written: Read-only file system. What you change in it will not be kept.\n"},
+         "cannot be opened: it is no file.\n"},
+        {"text", [&] { folder.Write("invest.db", "hello"); },
+         "is no data file, or its beginning is damaged. It is left as it is.\n"},
+        {"another layout", nothing, "holds other records than Quorvan's. It is left as it is.\n", false,
+         noneOfOurs},
+        {"cut off", [&] { folder.Write("invest.db", whole.substr(0, whole.size() - 5)); },
+         "is damaged: what can be read of it is shown. \"quorvan-cli db " + path +
+             " check\" tells what is wrong.\n",
+         true},
+        {"read-only", nothing,
+         "cannot be written: Read-only file system. What you change in it will not be kept.\n", true, any,
+         readOnly},
     };
     for (const auto& each : cases) {
         std::filesystem::remove_all(path);
@@ -243,15 +238,14 @@ TEST(DataFileOpening, SaysWhatIsWrongByName) {
         std::string said;
         const auto database =
             OpenDataFile(folder.Path(), "invest.db", each.holds, DataFileUse::Change, each.operations, said);
-        EXPECT_EQ(said, each.said) << each.what;
+        EXPECT_EQ(said, each.said.empty() ? "" : "invest.db " + each.said) << each.what;
         EXPECT_EQ(database->IsOpen(), each.opens) << each.what;
-        EXPECT_EQ(database->IsOpen() && database->IsReadOnly(), std::string(each.what) == "read-only");
+        EXPECT_EQ(database->IsOpen() && database->IsReadOnly(), each.what == "read-only");
     }
     // Who only looks need not know that the file cannot be written.
     folder.Write("invest.db", whole);
     std::string said;
-    const auto looked =
-        OpenDataFile(folder.Path(), "invest.db", HoldsAnything, DataFileUse::Look, readOnly, said);
+    const auto looked = OpenDataFile(folder.Path(), "invest.db", any, DataFileUse::Look, readOnly, said);
     EXPECT_EQ(said, "");
     EXPECT_NE(looked->Delete(0), 0);
     EXPECT_NE(looked->Compress(0), 0);

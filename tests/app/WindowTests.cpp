@@ -1,13 +1,34 @@
 // The main window, worked with real events.
 #include "Program.h"
 
-#include <QLineEdit>
 #include <QPushButton>
 
 #include "platform/MenuItem.h"
 #include "platform/Roster.h"
 
 namespace {
+
+class MainWindow : public testing::Test, protected Program {
+  protected:
+    // A portfolio with an investment of each of these names, of equal value.
+    void AddPortfolioOf(const char* name, const Texts& investments, float value = 1) const {
+        AddPortfolio(name);
+        for (const std::string& each : investments)
+            AddInvestment(MakeInvestment(name, each, 1, value));
+    }
+    // A step that sends a command and answers the alert that it leads to.
+    void Refused(uint32 code, const char* text) { Send(code).Answer(text, "Ok"); }
+    // Steps that delete the current portfolio, up to an answer other than Yes.
+    void DeletePortfolio(const char* first, const char* second) {
+        Send(MessagePortfolioDelete).Answer("Are you sure you want to delete this portfolio?", first);
+        if (second)
+            Answer("Are you really sure?", second);
+    }
+    static std::string Marked() {
+        const BMenuItem* marked = Selector()->FindMarked();
+        return marked ? marked->Label() : "";
+    }
+};
 
 struct MenuState {
     uint32 code;
@@ -32,285 +53,167 @@ constexpr MenuState MenuStates[] = {
     {B_QUIT_REQUESTED, true, true, true},
 };
 
-// Opens and closes a menu by the mouse.
-void OpenMenu(const char* title) {
-    auto* bar = Program::Main()->findChild<QMenuBar*>();
-    for (const QAction* action : bar->actions()) {
-        if (action->menu()->objectName() == title) {
-            QTest::mouseClick(bar, Qt::LeftButton, {},
-                              bar->actionGeometry(const_cast<QAction*>(action)).center());
-            ASSERT_TRUE(action->menu()->isVisible());
-            QTest::keyClick(action->menu(), Qt::Key_Escape);
-        }
-    }
-}
-
+// The items, once each menu has been opened.
 void ExpectMenus(bool MenuState::*state) {
-    for (const char* menu : {"File", "Portfolio", "Investment", "Help"})
-        OpenMenu(menu);
+    for (const char* menu : {"File", "Portfolio", "Investment", "Help"}) {
+        Driver::ClickTitle(Program::Main(), menu);
+        ASSERT_TRUE(Driver::OpenMenu());
+        Driver::Key(Qt::Key_Escape);
+    }
     for (const MenuState& each : MenuStates)
         EXPECT_EQ(Program::Find<BMenuBar>()->FindItem(each.code)->IsEnabled(), each.*state) << each.code;
 }
 
-TEST(NorvelWindow, MenuItemsFollowTheMarkAndTheRows) {
-    Program program;
-    program.AddPortfolio("Empty");
-    program.AddPortfolio("Full");
-    program.AddInvestment(MakeInvestment("Full", "a"));
-    program.Expect({"a"})
-        .Then("with investments", [] { ExpectMenus(&MenuState::investments); })
-        .Select("Empty")
-        .Expect({})
-        .Then("without investments",
-              [] {
-                  ExpectMenus(&MenuState::noInvestment);
-                  EXPECT_STREQ(Program::Selector()->FindMarked()->Label(), "Empty");
-              })
-        .Close();
-    program.Run();
+TEST_F(MainWindow, ShowsAPortfolioAndOffersWhatCanBeDoneWithIt) {
+    for (const char* name : {"Empty", "First one", "Second"})
+        AddPortfolio(name);
+    AddInvestment(MakeInvestment("First one", "a", 1000, 1234.5F));
+    AddInvestment(MakeInvestment("Second", "b", 1, 2));
+    AddInvestment(MakeInvestment("First one", "c", 1, 0.25F));
+    Expect({"b"}, "$2.00").Then("start", [] {
+        EXPECT_EQ(Marked(), "Second");
+        EXPECT_EQ(Selector()->CountItems(), 3);
+        ExpectMenus(&MenuState::investments);
+    });
+    Select("First one").Expect({"a", "c"}, "$1,234,500.25");
+    Select("Empty").Expect({}, "$0.00").Then("without investments", [] {
+        EXPECT_EQ(Marked(), "Empty");
+        ExpectMenus(&MenuState::noInvestment);
+    });
+    RunAndClose();
 }
 
-TEST(NorvelWindow, WithoutPortfoliosLittleIsEnabled) {
-    Program program;
-    program
-        .Then("without portfolios",
-              [] {
-                  ExpectMenus(&MenuState::noPortfolio);
-                  EXPECT_EQ(Program::Selector()->FindMarked(), nullptr);
-                  EXPECT_STREQ(Program::Selector()->Name(), "        ");
-                  Driver::Press(Program::Main(), "add button");
-              })
-        .Answer("This command requires that a portfolio be created first.", "Ok");
-    program.Close();
-    program.Run();
+TEST_F(MainWindow, SaysWhatACommandLacks) {
+    constexpr const char* noPortfolio = "This command requires that a portfolio be created first.";
+    Then("without portfolios", [] {
+        ExpectMenus(&MenuState::noPortfolio);
+        EXPECT_EQ(Marked(), "");
+        EXPECT_STREQ(Selector()->Name(), "        ");
+        Press(Main(), "add button");
+    }).Answer(noPortfolio, "Ok");
+    for (const uint32 code : {MessagePortfolioPrint, MessagePortfolioUpdate, MessageInvestmentAdd})
+        Refused(code, noPortfolio);
+    Refused(MessagePortfolioChart, "This command requires a portfolio with at least one investment.");
+    Refused(MessagePortfolioDelete, "There are no portfolios to delete!");
+    Refused(MessageInvestmentEdit, "You must select an investment to edit!");
+    RunAndClose();
+
+    AddPortfolioOf("Worthless", {"a"}, 0);
+    Expect({"a"});
+    Refused(MessagePortfolioChart, "Unable to chart. Total value of portfolio equals zero!");
+    Refused(MessageInvestmentDelete, "You must select an investment to delete!");
+    RunAndClose();
 }
 
-TEST(NorvelWindow, ShowsTheLastPortfolioAndChangesByTheSelector) {
-    Program program;
-    for (const char* name : {"First one", "Second"})
-        program.AddPortfolio(name);
-    program.AddInvestment(MakeInvestment("First one", "a", 1000, 1234.5F));
-    program.AddInvestment(MakeInvestment("Second", "b", 1, 2));
-    program.AddInvestment(MakeInvestment("First one", "c", 1, 0.25F));
-    program.Expect({"b"})
-        .Then("start",
-              [] {
-                  EXPECT_EQ(Program::Total(), "Total Value: $2.00");
-                  EXPECT_EQ(Program::Selector()->CountItems(), 2);
-                  EXPECT_STREQ(Program::Selector()->FindMarked()->Label(), "Second");
-                  for (auto* field : Program::Main()->findChildren<QPushButton*>()) {
-                      if (field->menu())
-                          QTest::keyClick(field, Qt::Key_Space);
-                  }
-              })
-        .When(
-            "open selector", [] { return QApplication::activePopupWidget() != nullptr; },
-            [] {
-                QTest::keyClick(QApplication::activePopupWidget(), Qt::Key_Up);
-                QTest::keyClick(QApplication::activePopupWidget(), Qt::Key_Return);
-            });
-    program.Expect({"a", "c"})
-        .Then("chosen",
-              [] {
-                  EXPECT_EQ(Program::Total(), "Total Value: $1,234,500.25");
-                  EXPECT_STREQ(Program::Selector()->FindMarked()->Label(), "First one");
-              })
-        .Close();
-    program.Run();
+TEST_F(MainWindow, TheTotalStandsClearOfTheSelector) {
+    AddPortfolio("WWWWWWWWWWWWWWWWWWWWWWWWWWWWWWW");
+    AddPortfolio("i");
+    Then("short name", [] {
+        const auto* field = Find<BMenuField>();
+        EXPECT_EQ(Find<BStringView>()->Frame().left, 200);
+        EXPECT_LT(field->VisibleRight(), 190);
+        Locked([] { Selector()->ItemAt(0)->SetMarked(true); });
+        EXPECT_GT(field->VisibleRight(), 190);
+        EXPECT_EQ(Find<BStringView>()->Frame().left, field->VisibleRight() + 10);
+    });
+    RunAndClose();
 }
 
-TEST(NorvelWindow, TheTotalStandsClearOfTheSelector) {
-    Program program;
-    program.AddPortfolio("WWWWWWWWWWWWWWWWWWWWWWWWWWWWWWW");
-    program.AddPortfolio("i");
-    float right = 0;
-    program
-        .Then("short name",
-              [&] {
-                  EXPECT_EQ(Program::Find<BStringView>()->Frame().left, 200);
-                  right = Program::Find<BMenuField>()->VisibleRight();
-                  EXPECT_LT(right, 190);
-                  Program::Locked([] { Program::Selector()->ItemAt(0)->SetMarked(true); });
-                  EXPECT_GT(Program::Find<BMenuField>()->VisibleRight(), right);
-                  EXPECT_EQ(Program::Find<BStringView>()->Frame().left,
-                            Program::Find<BMenuField>()->VisibleRight() + 10);
-              })
-        .Close();
-    program.Run();
-}
-
-TEST(NorvelWindow, AClickOnAHeaderSortsByText) {
-    Program program;
-    program.AddPortfolio("A");
-    const std::pair<const char*, float> values[] = {{"b", 980}, {"a", 1250}, {"C", 7}, {"d", 12345}};
-    for (const auto& [name, value] : values)
-        program.AddInvestment(MakeInvestment("A", name, 1, value));
-    const auto click = [](int32 column) {
-        return [column] {
-            const CLVColumn* clicked = Program::List()->ColumnAt(column);
-            auto* header = Program::Main()->findChild<QWidget*>("column labels");
-            QTest::mouseClick(header, Qt::LeftButton, {},
+TEST_F(MainWindow, AClickOnAHeaderSortsByText) {
+    AddPortfolio("A");
+    for (const auto& [name, value] : {std::pair{"b", 980.F}, {"a", 1250.F}, {"C", 7.F}, {"d", 12345.F}})
+        AddInvestment(MakeInvestment("A", name, 1, value));
+    const auto click = [this](InvestmentColumn column) {
+        Then("click", [column] {
+            const CLVColumn* clicked = List()->ColumnAt(static_cast<int32>(column));
+            QTest::mouseClick(Main()->findChild<QWidget*>("column labels"), Qt::LeftButton, {},
                               QPoint(static_cast<int>((clicked->Begin() + clicked->End()) / 2), 8));
-        };
+        });
     };
-    program.Expect({"b", "a", "C", "d"})
-        .Then("Value", click(static_cast<int32>(InvestmentColumn::Value)))
-        .Expect({"d", "a", "C", "b"}) // "12,345.00", "1250.00", "7.00", "980.00"
-        .Then("Name", click(static_cast<int32>(InvestmentColumn::Name)))
-        .Expect({"a", "b", "C", "d"})
-        .Then("Name again", click(static_cast<int32>(InvestmentColumn::Name)))
-        .Expect({"d", "C", "b", "a"});
-    program.Select("A").Expect({"d", "C", "b", "a"}); // loaded anew, and still as the header says
-    program.Close();
-    program.Run();
+    Expect({"b", "a", "C", "d"});
+    click(InvestmentColumn::Value);
+    Expect({"d", "a", "C", "b"}); // "12,345.00", "1250.00", "7.00", "980.00"
+    click(InvestmentColumn::Name);
+    Expect({"a", "b", "C", "d"});
+    click(InvestmentColumn::Name);
+    Expect({"d", "C", "b", "a"}).Select("A").Expect({"d", "C", "b", "a"}); // loaded anew, and still sorted
+    RunAndClose();
 }
 
-TEST(NorvelWindow, DeletesTheSelectedInvestments) {
-    Program program;
-    program.AddPortfolio("A");
-    for (const char* name : {"a", "b", "c", "d", "e"})
-        program.AddInvestment(MakeInvestment("A", name, 1, 1.5F));
-    program.Expect({"a", "b", "c", "d", "e"})
-        .Send(1022)
-        .Answer("You must select an investment to delete!", "Ok");
-    program
-        .Then("select b, c, e",
-              [] {
-                  Program::ClickRow(1);
-                  Program::ClickRow(2, Qt::ShiftModifier);
-                  Program::Locked([] { Program::List()->Select(4, true); });
-                  EXPECT_EQ(CountSelectedItems(Program::List()), 3);
-              })
-        .Send(1022)
-        .Expect({"a", "d"})
-        .Then("total", [] { EXPECT_EQ(Program::Total(), "Total Value: $3.00"); })
-        .Then("select all", [] { Program::Locked([] { Program::List()->Select(0, 1); }); })
-        .Send(1022)
-        .Expect({})
-        .Then("nothing", [] { EXPECT_EQ(Program::Total(), "Total Value: $0.00"); })
-        .Close();
-    program.Run();
-    EXPECT_EQ(program.Investments(), Texts{});
-    EXPECT_EQ(program.RecordSlots("invest.db"), 0);
+TEST_F(MainWindow, DeletesTheSelectedInvestments) {
+    AddPortfolioOf("A", {"a", "b", "c", "d", "e"}, 1.5F);
+    Expect({"a", "b", "c", "d", "e"}).Then("select b, c, e", [] {
+        ClickRow(1);
+        ClickRow(2, Qt::ShiftModifier);
+        Locked([] { List()->Select(4, true); });
+        EXPECT_EQ(CountSelectedItems(List()), 3);
+    });
+    Send(MessageInvestmentDelete).Expect({"a", "d"}, "$3.00");
+    Mark({0, 1}).Send(MessageInvestmentDelete).Expect({}, "$0.00");
+    RunAndClose();
+    EXPECT_EQ(RecordSlots("invest.db"), 0);
 }
 
-TEST(NorvelWindow, CutsCopiesAndPastesBetweenPortfolios) {
-    Program program;
-    for (const char* name : {"From", "To"})
-        program.AddPortfolio(name);
-    for (const char* name : {"a", "b", "c"})
-        program.AddInvestment(MakeInvestment("From", name, 1, 1));
-    program.Select("From")
-        .Expect({"a", "b", "c"})
-        .Send(1025) // an empty clipboard pastes nothing
-        .Send(1023)
-        .Answer("You must select a(n) investment(s) to cut or copy.", "Ok");
-    program.Then("select a, b", [] { Program::Locked([] { Program::List()->Select(0, 1); }); })
-        .Send(1024)
-        .Then("select b", [] { Program::Locked([] { Program::List()->Select(1); }); })
-        .Then("two copied", [] { EXPECT_EQ(app_state->clipboardCount, 2); })
-        .Send(1023)
-        .Expect({"a", "c"})
-        .Then("one cut", [] { EXPECT_EQ(app_state->clipboardCount, 1); })
-        .Send(1024)
-        .Answer("You must select a(n) investment(s) to cut or copy.", "Ok");
-    program.Select("To")
-        .Expect({})
-        .Send(1025)
-        .Expect({"b"})
-        .Send(1025)
-        .Expect({"b", "b"})
-        .Then("total", [] { EXPECT_EQ(Program::Total(), "Total Value: $2.00"); })
-        .Close();
-    program.Run();
-    EXPECT_EQ(program.Investments(), (Texts{"From/a", "From/c", "To/b", "To/b"}));
+TEST_F(MainWindow, CutsCopiesAndPastesBetweenPortfolios) {
+    constexpr const char* nothing = "You must select a(n) investment(s) to cut or copy.";
+    AddPortfolioOf("From", {"a", "b", "c"});
+    AddPortfolio("To");
+    Select("From").Expect({"a", "b", "c"}).Send(MessageInvestmentPaste); // there is nothing yet
+    Refused(MessageInvestmentCut, nothing);
+    Mark({0, 1}).Send(MessageInvestmentCopy).Then("two copied", [] {
+        EXPECT_EQ(app_state->clipboardCount, 2);
+    });
+    Mark({1}).Send(MessageInvestmentCut).Expect({"a", "c"});
+    Refused(MessageInvestmentCopy, nothing);
+    Select("To").Expect({}).Send(MessageInvestmentPaste).Expect({"b"});
+    Send(MessageInvestmentPaste).Expect({"b", "b"}, "$2.00");
+    RunAndClose();
+    EXPECT_EQ(Investments(), (Texts{"From/a", "From/c", "To/b", "To/b"}));
 }
 
-TEST(NorvelWindow, DeletesAPortfolioAfterTwoQuestions) {
-    constexpr const char* Sure = "Are you sure you want to delete this portfolio?";
-    constexpr const char* Really = "Are you really sure?";
-    Program program;
-    for (const char* name : {"A", "B", "C"}) {
-        program.AddPortfolio(name);
-        program.AddInvestment(MakeInvestment(name, std::string("in ") + name));
-    }
-    program.Expect({"in C"}).Send(1012).Answer(Sure, "No");
-    program.Send(1012).Answer(Sure, "Yes").Answer(Really, "No");
-    program.Then("nothing deleted",
-                 [&] {
-                     EXPECT_EQ(program.Portfolios(), (Texts{"A", "B", "C"}));
-                 })
-        .Select("B")
-        .Expect({"in B"})
-        .Send(1012)
-        .Answer(Sure, "Yes")
-        .Answer(Really, "Yes");
-    program.Expect({"in A"})
-        .Then("first is current",
-              [] {
-                  EXPECT_STREQ(Program::Selector()->FindMarked()->Label(), "A");
-                  EXPECT_EQ(Program::Selector()->CountItems(), 2);
-              })
-        .Send(1012)
-        .Answer(Sure, "Yes")
-        .Answer(Really, "Yes");
-    program.Expect({"in C"}).Send(1012).Answer(Sure, "Yes").Answer(Really, "Yes");
-    program.Expect({})
-        .Then("none left", [] { EXPECT_EQ(Program::Total(), "Total Value: $0.00"); })
-        .Send(1012)
-        .Answer("There are no portfolios to delete!", "Ok");
-    program.Close();
-    program.Run();
-    EXPECT_EQ(program.Portfolios(), Texts{});
-    EXPECT_EQ(program.RecordSlots("portfol.db"), 0);
-    EXPECT_EQ(program.Investments(), Texts{});
+TEST_F(MainWindow, DeletesAPortfolioAfterTwoQuestions) {
+    for (const char* name : {"A", "B", "C"})
+        AddPortfolioOf(name, {std::string("in ") + name});
+    Expect({"in C"});
+    DeletePortfolio("No", nullptr);
+    DeletePortfolio("Yes", "No");
+    Then("nothing deleted", [this] { EXPECT_EQ(Portfolios().size(), 3U); });
+    Select("B").Expect({"in B"});
+    DeletePortfolio("Yes", "Yes");
+    Expect({"in A"}).Then("first is current", [] {
+        EXPECT_EQ(Marked(), "A");
+        EXPECT_EQ(Selector()->CountItems(), 2);
+    });
+    DeletePortfolio("Yes", "Yes");
+    Expect({"in C"});
+    DeletePortfolio("Yes", "Yes");
+    Expect({}, "$0.00");
+    RunAndClose();
+    EXPECT_EQ(RecordSlots("portfol.db") + RecordSlots("invest.db"), 0);
 }
 
-TEST(NorvelWindow, CommandsThatNeedSomethingSaySo) {
-    Program program;
-    const char* const noPortfolio = "This command requires that a portfolio be created first.";
-    for (const uint32 code : {1014U, 1016U, 1020U})
-        program.Send(code).Answer(noPortfolio, "Ok");
-    program.Send(1013).Answer("This command requires a portfolio with at least one investment.", "Ok");
-    program.Send(1021).Answer("You must select an investment to edit!", "Ok");
-    program.Close();
-    program.Run();
-
-    program.AddPortfolio("Worthless");
-    program.AddInvestment(MakeInvestment("Worthless", "a", 0, 10));
-    program.Expect({"a"}).Send(1013).Answer("Unable to chart. Total value of portfolio equals zero!", "Ok");
-    program.Close();
-    program.Run();
-}
-
-TEST(NorvelWindow, SettingsHelpAndAboutOpen) {
+TEST_F(MainWindow, SettingsHelpAndAboutOpen) {
     static std::string launched;
-    Program program;
     BRoster::SetLauncher([](const char* path) {
         launched = path;
         return true;
     });
-    std::filesystem::create_directory(program.File("help"));
-    program.Write("help/Quorvan.html", "help");
-    program.Send(1030)
-        .When(
-            "help", [] { return !launched.empty(); }, [] {})
-        .When("main window", Program::Main,
-              [] {
-                  Program::Window()->PostMessage(1000);
-                  be_app->PostMessage(B_ABOUT_REQUESTED);
-              })
-        .Answer("Quorvan version 1.0", "Ok")
-        .When("settings", Driver::WindowShown("Settings"), [] {
-            EXPECT_EQ(Driver::Window("Settings")->geometry().topLeft(), QPoint(150, 150));
-            auto* field = Driver::Window("Settings")->findChild<QLineEdit*>("text control");
-            QTest::keyClicks(field, "abc");
-            QTest::keyClick(field, Qt::Key_Return);
-        });
-    program.Close();
-    program.Run();
-    EXPECT_EQ(launched, program.Path() + "//help/Quorvan.html");
-    EXPECT_NE(program.Read("Quorvan.ini").find("[GENERAL]\nPassword=abc\n"), std::string::npos);
+    std::filesystem::create_directory(File("help"));
+    Write("help/Quorvan.html", "help");
+    Send(MessageHelp).Await("help", [] { return !launched.empty(); });
+    Then("main window", [] {
+        Window()->PostMessage(1000);
+        be_app->PostMessage(B_ABOUT_REQUESTED);
+    }).Answer("Quorvan version 1.0", "Ok");
+    When("settings", WindowShown("Settings"), [] {
+        EXPECT_EQ(Driver::Window("Settings")->geometry().topLeft(), QPoint(150, 150));
+        auto* field = Driver::Window("Settings")->findChild<QLineEdit*>();
+        QTest::keyClicks(field, "abc");
+        QTest::keyClick(field, Qt::Key_Return);
+    });
+    RunAndClose();
+    EXPECT_EQ(launched, Path() + "//help/Quorvan.html");
+    EXPECT_NE(Read("Quorvan.ini").find("[GENERAL]\nPassword=abc\n"), std::string::npos);
 }
 
 TEST(NorvelWindow, WhatWasCutOnlyGoesWhenThePersonSaysSo) {

@@ -2,21 +2,15 @@
 // record is looked at byte by byte.
 #include "Program.h"
 
-#include <functional>
-
-#include <QLineEdit>
-
-#include "util/Dates.h"
+#include <QPushButton>
 
 namespace {
 
-constexpr const char* AddTitle = "Add an Investment";
 // With letters of more than one byte.
 constexpr const char* CedarName = "C\xC3\xA9"
                                   "dar";
 constexpr const char* Reserve = "R\xC3\xBC"
                                 "ckhalt";
-constexpr const char* EditTitle = "Edit this Investment";
 
 struct Typed {
     const char* name;
@@ -56,105 +50,55 @@ INVESTMENT_DATA Expected(const char* portfolio, const Typed& typed, dbDATE today
     return record;
 }
 
-dbDATE Today() {
-    int year = 0;
-    int month = 0;
-    int day = 0;
-    GetDate(&year, &month, &day);
-    return {static_cast<std::int8_t>(day), static_cast<std::int8_t>(month), static_cast<std::int16_t>(year)};
-}
-
-void TypeOver(const char* text) {
-    auto* field = qobject_cast<QLineEdit*>(QApplication::focusWidget());
-    ASSERT_TRUE(field);
-    QTest::keyClick(field, Qt::Key_A, Qt::ControlModifier);
-    QTest::keyClick(field, Qt::Key_Delete);
-    for (const QChar letter : QString::fromUtf8(text))
-        QTest::sendKeyEvent(QTest::Click, field, Qt::Key_unknown, QString(letter), Qt::NoModifier);
-}
-
-void Key(Qt::Key key) {
-    QTest::keyClick(QApplication::focusWidget(), key);
-}
-
 // Fills the investment form from top to bottom, going on with Tab over the pick lists, and confirms it with
 // Enter.
 void FillForm(const Typed& typed) {
-    const auto next = [](int fields) {
-        while (fields-- > 0)
-            Key(Qt::Key_Tab);
-    };
-    TypeOver(typed.name);
-    next(1);
-    TypeOver(typed.ticker);
-    next(1);
-    TypeOver(typed.type);
-    next(2);
-    TypeOver(typed.shares);
-    next(1);
-    TypeOver(typed.price);
-    next(2);
-    TypeOver(typed.agent);
-    Key(Qt::Key_Return);
+    const std::pair<const char*, int> fields[] = {
+        {typed.name, 1}, {typed.ticker, 1}, {typed.type, 2}, {typed.shares, 1}, {typed.price, 2}};
+    for (const auto& [text, tabs] : fields) {
+        Driver::TypeOver(text);
+        for (int i = 0; i < tabs; ++i)
+            Driver::Key(Qt::Key_Tab);
+    }
+    Driver::TypeOver(typed.agent, Qt::Key_Return);
 }
 
-class WorkingDay : public Program {
-  public:
+class WorkingDay : public testing::Test, protected Program {
+  protected:
+    using Program::Run;
+
     // Opens a menu by the mouse and clicks one of its items.
-    WorkingDay& Choose(const char* title, const char* label) {
+    void Choose(const char* title, const char* label) {
         Then(std::string(title) + " > " + label, [title, label] {
-            auto* bar = Main()->findChild<QMenuBar*>();
-            for (QAction* top : bar->actions()) {
-                if (top->menu()->objectName() != title)
-                    continue;
-                QTest::mouseClick(bar, Qt::LeftButton, {}, bar->actionGeometry(top).center());
-                for (QAction* item : top->menu()->actions())
-                    if (item->objectName() == label)
-                        QTest::mouseClick(top->menu(), Qt::LeftButton, {},
-                                          top->menu()->actionGeometry(item).center());
-            }
+            ClickTitle(Main(), title);
+            ClickItem(label);
         });
-        return *this;
     }
-    WorkingDay& Fill(const char* title, Action action) {
+    void Fill(const char* title, Action action) {
         When(
             std::string("form: ") + title,
             [title] {
                 return Driver::Window(title) && QApplication::activeModalWidget() == Driver::Window(title) &&
-                       qobject_cast<QLineEdit*>(QApplication::focusWidget());
+                       Field();
             },
             std::move(action));
-        return *this;
     }
-    WorkingDay& AddPortfolioByHand(const char* name) {
-        Choose("Portfolio", "Add").Fill("Add a Portfolio", [name] {
-            TypeOver(name);
-            Key(Qt::Key_Return);
+    // Gives the current or a new portfolio a name.
+    void Name(const char* command, const char* title, const char* name) {
+        Choose("Portfolio", command);
+        Fill(title, [name] { TypeOver(name, Qt::Key_Return); });
+        Await(std::string("portfolio ") + name, [name] {
+            return Selector()->FindMarked() && Selector()->FindMarked()->Label() == std::string(name);
         });
-        When(
-            std::string("portfolio ") + name, [name] { return Marked() == name; }, [] {});
-        return *this;
     }
     // Opens the selector by the mouse and picks a portfolio.
-    WorkingDay& Pick(const char* name) {
+    void Pick(const char* name) {
         Then(std::string("pick ") + name, [] {
-            for (QAbstractButton* button : Main()->findChildren<QAbstractButton*>())
-                if (button->property("menu").isValid() || button->objectName().isEmpty())
+            for (QPushButton* button : Main()->findChildren<QPushButton*>())
+                if (button->menu())
                     QTest::mouseClick(button, Qt::LeftButton);
         });
-        When(
-            "the selector's menu", [] { return QApplication::activePopupWidget() != nullptr; },
-            [name] {
-                auto* menu = qobject_cast<QMenu*>(QApplication::activePopupWidget());
-                for (QAction* item : menu->actions())
-                    if (item->objectName() == name)
-                        QTest::mouseClick(menu, Qt::LeftButton, {}, menu->actionGeometry(item).center());
-            });
-        return *this;
-    }
-    static std::string Marked() {
-        const BMenuItem* marked = Selector()->FindMarked();
-        return marked ? marked->Label() : "";
+        When("the selector's menu", OpenMenu, [name] { ClickItem(name); });
     }
     // Every record of invest.db, compared with what it must be.
     void ExpectInvestments(const std::vector<INVESTMENT_DATA>& expected) const {
@@ -172,68 +116,58 @@ class WorkingDay : public Program {
     }
 };
 
-} // namespace
-
-TEST(WorkingDay, EveryRecordIsAsItShouldBe) {
+TEST_F(WorkingDay, EveryRecordIsAsItShouldBe) {
     const dbDATE today = Today();
-    WorkingDay day;
-    day.AddPortfolioByHand("Old hand").AddPortfolioByHand("Short lived").AddPortfolioByHand("My first one");
+    for (const char* name : {"Old hand", "Short lived", "My first one"})
+        Name("Add", "Add a Portfolio", name);
     for (const Typed& typed : Day) {
-        day.Then("Add button", [] { Driver::Press(Program::Main(), "add button"); });
-        day.Fill(AddTitle, [&typed] { FillForm(typed); });
+        Then("Add button", [] { Press(Main(), "add button"); });
+        Fill("Add an Investment", [&typed] { FillForm(typed); });
     }
-    day.Expect({"Acme", "Birch & Sons", CedarName, "Dogwood", "Elm", "Fir", "Grove",
-                "Hazel, long in name but not too", "Ironwood", "Juniper"});
+    Expect({"Acme", "Birch & Sons", CedarName, "Dogwood", "Elm", "Fir", "Grove",
+            "Hazel, long in name but not too", "Ironwood", "Juniper"});
 
-    day.Then("select two", [] {
-        Program::ClickRow(1);
-        Program::ClickRow(3, Qt::ControlModifier);
+    Then("select two", [] {
+        ClickRow(1);
+        ClickRow(3, Qt::ControlModifier);
     });
-    day.Choose("Investment", "Cut").Pick("Old hand").Expect({});
-    day.Choose("Investment", "Paste").Expect({"Birch & Sons", "Dogwood"});
-    day.Pick("My first one");
-    day.When(
-        "eight rows", [] { return Program::Names().size() == 8; }, [] {});
+    Choose("Investment", "Cut");
+    Pick("Old hand");
+    Expect({});
+    Choose("Investment", "Paste");
+    Expect({"Birch & Sons", "Dogwood"});
+    Pick("My first one");
+    Await("eight rows", [] { return Names().size() == 8; });
 
     // A double click edits; the row keeps its place.
-    day.Then("edit Elm", [] {
-        const BRect frame = Program::List()->ItemFrame(2);
-        const QPoint place(30, static_cast<int>((frame.top + frame.bottom) / 2));
-        QTest::mouseClick(Program::RowsWidget()->viewport(), Qt::LeftButton, {}, place);
-        QTest::mouseDClick(Program::RowsWidget()->viewport(), Qt::LeftButton, {}, place);
+    Then("edit Elm", [] {
+        ClickRow(2);
+        QTest::mouseDClick(RowsWidget()->viewport(), Qt::LeftButton, {}, PlaceOfRow(2));
     });
-    day.Fill(EditTitle, [] {
-        TypeOver("Elm again");
-        QTest::keyClick(QApplication::focusWidget(), Qt::Key_Tab);
-        Driver::Window(EditTitle)->findChild<QLineEdit*>("price control")->setFocus();
-        TypeOver("41.5");
-        Key(Qt::Key_Return);
+    Fill("Edit this Investment", [] {
+        TypeOver("Elm again", Qt::Key_Tab);
+        Driver::Window("Edit this Investment")->findChild<QLineEdit*>("price control")->setFocus();
+        TypeOver("41.5", Qt::Key_Return);
     });
-    day.When(
-        "the edited row", [] { return Program::Names().at(2) == "Elm again"; },
-        [] { EXPECT_STREQ(Program::Row(2)->Text(5), "41 1/2"); });
+    When(
+        "the edited row", [] { return Names().at(2) == "Elm again"; },
+        [] { EXPECT_STREQ(Row(2)->Text(5), "41 1/2"); });
 
-    day.Choose("Portfolio", "Edit").Fill("Edit Portfolio", [] {
-        TypeOver(Reserve);
-        Key(Qt::Key_Return);
+    Name("Edit", "Edit Portfolio", Reserve);
+    Then("sort by name", [] {
+        QTest::mouseClick(Main()->findChild<QWidget*>("column labels"), Qt::LeftButton, {}, QPoint(80, 6));
     });
-    day.When(
-        "renamed", [] { return WorkingDay::Marked() == Reserve; }, [] {});
-    day.Then("sort by name", [] {
-        auto* header = Program::Main()->findChild<QWidget*>("column labels");
-        QTest::mouseClick(header, Qt::LeftButton, {}, QPoint(80, 6));
-    });
-    day.Expect({"Acme", CedarName, "Elm again", "Fir", "Grove", "Hazel, long in name but not too", "Ironwood",
-                "Juniper"});
+    const Texts rest = {"Acme",     CedarName, "Elm again", "Fir", "Grove", "Hazel, long in name but not too",
+                        "Ironwood", "Juniper"};
+    Expect(rest);
 
-    day.Pick("Short lived").Expect({});
-    day.Choose("Portfolio", "Del")
-        .Answer("Are you sure you want to delete this portfolio?", "Yes")
-        .Answer("Are you really sure?", "Yes");
-    day.Expect({"Birch & Sons", "Dogwood"});
-    day.Then("total", [] { EXPECT_EQ(Program::Total(), "Total Value: $31.50"); });
-    day.Choose("File", "Quit");
-    day.Run();
+    Pick("Short lived");
+    Expect({});
+    Choose("Portfolio", "Del");
+    Answer("Are you sure you want to delete this portfolio?", "Yes").Answer("Are you really sure?", "Yes");
+    Expect({"Birch & Sons", "Dogwood"}, "$31.50");
+    Choose("File", "Quit");
+    Run();
 
     std::vector<INVESTMENT_DATA> expected;
     for (const std::size_t i : {0U, 2U, 4U, 5U, 6U, 7U, 8U, 9U})
@@ -244,12 +178,13 @@ TEST(WorkingDay, EveryRecordIsAsItShouldBe) {
     CopyTextZeroed(expected[5].Ticker, "HAZELNU");
     for (const std::size_t i : {1U, 3U})
         expected.push_back(Expected("Old hand", Day[i], today));
-    day.ExpectInvestments(expected);
-    EXPECT_EQ(day.Portfolios(), (Texts{"Old hand", Reserve}));
+    ExpectInvestments(expected);
+    EXPECT_EQ(Portfolios(), (Texts{"Old hand", Reserve}));
 
-    day.Expect({"Acme", CedarName, "Elm again", "Fir", "Grove", "Hazel, long in name but not too", "Ironwood",
-                "Juniper"});
-    day.Choose("File", "Quit");
-    day.Run();
-    day.ExpectInvestments(expected);
+    Expect(rest);
+    Choose("File", "Quit");
+    Run();
+    ExpectInvestments(expected);
 }
+
+} // namespace
