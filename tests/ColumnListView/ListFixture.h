@@ -15,6 +15,9 @@
 inline constexpr rgb_color kColumnColors[] = {{255, 0, 0, 255}, {0, 160, 0, 255}, {200, 200, 0, 255}};
 inline constexpr rgb_color kStripColor{0, 160, 160, 255};
 
+using Order = std::vector<int32>;
+using Mode = CLVSortMode;
+
 // A row that fills each column with the column's colour, or with grey when selected, and notes what it hears.
 class TextRow : public CLVListItem {
   public:
