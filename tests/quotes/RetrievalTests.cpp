@@ -7,15 +7,12 @@
 #include <vector>
 
 #include "LoopbackServer.h"
-#include "StopSwitch.h"
-#include "TemporaryFolder.h"
+#include "QuoteTest.h"
 #include "quotes/HostLookup.h"
 #include "quotes/LastConnection.h"
 #include "quotes/QuoteObserver.h"
 #include "quotes/QuoteReport.h"
-#include "quotes/QuoteRetrieval.h"
 #include "quotes/QuoteScanner.h"
-#include "util/GatheredLog.h"
 
 namespace {
 
@@ -34,34 +31,25 @@ class StepByStep : public QuoteObserver {
     LoopbackServer& server_;
 };
 
-class Retrieval : public testing::Test {
+class Retrieval : public QuoteTest {
   protected:
     Retrieval() {
         context_.sourcePath = sourcePath_.c_str();
-        context_.log = &log_;
         context_.lastConnection = &lastConnection_;
-        context_.stopFd = stop_.Fd();
     }
 
     // The answer for the ticker ABC, with the lines as the source file.
     float Quote(const std::string& lines) {
         folder_.Write("Quorvan.cfg", lines);
-        log_.Write();
-        folder_.Write("log", "");
+        static_cast<void>(Log());
         return GetPriceQuote("ABC", context_);
     }
-    [[nodiscard]] std::string Log() {
-        log_.Write();
-        return folder_.Read("log");
+    std::future<float> QuoteMeanwhile(const std::string& lines) {
+        return std::async(std::launch::async, [this, lines] { return Quote(lines); });
     }
 
-    TemporaryFolder folder_;
     std::string sourcePath_ = folder_.File("Quorvan.cfg");
-    std::string logPath_ = folder_.File("log");
-    GatheredLog log_{logPath_.c_str()};
     LastConnection lastConnection_;
-    StopSwitch stop_;
-    QuoteContext context_;
 };
 
 std::string Replace(std::string text, const std::string& from, const std::string& to) {
@@ -76,32 +64,29 @@ const std::string Asked = Before + "connected ok\nGET /q?s=ABC HTTP/1.0\n\n";
 const std::string NoPrice = "Returning price = -4.00\n";
 
 TEST_F(Retrieval, AsksByABareRequestAndLogsEveryStep) {
+    const std::string priced = "found tag\nskipped ok\nvalue string is '45'\n"
+                               "Returning price = 45.38\nPrice = 45.38\n";
     const struct {
         Reply reply;
+        int skip;
         float price;
         std::string log; // behind the request
     } cases[] = {
-        {{{Page}},
-         45.375F,
-         "found tag\nskipped ok\nvalue string is '45'\nReturning price = 45.38\nPrice = 45.38\n"},
-        {{{Page}, Reply::End::Hold},
-         45.375F,
-         "found tag\nskipped ok\nvalue string is '45'\nReturning price = 45.38\nPrice = 45.38\n"},
-        {{{Page}, Reply::End::Endless},
-         45.375F,
-         "found tag\nskipped ok\nvalue string is '45'\nReturning price = 45.38\nPrice = 45.38\n"},
-        {{{"Last</td>"}}, NoQuote, "found tag\nreceived zero bytes\n" + NoPrice},
-        {{{"\0\xFF%s%n\x1B[2J"s}}, NoQuote, "received zero bytes\n" + NoPrice},
+        {{{Page}}, 3, 45.375F, priced},
+        {{{Page}, Reply::End::Hold}, 3, 45.375F, priced},
+        {{{Page}, Reply::End::Endless}, 3, 45.375F, priced},
+        {{{"Last</td>"}}, 2, NoQuote, "found tag\nreceived zero bytes\n" + NoPrice},
+        {{{"\0\xFF%s%n\x1B[2J"s}}, 2, NoQuote, "received zero bytes\n" + NoPrice},
         {{{"Last></>%s%n%s"}},
+         2,
          0,
          "found tag\nskipped ok\nvalue string is '%s%n%s'\nReturning price = 0.00\n"},
-        {{{}}, NoQuote, "received zero bytes\n" + NoPrice},
-        {{{}, Reply::End::Reset}, NoQuote, "recv() error\n" + NoPrice},
+        {{{}}, 2, NoQuote, "received zero bytes\n" + NoPrice},
+        {{{}, Reply::End::Reset}, 2, NoQuote, "recv() error\n" + NoPrice},
     };
     for (const auto& c : cases) {
         LoopbackServer server(c.reply);
-        const int skip = c.reply.pieces == std::vector<std::string>{Page} ? 3 : 2;
-        EXPECT_EQ(Quote("net " + server.Host() + " /q?s= Last " + std::to_string(skip)), c.price);
+        EXPECT_EQ(Quote("net " + server.Host() + " /q?s= Last " + std::to_string(c.skip)), c.price) << c.log;
         EXPECT_EQ(Replace(Log(), server.Host(), "HOST"), Asked + c.log);
         EXPECT_EQ(server.Requests(), std::vector<std::string>{"GET /q?s=ABC HTTP/1.0\n\n"});
     }
@@ -168,13 +153,9 @@ TEST_F(Retrieval, TriesTheSourcesInOrder) {
 
 // A page in these pieces is read off the network as the scanner reads it.
 TEST_F(Retrieval, ReadsEachPieceAsItArrives) {
-    std::vector<std::vector<std::string>> pages;
+    std::vector<std::vector<std::string>> pages{SingleBytes("#>\n<7 1/2")};
     for (std::size_t split = 1; split < Page.size(); ++split)
         pages.push_back({Page.substr(0, split), Page.substr(split)});
-    std::vector<std::string> bytes;
-    for (const char byte : "#>\n<7 1/2"s)
-        bytes.emplace_back(1, byte);
-    pages.push_back(bytes);
     QuoteReport nobody(nullptr, nullptr);
     for (const auto& pieces : pages) {
         const char* tag = pieces.size() == 2 ? "Last" : "#";
@@ -212,14 +193,13 @@ TEST_F(Retrieval, StopsAtOnceWhereverTheServerIs) {
         LoopbackServer server(reply);
         const StopSwitch stop;
         context_.stopFd = stop.Fd();
-        auto quote = std::async(std::launch::async, [&] {
-            return Quote("net " + server.Host() + " /q?s= Last 1\nnet h /q Last 1");
-        });
+        auto quote = QuoteMeanwhile("net " + server.Host() + " /q?s= Last 1\nnet h /q Last 1");
         EXPECT_TRUE(server.WaitForRequests(1));
         stop.Stop();
         EXPECT_EQ(quote.get(), QuoteCancelled);
         EXPECT_TRUE(server.WaitForEnds(1));
-        EXPECT_TRUE(Log().ends_with("\ncancelled\n")) << Log();
+        const std::string log = Log();
+        EXPECT_TRUE(log.ends_with("\ncancelled\n")) << log;
     }
 }
 
@@ -244,14 +224,13 @@ TEST_F(Retrieval, StopsWhileItConnects) {
     socklen_t size = sizeof address;
     ASSERT_EQ(getsockname(server.Fd(), reinterpret_cast<sockaddr*>(&address), &size), 0);
     std::vector<int> waiting;
-    for (pollfd last{}; waiting.size() < 64;) {
-        last = {socket(AF_INET, SOCK_STREAM | SOCK_NONBLOCK | SOCK_CLOEXEC, 0), POLLOUT, 0};
+    while (waiting.size() < 64) {
+        pollfd last{socket(AF_INET, SOCK_STREAM | SOCK_NONBLOCK | SOCK_CLOEXEC, 0), POLLOUT, 0};
         waiting.push_back(last.fd);
         if (connect(last.fd, reinterpret_cast<sockaddr*>(&address), size) != 0 && poll(&last, 1, 50) == 0)
             break;
     }
-    auto quote =
-        std::async(std::launch::async, [&] { return Quote("net " + server.Host() + " /q?s= Last 1"); });
+    auto quote = QuoteMeanwhile("net " + server.Host() + " /q?s= Last 1");
     while (folder_.Read("log").find("socket created ok\n") == std::string::npos)
         std::this_thread::yield();
     stop_.Stop();
@@ -270,12 +249,10 @@ TEST_F(Retrieval, AsksNobodyWhenItIsToStopAlready) {
 }
 
 TEST_F(Retrieval, TheNetworkIsThereWhenANameResolves) {
-    for (const int stopFd : {-1, stop_.Fd()}) {
-        EXPECT_TRUE(IsConnected("localhost", stopFd));
-        EXPECT_TRUE(IsConnected("127.0.0.1", stopFd));
-        EXPECT_FALSE(IsConnected(NoSuchHost, stopFd));
-        EXPECT_FALSE(IsConnected("", stopFd));
-    }
+    for (const int stopFd : {-1, stop_.Fd()})
+        for (const auto& [name, there] :
+             {std::pair{"localhost", true}, {"127.0.0.1", true}, {NoSuchHost, false}, {"", false}})
+            EXPECT_EQ(IsConnected(name, stopFd), there) << name;
 }
 
 std::binary_semaphore resolving(0), resolverMayEnd(0), resolverEnded(0);
@@ -289,21 +266,20 @@ TEST_F(Retrieval, StopsWhileANameIsLookedUp) {
         return found;
     };
     in_addr address{};
-    auto lookup =
-        std::async(std::launch::async, [&] { return LookUpHost("localhost", stop_.Fd(), &address, slow); });
-    resolving.acquire();
-    stop_.Stop();
-    EXPECT_EQ(lookup.get(), HostLookup::Stopped);
-    resolverMayEnd.release();
-    resolverEnded.acquire();
-    EXPECT_EQ(address.s_addr, 0U);
-    // The program may end while a resolver is still at work.
-    const StopSwitch later;
-    lookup =
-        std::async(std::launch::async, [&] { return LookUpHost("localhost", later.Fd(), &address, slow); });
-    resolving.acquire();
-    later.Stop();
-    EXPECT_EQ(lookup.get(), HostLookup::Stopped);
+    // The program may end while a resolver is still at work: the second one.
+    for (const bool resolverEnds : {true, false}) {
+        const StopSwitch stop;
+        auto lookup = std::async(std::launch::async,
+                                 [&] { return LookUpHost("localhost", stop.Fd(), &address, slow); });
+        resolving.acquire();
+        stop.Stop();
+        EXPECT_EQ(lookup.get(), HostLookup::Stopped);
+        if (resolverEnds) {
+            resolverMayEnd.release();
+            resolverEnded.acquire();
+            EXPECT_EQ(address.s_addr, 0U);
+        }
+    }
 }
 
 } // namespace

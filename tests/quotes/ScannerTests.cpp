@@ -45,10 +45,7 @@ TEST(QuoteScanner, ReadsThePriceBehindTheMarker) {
         std::string log;
     } cases[] = {
         {{"a Last Trade</td><td><b>45 3/8</b>"}, 3, 45.375F, found + "value string is '45'\n"},
-        {{"a Last Trade</td><td><b>45<sup>3</sup>/<sub>8</sub></b>"},
-         3,
-         45.375F,
-         found + "value string is '45'\n"},
+        {{"a Last</td><td><b>45<sup>3</sup>/<sub>8</sub></b>"}, 3, 45.375F, found + "value string is '45'\n"},
         {{"Last<b>45</b> and support follows"}, 1, NoQuote, found + "value string is '45'\n"},
         {{"Last<b>45</b> and no more"}, 1, 45, found + "value string is '45'\n"},
         {{"Last<b>12 3/0 </b>"}, 1, 12, found + "value string is '12'\n"},
@@ -66,10 +63,7 @@ TEST(QuoteScanner, ReadsThePriceBehindTheMarker) {
         {{"Last>\r\n45"}, 1, 0, found + "value string is '\r'\n"},
         // Of earlier pieces nothing but the marker and the count is known.
         {{"Last</td", "><", ">\n\t ", "<>7"}, 3, 7, found + "value string is '7'\n"},
-        {{"Last>", " \t\n<>", "7"},
-         1,
-         7,
-         found + "value string not found\nskipped ok\nvalue string is '7'\n"},
+        {{"Last>", " \t<>", "7"}, 1, 7, found + "value string not found\nskipped ok\nvalue string is '7'\n"},
         {{"La", "st>7"}, 1, NoQuote, ""},
         {{"La", "st>7", "Last>8"}, 1, 8, found + "value string is '8'\n"},
         // Any bytes: a NUL is one of them, but ends the text in which a fraction is looked for.

@@ -5,11 +5,8 @@
 #include <string>
 
 #include "LoopbackServer.h"
-#include "StopSwitch.h"
-#include "TemporaryFolder.h"
+#include "QuoteTest.h"
 #include "TlsServer.h"
-#include "quotes/QuoteRetrieval.h"
-#include "util/GatheredLog.h"
 
 namespace {
 
@@ -20,41 +17,29 @@ Reply Redirect(const std::string& address) {
     return {{"HTTP/1.0 302 Found\r\nLocation: " + address + "\r\nContent-Length: 0\r\n\r\n"}};
 }
 
-class Tls : public testing::Test {
+class Tls : public QuoteTest {
   protected:
     Tls() {
         setenv("no_proxy", "*", 1);
         identity_.WriteCertificate(caFile_);
         context_.caFile = caFile_.c_str();
-        context_.log = &log_;
-        context_.stopFd = stop_.Fd();
     }
 
     float Quote(const std::string& host, const char* path = "/q?s=ABC") {
-        log_.Write();
-        folder_.Write("log", "");
         return GetQuote(host.c_str(), path, "Last", 3, context_);
     }
-    [[nodiscard]] std::string Log() {
-        log_.Write();
-        return folder_.Read("log");
+    void ExpectFailure(const std::string& host, float result, const char* logged) {
+        EXPECT_EQ(Quote(host), result) << host;
+        const std::string log = Log();
+        EXPECT_NE(log.find(logged), std::string::npos) << log;
     }
-    [[nodiscard]] bool Logged(const std::string& text) { return Log().find(text) != std::string::npos; }
 
-    TemporaryFolder folder_;
     std::string caFile_ = folder_.File("ca.pem");
-    std::string logPath_ = folder_.File("log");
-    GatheredLog log_{logPath_.c_str()};
     TlsIdentity identity_{"IP:127.0.0.1"};
-    StopSwitch stop_;
-    QuoteContext context_;
 };
 
 TEST_F(Tls, APageIsScannedInOnePiece) {
-    std::vector<std::string> bytes;
-    for (const char byte : Page)
-        bytes.emplace_back(1, byte);
-    TlsServer server(identity_, [&](const std::string&) { return Reply{bytes}; });
+    TlsServer server(identity_, [&](const std::string&) { return Reply{SingleBytes(Page)}; });
     EXPECT_EQ(Quote(server.Host(), "q?s=B C#\xC3\xA4%20\n"), 45.375F);
     EXPECT_TRUE(server.Server().Requests().at(0).starts_with("GET /q?s=B%20C%23%C3%A4%20%0A HTTP/1.1\r\n"));
     EXPECT_EQ(Log(), "In GetQuote\nconnected to 127.0.0.1 port " + std::to_string(server.Server().Port()) +
@@ -94,7 +79,8 @@ TEST_F(Tls, WhatTheServerRefusesIsNoPrice) {
     for (const auto& c : cases) {
         redirects = c.redirects;
         EXPECT_EQ(Quote(server.Host(), c.path), c.price) << c.path;
-        EXPECT_TRUE(Logged(c.log)) << Log();
+        const std::string log = Log();
+        EXPECT_NE(log.find(c.log), std::string::npos) << log;
     }
     EXPECT_TRUE(plain.Requests().empty());
 }
@@ -104,24 +90,19 @@ TEST_F(Tls, AConnectionThatCannotBeTrustedIsAFailure) {
     const TlsIdentity stranger("IP:127.0.0.1");
     const TlsIdentity otherName("DNS:quotes.example");
     TlsServer unknown(stranger, answer);
-    EXPECT_EQ(Quote(unknown.Host()), QuoteNetworkFailure);
-    EXPECT_TRUE(Logged("https error: SSL certificate problem")) << Log();
+    ExpectFailure(unknown.Host(), QuoteNetworkFailure, "https error: SSL certificate problem");
     TlsServer misnamed(otherName, answer);
     otherName.WriteCertificate(caFile_);
-    EXPECT_EQ(Quote(misnamed.Host()), QuoteNetworkFailure);
-    EXPECT_TRUE(Logged("no alternative certificate subject name matches")) << Log();
+    ExpectFailure(misnamed.Host(), QuoteNetworkFailure, "no alternative certificate subject name matches");
     EXPECT_TRUE(unknown.Server().Requests().empty() && misnamed.Server().Requests().empty());
 }
 
 TEST_F(Tls, NoConnectionIsAFailureAndNoNameIsNoPrice) {
     const LoopbackSocket refusing;
-    EXPECT_EQ(Quote("https://" + refusing.Host()), QuoteNetworkFailure);
-    EXPECT_TRUE(Logged("https error: Failed to connect")) << Log();
-    EXPECT_EQ(Quote("https://no..such..host"), NoQuote);
-    EXPECT_TRUE(Logged("https error: Could not resolve host")) << Log();
+    ExpectFailure("https://" + refusing.Host(), QuoteNetworkFailure, "https error: Failed to connect");
+    ExpectFailure("https://no..such..host", NoQuote, "https error: Could not resolve host");
     TlsServer broken(identity_, [](const std::string&) { return Reply{{Page}, Reply::End::Reset}; });
-    EXPECT_EQ(Quote(broken.Host()), QuoteNetworkFailure);
-    EXPECT_TRUE(Logged("https error: ")) << Log();
+    ExpectFailure(broken.Host(), QuoteNetworkFailure, "https error: ");
 }
 
 TEST_F(Tls, StopsAtOnceWhereverTheServerIs) {
