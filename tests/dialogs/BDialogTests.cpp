@@ -1,14 +1,13 @@
 // The modal dialog base, worked with real events while its caller waits.
 #include "Driver.h"
-
-#include <QLineEdit>
+#include "Worker.h"
 
 #include <atomic>
 
 #include "dialogs/BDialog.h"
 #include "platform/Button.h"
 #include "platform/Font.h"
-#include "platform/Kernel.h"
+#include "platform/Stage.h"
 #include "platform/TextControl.h"
 #include "util/InterfaceHelpers.h"
 
@@ -48,10 +47,6 @@ class TestDialog : public BDialog {
 
 QWidget* Shown() {
     return Driver::Window("Test");
-}
-
-void PressKey(Qt::Key key) {
-    QTest::keyClick(QApplication::focusWidget(), key);
 }
 
 bool FieldHasFocus() {
@@ -94,10 +89,10 @@ TEST(BDialog, EveryWayOutHasItsResult) {
         int confirmed;
         std::function<void()> way;
     } cases[] = {
-        {"Enter in the field", DialogOk, 1, [] { PressKey(Qt::Key_Return); }},
+        {"Enter in the field", DialogOk, 1, [] { Driver::Key(Qt::Key_Return); }},
         {"the Ok button", DialogOk, 1, [] { Driver::Press(Shown(), "Ok button"); }},
         {"the Cancel button", DialogCancel, 0, [] { Driver::Press(Shown(), "cancel button"); }},
-        {"Escape", DialogCancel, 0, [] { PressKey(Qt::Key_Escape); }},
+        {"Escape", DialogCancel, 0, [] { Driver::Key(Qt::Key_Escape); }},
         {"the close box", DialogCancel, 0, [] { Shown()->close(); }},
         {"a control that ends it", DialogOk, 0, [] { Driver::Press(Shown(), "done"); }},
     };
@@ -115,109 +110,68 @@ TEST(BDialog, ARefusedOkKeepsItOpenAsItIs) {
     const BApplication application("test");
     TestDialog::accepts = false;
     Driver driver;
-    driver.When("dialog", FieldHasFocus, [] { QTest::keyClicks(QApplication::focusWidget(), "more"); })
-        .When("typed", FieldHasFocus, [] { PressKey(Qt::Key_Return); })
+    driver.When("dialog", FieldHasFocus, [] { Driver::Type("more", Qt::Key_Return); })
         .When(
             "refused", [] { return TestDialog::confirmed == 1; }, [] { Driver::Press(Shown(), "ignored"); })
-        .When(
-            "still shown", [] { return Shown() != nullptr; },
-            [] {
-                EXPECT_EQ(Shown()->findChild<QLineEdit*>("field")->text(), "more");
-                PressKey(Qt::Key_Escape);
-            });
+        .When("still shown", Shown, [] {
+            EXPECT_EQ(Shown()->findChild<QLineEdit*>("field")->text(), "more");
+            Driver::Key(Qt::Key_Escape);
+        });
     EXPECT_EQ((new TestDialog)->DoModal(), DialogCancel);
     EXPECT_EQ(TestDialog::confirmed, 1);
     ExpectGone();
 }
 
 TEST(BDialog, TheCallersWindowWaitsButPaints) {
-    BApplication application("test");
-    static constexpr uint32 Run = 1;
-    static constexpr uint32 Later = 2;
-    struct Caller : BWindow {
-        struct Painted : BView {
-            using BView::BView;
-            void Draw(BRect) override { paints++; }
-            int paints = 0;
-        };
-        Caller() : BWindow({10, 10, 200, 200}, "Caller", B_TITLED_WINDOW, 0) {
-            view = new Painted(Bounds(), "", B_FOLLOW_ALL_SIDES, B_WILL_DRAW);
-            AddChild(view);
-        }
-        void MessageReceived(BMessage* message) override {
-            if (message->what == Run)
-                result = (new TestDialog)->DoModal();
-            else if (message->what == Later)
-                laterCameAt = result;
-            else
-                BWindow::MessageReceived(message);
-        }
-        Painted* view;
-        uint32 result = 0;
-        uint32 laterCameAt = 0;
+    struct Painted : BView {
+        using BView::BView;
+        void Draw(BRect) override { paints++; }
+        int paints = 0;
     };
-    auto* caller = new Caller;
-    caller->Show();
-    caller->PostMessage(Run);
+    Stage stage;
+    auto* view = stage.Add(new Painted(BRect(0, 0, 99, 99), "", B_FOLLOW_ALL_SIDES, B_WILL_DRAW));
+    uint32 result = 0;
+    stage.window->inside = [&](uint32 code) {
+        if (code == 1)
+            result = (new TestDialog)->DoModal();
+        else
+            EXPECT_EQ(result, DialogOk); // a message that came meanwhile has waited
+    };
+    stage.Show();
+    stage.window->PostMessage(1);
     int before = 0;
     Driver driver;
-    driver
-        .When("dialog", FieldHasFocus,
-              [&] {
-                  before = caller->view->paints;
-                  caller->view->Invalidate();
-                  caller->PostMessage(Later);
-              })
-        .When(
-            "a paint pass", [&] { return caller->view->paints > before; },
-            [&] {
-                EXPECT_EQ(caller->laterCameAt, 0U);
-                PressKey(Qt::Key_Return);
-            })
-        .When(
-            "the message that waited", [&] { return caller->laterCameAt != 0; },
-            [&] {
-                EXPECT_EQ(caller->laterCameAt, DialogOk);
-                application.PostMessage(B_QUIT_REQUESTED);
-            });
-    application.Run();
+    driver.When("dialog", FieldHasFocus, [&] {
+        before = view->paints;
+        view->Invalidate();
+        stage.window->PostMessage(2);
+    });
+    driver.When(
+        "a paint pass", [&] { return view->paints > before; }, [] { Driver::Key(Qt::Key_Return); });
+    EXPECT_EQ(stage.Received(2), (Codes{1, 2}));
 }
 
-// A worker's DoModal; result is there once Done says so.
-struct Worker {
-    explicit Worker(BDialog* d) : dialog(d) {
-        id = spawn_thread(
-            [](void* data) {
-                auto* self = static_cast<Worker*>(data);
-                self->result = self->dialog->DoModal();
-                return int32{0};
-            },
-            "worker", B_NORMAL_PRIORITY, this);
-        resume_thread(id);
+TEST(BDialog, AWorkerCanRunOneAndItsStopEndsIt) {
+    const BApplication application("test");
+    for (const bool stopped : {false, true}) {
+        TestDialog::destroyed = 0;
+        std::atomic<uint32> result = 0;
+        auto* dialog = new TestDialog;
+        Driver driver;
+        const Worker worker([&] {
+            result = dialog->DoModal();
+            return 0;
+        });
+        driver.When("dialog", FieldHasFocus, [&] {
+            if (stopped)
+                kill_thread(worker.Id());
+            else
+                Driver::Key(Qt::Key_Return);
+        });
+        EXPECT_TRUE(QTest::qWaitFor([&] { return result != 0; }));
+        EXPECT_EQ(result, stopped ? DialogCancel : DialogOk);
+        ExpectGone();
     }
-    BDialog* dialog;
-    std::atomic<uint32> result = 0;
-    thread_id id;
-};
-
-TEST(BDialog, AWorkerCanRunOne) {
-    const BApplication application("test");
-    Driver driver;
-    driver.When("dialog", FieldHasFocus, [] { PressKey(Qt::Key_Return); });
-    Worker worker(new TestDialog);
-    EXPECT_TRUE(QTest::qWaitFor([&] { return worker.result != 0; }));
-    EXPECT_EQ(worker.result, DialogOk);
-    ExpectGone();
-}
-
-TEST(BDialog, AStoppedWorkerTakesItsDialogAlong) {
-    const BApplication application("test");
-    Driver driver;
-    Worker worker(new TestDialog);
-    driver.When("dialog", FieldHasFocus, [&] { kill_thread(worker.id); });
-    EXPECT_TRUE(QTest::qWaitFor([&] { return worker.result != 0; }));
-    EXPECT_EQ(worker.result, DialogCancel);
-    ExpectGone();
 }
 
 TEST(BDialog, TheApplicationsQuitEndsIt) {

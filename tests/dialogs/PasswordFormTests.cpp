@@ -1,7 +1,7 @@
 // The settings dialog and the start-up password dialog, and the helpers over alerts.
 #include "Driver.h"
 
-#include <QLineEdit>
+#include <filesystem>
 
 #include "TemporaryFolder.h"
 #include "app/AppState.h"
@@ -15,25 +15,28 @@ namespace {
 
 constexpr uint16 Both = DialogHasOk | DialogHasCancel;
 
-bool FieldHasFocus() {
-    const auto* field = qobject_cast<QLineEdit*>(QApplication::focusWidget());
-    return field && field->objectName() == "text control";
-}
+// Types over what is selected, as soon as the keyboard is in the field, then presses the key.
+class Typist : public Driver {
+  public:
+    void Enter(const char* text, Qt::Key key) {
+        When(
+            "the field", [] { return Field() && Field()->objectName() == "text control"; },
+            [this, text, key] {
+                shown_ = Field()->text().toStdString();
+                EXPECT_EQ(Field()->echoMode(), QLineEdit::Normal);
+                EXPECT_EQ(Field()->selectedText(), Field()->text());
+                Key(Qt::Key_Backspace);
+                Type(text, key);
+            });
+    }
+    // What was in the field before.
+    [[nodiscard]] const std::string& Shown() const { return shown_; }
 
-// Types over what is selected, then presses the key.
-Driver::Action Type(const char* text, Qt::Key key) {
-    return [text, key] {
-        auto* field = qobject_cast<QLineEdit*>(QApplication::focusWidget());
-        EXPECT_EQ(field->echoMode(), QLineEdit::Normal);
-        EXPECT_EQ(field->selectedText(), field->text());
-        QTest::keyClick(field, Qt::Key_Backspace);
-        for (const QChar letter : QString::fromUtf8(text))
-            QTest::sendKeyEvent(QTest::Click, field, Qt::Key_unknown, QString(letter), Qt::NoModifier);
-        QTest::keyClick(field, key);
-    };
-}
+  private:
+    std::string shown_;
+};
 
-class SettingsDialogTest : public testing::Test {
+class SettingsDialogTest : public testing::Test, protected Typist {
   protected:
     SettingsDialogTest() {
         CopyText(state_.settingsPath, folder_.File("Quorvan.ini"));
@@ -41,52 +44,47 @@ class SettingsDialogTest : public testing::Test {
     }
     ~SettingsDialogTest() override { app_state = nullptr; }
 
-    // The settings after the text was typed into the dialog on settings as given.
-    std::string After(const char* before, const char* typed, Qt::Key key) {
-        folder_.Write("Quorvan.ini", before);
-        Driver driver;
-        driver.When("settings dialog", FieldHasFocus, Type(typed, key));
-        (new SettingsDialog({100, 100}, Both))->DoModal();
-        return folder_.Read("Quorvan.ini");
-    }
-
     BApplication application_{"test"};
     AppState state_;
     TemporaryFolder folder_;
 };
 
 TEST_F(SettingsDialogTest, OkWritesAndCancelDoesNot) {
-    EXPECT_EQ(After("[GENERAL]\nPassword=abc\n", "new one", Qt::Key_Return), "[GENERAL]\nPassword=new one\n");
-    EXPECT_EQ(After("[GENERAL]\n", "blank ", Qt::Key_Return), "[GENERAL]\nPassword=blank\n");
-    EXPECT_EQ(After("[GENERAL]\nPassword=abc\n", "", Qt::Key_Return), "[GENERAL]\nPassword=\n");
-    EXPECT_EQ(After("[GENERAL]\nPassword=abc\n", "new", Qt::Key_Escape), "[GENERAL]\nPassword=abc\n");
-    EXPECT_EQ(After("[DISPLAY]\n", "abc", Qt::Key_Return), "[DISPLAY]\n[GENERAL]\nPassword=abc\n");
-    // Fifteen bytes, cut between whole characters.
-    EXPECT_EQ(After("[GENERAL]\n", "0123456789abcdefgh", Qt::Key_Return),
-              "[GENERAL]\nPassword=0123456789abcde\n");
-    EXPECT_EQ(After("[GENERAL]\n", "0123456789abcd\xC3\xA4", Qt::Key_Return),
-              "[GENERAL]\nPassword=0123456789abcd\n");
+    const struct {
+        std::string before;
+        const char* typed;
+        Qt::Key key;
+        std::string after;
+    } cases[] = {
+        {"[GENERAL]\nPassword=abc\n", "new one", Qt::Key_Return, "[GENERAL]\nPassword=new one\n"},
+        {"[GENERAL]\n", "blank ", Qt::Key_Return, "[GENERAL]\nPassword=blank\n"},
+        {"[GENERAL]\nPassword=abc\n", "", Qt::Key_Return, "[GENERAL]\nPassword=\n"},
+        {"[GENERAL]\nPassword=abc\n", "new", Qt::Key_Escape, "[GENERAL]\nPassword=abc\n"},
+        {"[DISPLAY]\n", "abc", Qt::Key_Return, "[DISPLAY]\n[GENERAL]\nPassword=abc\n"},
+        // Fifteen bytes, cut between whole characters.
+        {"[GENERAL]\n", "0123456789abcdefgh", Qt::Key_Return, "[GENERAL]\nPassword=0123456789abcde\n"},
+        {"[GENERAL]\n", "0123456789abcd\xC3\xA4", Qt::Key_Return, "[GENERAL]\nPassword=0123456789abcd\n"},
+        {"", "abc", Qt::Key_Return, ""}, // there is no file, and none is made
+    };
+    for (const auto& each : cases) {
+        std::filesystem::remove(folder_.File("Quorvan.ini"));
+        if (!each.before.empty())
+            folder_.Write("Quorvan.ini", each.before);
+        Enter(each.typed, each.key);
+        EXPECT_EQ((new SettingsDialog({100, 100}, Both))->DoModal(),
+                  each.key == Qt::Key_Return ? DialogOk : DialogCancel);
+        EXPECT_EQ(folder_.Read("Quorvan.ini"), each.after) << each.before << each.typed;
+        EXPECT_EQ(folder_.Has("Quorvan.ini"), !each.before.empty());
+    }
 }
 
 TEST_F(SettingsDialogTest, ShowsWhatIsStored) {
     folder_.Write("Quorvan.ini", "[GENERAL]\nPassword=0123456789abcdefgh\n");
-    std::string shown;
-    Driver driver;
-    driver.When("settings dialog", FieldHasFocus, [&] {
-        shown = qobject_cast<QLineEdit*>(QApplication::focusWidget())->text().toStdString();
-        QTest::keyClick(QApplication::focusWidget(), Qt::Key_Escape);
-    });
+    Enter("", Qt::Key_Escape);
     auto* dialog = new SettingsDialog({100, 120}, Both);
     EXPECT_EQ(dialog->Frame(), BRect(100, 120, 300, 120 + std::floor(7 * GetFontHeight(be_bold_font))));
     EXPECT_EQ(dialog->DoModal(), DialogCancel);
-    EXPECT_EQ(shown, "0123456789abcde");
-}
-
-TEST_F(SettingsDialogTest, WithoutASettingsFileNothingIsMade) {
-    Driver driver;
-    driver.When("settings dialog", FieldHasFocus, Type("abc", Qt::Key_Return));
-    EXPECT_EQ((new SettingsDialog({100, 100}, Both))->DoModal(), DialogOk);
-    EXPECT_FALSE(folder_.Has("Quorvan.ini"));
+    EXPECT_EQ(Shown(), "0123456789abcde");
 }
 
 TEST(PasswordDialog, HandsBackWhatWasTyped) {
@@ -104,16 +102,13 @@ TEST(PasswordDialog, HandsBackWhatWasTyped) {
     };
     for (const auto& each : cases) {
         char answer[PasswordSize] = "first";
-        Driver driver;
-        driver.When("password dialog", FieldHasFocus, Type(each.typed, each.key));
-        EXPECT_EQ((new PasswordDialog({300, 200}, answer, Both))->DoModal(), each.result);
+        Typist typist;
+        typist.Enter(each.typed, each.key);
+        auto* dialog = new PasswordDialog({300, 200}, answer, Both);
+        EXPECT_EQ(dialog->Frame().LeftTop(), BPoint(200, std::floor(200 - 3 * GetFontHeight(be_bold_font))));
+        EXPECT_EQ(dialog->DoModal(), each.result);
         EXPECT_STREQ(answer, each.answer);
     }
-    char answer[PasswordSize] = "";
-    auto* dialog = new PasswordDialog({300, 200}, answer, Both);
-    EXPECT_EQ(dialog->Frame().left, 200);
-    EXPECT_EQ(dialog->Frame().top, std::floor(200 - 3 * GetFontHeight(be_bold_font)));
-    dialog->Quit();
 }
 
 TEST(InterfaceHelpers, AlertsAnswer) {

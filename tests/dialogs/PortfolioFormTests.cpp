@@ -22,25 +22,7 @@ namespace {
 
 constexpr uint16 Both = DialogHasOk | DialogHasCancel;
 
-void TypeInto(QWidget* field, const char* text) {
-    for (const QChar letter : QString::fromUtf8(text))
-        QTest::sendKeyEvent(QTest::Click, field, Qt::Key_unknown, QString(letter), Qt::NoModifier);
-}
-
-// Types over the whole of the field that has the focus.
-void TypeOver(const char* text) {
-    auto* field = qobject_cast<QLineEdit*>(QApplication::focusWidget());
-    ASSERT_TRUE(field);
-    field->selectAll();
-    QTest::keyClick(field, Qt::Key_Backspace);
-    TypeInto(field, text);
-}
-
-void Key(Qt::Key key) {
-    QTest::keyClick(QApplication::focusWidget(), key);
-}
-
-class FormTest : public testing::Test {
+class FormTest : public testing::Test, protected Driver {
   protected:
     FormTest() {
         state_.portfolios = std::make_unique<DATABASE>(folder_.File("portfol.db").c_str());
@@ -56,17 +38,20 @@ class FormTest : public testing::Test {
         state_.categories->Append(&record);
     }
 
+    // A step as soon as the keyboard is in a field of the dialog with this title.
+    void In(const char* title, Action action) {
+        When(
+            title,
+            [title] {
+                return Window(title) && QApplication::activeModalWidget() == Window(title) && Field();
+            },
+            std::move(action));
+    }
+
     BApplication application_{"test"};
     DataFolder folder_;
     AppState state_;
 };
-
-Driver::Condition FocusIn(const char* title) {
-    return [title] {
-        return QApplication::activeModalWidget() == Driver::Window(title) && Driver::Window(title) &&
-               qobject_cast<QLineEdit*>(QApplication::focusWidget());
-    };
-}
 
 TEST_F(FormTest, ALargeFontLeavesRoomForButtonsAndFields) {
     const BFont* usual = be_plain_font;
@@ -87,76 +72,54 @@ TEST_F(FormTest, ALargeFontLeavesRoomForButtonsAndFields) {
 
 TEST_F(FormTest, APortfolioNameIsNewAndFitsItsRecord) {
     ASSERT_TRUE(AddPortfolio(*state_.portfolios, "growth"));
+    const char* add = "Add a Portfolio";
+    In(add, [] { Key(Qt::Key_Return); });
+    Answer("Invalid portfolio name!", "Ok");
+    In(add, [] { TypeOver("Growth", Qt::Key_Return); });
+    Answer("Portfolio name already exists!", "Ok");
+    In(add, [] { TypeOver("Growth Fund 0123456789012345678\xC3\xBC", Qt::Key_Return); });
     char name[NameSize] = "";
-    Driver driver;
-    const char* title = "Add a Portfolio";
-    driver.When("the empty form", FocusIn(title), [] { Key(Qt::Key_Return); })
-        .Answer("Invalid portfolio name!", "Ok")
-        .When("a taken name", FocusIn(title),
-              [] {
-                  TypeOver("Growth");
-                  Key(Qt::Key_Return);
-              })
-        .Answer("Portfolio name already exists!", "Ok")
-        .When("a long name", FocusIn(title), [] {
-            TypeOver("Growth Fund 0123456789012345678\xC3\xBC");
-            Key(Qt::Key_Return);
-        });
-    EXPECT_EQ((new PortfolioAddDialog(50, 50, title, name, state_.portfolios.get()))->DoModal(), DialogOk);
+    EXPECT_EQ((new PortfolioAddDialog(50, 50, add, name, state_.portfolios.get()))->DoModal(), DialogOk);
     EXPECT_STREQ(name, "Growth Fund 0123456789012345678");
 
+    const char* edit = "Edit Portfolio";
+    In(edit, [] { Key(Qt::Key_Return); }); // unchanged
+    Answer("Portfolio name already exists!", "Ok");
+    In(edit, [] { TypeOver("Else", Qt::Key_Escape); });
     char present[NameSize] = "growth";
-    driver.When("unchanged", FocusIn("Edit Portfolio"), [] { Key(Qt::Key_Return); })
-        .Answer("Portfolio name already exists!", "Ok")
-        .When("cancelled", FocusIn("Edit Portfolio"), [] {
-            TypeOver("Else");
-            Key(Qt::Key_Escape);
-        });
-    EXPECT_EQ(
-        (new PortfolioEditDialog(50, 50, "Edit Portfolio", present, state_.portfolios.get()))->DoModal(),
-        DialogCancel);
+    EXPECT_EQ((new PortfolioEditDialog(50, 50, edit, present, state_.portfolios.get()))->DoModal(),
+              DialogCancel);
     EXPECT_STREQ(present, "growth");
 }
 
 TEST_F(FormTest, AnInvestmentIsEnteredByKeyboardAlone) {
-    AddEntry("Type", "Stock");
     AddEntry("Agent", "Bank");
-    AddEntry("Type", "Fund");
-    INVESTMENT_DATA record{};
-    Driver driver;
+    AddEntry("Type", "Stock");
     const char* title = "Add an Investment";
-    driver.When("no name", FocusIn(title), [] { Key(Qt::Key_Return); })
-        .Answer("You must enter a Name!", "Ok")
-        .When("the form", FocusIn(title),
-              [] {
-                  TypeOver("M\xC3\xBCller & Co");
-                  for (const char* text : {"LONGTICKER", "my type"}) {
-                      Key(Qt::Key_Tab);
-                      TypeOver(text);
-                  }
-                  Key(Qt::Key_Tab); // to the types, left alone
-                  for (const char* text : {"1e39", "10"}) {
-                      Key(Qt::Key_Tab);
-                      TypeOver(text);
-                  }
-                  Key(Qt::Key_Return);
-              })
-        .Answer("Shares or price is too large!", "Ok")
-        .When("corrected badly", FocusIn(title),
-              [title] {
-                  Driver::Window(title)->findChild<QLineEdit*>("shares control")->setFocus();
-                  TypeOver("2,5");
-                  Key(Qt::Key_Return);
-              })
-        .Answer("Shares or price is not a plain number such as 1250.5!", "Ok")
-        .When("corrected", FocusIn(title), [title] {
-            Driver::Window(title)->findChild<QLineEdit*>("shares control")->setFocus();
-            TypeOver("2.5");
-            auto* retirement = Driver::Window(title)->findChild<QCheckBox*>("retirement check");
-            retirement->setFocus();
-            Key(Qt::Key_Space);
-            Key(Qt::Key_Return);
-        });
+    In(title, [] { Key(Qt::Key_Return); });
+    Answer("You must enter a Name!", "Ok");
+    In(title, [] {
+        TypeOver("M\xC3\xBCller & Co", Qt::Key_Tab);
+        TypeOver("LONGTICKER", Qt::Key_Tab);
+        TypeOver("my type", Qt::Key_Tab);
+        Key(Qt::Key_Tab); // over the types
+        TypeOver("1e39", Qt::Key_Tab);
+        TypeOver("10", Qt::Key_Return);
+    });
+    Answer("Shares or price is too large!", "Ok");
+    In(title, [title] {
+        Window(title)->findChild<QLineEdit*>("shares control")->setFocus();
+        TypeOver("2,5", Qt::Key_Return);
+    });
+    Answer("Shares or price is not a plain number such as 1250.5!", "Ok");
+    In(title, [title] {
+        Window(title)->findChild<QLineEdit*>("shares control")->setFocus();
+        TypeOver("2.5");
+        Window(title)->findChild<QCheckBox*>("retirement check")->setFocus();
+        Key(Qt::Key_Space);
+        Key(Qt::Key_Return);
+    });
+    INVESTMENT_DATA record{};
     EXPECT_EQ((new InvestmentDialog(50, 50, title, &record, Both))->DoModal(), DialogOk);
     EXPECT_STREQ(record.Name, "M\xC3\xBCller & Co");
     EXPECT_STREQ(record.Ticker, "LONGTIC");
@@ -181,25 +144,24 @@ TEST_F(FormTest, TheFormShowsTheRecordAndPickListsFillTheirFields) {
     record.QuoteError = 1;
     const char* title = "Edit this Investment";
     std::vector<std::string> shown;
-    Driver driver;
-    const auto field = [title](const char* name) {
-        return Driver::Window(title)->findChild<QLineEdit*>(name);
-    };
-    driver.When("the form", FocusIn(title), [&] {
+    const auto field = [title](const char* name) { return Window(title)->findChild<QLineEdit*>(name); };
+    In(title, [&] {
         for (const char* name : {"name control", "ticker control", "type control", "shares control",
                                  "price control", "agent control"})
             shown.push_back(field(name)->text().toStdString());
-        for (const QPushButton* button : Driver::Window(title)->findChildren<QPushButton*>())
-            if (button->menu())
-                for (QAction* action : button->menu()->actions())
-                    if (action->isChecked())
-                        shown.push_back(action->objectName().toStdString());
-        for (const QPushButton* button : Driver::Window(title)->findChildren<QPushButton*>())
-            if (button->menu() && button->menu()->actions().back()->objectName() == "Fund")
-                button->menu()->actions().back()->trigger();
+        QAction* fund = nullptr;
+        for (const QPushButton* button : Window(title)->findChildren<QPushButton*>())
+            for (QAction* action : button->menu() ? button->menu()->actions() : QList<QAction*>()) {
+                if (action->isChecked())
+                    shown.push_back(action->objectName().toStdString());
+                if (action->objectName() == "Fund")
+                    fund = action;
+            }
+        ASSERT_TRUE(fund);
+        fund->trigger();
     });
-    driver.When(
-        "the picked type", [&] { return Driver::Window(title) && field("type control")->text() == "Fund"; },
+    When(
+        "the picked type", [&] { return Window(title) && field("type control")->text() == "Fund"; },
         [] { Key(Qt::Key_Return); });
     EXPECT_EQ((new InvestmentDialog(50, 50, title, &record, Both))->DoModal(), DialogOk);
     // No type is "stock" to the letter, so the first one stays marked.
