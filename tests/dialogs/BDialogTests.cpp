@@ -174,14 +174,20 @@ TEST(BDialog, AWorkerCanRunOneAndItsStopEndsIt) {
     }
 }
 
+// Also while a window's handler waits for it.
 TEST(BDialog, TheApplicationsQuitEndsIt) {
-    BApplication application("test");
+    Stage stage;
+    uint32 result = DialogOk;
+    stage.window->inside = [&](uint32) { result = (new TestDialog)->DoModal(); };
+    stage.Show();
+    stage.window->PostMessage(1);
     Driver driver;
-    driver.When("dialog", FieldHasFocus, [&] { application.PostMessage(B_QUIT_REQUESTED); });
-    EXPECT_EQ((new TestDialog)->DoModal(), DialogCancel);
+    driver.When("dialog", FieldHasFocus, [&] { stage.application.PostMessage(B_QUIT_REQUESTED); });
+    stage.application.Run();
+    EXPECT_EQ(result, DialogCancel);
     EXPECT_EQ(TestDialog::confirmed, 0);
-    application.Run();
-    ExpectGone();
+    EXPECT_EQ(TestDialog::destroyed, 1);
+    EXPECT_EQ(stage.application.CountWindows(), 0);
 }
 
 } // namespace

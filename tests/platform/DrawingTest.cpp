@@ -165,35 +165,3 @@ TEST(Views, FollowTheirParentsEdges) {
         window->Quit();
     }
 }
-
-TEST(Views, PressesComeAsMessagesWithTheirDetails) {
-    const BApplication application("test");
-    class Pressed : public BView {
-      public:
-        Pressed() : BView(BRect(10, 10, 59, 59), "pressed", B_FOLLOW_NONE, B_WILL_DRAW) {}
-        void MouseDown(BPoint where) override {
-            place = where;
-            Window()->CurrentMessage()->FindInt32("modifiers", &keys);
-            GetMouse(&place2, &buttons);
-        }
-        BPoint place, place2;
-        int32 keys = 0;
-        uint32 buttons = 0;
-    };
-    const Shown shown([](BView*) {});
-    auto* view = new Pressed;
-    shown.canvas->AddChild(view);
-    auto* widget = shown.Toolkit()->findChild<QWidget*>("pressed");
-    ASSERT_TRUE(widget);
-    QTest::mousePress(widget, Qt::LeftButton, Qt::ShiftModifier, QPoint(5, 7));
-    ASSERT_TRUE(QTest::qWaitFor([&] { return view->place == BPoint(5, 7); }));
-    EXPECT_EQ(view->keys, static_cast<int32>(B_SHIFT_KEY));
-    EXPECT_EQ(view->buttons, B_PRIMARY_MOUSE_BUTTON);
-    QTest::mouseMove(widget, QPoint(30, 31));
-    QTest::mouseRelease(widget, Qt::LeftButton, Qt::NoModifier, QPoint(30, 31));
-    BPoint where;
-    uint32 buttons = 9;
-    view->GetMouse(&where, &buttons);
-    EXPECT_EQ(where, BPoint(30, 31));
-    EXPECT_EQ(buttons, 0U);
-}

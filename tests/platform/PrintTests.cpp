@@ -5,10 +5,7 @@
 #include <memory>
 #include <sys/resource.h>
 
-#include <QDialog>
 #include <QImage>
-#include <QRadioButton>
-#include <QTimer>
 
 #include "Pdf.h"
 #include "Stage.h"
@@ -188,25 +185,4 @@ TEST_F(PrintJobs, LeaveFilesAsTheyWereUnlessAllIsWritten) {
     EXPECT_TRUE(folder.Read("old.pdf").starts_with("%PDF"));
     EXPECT_EQ(std::filesystem::status(folder.File("old.pdf")).permissions(), std::filesystem::perms{0640});
     EXPECT_EQ(files(), 3);
-}
-
-TEST_F(PrintJobs, AskThroughTheToolkitsDialogs) {
-    for (const bool accepted : {true, false}) {
-        BPrintJob job("Quorvan");
-        const auto answer = [&](const char* name) {
-            QTimer::singleShot(50, qApp, [accepted, name] {
-                auto* dialog = qobject_cast<QDialog*>(QApplication::activeModalWidget());
-                ASSERT_TRUE(dialog);
-                EXPECT_EQ(dialog->objectName(), name);
-                if (auto* landscape = dialog->findChild<QRadioButton*>("landscape"))
-                    landscape->click();
-                accepted ? dialog->accept() : dialog->reject();
-            });
-        };
-        answer("page setup dialog");
-        EXPECT_EQ(job.ConfigPage(), accepted ? B_OK : B_ERROR);
-        EXPECT_EQ(job.PaperRect().Width() > job.PaperRect().Height(), accepted);
-        answer("print dialog");
-        EXPECT_EQ(job.ConfigJob(), accepted ? B_OK : B_ERROR);
-    }
 }

@@ -1,7 +1,6 @@
 #include <gtest/gtest.h>
 
 #include <future>
-#include <optional>
 #include <semaphore>
 #include <string>
 #include <vector>
@@ -170,17 +169,6 @@ TEST_F(Retrieval, ReadsEachPieceAsItArrives) {
         context_.observer = &steps;
         EXPECT_EQ(GetQuote(server.Host().c_str(), "/", tag, skip, context_), scanner.Price()) << pieces[0];
     }
-}
-
-TEST_F(Retrieval, APlainNameIsAskedOnPort80) {
-    std::optional<LoopbackServer> server;
-    try {
-        server.emplace([](const std::string&) { return Reply{{Page}}; }, std::uint16_t{80});
-    } catch (const std::runtime_error&) {
-        GTEST_SKIP() << "port 80 cannot be had here";
-    }
-    EXPECT_EQ(Quote("net 127.0.0.1 /q?s= Last 3"), 45.375F);
-    EXPECT_EQ(Quote("net localhost /q?s= Last 3"), 45.375F);
 }
 
 // Stops the call once the server has the request, and waits until the server saw the connection end.
