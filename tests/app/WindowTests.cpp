@@ -216,31 +216,26 @@ TEST_F(MainWindow, SettingsHelpAndAboutOpen) {
     EXPECT_NE(Read("Quorvan.ini").find("[GENERAL]\nPassword=abc\n"), std::string::npos);
 }
 
-TEST(NorvelWindow, WhatWasCutOnlyGoesWhenThePersonSaysSo) {
+TEST_F(MainWindow, WhatWasCutOnlyGoesWhenThePersonSaysSo) {
     constexpr const char* question =
         "What you cut has not been pasted yet, and would be lost. Go on all the same?";
-    Program program;
-    program.AddPortfolio("P");
-    for (const char* name : {"a", "b", "c"})
-        program.AddInvestment(MakeInvestment("P", name));
-    const auto take = [&](uint32 command) {
-        program.Then("the first row", [] { Program::ClickRow(0); }).Send(command);
-    };
-    program.Expect({"a", "b", "c"});
-    take(1023);
-    program.Expect({"b", "c"});
-    take(1024);
-    program.Answer(question, "No");
-    program.Close().Answer(question, "No");
-    program.Then("quit", [] { be_app->PostMessage(B_QUIT_REQUESTED); }).Answer(question, "No");
-    program.Send(1025).Expect({"b", "c", "a"});
-    take(1023);
-    program.Expect({"c", "a"});
-    take(1023);
-    program.Answer(question, "Yes");
-    program.Expect({"a"}).Close().Answer(question, "Yes");
-    EXPECT_EQ(program.Run(), 0);
-    EXPECT_EQ(program.Investments(), Texts{"P/a"});
+    AddPortfolioOf("P", {"a", "b", "c"});
+    const auto take = [&](uint32 command) { Mark({0}).Send(command); };
+    Expect({"a", "b", "c"});
+    take(MessageInvestmentCut);
+    Expect({"b", "c"});
+    take(MessageInvestmentCopy);
+    Answer(question, "No");
+    Close().Answer(question, "No");
+    Then("quit", [] { be_app->PostMessage(B_QUIT_REQUESTED); }).Answer(question, "No");
+    Send(MessageInvestmentPaste).Expect({"b", "c", "a"});
+    take(MessageInvestmentCut);
+    Expect({"c", "a"});
+    take(MessageInvestmentCut);
+    Answer(question, "Yes");
+    Expect({"a"}).Close().Answer(question, "Yes");
+    EXPECT_EQ(Program::Run(), 0);
+    EXPECT_EQ(Investments(), Texts{"P/a"});
 }
 
 } // namespace
