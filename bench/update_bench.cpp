@@ -226,7 +226,7 @@ bool MakeFolder(const std::string& folder, const std::string& host, long records
             return false;
     }
     std::ofstream(folder + "/Quorvan.cfg") << "local " << host << " /quote/ Last 3\n";
-    std::ofstream(folder + "/Quorvan.ini") << "[GENERAL]\nIsConnectedURL=localhost\n[DISPLAY]\n";
+    std::ofstream(folder + "/Quorvan.ini") << "[GENERAL]\nIsConnectedURL=127.0.0.1\n[DISPLAY]\n";
     return true;
 }
 

@@ -25,7 +25,7 @@ INVESTMENT_DATA Holding(const char* ticker, float price, float previousPrice) {
 class PriceUpdate : public testing::Test, protected Program {
   protected:
     PriceUpdate() {
-        Write("Quorvan.ini", "[GENERAL]\nIsConnectedURL=localhost\n[DISPLAY]\n");
+        Write("Quorvan.ini", "[GENERAL]\nIsConnectedURL=127.0.0.1\n[DISPLAY]\n");
         Write("Quorvan.cfg", "local " + server_.Host() + " /quote/ Last 1\n");
         AddPortfolio("A");
         for (const char* ticker : {"RISE", "FALL", "SAME", "FAIL", "NEW"})
@@ -121,7 +121,7 @@ TEST_F(PriceUpdate, AsksForTheSelectedRowsThatHaveATicker) {
     EXPECT_EQ(Record(5).Price, 48200);
     EXPECT_EQ(Record(5).QuoteError, 0);
     const std::string log = Read("Quorvan.log");
-    EXPECT_EQ(log.find("Checked 'localhost', connection found ok\nChecking price for 'RISE'\n"), 0U) << log;
+    EXPECT_EQ(log.find("Checked '127.0.0.1', connection found ok\nChecking price for 'RISE'\n"), 0U) << log;
     EXPECT_NE(log.find("GetPriceQuote() returned -4.00\n"), std::string::npos) << log;
     EXPECT_EQ(server_.Requests().size(), 4U);
 }
@@ -150,8 +150,8 @@ TEST_F(PriceUpdate, EndsWithAnAlertWhenNobodyCanBeAsked) {
         const char* sources;
         const char* logged;
     } cases[] = {
-        {"[GENERAL]\nIsConnectedURL=localhost\n", nullptr, "Unable to open '"},
-        {"[GENERAL]\nIsConnectedURL=localhost\n", "reset 127.0.0.1:1 /a Last 1\n", "connect() error\n"},
+        {"[GENERAL]\nIsConnectedURL=127.0.0.1\n", nullptr, "Unable to open '"},
+        {"[GENERAL]\nIsConnectedURL=127.0.0.1\n", "reset 127.0.0.1:1 /a Last 1\n", "connect() error\n"},
         {"[GENERAL]\n", "", "Checked '', no connection found!\n"},
     };
     for (const auto& each : cases) {

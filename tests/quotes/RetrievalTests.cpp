@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include <future>
+#include <netdb.h>
 #include <semaphore>
 #include <string>
 #include <vector>
@@ -237,6 +238,8 @@ TEST_F(Retrieval, AsksNobodyWhenItIsToStopAlready) {
 }
 
 TEST_F(Retrieval, TheNetworkIsThereWhenANameResolves) {
+    if (!gethostbyname("localhost"))
+        GTEST_SKIP() << "this machine knows no name at all, not even its own";
     for (const int stopFd : {-1, stop_.Fd()})
         for (const auto& [name, there] :
              {std::pair{"localhost", true}, {"127.0.0.1", true}, {NoSuchHost, false}, {"", false}})
