@@ -165,3 +165,25 @@ TEST(Views, FollowTheirParentsEdges) {
         window->Quit();
     }
 }
+
+TEST(Views, PressesComeAsMessagesWithTheirDetails) {
+    const BApplication application("test");
+    class Pressed : public BView {
+      public:
+        Pressed() : BView(BRect(10, 10, 59, 59), "pressed", B_FOLLOW_NONE, B_WILL_DRAW) {}
+        void MouseDown(BPoint where) override {
+            place = where;
+            Window()->CurrentMessage()->FindInt32("modifiers", &keys);
+        }
+        BPoint place;
+        int32 keys = 0;
+    };
+    const Shown shown([](BView*) {});
+    auto* view = new Pressed;
+    shown.canvas->AddChild(view);
+    auto* widget = shown.Toolkit()->findChild<QWidget*>("pressed");
+    ASSERT_TRUE(widget);
+    QTest::mouseClick(widget, Qt::LeftButton, Qt::ShiftModifier, QPoint(5, 7));
+    ASSERT_TRUE(QTest::qWaitFor([&] { return view->place == BPoint(5, 7); }));
+    EXPECT_EQ(view->keys, static_cast<int32>(B_SHIFT_KEY));
+}

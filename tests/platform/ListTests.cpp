@@ -1,10 +1,12 @@
 // List views: rows, selection, keys, pointer, scrolling and drawing, against a plain model of what a list is.
 #include <algorithm>
+#include <cmath>
 #include <functional>
 #include <memory>
 #include <random>
 
 #include <QAccessible>
+#include <QImage>
 #include <QListView>
 #include <QScrollBar>
 
@@ -21,7 +23,14 @@ class Row : public BListItem {
   public:
     explicit Row(int32 n, float least = 20) : number(n), least_(least) {}
 
-    void DrawItem(BView*, BRect, bool) override {}
+    void DrawItem(BView* owner, BRect rect, bool) override {
+        drawn++;
+        where = rect;
+        owner->SetLowColor(IsSelected() ? rgb_color{178, 178, 178, 255} : rgb_color{255, 255, 255, 255});
+        owner->FillRectLow(rect);
+        owner->SetHighColor(255, 0, 0);
+        owner->FillRect(BRect(rect.left + 300, rect.top + 2, rect.left + 309, rect.top + 11));
+    }
     void Update(BView* owner, const BFont* font) override {
         BListItem::Update(owner, font);
         SetHeight(std::max(Height(), least_));
@@ -29,6 +38,8 @@ class Row : public BListItem {
     std::string AccessibleText() const override { return "row " + std::to_string(number); }
 
     int32 number;
+    int drawn = 0;
+    BRect where;
 
   private:
     float least_;
@@ -330,6 +341,28 @@ TEST(Lists, ScrollByWhateverMeansAndTellOnce) {
     stage.list->MakeEmpty();
     QTest::qWait(0);
     EXPECT_EQ(stage.list->Bounds().Width(), scroll->Bounds().Width());
+}
+
+TEST(Lists, DrawVisibleRowsWhereTheyLie) {
+    ListStage stage(1000);
+    stage.list->SetViewColor({1, 2, 3, 255});
+    stage.list->SetDataWidth(500);
+    stage.Show();
+    stage.list->ScrollTo(BPoint(250, 10));
+    for (const auto& row : stage.rows)
+        row->drawn = 0;
+    stage.list->Select(2);
+    const QImage picture = stage.Widget()->viewport()->grab().toImage();
+    EXPECT_EQ(
+        std::count_if(stage.rows.begin(), stage.rows.end(), [](const auto& row) { return row->drawn > 0; }),
+        std::ceil((stage.list->Bounds().Height() + 1 + 10) / 20));
+    EXPECT_EQ(stage.rows[1]->where, BRect(0, 20, 499, 39));
+    const auto color = [&](int x, int y) { return QColor(picture.pixel(x, y)); };
+    EXPECT_EQ(color(300 + 5 - 250, 20 + 5 - 10), QColor(255, 0, 0));
+    EXPECT_EQ(color(20, 20 + 5 - 10), QColor(255, 255, 255));
+    EXPECT_EQ(color(20, 40 + 10 - 10), QColor(178, 178, 178));
+    stage.list->RemoveItems(1, 999);
+    EXPECT_EQ(QColor(stage.Widget()->viewport()->grab().toImage().pixel(20, 60)), QColor(1, 2, 3));
 }
 
 TEST(Lists, LayOutRowsOfDifferentHeightsAndFollowTheFont) {
