@@ -190,6 +190,7 @@ TEST_F(Outline, ShowsWhatIsExpanded) {
                 list->AddUnder(NewRow({"e"}), a) && list->AddUnder(NewRow({"f"}), b));
     EXPECT_FALSE(list->AddUnder(d, a) || list->AddUnder(NewRow({"x"}), nullptr));
     EXPECT_EQ(FullList(), "acdebf");
+    EXPECT_EQ(list->FullListItemAt(6), nullptr);
     EXPECT_EQ(Shown(0), "aceb");
     EXPECT_TRUE(c->IsSuperItem());
     EXPECT_EQ(d->OutlineLevel(), 2U);

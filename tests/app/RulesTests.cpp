@@ -35,6 +35,7 @@ TEST(InvestmentTexts, APriceIsInFractionsForStocks) {
         {12.5F, "STOCK", "12 1/2"},
         {12.99F, "Stock Fund", "12 31/32"},
         {12.02F, "my stocks", "12"},
+        {12.04F, "stock", "12 1/32"},
         {10, "Stock", "10"},
         {0.5F, "stock", "0 1/2"},
         {8388607.5F, "stock", "8388607 1/2"},
@@ -190,7 +191,7 @@ TEST(PortfolioRules, ARenameTakesEveryInvestmentAlong) {
         // What the investments could not take must not be given to the portfolio alone.
         {"Alone", "", false},
         {"Alone", "a\tb", false},
-        {"Alone", "a name of more than 31 characters", false},
+        {"Alone", "a name of exactly 32 characters.", false},
     };
     for (const auto& each : cases)
         EXPECT_EQ(RenamePortfolio(folder.portfolios, folder.investments, each.from, each.to), each.done)
