@@ -53,7 +53,10 @@ class PriceUpdate : public testing::Test, protected Program {
     void ExpectUntouched(long number, const char* ticker) const {
         const INVESTMENT_DATA record = Record(number);
         const INVESTMENT_DATA before = Holding(ticker, 11, NoPreviousPrice);
-        EXPECT_EQ(std::memcmp(&record, &before, sizeof record), 0) << ticker;
+        const auto bytes = [](const INVESTMENT_DATA& data) {
+            return std::string(reinterpret_cast<const char*>(&data), sizeof data);
+        };
+        EXPECT_EQ(bytes(record), bytes(before)) << ticker;
     }
 
     std::string held_; // the server says nothing when it is asked for this ticker

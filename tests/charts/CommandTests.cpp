@@ -9,8 +9,6 @@
 
 namespace {
 
-namespace fs = std::filesystem;
-
 class ChartCommandTest : public testing::Test {
   protected:
     ChartCommandTest() {

@@ -70,6 +70,7 @@ TEST_F(TextTest, LinesAreAsDocumented) {
 // Several blocks, batches and lines across them.
 TEST_F(TextTest, WhatIsExportedLoadsBack) {
     std::vector<ROW> rows;
+    rows.reserve(20'001);
     for (int i = 0; i < 20'000; ++i) {
         rows.push_back(Row("row " + std::string(static_cast<std::size_t>(i % 11), 'x'), i % 7, i % 1000 - 500,
                            i * 1'000, static_cast<float>(i) / 4));

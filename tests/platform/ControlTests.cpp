@@ -179,25 +179,25 @@ TEST_F(TextControls, AreLaidOutByTheirDividerAndHeardOfAtTheirEnd) {
 TEST_F(TextControls, KeepToTheirBytesWhateverIsPutIn) {
     const struct {
         const char* name;
-        int32 limit;
         const char* before;
         int cursor;
         int selected; // characters from the cursor on that are replaced
         const char* pasted;
         const char* after;
         int cursorAfter;
+        int32 limit; // in bytes
     } cases[] = {
-        {"all of it fits", 8, "abcd", 4, 0, "efgh", "abcdefgh", 8},
-        {"the end of what is put in is cut", 6, "abcd", 4, 0, "xyz", "abcdxy", 6},
-        {"what was there stays", 6, "abcd", 1, 0, "xyz", "axybcd", 3},
-        {"equal letters around the cursor", 5, "aaaa", 0, 0, "aaa", "aaaaa", 1},
-        {"a replaced part makes room", 4, "abcd", 1, 2, "xyz", "axyd", 3},
-        {"no room at all", 4, "abcd", 2, 0, "x", "abcd", 2},
-        {"two-byte letters are kept whole", 5, "abcd", 4, 0, "\xC3\xA9", "abcd", 4},
-        {"four-byte letters are kept whole", 8, "abc", 3, 0, "\xF0\x9F\x98\x80\xF0\x9F\x98\x80",
-         "abc\xF0\x9F\x98\x80", 5},
-        {"an accent stays with its letter", 6, "abcd", 4, 0, "xe\xCC\x81", "abcdx", 5},
-        {"line ends and tabs become blanks", 31, "a", 1, 0, "b\nc\td\r", "ab c d ", 7},
+        {"all of it fits", "abcd", 4, 0, "efgh", "abcdefgh", 8, 8},
+        {"the end of what is put in is cut", "abcd", 4, 0, "xyz", "abcdxy", 6, 6},
+        {"what was there stays", "abcd", 1, 0, "xyz", "axybcd", 3, 6},
+        {"equal letters around the cursor", "aaaa", 0, 0, "aaa", "aaaaa", 1, 5},
+        {"a replaced part makes room", "abcd", 1, 2, "xyz", "axyd", 3, 4},
+        {"no room at all", "abcd", 2, 0, "x", "abcd", 2, 4},
+        {"two-byte letters are kept whole", "abcd", 4, 0, "\xC3\xA9", "abcd", 4, 5},
+        {"four-byte letters are kept whole", "abc", 3, 0, "\xF0\x9F\x98\x80\xF0\x9F\x98\x80",
+         "abc\xF0\x9F\x98\x80", 5, 8},
+        {"an accent stays with its letter", "abcd", 4, 0, "xe\xCC\x81", "abcdx", 5, 6},
+        {"line ends and tabs become blanks", "a", 1, 0, "b\nc\td\r", "ab c d ", 7, 31},
     };
     auto* text = Add(new BTextControl(BRect(10, 90, 300, 110), "text", "Text", "", nullptr));
     Show();
