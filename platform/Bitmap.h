@@ -23,7 +23,6 @@ class BBitmap {
     BBitmap& operator=(const BBitmap&) = delete;
 
     [[nodiscard]] BRect Bounds() const { return bounds_; }
-    [[nodiscard]] color_space ColorSpace() const { return space_; }
 
     // Copies length bytes of pixels, rows top to bottom without padding, to the byte offset given. In B_CMAP8
     // a pixel is one byte; in the other spaces four: blue, green, red, alpha. Bytes beyond the bitmap are

@@ -220,13 +220,6 @@ int32 BListView::CurrentSelection(int32 index) const {
     return ListAccess::Peer(*this).selection.Nth(index);
 }
 
-void BListView::ScrollToSelection() {
-    const ListPeer& peer = ListAccess::Peer(*this);
-    const int32 first = peer.selection.Nth(0);
-    if (first >= 0)
-        peer.Rows()->scrollTo(peer.model.index(first));
-}
-
 void BListView::SortItems(const std::function<int(const BListItem*, const BListItem*)>& compare) {
     ListPeer& peer = ListAccess::Peer(*this);
     std::vector<BListItem*> rows = peer.model.Rows();

@@ -88,8 +88,6 @@ class BListView : public BView, public BInvoker {
     // The index of the index-th selected row, counted from the top; -1 when fewer are selected. Asking for
     // one after the other costs no more than looking at each.
     [[nodiscard]] int32 CurrentSelection(int32 index = 0) const;
-    // Makes the first selected row visible.
-    void ScrollToSelection();
     // Called after the selection has changed.
     virtual void SelectionChanged() {}
 

@@ -54,11 +54,6 @@ bool BMenu::AddItem(BMenu* submenu) {
     return AddItem(item.get()) && item.release();
 }
 
-bool BMenu::AddSeparatorItem() {
-    auto item = std::make_unique<BSeparatorItem>();
-    return AddItem(item.get()) && item.release();
-}
-
 bool BMenu::RemoveItem(BMenuItem* item) {
     return RemoveItem(IndexOf(item)) != nullptr;
 }

@@ -20,7 +20,6 @@ class BMenu {
     bool AddItem(BMenuItem* item, int32 index);
     // A submenu under its own title; takes ownership of it.
     bool AddItem(BMenu* submenu);
-    bool AddSeparatorItem();
     // Hand the item back to the caller; false or null when it is not there.
     bool RemoveItem(BMenuItem* item);
     BMenuItem* RemoveItem(int32 index);

@@ -43,10 +43,6 @@ status_t BMessage::FindInt32(const char* name, int32* value, int32 index) const 
     return FindValue(name, index, value);
 }
 
-status_t BMessage::FindInt64(const char* name, int64* value, int32 index) const {
-    return FindValue(name, index, value);
-}
-
 status_t BMessage::FindFloat(const char* name, float* value, int32 index) const {
     return FindValue(name, index, value);
 }
@@ -57,12 +53,4 @@ status_t BMessage::FindBool(const char* name, bool* value, int32 index) const {
 
 status_t BMessage::FindPoint(const char* name, BPoint* value, int32 index) const {
     return FindValue(name, index, value);
-}
-
-status_t BMessage::RemoveName(const char* name) {
-    const auto field = fields_.find(name);
-    if (field == fields_.end())
-        return B_NAME_NOT_FOUND;
-    fields_.erase(field);
-    return B_OK;
 }

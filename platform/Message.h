@@ -34,7 +34,6 @@ class BMessage {
 
     status_t AddString(const char* name, const char* value) { return Add(name, std::string(value)); }
     status_t AddInt32(const char* name, int32 value) { return Add(name, value); }
-    status_t AddInt64(const char* name, int64 value) { return Add(name, value); }
     status_t AddFloat(const char* name, float value) { return Add(name, value); }
     status_t AddBool(const char* name, bool value) { return Add(name, value); }
     status_t AddPoint(const char* name, BPoint value) { return Add(name, value); }
@@ -42,18 +41,12 @@ class BMessage {
     // The text stays valid until the message is changed or destroyed.
     status_t FindString(const char* name, const char** value, int32 index = 0) const;
     status_t FindInt32(const char* name, int32* value, int32 index = 0) const;
-    status_t FindInt64(const char* name, int64* value, int32 index = 0) const;
     status_t FindFloat(const char* name, float* value, int32 index = 0) const;
     status_t FindBool(const char* name, bool* value, int32 index = 0) const;
     status_t FindPoint(const char* name, BPoint* value, int32 index = 0) const;
 
-    // Drops a field with all its values; B_NAME_NOT_FOUND when there is none.
-    status_t RemoveName(const char* name);
-    void MakeEmpty() { fields_.clear(); }
-    [[nodiscard]] bool IsEmpty() const { return fields_.empty(); }
-
   private:
-    using Value = std::variant<std::string, int32, int64, float, bool, BPoint>;
+    using Value = std::variant<std::string, int32, float, bool, BPoint>;
 
     status_t Add(const char* name, Value value);
     template <class T>

@@ -179,17 +179,6 @@ bool BPrintJob::BeginJob() {
     return !peer_->painter.isActive() && peer_->Begin();
 }
 
-bool BPrintJob::CanContinue() const {
-    return peer_->IsUsable();
-}
-
-BRect BPrintJob::PaperRect() const {
-    BRect paper = FromQt(peer_->printer.pageLayout().fullRect(QPageLayout::Point));
-    const QRectF printable = peer_->printer.pageLayout().paintRect(QPageLayout::Point);
-    paper.OffsetBy(static_cast<float>(-printable.left()), static_cast<float>(-printable.top()));
-    return paper;
-}
-
 BRect BPrintJob::PrintableRect() const {
     BRect printable = FromQt(peer_->printer.pageLayout().paintRect(QPageLayout::Point));
     printable.OffsetTo(0, 0);

@@ -35,9 +35,6 @@ class BPrintJob {
     // False when the printer is not there, or printer or file cannot be opened; errno then says why for a
     // file.
     [[nodiscard]] bool BeginJob();
-    [[nodiscard]] bool CanContinue() const;
-    // The whole sheet, from the printable part's left top.
-    [[nodiscard]] BRect PaperRect() const;
     // The part of the page that can be printed; its left top is (0, 0).
     [[nodiscard]] BRect PrintableRect() const;
     // Draws that part of the view, and of the views and controls in it that are not hidden, at the given

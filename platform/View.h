@@ -134,7 +134,6 @@ class BView : public BHandler {
     [[nodiscard]] rgb_color HighColor() const { return highColor_; }
     void SetLowColor(rgb_color color) { lowColor_ = color; }
     void SetLowColor(uint8 red, uint8 green, uint8 blue) { lowColor_ = {red, green, blue, 255}; }
-    [[nodiscard]] rgb_color LowColor() const { return lowColor_; }
     void SetDrawingMode(drawing_mode mode) { drawingMode_ = mode; }
     // Width of lines and outlines; 1 at first.
     void SetPenSize(float size) { penSize_ = size; }

@@ -46,7 +46,7 @@ TEST_F(MenuBars, AskTheirWindowAndSendToTheItemsTarget) {
     auto* looper = new Looper;
     auto* file = new BMenu("File");
     file->AddItem(new BMenuItem("Save & <b>go</b>", new BMessage(1)));
-    file->AddSeparatorItem();
+    file->AddItem(new BSeparatorItem);
     auto* quit = new BMenuItem("Quit", new BMessage(2), 'Q');
     quit->SetTarget(looper);
     file->AddItem(quit);
