@@ -47,7 +47,8 @@ class BControl : public BView, public BInvoker {
     [[nodiscard]] int32 Value() const { return value_; }
 
     void SetFont(const BFont* font, uint32 properties = B_FONT_ALL) override;
-    void GetPreferredSize(float* width, float* height) const override;
+    // The size at which the control shows all of itself.
+    void GetPreferredSize(float* width, float* height) const;
 
   protected:
     BControl(BRect frame, const char* name, const char* label, BMessage* message, uint32 resizingMode,

@@ -24,11 +24,6 @@ QPen LinePen(BPoint from, BPoint to, rgb_color color, float width) {
     return {ToQt(color), width, Qt::SolidLine, straight ? Qt::SquareCap : Qt::RoundCap, Qt::RoundJoin};
 }
 
-// The middle line of an outline that lies wholly inside rect.
-QRectF OutlineRect(const BRect& rect, float pen) {
-    return ToQt(rect).adjusted(pen / 2.0, pen / 2.0, -pen / 2.0, -pen / 2.0);
-}
-
 // The part of the image with every pixel made a square of at least as many as the device has for it, so that
 // only what is left over is smoothed: pixels keep their edges at any density.
 QImage Enlarged(const QImage& image, const QRect& part, double devicePixels) {
@@ -127,14 +122,6 @@ void BView::FillRect(BRect rect) {
 void BView::FillRectLow(BRect rect) {
     if (QPainter* painter = ViewAccess::Painter(this))
         painter->fillRect(ToQt(rect), ToQt(lowColor_));
-}
-
-void BView::StrokeRoundRect(BRect rect, float xRadius, float yRadius) {
-    if (QPainter* painter = ViewAccess::Painter(this)) {
-        painter->setPen(QPen(ToQt(highColor_), penSize_));
-        painter->setBrush(Qt::NoBrush);
-        painter->drawRoundedRect(OutlineRect(rect, penSize_), xRadius, yRadius);
-    }
 }
 
 void BView::FillRoundRect(BRect rect, float xRadius, float yRadius) {

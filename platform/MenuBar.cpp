@@ -33,16 +33,7 @@ void BMenuBar::AttachedToWindow() {
     FitHeight();
 }
 
-void BMenuBar::GetPreferredSize(float* width, float* height) const {
-    const QSize size = Widget(this)->sizeHint();
-    *width = static_cast<float>(size.width() - 1);
-    *height = static_cast<float>(size.height() - 1);
-}
-
 void BMenuBar::FitHeight() {
-    float width = 0;
-    float height = 0;
-    BMenuBar::GetPreferredSize(&width, &height);
     if (resizeToFit_)
-        ResizeTo(Frame().Width(), height);
+        ResizeTo(Frame().Width(), static_cast<float>(Widget(this)->sizeHint().height() - 1));
 }

@@ -13,7 +13,6 @@ class BMenuBar : public BView, public BMenu {
 
     using BMenu::Name;
     void AttachedToWindow() override;
-    void GetPreferredSize(float* width, float* height) const override;
 
   private:
     void FitHeight();

@@ -47,9 +47,3 @@ void BStringView::SetFont(const BFont* font, uint32 properties) {
     GetFont(&whole);
     Widget(this)->setFont(FontAccess::ToQt(whole));
 }
-
-void BStringView::GetPreferredSize(float* width, float* height) const {
-    const QSize size = Widget(this)->sizeHint();
-    *width = static_cast<float>(size.width() - 1);
-    *height = static_cast<float>(size.height() - 1);
-}

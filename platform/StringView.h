@@ -14,7 +14,6 @@ class BStringView : public BView {
     void SetHighColor(rgb_color color) override;
     using BView::SetHighColor;
     void SetFont(const BFont* font, uint32 properties = B_FONT_ALL) override;
-    void GetPreferredSize(float* width, float* height) const override;
 
   private:
     std::string text_;

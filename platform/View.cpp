@@ -227,10 +227,6 @@ void BView::MoveTo(float x, float y) {
     PlaceWidget();
 }
 
-void BView::MoveBy(float dx, float dy) {
-    MoveTo(frame_.left + dx, frame_.top + dy);
-}
-
 void BView::ResizeTo(float width, float height) {
     const float dx = width - frame_.Width();
     const float dy = height - frame_.Height();
@@ -258,11 +254,6 @@ void BView::ParentResized(float dx, float dy) {
                 mode & B_FOLLOW_V_CENTER);
     MoveTo(frame.left, frame.top);
     ResizeTo(frame.Width(), frame.Height());
-}
-
-void BView::GetPreferredSize(float* width, float* height) const {
-    *width = frame_.Width();
-    *height = frame_.Height();
 }
 
 void BView::ScrollTo(BPoint where) {

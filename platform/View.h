@@ -105,11 +105,8 @@ class BView : public BHandler {
     // The visible rectangle in the view's own coordinates: its left top is where the view is scrolled to.
     [[nodiscard]] virtual BRect Bounds() const;
     void MoveTo(float x, float y);
-    void MoveBy(float dx, float dy);
     void ResizeTo(float width, float height);
     void ResizeBy(float dx, float dy);
-    // The size at which a control shows all of itself; the base answers with the present one.
-    virtual void GetPreferredSize(float* width, float* height) const;
     virtual void ScrollTo(BPoint where);
     [[nodiscard]] uint32 Flags() const { return flags_; }
 
@@ -160,7 +157,6 @@ class BView : public BHandler {
     void FillRect(BRect rect);
     // As FillRect, in the low colour.
     void FillRectLow(BRect rect);
-    void StrokeRoundRect(BRect rect, float xRadius, float yRadius);
     void FillRoundRect(BRect rect, float xRadius, float yRadius);
     void StrokeEllipse(BPoint center, float xRadius, float yRadius);
     void FillEllipse(BPoint center, float xRadius, float yRadius);
