@@ -1,4 +1,6 @@
 // Views: where they lie, and what their drawing calls leave on the picture.
+#include <cmath>
+
 #include <QApplication>
 #include <QImage>
 #include <QTest>
@@ -8,6 +10,7 @@
 #include "platform/Application.h"
 #include "platform/View.h"
 #include "platform/Window.h"
+#include "util/InterfaceHelpers.h"
 
 namespace {
 
@@ -130,6 +133,60 @@ TEST(Drawing, BitmapsStaySharpOnDenseScreens) {
     // side of the middle.
     ExpectColor(kBlackPixel, shown.Picture(1.5), {{15, 15}, {18, 15}});
     ExpectColor(kWhitePixel, shown.Picture(1.5), {{14, 15}});
+}
+
+// The part of the picture that is not white.
+QRect Inked(const QImage& picture) {
+    QRegion found;
+    for (int y = 0; y < picture.height(); ++y)
+        for (int x = 0; x < picture.width(); ++x)
+            if (picture.pixel(x, y) != (0xFF000000 | kWhitePixel))
+                found += QRect(x, y, 1, 1);
+    return found.boundingRect();
+}
+
+TEST(Drawing, TextKeepsToItsPlaceInARectangle) {
+    const BApplication application("test");
+    constexpr uint8 centered = DrawTextCenter | DrawTextMiddle;
+    int width = 0;
+    const Shown shown([&](BView* view) {
+        const BRect rooms[] = {{0, 0, 39, 39}, {60, 0, 99, 39}, {0, 60, 39, 99}, {60, 60, 99, 99}};
+        view->SetFontSize(12);
+        width = static_cast<int>(std::ceil(view->StringWidth("H")));
+        DrawText(view, &rooms[0], "H", DrawTextLeft | DrawTextTop);
+        DrawText(view, &rooms[1], "H", centered);
+        DrawText(view, &rooms[2], "H", DrawTextRight | DrawTextBottom);
+        DrawText(view, &rooms[3], "HHHHHHHHHHHHHHHH", centered);
+    });
+    const QImage picture = shown.Picture();
+    const QRect leftTop = Inked(picture.copy(0, 0, 50, 50));
+    const QRect center = Inked(picture.copy(60, 0, 40, 40));
+    const QRect rightBottom = Inked(picture.copy(0, 60, 40, 40));
+    EXPECT_TRUE(leftTop.left() <= 3 && leftTop.top() <= 6) << leftTop.left() << ", " << leftTop.top();
+    EXPECT_NEAR(center.left() + center.right(), 39, 3);
+    EXPECT_NEAR(center.top() + center.bottom(), 39, 5);
+    EXPECT_EQ(rightBottom.left(), 39 - 2 - width + leftTop.left());
+    EXPECT_TRUE(rightBottom.bottom() >= 33 && rightBottom.bottom() <= 39) << rightBottom.bottom();
+    const QRect tooWide = Inked(picture.copy(50, 50, 50, 50)); // cut on the right only, and within its room
+    EXPECT_EQ(tooWide.left() - 10, leftTop.left());
+    EXPECT_GE(tooWide.right(), 47);
+}
+
+TEST(Drawing, BevelsAreLitFromTheLeftTop) {
+    const BApplication application("test");
+    const Shown shown([](BView* view) {
+        view->SetLowColor(kBlue);
+        view->FillRectLow({0, 0, 99, 99});
+        const BRect raised(5, 5, 44, 44);
+        const BRect sunken(55, 5, 94, 44);
+        ThreeDRectangle(view, &raised, 0);
+        ThreeDRectangle(view, &sunken, 1);
+        EXPECT_EQ(view->PenSize(), 1);
+    });
+    const QRgb dark = qRgb(colors::dark_gray.red, colors::dark_gray.green, colors::dark_gray.blue);
+    ExpectColor(kWhitePixel, shown.Picture(), {{20, 5}, {5, 20}, {70, 44}, {94, 20}});
+    ExpectColor(dark, shown.Picture(), {{20, 44}, {44, 20}, {70, 5}, {55, 20}});
+    ExpectColor(kBluePixel, shown.Picture(), {{20, 20}, {20, 8}, {70, 41}});
 }
 
 TEST(Drawing, OutsideAPaintPassItOnlyAsksForOne) {
