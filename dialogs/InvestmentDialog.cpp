@@ -10,7 +10,6 @@
 #include "platform/MenuField.h"
 #include "platform/TextControl.h"
 #include "util/CharacterBuffer.h"
-#include "util/Numbers.h"
 
 namespace {
 
@@ -20,19 +19,10 @@ constexpr float Margin = 10;
 constexpr float RowGap = 5;
 constexpr float PickListWidth = 20;
 constexpr float PickListRise = 2;
-// More than any amount that is worth typing; records keep amounts as numbers.
-constexpr int32 MaxAmountBytes = 31;
 
 template <std::size_t Size>
 std::string TextOf(const char (&field)[Size]) {
     return std::string(FieldText(field));
-}
-
-std::string AmountText(float amount, int decimals) {
-    char text[64] = "";
-    if (amount > 0)
-        FormatFixed(static_cast<double>(amount), text, sizeof text, decimals);
-    return text;
 }
 
 void MarkItem(BMenu* menu, const std::string& label) {
@@ -73,10 +63,10 @@ void InvestmentDialog::AddRows() {
     MarkItem(types, TextOf(investment_->Type));
     typeMenuField_ = AddPickList(typeControl_, types);
 
-    sharesControl_ = AddTextRow("shares control", "Shares", AmountText(investment_->Shares, 3).c_str(),
-                                narrow, MaxAmountBytes);
-    priceControl_ = AddTextRow("price control", "Share price", AmountText(investment_->Price, 2).c_str(),
-                               narrow, MaxAmountBytes);
+    sharesControl_ =
+        AddTextRow("shares control", "Shares", ShownShares(*investment_).c_str(), narrow, MaxAmountBytes);
+    priceControl_ =
+        AddTextRow("price control", "Share price", ShownPrice(*investment_).c_str(), narrow, MaxAmountBytes);
     riskMenuField_ = AddRiskRow();
 
     agentControl_ = AddTextRow("agent control", "Agent", TextOf(investment_->Agent).c_str(), besidePickList,

@@ -10,11 +10,22 @@
 
 namespace {
 
-InvestmentCheck ReadAmount(const std::string& text, float* amount) {
+std::string ShownAmount(float amount, int decimals) {
+    char text[MaxAmountBytes + 1] = "";
+    if (amount > 0)
+        FormatFixed(static_cast<double>(amount), text, sizeof text, decimals);
+    return text;
+}
+
+// `shown` is the text for the amount as it is.
+InvestmentCheck ReadAmount(const std::string& text, const std::string& shown, float* amount) {
+    if (!text.empty() && text == shown)
+        return InvestmentCheck::Accepted;
     double number = 0;
     const char* rest = nullptr;
     const bool inRange = ReadDecimal(text.c_str(), &number, &rest);
-    if (rest != text.c_str() && rest[std::strspn(rest, " \t")] != '\0')
+    const bool anyNumber = text.find_first_of("0123456789") != std::string::npos;
+    if (anyNumber && (rest == text.c_str() || rest[std::strspn(rest, " \t")] != '\0'))
         return InvestmentCheck::NotPlain;
     // In a record's single precision it would be stored as infinite.
     if (!inRange || std::fabs(number) > std::numeric_limits<float>::max())
@@ -37,12 +48,21 @@ dbDATE Today() {
 
 } // namespace
 
+std::string ShownShares(const INVESTMENT_DATA& record) {
+    return ShownAmount(record.Shares, 3);
+}
+
+std::string ShownPrice(const INVESTMENT_DATA& record) {
+    return ShownAmount(record.Price, 2);
+}
+
 InvestmentCheck FillInvestment(const InvestmentInput& input, INVESTMENT_DATA* record) {
-    if (input.name.empty())
+    if (input.name.find_first_not_of(' ') == std::string::npos)
         return InvestmentCheck::NoName;
-    float shares = 0;
-    float price = 0;
-    for (const InvestmentCheck check : {ReadAmount(input.shares, &shares), ReadAmount(input.price, &price)}) {
+    float shares = record->Shares;
+    float price = record->Price;
+    for (const InvestmentCheck check : {ReadAmount(input.shares, ShownShares(*record), &shares),
+                                        ReadAmount(input.price, ShownPrice(*record), &price)}) {
         if (check != InvestmentCheck::Accepted)
             return check;
     }

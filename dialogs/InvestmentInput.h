@@ -18,14 +18,21 @@ struct InvestmentInput {
 
 enum class InvestmentCheck {
     Accepted,
-    NoName,
-    NotPlain, // shares or price begins with a number and goes on: "44,50" or "12 3/8" must not become 44 or
-              // 12
+    NoName,   // empty, or nothing but blanks
+    NotPlain, // there are digits in shares or price, and more than a number: "44,50", "12 3/8" or "$5" must
+              // not become 44, 12 or 0
     TooLarge, // shares, price or their product is beyond what a record can hold
 };
 
+// What the form's fields can hold for shares and price: more than any amount that is worth typing.
+inline constexpr int MaxAmountBytes = 31;
+
+// A record's shares and price as the form shows them, with three and two decimals; empty unless above 0.
+[[nodiscard]] std::string ShownShares(const INVESTMENT_DATA& record);
+[[nodiscard]] std::string ShownPrice(const INVESTMENT_DATA& record);
+
 // Puts the input into the record: texts cut to their fields, shares and price read as decimal numbers (0 when
-// the text begins with none), Value as their product in single precision, today's date. Portfolio, PrevPrice
-// and QuoteError are left alone, and so is Risk when none was chosen. The record is only changed when the
-// answer is Accepted.
+// the text has none), Value as their product in single precision, today's date. Shares and price that read as
+// the record's own are shown keep all their decimals. Portfolio, PrevPrice and QuoteError are left alone, and
+// so is Risk when none was chosen. The record is only changed when the answer is Accepted.
 [[nodiscard]] InvestmentCheck FillInvestment(const InvestmentInput& input, INVESTMENT_DATA* record);

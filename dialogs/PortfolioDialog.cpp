@@ -1,5 +1,7 @@
 #include "dialogs/PortfolioDialog.h"
 
+#include <cstring>
+
 #include "app/PortfolioRules.h"
 #include "platform/TextControl.h"
 #include "util/CharacterBuffer.h"
@@ -14,7 +16,7 @@ constexpr float Margin = 10;
 } // namespace
 
 PortfolioNameCheck CheckPortfolioName(DATABASE& portfolios, const char* name) {
-    if (!CanBePortfolioName(name))
+    if (!CanBePortfolioName(name) || name[std::strspn(name, " ")] == '\0')
         return PortfolioNameCheck::Invalid;
     return SelectPortfolios(portfolios, name) > 0 ? PortfolioNameCheck::Taken : PortfolioNameCheck::Accepted;
 }

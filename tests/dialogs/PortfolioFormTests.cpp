@@ -75,6 +75,8 @@ TEST_F(FormTest, APortfolioNameIsNewAndFitsItsRecord) {
     const char* add = "Add a Portfolio";
     In(add, [] { Key(Qt::Key_Return); });
     Answer("Invalid portfolio name!", "Ok");
+    In(add, [] { TypeOver("  ", Qt::Key_Return); });
+    Answer("Invalid portfolio name!", "Ok");
     In(add, [] { TypeOver("Growth", Qt::Key_Return); });
     Answer("Portfolio name already exists!", "Ok");
     In(add, [] { TypeOver("Growth Fund 0123456789012345678\xC3\xBC", Qt::Key_Return); });
@@ -96,7 +98,7 @@ TEST_F(FormTest, AnInvestmentIsEnteredByKeyboardAlone) {
     AddEntry("Agent", "Bank");
     AddEntry("Type", "Stock");
     const char* title = "Add an Investment";
-    In(title, [] { Key(Qt::Key_Return); });
+    In(title, [] { TypeOver("  ", Qt::Key_Return); });
     Answer("You must enter a Name!", "Ok");
     In(title, [] {
         TypeOver("M\xC3\xBCller & Co", Qt::Key_Tab);
@@ -186,6 +188,7 @@ TEST(InvestmentInput, AmountsAreNumbersARecordCanHold) {
         {"1e39", "1", InvestmentCheck::TooLarge, 7},    {"1", "-1e999", InvestmentCheck::TooLarge, 7},
         {"1e30", "1e30", InvestmentCheck::TooLarge, 7}, {"1", "44,50", InvestmentCheck::NotPlain, 7},
         {"1,250.5", "2", InvestmentCheck::NotPlain, 7}, {"1", "12 3/8", InvestmentCheck::NotPlain, 7},
+        {"1", "$12.50", InvestmentCheck::NotPlain, 7},  {"10", "7.00", InvestmentCheck::Accepted, 70},
     };
     for (const auto& each : cases) {
         INVESTMENT_DATA record{};
@@ -196,6 +199,28 @@ TEST(InvestmentInput, AmountsAreNumbersARecordCanHold) {
         input.price = each.price;
         EXPECT_EQ(FillInvestment(input, &record), each.check) << each.shares;
         EXPECT_EQ(record.Value, each.value) << each.shares;
+    }
+}
+
+// The form shows fewer decimals than a record has.
+TEST(InvestmentInput, AmountsLeftAsShownStayWhatTheyWere) {
+    for (const float exact : {45.375F, 1.0044F, 0.001F, 3e38F, 2.5F}) {
+        INVESTMENT_DATA record = MakeInvestment("P", "N");
+        record.Shares = 1.0004F;
+        record.Price = exact;
+        InvestmentInput input;
+        input.name = "N";
+        input.shares = ShownShares(record);
+        input.price = ShownPrice(record);
+        EXPECT_LE(input.price.size(), std::size_t{MaxAmountBytes});
+        EXPECT_EQ(FillInvestment(input, &record), InvestmentCheck::Accepted);
+        EXPECT_EQ(record.Shares, 1.0004F);
+        EXPECT_EQ(record.Price, exact);
+        EXPECT_EQ(record.Value, 1.0004F * exact);
+        input.shares = "2";
+        input.price = "45.37";
+        EXPECT_EQ(FillInvestment(input, &record), InvestmentCheck::Accepted);
+        EXPECT_EQ(record.Value, 2 * 45.37F);
     }
 }
 
