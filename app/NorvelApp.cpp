@@ -8,6 +8,7 @@
 #include <malloc.h>
 
 #include "ColumnListView/PrefilledBitmap.h"
+#include "app/CutFile.h"
 #include "app/DataFileOpening.h"
 #include "app/NorvelWindow.h"
 #include "app/PortfolioRules.h"
@@ -191,8 +192,24 @@ void NorvelApp::OpenDatabases(std::string& complaints) {
     state_.categories = open("misc.db", HoldsCategories, nullptr); // which the program never changes
     if (backup_)
         backup_->Prepare();
-    if (!lookOnly_ && state_.portfolios->IsOpen() && state_.investments->IsOpen())
+    if (!lookOnly_ && state_.portfolios->IsOpen() && state_.investments->IsOpen()) {
+        RestoreCut(complaints);
         RestoreLostPortfolios(complaints);
+    }
+}
+
+void NorvelApp::RestoreCut(std::string& complaints) {
+    switch (CutFile(state_.homeFolder).Restore(*state_.investments)) {
+    case CutFile::Outcome::NothingKept:
+        break;
+    case CutFile::Outcome::Restored:
+        complaints += "What had been cut and not pasted when Quorvan last ended is back in its portfolio.\n";
+        break;
+    case CutFile::Outcome::Failed:
+        complaints += "What had been cut and not pasted when Quorvan last ended could not be put back. It is "
+                      "kept in the file cut.db.\n";
+        break;
+    }
 }
 
 void NorvelApp::RestoreLostPortfolios(std::string& complaints) {

@@ -45,6 +45,7 @@ class NorvelApp : public BApplication {
     [[nodiscard]] FolderLock::Outcome TakeLock();
     void OpenDatabases(std::string& complaints);
     void PrepareBackup();
+    void RestoreCut(std::string& complaints);
     void RestoreLostPortfolios(std::string& complaints);
     // Whether the person may go on: no password is set, or it was typed.
     [[nodiscard]] bool PassPasswordGate();

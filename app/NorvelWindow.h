@@ -101,6 +101,8 @@ class NorvelWindow : public BWindow {
     void DisplayTotalValue(float total);
     // Whether what was cut and never pasted may go: the person is asked, since nothing else has it.
     [[nodiscard]] static bool MayForgetClipboard();
+    // What was cut is pasted, or given up.
+    static void CutIsSettled();
     // Copies the selected investments to the clipboard; true when it now holds all of them.
     bool CopySelection();
     void RemoveSelectedRows();

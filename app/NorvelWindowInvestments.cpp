@@ -6,6 +6,7 @@
 
 #include "ColumnListView/ColumnListView.h"
 #include "app/AppState.h"
+#include "app/CutFile.h"
 #include "app/FailureAlerts.h"
 #include "app/NorvelItem.h"
 #include "app/PortfolioRules.h"
@@ -183,7 +184,15 @@ bool NorvelWindow::MayForgetClipboard() {
     if (!app_state->clipboardIsOnlyCopy)
         return true;
     const bool no = YesNoBox("What you cut has not been pasted yet, and would be lost. Go on all the same?");
+    if (!no)
+        CutIsSettled();
     return !no;
+}
+
+void NorvelWindow::CutIsSettled() {
+    if (app_state->clipboardIsOnlyCopy)
+        CutFile(app_state->homeFolder).Forget();
+    app_state->clipboardIsOnlyCopy = false;
 }
 
 bool NorvelWindow::CopySelection() {
@@ -195,7 +204,6 @@ bool NorvelWindow::CopySelection() {
     if (!MayForgetClipboard())
         return false;
     AppState& state = *app_state;
-    state.clipboardIsOnlyCopy = false;
     state.clipboardCount = 0;
     state.clipboard.reset(
         static_cast<INVESTMENT_DATA*>(std::calloc(selected.size(), sizeof(INVESTMENT_DATA))));
@@ -220,7 +228,15 @@ void NorvelWindow::OnInvestmentCopy() {
 void NorvelWindow::OnInvestmentCut() {
     if (!CopySelection())
         return;
-    app_state->clipboardIsOnlyCopy = true;
+    AppState& state = *app_state;
+    std::vector<long> numbers;
+    for (const NorvelItem* row : SelectedItems(investmentList_))
+        numbers.push_back(row->RecordNumber());
+    if (!CutFile(state.homeFolder).Keep({state.clipboard.get(), numbers.size()}, numbers)) {
+        TellNotSaved();
+        return;
+    }
+    state.clipboardIsOnlyCopy = true;
     OnInvestmentDelete();
 }
 
@@ -231,7 +247,7 @@ void NorvelWindow::OnInvestmentPaste() {
     if (AppendCopies(*state.investments,
                      {state.clipboard.get(), static_cast<std::size_t>(state.clipboardCount)},
                      currentPortfolio_))
-        state.clipboardIsOnlyCopy = false;
+        CutIsSettled();
     else
         TellNotSaved();
     LoadInvestmentList();

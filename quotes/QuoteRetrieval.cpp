@@ -63,6 +63,7 @@ float SearchSources(std::string_view sources, const char* ticker, const QuoteCon
     using Line = QuoteSourceReader::Line;
     QuoteSourceReader reader(sources);
     float result = NoQuote;
+    bool anySource = false;
     for (Line line = reader.Next(); line != Line::EndOfFile && !EndsTheSearch(result); line = reader.Next()) {
         // A line that is no source, be it the last, takes back what the source before it answered.
         result = NoQuote;
@@ -72,6 +73,7 @@ float SearchSources(std::string_view sources, const char* ticker, const QuoteCon
         }
         if (line == Line::Skipped && !reader.Problem())
             continue;
+        anySource = true;
         QuoteSource source;
         if (const char* problem = PrepareSource(reader, ticker, &source)) {
             report.Log("Skipped line %d: %s\n", reader.LineNumber(), problem);
@@ -80,6 +82,8 @@ float SearchSources(std::string_view sources, const char* ticker, const QuoteCon
         }
         result = AskForTicker(source, context, report);
     }
+    if (!anySource)
+        report.LogText("no source to ask\n");
     return result;
 }
 

@@ -7,6 +7,7 @@
 
 #include "DataFolder.h"
 #include "InChild.h"
+#include "app/CutFile.h"
 #include "app/InvestmentTexts.h"
 #include "app/PortfolioRules.h"
 #include "db/FaultyFiles.h"
@@ -244,6 +245,31 @@ TEST(PortfolioRules, CopiesDifferInTheirPortfolioAlone) {
     CopyTextZeroed(copied.Portfolio, "New one");
     EXPECT_EQ(std::memcmp(&record, &copied, offsetof(INVESTMENT_DATA, Unused)), 0);
     EXPECT_EQ(folder.Investments(), (Texts{"New one/Fund", "New one/n"}));
+}
+
+TEST(CutFile, PutsBackWhatIsNotThere) {
+    const DataFolder folder;
+    std::vector<INVESTMENT_DATA> cut;
+    for (const char* name : {"deleted", "not reached", "changed since"}) {
+        cut.push_back(MakeInvestment("P", name));
+        folder.AddInvestment(cut.back());
+    }
+    cut[0].Unused[0] = 'x'; // a file with longer records
+    DATABASE investments(folder.File("invest.db").c_str());
+    const CutFile file(folder.Path());
+    EXPECT_EQ(file.Restore(investments), CutFile::Outcome::NothingKept);
+    folder.Write("cut.db.tmp", "left by a kill");
+    ASSERT_TRUE(file.Keep(cut, std::vector<long>{0, 1, 2}));
+    EXPECT_FALSE(file.Keep(cut, std::vector<long>{0, 1, 2})) << "what is kept is not replaced";
+    investments.Delete(0);
+    const INVESTMENT_DATA other = MakeInvestment("P", "other");
+    investments.Write(2, &other);
+    EXPECT_EQ(file.Restore(investments), CutFile::Outcome::Restored);
+    EXPECT_EQ(folder.Investments(), (Texts{"P/not reached", "P/other", "P/deleted", "P/changed since"}));
+    EXPECT_FALSE(folder.Has("cut.db") || folder.Has("cut.db.tmp"));
+    folder.Write("cut.db", "damaged");
+    EXPECT_EQ(file.Restore(investments), CutFile::Outcome::Failed);
+    EXPECT_TRUE(folder.Has("cut.db"));
 }
 
 } // namespace

@@ -1,6 +1,8 @@
 // The main window, worked with real events.
 #include "Program.h"
 
+#include <map>
+
 #include <QPushButton>
 
 #include "platform/MenuItem.h"
@@ -236,6 +238,32 @@ TEST_F(MainWindow, WhatWasCutOnlyGoesWhenThePersonSaysSo) {
     Expect({"a"}).Close().Answer(question, "Yes");
     EXPECT_EQ(Program::Run(), 0);
     EXPECT_EQ(Investments(), Texts{"P/a"});
+}
+
+// The second program finds the files as the first one would leave them if it were killed after the cut.
+TEST(CutInvestments, ComeBackAtTheNextStart) {
+    std::map<std::string, std::string> files;
+    {
+        Program killed;
+        killed.AddPortfolio("P");
+        for (const char* name : {"a", "b", "c"})
+            killed.AddInvestment(MakeInvestment("P", name));
+        killed.Expect({"a", "b", "c"}).Mark({0, 2}).Send(MessageInvestmentCut).Expect({"b"});
+        killed.Then("kept", [&] {
+            for (const char* name : {"portfol.db", "invest.db", "cut.db"})
+                files[name] = killed.Read(name);
+        });
+        killed.Send(MessageInvestmentPaste).Expect({"b", "a", "c"});
+        killed.Then("pasted", [&] { EXPECT_FALSE(killed.Has("cut.db")); });
+        EXPECT_EQ(killed.RunAndClose(), 0);
+    }
+    Program next;
+    for (const auto& [name, content] : files)
+        next.Write(name, content);
+    next.Answer("What had been cut and not pasted when Quorvan last ended is back in its portfolio.", "Ok");
+    next.Expect({"b", "a", "c"});
+    EXPECT_EQ(next.RunAndClose(), 0);
+    EXPECT_FALSE(next.Has("cut.db"));
 }
 
 } // namespace

@@ -105,6 +105,8 @@ TEST_F(Retrieval, SaysWhyThereIsNoConnection) {
     context_.sourcePath = "/nowhere/Quorvan.cfg";
     EXPECT_EQ(Quote(""), NoQuoteSources);
     EXPECT_EQ(Log(), "Unable to open '/nowhere/Quorvan.cfg'\n");
+    EXPECT_EQ(GetPriceQuoteFrom("; nothing but a comment\n", "ABC", context_), NoQuote);
+    EXPECT_EQ(Log(), "no source to ask\n");
 }
 
 TEST_F(Retrieval, TriesTheSourcesInOrder) {

@@ -1,0 +1,93 @@
+#include "app/CutFile.h"
+
+#include <algorithm>
+#include <cstdio>
+#include <cstring>
+#include <filesystem>
+#include <vector>
+
+#include "app/PortfolioRules.h"
+#include "db/Database.h"
+
+namespace {
+
+struct [[gnu::packed]] CUT_DATA {
+    INVESTMENT_DATA investment;
+    std::int32_t record; // its number in invest.db
+};
+
+// An investment's columns, and the rest of its struct, so that nothing of it is lost.
+std::vector<COLUMN_ENTRY> Columns() {
+    std::vector<COLUMN_ENTRY> columns(InvestmentColumns.begin(), InvestmentColumns.end());
+    columns.push_back({"Unused", ColumnType::String, sizeof(INVESTMENT_DATA::Unused), 0, 0});
+    columns.push_back({"Record", ColumnType::Long, sizeof(CUT_DATA::record), 0, 0});
+    return columns;
+}
+
+bool AreSame(const INVESTMENT_DATA& one, const INVESTMENT_DATA& other) {
+    const auto bytes = [](const INVESTMENT_DATA& data) {
+        return std::string_view(reinterpret_cast<const char*>(&data), sizeof data);
+    };
+    return bytes(one) == bytes(other);
+}
+
+bool ReadAll(const std::string& path, std::vector<CUT_DATA>* kept) {
+    DATABASE file(path.c_str());
+    DATABASE_HEADER header{};
+    file.GetHeaderInfo(&header);
+    if (!file.IsOpen() || file.IsDamaged() || header.recordLength != sizeof(CUT_DATA) + 1)
+        return false;
+    kept->resize(static_cast<std::size_t>(header.recordCount));
+    for (std::size_t i = 0; i < kept->size(); ++i)
+        if (file.Read(static_cast<long>(i), &(*kept)[i]) != 1)
+            return false;
+    return true;
+}
+
+} // namespace
+
+bool CutFile::Keep(std::span<const INVESTMENT_DATA> investments, std::span<const long> numbers) const {
+    std::vector<CUT_DATA> records(investments.size());
+    for (std::size_t i = 0; i < records.size(); ++i)
+        records[i] = {investments[i], static_cast<std::int32_t>(numbers[i])};
+    std::error_code error;
+    if (std::filesystem::exists(path_, error) || error)
+        return false;
+    // Under its own name only when it is whole.
+    const std::string unfinished = path_ + ".tmp";
+    std::filesystem::remove(unfinished, error);
+    const std::vector<COLUMN_ENTRY> columns = Columns();
+    DATABASE file(nullptr);
+    if (file.Create(unfinished.c_str(), "cut investments", static_cast<int>(columns.size()),
+                    columns.data()) == 0 &&
+        file.AppendAll(records.data(), sizeof(CUT_DATA), static_cast<std::int32_t>(records.size())) >= 0 &&
+        std::rename(unfinished.c_str(), path_.c_str()) == 0)
+        return true;
+    std::filesystem::remove(unfinished, error);
+    return false;
+}
+
+void CutFile::Forget() const {
+    std::error_code error;
+    std::filesystem::remove(path_, error);
+}
+
+CutFile::Outcome CutFile::Restore(DATABASE& investments) const {
+    std::error_code error;
+    if (!std::filesystem::exists(path_, error))
+        return Outcome::NothingKept;
+    std::vector<CUT_DATA> kept;
+    if (!ReadAll(path_, &kept))
+        return Outcome::Failed;
+    std::vector<INVESTMENT_DATA> lost;
+    for (const CUT_DATA& each : kept) {
+        INVESTMENT_DATA present;
+        if (!ReadInvestment(investments, each.record, &present) || !AreSame(present, each.investment))
+            lost.push_back(each.investment);
+    }
+    if (investments.AppendAll(lost.data(), sizeof(INVESTMENT_DATA), static_cast<std::int32_t>(lost.size())) <
+        0)
+        return Outcome::Failed;
+    Forget();
+    return Outcome::Restored;
+}
