@@ -9,7 +9,8 @@ cd "$(dirname "$0")/.."
 . scripts/packages.sh
 
 build=${1:-build/run}
-for_help=(main-window portfolio-add investment-add portfolio-selector update updated chart-investment chart-time report)
+for_help=(main-window menu-Portfolio menu-Investment portfolio-add investment-add portfolio-selector update updated
+    chart-investment chart-time report)
 for_readme=(main-window chart-investment report)
 
 install_missing "${display_packages[@]}"

@@ -39,6 +39,22 @@ class SetupTest : public testing::Test {
         return files;
     }
 
+    static std::set<std::string> PicturesOf(const std::string& help) {
+        const std::string before = "<img src=\"pictures/";
+        std::set<std::string> names;
+        for (std::size_t at = 0; (at = help.find(before, at)) != std::string::npos;) {
+            at += before.size();
+            names.insert(help.substr(at, help.find('"', at) - at));
+        }
+        return names;
+    }
+    std::set<std::string> FileNames(const std::string& folder) const {
+        std::set<std::string> names;
+        for (const auto& entry : fs::directory_iterator(folder_.File(folder)))
+            names.insert(entry.path().filename().string());
+        return names;
+    }
+
     template <class Record>
     std::vector<Record> Records(const char* name, int length) const {
         DATABASE database(folder_.File(std::string("home/") + name).c_str());
@@ -74,7 +90,7 @@ TEST_F(SetupTest, MakesAFolderThatRuns) {
     EXPECT_GE(categories["Agent"], 3);
     EXPECT_EQ(categories.size(), 2U);
     EXPECT_EQ(folder_.Read("home/quorvan"), "a program");
-    EXPECT_TRUE(fs::exists(folder_.File("home/help/pictures/main-window.png")));
+    EXPECT_EQ(PicturesOf(folder_.Read("home/help/Quorvan.html")), FileNames("home/help/pictures"));
     EXPECT_EQ(fs::status(folder_.File("home/quorvan")).permissions() & fs::perms::owner_all,
               fs::perms::owner_all);
     EXPECT_EQ(fs::status(folder_.File("home/Quorvan.ini")).permissions(),
