@@ -209,10 +209,19 @@ class DATABASE {
     /// AppendAll. Records appended before a failure stay; killed meanwhile, the file has the first so many of
     /// them, whole.
     long Load(const char* path, const char* separators);
+    /// Characters, the newline included, of the longest line that Load takes whole; of a longer one it takes
+    /// pieces, each as a line.
+    [[nodiscard]] std::size_t LongestLoadLine() const;
     /// Makes `line` the line, newline included, that Export writes for a record's data.
     void FormatRecordData(std::string* line, const void* record, const char* separator) const;
     /// 1: byte columns are written as the character of that code, otherwise (2 at first) as a number.
     void SetByteOutputFormat(int format) { byteOutputFormat_ = format; }
+    /// 1 (the default): Load takes the code of a byte column's first character, otherwise its number, the low
+    /// 8 bits of it. With the format that Export wrote in, every byte comes back as it was.
+    void SetByteInputFormat(int format) { byteInputFormat_ = format; }
+    /// On: Export writes a first line of the columns' names, which its result does not count, and Load skips
+    /// the first line, whatever it holds. Off by default.
+    void SetHeadingLine(bool on) { headingLine_ = on; }
 
     // Set statements
 
@@ -313,10 +322,11 @@ class DATABASE {
     void TakeSortOrder(const SortKeys& keys);
     struct EXPORT;
     struct LOAD;
-    [[nodiscard]] RecordText Text() const;
+    [[nodiscard]] RecordText Text(int byteFormat) const;
     [[nodiscard]] bool OpenForExport(const char* path, File* file) const;
     [[nodiscard]] int ExportAll(EXPORT& work);
     [[nodiscard]] int ExportResultSet(EXPORT& work);
+    [[nodiscard]] bool BeginLines(LOAD& work) const;
     [[nodiscard]] int CheckFirstLine(LOAD& work) const;
     [[nodiscard]] int LoadLines(LOAD& work);
 
@@ -348,6 +358,8 @@ class DATABASE {
     bool immediateHeaderWrite_ = true;
     bool caseSensitive_ = false;
     int byteOutputFormat_ = 2;
+    int byteInputFormat_ = 1;
+    bool headingLine_ = false;
     ReadCache cache_;
     std::int64_t dataStart_ = 0;
     int lastError_ = DatabaseError::None;

@@ -78,12 +78,23 @@ char* PutTime(const dbTIME& time, char* out) {
     return PutPadded(time.second, 2, PutPadded(time.minute, 2, PutPadded(time.hour, 2, out)));
 }
 
+std::string_view NameOf(const COLUMN_ENTRY& column) {
+    return {column.name, strnlen(column.name, NameSize)};
+}
+
 std::uint32_t Number(const std::uint8_t* field, std::size_t width) {
     return LoadLittleEndian<std::uint32_t>(field, width);
 }
 
+std::uint8_t ByteIn(std::string_view text, bool character) {
+    if (character) {
+        return static_cast<std::uint8_t>(text.empty() ? 0 : text.front());
+    }
+    return static_cast<std::uint8_t>(WholeNumber(text.data()));
+}
+
 // Sets a column from a field that ends with a NUL, and all bytes of it.
-void StoreField(const COLUMN_ENTRY& column, std::string_view text, std::uint8_t* field) {
+void StoreField(const COLUMN_ENTRY& column, std::string_view text, bool byteCharacters, std::uint8_t* field) {
     const auto width = static_cast<std::size_t>(column.size);
     std::memset(field, 0, width);
     switch (column.type) {
@@ -91,7 +102,7 @@ void StoreField(const COLUMN_ENTRY& column, std::string_view text, std::uint8_t*
         CopyText(reinterpret_cast<char*>(field), width, text);
         break;
     case ColumnType::Byte:
-        StoreLittleEndian(field, static_cast<std::uint8_t>(text.empty() ? 0 : text.front()), width);
+        StoreLittleEndian(field, ByteIn(text, byteCharacters), width);
         break;
     case ColumnType::Short:
         StoreLittleEndian(field, static_cast<std::uint16_t>(WholeNumber(text.data())), width);
@@ -151,7 +162,7 @@ int FieldSplitter::Count() {
 std::size_t RecordText::LongestLine(std::size_t separatorSize) const {
     std::size_t longest = 1 + columns_.size() * separatorSize;
     for (const COLUMN_ENTRY& column : columns_) {
-        longest += LongestField(column);
+        longest += std::max(LongestField(column), NameOf(column).size());
     }
     return longest;
 }
@@ -159,6 +170,16 @@ std::size_t RecordText::LongestLine(std::size_t separatorSize) const {
 char* RecordText::Format(const std::uint8_t* data, std::string_view separator, char* line) const {
     for (const COLUMN_ENTRY& column : columns_) {
         line = FormatField(column, data + column.offset, line);
+        line = std::copy(separator.begin(), separator.end(), line);
+    }
+    *line++ = '\n';
+    return line;
+}
+
+char* RecordText::FormatHeading(std::string_view separator, char* line) const {
+    for (const COLUMN_ENTRY& column : columns_) {
+        const std::string_view name = NameOf(column);
+        line = std::copy(name.begin(), name.end(), line);
         line = std::copy(separator.begin(), separator.end(), line);
     }
     *line++ = '\n';
@@ -193,6 +214,6 @@ char* RecordText::FormatField(const COLUMN_ENTRY& column, const std::uint8_t* fi
 
 void RecordText::Parse(FieldSplitter& fields, std::uint8_t* data) const {
     for (const COLUMN_ENTRY& column : columns_) {
-        StoreField(column, fields.Next(), data + column.offset);
+        StoreField(column, fields.Next(), byteCharacters_, data + column.offset);
     }
 }

@@ -34,14 +34,17 @@ class FieldSplitter {
 /// which it borrows, but no files.
 class RecordText {
   public:
-    /// `byteCharacters`: byte columns are written as one character instead of a number.
+    /// `byteCharacters`: byte columns are written as one character and read as the first one's code, instead
+    /// of as a number.
     RecordText(std::span<const COLUMN_ENTRY> columns, bool byteCharacters)
         : columns_(columns), byteCharacters_(byteCharacters) {}
 
-    /// The most characters that Format writes with a separator of that size.
+    /// The most characters that Format and FormatHeading write with a separator of that size.
     [[nodiscard]] std::size_t LongestLine(std::size_t separatorSize) const;
     /// Writes a record's line, its newline included and no NUL, and returns where it ends.
     [[nodiscard]] char* Format(const std::uint8_t* data, std::string_view separator, char* line) const;
+    /// Writes a line of the columns' names in the same way.
+    [[nodiscard]] char* FormatHeading(std::string_view separator, char* line) const;
     /// Sets all columns in a record's data from the fields that are left, one for each; a column without a
     /// field becomes empty or 0. Other bytes of the data are not touched.
     void Parse(FieldSplitter& fields, std::uint8_t* data) const;

@@ -22,7 +22,14 @@ struct DATABASE::EXPORT {
     std::string_view separator;
     long lines = 0;
 
-    // False when the text file could not be written.
+    // Both are false when the text file could not be written.
+    [[nodiscard]] bool WriteHeading() {
+        char* line = writer.Room();
+        if (line != nullptr) {
+            writer.Take(text.FormatHeading(separator, line));
+        }
+        return line != nullptr;
+    }
     [[nodiscard]] bool Write(const std::uint8_t* data) {
         char* line = writer.Room();
         if (line != nullptr) {
@@ -43,13 +50,12 @@ struct DATABASE::LOAD {
     long records = 0;          // appended
 };
 
-RecordText DATABASE::Text() const {
-    return {{columns_.get(), static_cast<std::size_t>(header_.columnCount)},
-            byteOutputFormat_ == CharacterFormat};
+RecordText DATABASE::Text(int byteFormat) const {
+    return {{columns_.get(), static_cast<std::size_t>(header_.columnCount)}, byteFormat == CharacterFormat};
 }
 
 void DATABASE::FormatRecordData(std::string* line, const void* record, const char* separator) const {
-    const RecordText text = Text();
+    const RecordText text = Text(byteOutputFormat_);
     const std::string_view between = TextOrNone(separator);
     line->resize(text.LongestLine(between.size()));
     const char* end = text.Format(static_cast<const std::uint8_t*>(record), between, line->data());
@@ -60,7 +66,7 @@ long DATABASE::Export(const char* path, int all, const char* separator) {
     if (!IsOpen()) {
         return Fail(DatabaseError::ExportNoFile);
     }
-    const RecordText text = Text();
+    const RecordText text = Text(byteOutputFormat_);
     File file(operations_);
     TextWriter writer(file);
     EXPORT work{text, writer, TextOrNone(separator)};
@@ -74,7 +80,10 @@ long DATABASE::Export(const char* path, int all, const char* separator) {
     if (!OpenForExport(path, &file)) {
         return Fail(DatabaseError::ExportOpenFailed);
     }
-    int code = all != 0 ? ExportAll(work) : ExportResultSet(work);
+    int code = DatabaseError::ExportWriteFailed;
+    if (!headingLine_ || work.WriteHeading()) {
+        code = all != 0 ? ExportAll(work) : ExportResultSet(work);
+    }
     if (code == DatabaseError::None && writer.Flush() != 0) {
         code = DatabaseError::ExportWriteFailed;
     }
@@ -120,6 +129,12 @@ int DATABASE::ExportResultSet(EXPORT& work) {
     }
 }
 
+std::size_t DATABASE::LongestLoadLine() const {
+    // What Export writes is never taken apart.
+    const auto buffer = static_cast<std::size_t>(std::max(CalculateIOBufferSize(), 1));
+    return std::max(buffer - 1, Text(byteInputFormat_).LongestLine(1));
+}
+
 long DATABASE::Load(const char* path, const char* separators) {
     constexpr std::int32_t batchBytes = 256 * 1024;
     if (!IsOpen()) {
@@ -130,11 +145,9 @@ long DATABASE::Load(const char* path, const char* separators) {
     if (path == nullptr || file_.IsAt(path) || file.Open(path, FileMode::ReadOnly) != 0) {
         return Fail(DatabaseError::LoadOpenFailed);
     }
-    const RecordText text = Text();
+    const RecordText text = Text(byteInputFormat_);
     LineReader reader(file);
-    // What Export writes is never taken apart.
-    const auto buffer = static_cast<std::size_t>(std::max(CalculateIOBufferSize(), 1));
-    if (!reader.Prepare(std::max(buffer - 1, text.LongestLine(1)))) {
+    if (!reader.Prepare(LongestLoadLine())) {
         return Fail(DatabaseError::LoadNoMemoryForLine);
     }
     const std::int32_t batchRecords = std::max(batchBytes / header_.recordLength, 1);
@@ -147,14 +160,23 @@ long DATABASE::Load(const char* path, const char* separators) {
     LOAD work{text, reader, fields, batch.get(), batchRecords};
     int code = CheckFirstLine(work);
     if (code == DatabaseError::None) {
-        reader.Rewind();
         code = LoadLines(work);
     }
     return code == DatabaseError::None ? work.records : Fail(code);
 }
 
+// Goes to the first line of a record. False when the text cannot be read.
+bool DATABASE::BeginLines(LOAD& work) const {
+    work.reader.Rewind();
+    std::span<char> heading;
+    return !headingLine_ || work.reader.Next(&heading) == 0;
+}
+
 // The first line that is not empty must have as many fields as there are columns.
 int DATABASE::CheckFirstLine(LOAD& work) const {
+    if (!BeginLines(work)) {
+        return DatabaseError::LoadReadFailed;
+    }
     for (;;) {
         std::span<char> line;
         if (work.reader.Next(&line) != 0) {
@@ -172,6 +194,9 @@ int DATABASE::CheckFirstLine(LOAD& work) const {
 }
 
 int DATABASE::LoadLines(LOAD& work) {
+    if (!BeginLines(work)) {
+        return DatabaseError::LoadReadFailed;
+    }
     std::int32_t waiting = 0; // records in the batch
     for (;;) {
         std::span<char> line;

@@ -1,5 +1,5 @@
-// A text file of any bytes behind a byte that chooses the separators: its records are appended whole, and
-// what is exported of them loads again.
+// A text file of any bytes behind a byte that chooses the separators, its highest bit how bytes are read: its
+// records are appended whole, and what is exported of them loads again.
 #include <cstdint>
 #include <cstring>
 #include <string>
@@ -29,15 +29,17 @@ ROW RecordOf(DATABASE& database, long number) {
 }
 
 // Whether the record's line has a field for each column again.
-bool LoadsAgain(const ROW& row) {
-    return std::strpbrk(row.name, "\t\n") == nullptr && row.tag != '\0' && row.tag != '\t' && row.tag != '\n';
+bool LoadsAgain(const ROW& row, int byteFormat) {
+    return std::strpbrk(row.name, "\t\n") == nullptr &&
+           (byteFormat != 1 || (row.tag != '\0' && row.tag != '\t' && row.tag != '\n'));
 }
 
 // What is exported loads again, prices apart, which are rounded.
-void ExportAndLoad(DATABASE& database, long records, const std::string& text) {
-    database.SetByteOutputFormat(1);
+void ExportAndLoad(DATABASE& database, int byteFormat, long records, const std::string& text) {
+    database.SetByteOutputFormat(byteFormat);
     Require(database.Export(text.c_str(), 1, "\t") == records, "not all records are exported");
     DATABASE other(nullptr);
+    other.SetByteInputFormat(byteFormat);
     CreateSample(other, FuzzFolder() + "/again.db");
     Require(other.Load(text.c_str(), "\t\n") == records, "not all records are loaded again");
     for (long n = 0; n < records; ++n) {
@@ -65,6 +67,8 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     WriteBytes(text, BytesOf(data + 1, size - 1));
     DATABASE database(nullptr);
     CreateSample(database, path);
+    const int byteFormat = data[0] < 128 ? 1 : 2;
+    database.SetByteInputFormat(byteFormat);
     const long loaded = database.Load(text.c_str(), Separators[data[0] % std::size(Separators)]);
     DATABASE_HEADER header{};
     database.GetHeaderInfo(&header);
@@ -75,12 +79,12 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     }
     bool loadsAgain = loaded > 0;
     for (long n = 0; n < header.recordCount; ++n) {
-        loadsAgain = LoadsAgain(RecordOf(database, n)) && loadsAgain;
+        loadsAgain = LoadsAgain(RecordOf(database, n), byteFormat) && loadsAgain;
     }
     FileCheck check;
     Require(check.Run(path) == 0 && check.IsSound() && check.Findings().empty(), "the file is not sound");
     if (loadsAgain) {
-        ExportAndLoad(database, loaded, text);
+        ExportAndLoad(database, byteFormat, loaded, text);
     }
     return 0;
 }

@@ -111,6 +111,32 @@ TEST_F(TextTest, FieldsOfALine) {
     }
 }
 
+TEST_F(TextTest, BytesAsNumbersAndAHeading) {
+    const COLUMN_ENTRY tag = Column("TagOfThirteen", ColumnType::Byte); // wider than a byte's text
+    for (const int format : {1, 2}) {
+        std::filesystem::remove(folder_.File("other.db"));
+        database_.SetByteInputFormat(format);
+        database_.SetHeadingLine(false);
+        ASSERT_EQ(LoadInto({tag, tag}, "-7|300\nx|65|\n", "|\n"), 2);
+        database_.SetByteOutputFormat(2);
+        database_.SetHeadingLine(true);
+        EXPECT_EQ(database_.Export(text_.c_str(), 1, "|"), 2);
+        EXPECT_EQ(folder_.Read("rows.txt"), std::string("TagOfThirteen|TagOfThirteen|\n") +
+                                                (format == 1 ? "45|51|\n120|54|\n" : "-7|44|\n0|65|\n"));
+        database_.SetByteOutputFormat(format);
+        const CONTENT content = ContentOf(database_);
+        EXPECT_EQ(database_.Export(text_.c_str(), 1, "|"), 2);
+        EXPECT_EQ(database_.Load(text_.c_str(), "|\n"), 2);
+        for (std::size_t i = 0; i < 2; ++i) {
+            EXPECT_EQ(ContentOf(database_)[i + 2], content[i]) << format;
+        }
+    }
+    for (const char* text : {"", "one field", "one field\n\n"}) {
+        EXPECT_EQ(Load(text, "|\n"), 0) << text;
+    }
+    EXPECT_EQ(CodeOf(Load("a|b\n1\n", "|\n")), 1802);
+}
+
 TEST_F(TextTest, LinesOfAFile) {
     const std::string line = "a|1|1|1|1|1|1";
     const struct {
