@@ -8,6 +8,7 @@
 
 #include "db/Database.h"
 #include "tools/TableWriter.h"
+#include "tools/TextCheck.h"
 #include "tools/TextOutput.h"
 #include "util/FolderLock.h"
 
@@ -50,12 +51,12 @@ class DataFileTool {
     int Lock(const std::vector<long>& records, const SELECTION* selection);
     int UnLock(const std::vector<long>& records, const SELECTION* selection);
 
-    // Writes text lines of the selection, or of all records when it is null, to a file that is replaced. With
-    // `characters` a byte column becomes the character of that code, as Load reads it, instead of a number.
-    int Export(const std::string& path, const std::string& separator, bool characters,
-               const SELECTION* selection);
-    // Appends the records of a text file. A field ends at any of the separators and at the line's end.
-    int Load(const std::string& path, const std::string& separators);
+    // Writes text lines of the selection, or of all records when it is null, to a file that is replaced. Load
+    // reads them with the same format.
+    int Export(const std::string& path, const TEXT_FORMAT& format, const SELECTION* selection);
+    // Appends the records of a text file, or none when TextCheck finds a line wrong. A field ends at any
+    // character of the separator and at the line's end.
+    int Load(const std::string& path, const TEXT_FORMAT& format);
 
     int Compact();
     // Makes a new file. The columns are as ParseColumn reads them.
@@ -100,6 +101,8 @@ class DataFileTool {
                                          const std::string& assignment, std::vector<bool>& given,
                                          std::uint8_t* data) const;
     int Mark(const MARKING& marking, std::vector<long> records, const SELECTION* selection);
+    [[nodiscard]] int CheckText(const std::string& path, const TEXT_FORMAT& format,
+                                const std::string& separators);
     [[nodiscard]] bool RestoreBackup();
     void PrintFindings(const class FileCheck& check);
 

@@ -13,27 +13,50 @@ std::string Records(long count) {
     return std::to_string(count) + (count == 1 ? " record" : " records");
 }
 
+// As the engine numbers it.
+int ByteFormat(const TEXT_FORMAT& format) {
+    return format.characters ? 1 : 2;
+}
+
 } // namespace
 
-int DataFileTool::Export(const std::string& path, const std::string& separator, bool characters,
-                         const SELECTION* selection) {
+int DataFileTool::Export(const std::string& path, const TEXT_FORMAT& format, const SELECTION* selection) {
     if (!Open(Access::Read))
         return 1;
     if (selection != nullptr && !Select(*selection))
         return FailAsEngine();
-    database_.SetByteOutputFormat(characters ? 1 : 2);
+    database_.SetByteOutputFormat(ByteFormat(format));
+    database_.SetHeadingLine(format.heading);
     errno = 0;
-    const long lines = database_.Export(path.c_str(), selection == nullptr ? 1 : 0, separator.c_str());
+    const long lines = database_.Export(path.c_str(), selection == nullptr ? 1 : 0, format.separator.c_str());
     if (lines < 0)
         return FailAsEngine(path + ": ");
     Tell("exported", lines, Records(lines) + " exported to " + path);
     return 0;
 }
 
-int DataFileTool::Load(const std::string& path, const std::string& separators) {
-    if (!Open(Access::Change))
+// Tells of the first line that is wrong, or why the text cannot be read. Returns an exit status.
+int DataFileTool::CheckText(const std::string& path, const TEXT_FORMAT& format,
+                            const std::string& separators) {
+    File text(SystemFiles());
+    errno = text.Open(path, FileMode::ReadOnly);
+    if (errno != 0 || text.IsAt(file_))
+        return FailWithCode(DatabaseError::LoadOpenFailed, path + ": ");
+    const std::vector<COLUMN_ENTRY> columns = AllColumns();
+    TextCheck check(columns, format, separators);
+    if (const int code = check.Run(text, database_.LongestLoadLine()); code != 0)
+        return FailWithCode(code, path + ": ");
+    return check.Wrong().empty() ? 0 : Fail(path + ", " + check.Wrong());
+}
+
+int DataFileTool::Load(const std::string& path, const TEXT_FORMAT& format) {
+    const std::string separators = format.separator + "\r\n";
+    if (!Open(Access::Change) || CheckText(path, format, separators) != 0)
         return 1;
-    const long loaded = database_.Load(path.c_str(), (separators + "\r\n").c_str());
+    database_.SetByteInputFormat(ByteFormat(format));
+    database_.SetHeadingLine(format.heading);
+    errno = 0;
+    const long loaded = database_.Load(path.c_str(), separators.c_str());
     if (loaded < 0)
         return FailAsEngine(path + ": ");
     Tell("loaded", loaded, Records(loaded) + " loaded from " + path);

@@ -25,8 +25,7 @@ struct DB_OPTIONS {
     std::vector<long> records;
     std::vector<std::string> values;
     std::string path;
-    std::string separator = "\t";
-    bool characters = false;
+    TEXT_FORMAT text;
     std::string description;
     bool repair = false;
 };
@@ -57,6 +56,7 @@ class DbCommand {
     void AddReadingCommands();
     void AddChangingCommands();
     void AddMarkingCommands();
+    void AddTextCommands();
     void AddFileCommands();
 
   private:
@@ -207,6 +207,35 @@ void DbCommand::AddMarkingCommands() {
                [](DataFileTool& tool, const DB_OPTIONS& options) { return tool.UnDelete(options.records); });
 }
 
+void DbCommand::AddTextCommands() {
+    CLI::App* exporting = Add("export", "Write records to a text file, a line each",
+                              [](DataFileTool& tool, const DB_OPTIONS& options) {
+                                  return tool.Export(options.path, options.text, Selected(options));
+                              });
+    exporting->add_option("TEXTFILE", options_->path, "The text file; replaced when it exists")->required();
+    exporting->add_option("--separator", options_->text.separator, "What follows each field (default: a tab)")
+        ->option_text("TEXT");
+    exporting->add_flag("--characters", options_->text.characters,
+                        "Write a byte as the character of that code, not as a number");
+    exporting->add_flag("--heading", options_->text.heading, "Write a first line of the columns' names");
+    CLI::Option* where = AddWhere(exporting, "Which records (default: all)");
+    AddSelection(exporting, where);
+    exporting->add_option("--sort", options_->selection.sortColumn, "Write them in the order of this column")
+        ->option_text("COLUMN")
+        ->needs(where);
+    CLI::App* load = Add(
+        "load", "Append the records of a text file, or none when a line is wrong",
+        [](DataFileTool& tool, const DB_OPTIONS& options) { return tool.Load(options.path, options.text); });
+    load->add_option("TEXTFILE", options_->path, "The text file, a line for each record")->required();
+    load->add_option("--separators", options_->text.separator,
+                     "The characters that end a field (default: a tab)")
+        ->option_text("TEXT");
+    load->add_flag("--characters", options_->text.characters,
+                   "Read a byte as the character of that code, not as a number");
+    load->add_flag("--heading", options_->text.heading,
+                   "Expect a first line of the columns' names, in their order");
+}
+
 void DbCommand::AddFileCommands() {
     CLI::App* create = Add("create", "Make a new file", [](DataFileTool& tool, const DB_OPTIONS& options) {
         return tool.Create(options.description, options.values);
@@ -226,28 +255,6 @@ void DbCommand::AddFileCommands() {
         ->required();
     create->add_option("--description", options_->description, "A text of at most 31 bytes")
         ->option_text("TEXT");
-    CLI::App* exporting =
-        Add("export", "Write records to a text file, a line each",
-            [](DataFileTool& tool, const DB_OPTIONS& options) {
-                return tool.Export(options.path, options.separator, options.characters, Selected(options));
-            });
-    exporting->add_option("TEXTFILE", options_->path, "The text file; replaced when it exists")->required();
-    exporting->add_option("--separator", options_->separator, "What follows each field (default: a tab)")
-        ->option_text("TEXT");
-    exporting->add_flag("--characters", options_->characters,
-                        "Write a byte as the character of that code, as `load` reads it");
-    CLI::Option* where = AddWhere(exporting, "Which records (default: all)");
-    AddSelection(exporting, where);
-    exporting->add_option("--sort", options_->selection.sortColumn, "Write them in the order of this column")
-        ->option_text("COLUMN")
-        ->needs(where);
-    CLI::App* load =
-        Add("load", "Append the records of a text file", [](DataFileTool& tool, const DB_OPTIONS& options) {
-            return tool.Load(options.path, options.separator);
-        });
-    load->add_option("TEXTFILE", options_->path, "The text file, a line for each record")->required();
-    load->add_option("--separators", options_->separator, "The characters that end a field (default: a tab)")
-        ->option_text("TEXT");
     Add("compact", "Rewrite the file without its deleted records; the others get new numbers",
         [](DataFileTool& tool, const DB_OPTIONS&) { return tool.Compact(); });
 }
@@ -259,5 +266,6 @@ void AddDbCommand(CLI::App& application, int& status) {
     command.AddReadingCommands();
     command.AddChangingCommands();
     command.AddMarkingCommands();
+    command.AddTextCommands();
     command.AddFileCommands();
 }

@@ -94,6 +94,8 @@ std::string StoreText(const COLUMN_ENTRY& column, std::string_view text, std::ui
     if (text.size() + 1 > WidthOf(column) && !text.empty())
         return "is too long: " + std::to_string(text.size()) + " bytes, and the column holds " +
                std::to_string(std::max(column.size - 1, 0));
+    if (text.find('\0') != text.npos)
+        return "has a byte 0 in it, where it would end";
     std::copy(text.begin(), text.end(), field);
     return {};
 }

@@ -17,9 +17,9 @@
 void FillCell(const COLUMN_ENTRY& column, const std::uint8_t* data, CELL* cell);
 
 // Writes a value into the column of a record's data, which must be zeroed. Refused are a text that is too
-// long, a number that is none or beyond the column's range, an infinite float, and a date or time that does
-// not exist; an empty date or 00000000 is none. Returns an empty text on success, else what is wrong with the
-// value.
+// long or has a byte 0 in it, a number that is none or beyond the column's range, an infinite float, and a
+// date or time that does not exist; an empty date or 00000000 is none. Returns an empty text on success, else
+// what is wrong with the value.
 [[nodiscard]] std::string StoreField(const COLUMN_ENTRY& column, std::string_view text, std::uint8_t* data);
 
 // Reads a column's description: NAME:TYPE[:WIDTH[:DECIMALS]]. A string needs its width in bytes, its end

@@ -178,6 +178,10 @@ TEST_F(DbCommandTest, EveryCommandTakesItsOptions) {
         {"db a.db export a.txt --separator , --where 'N > 0' --sort Name", 0,
          "2 records exported to a.txt\n"},
         {"db a.db load a.txt --separators ,", 0, "2 records loaded from a.txt\n"},
+        {"db a.db load a.txt --separators , --heading",
+         1,
+         "",
+         {"a.txt, line 1: ' ' stands where the column Name "}},
         {"db a.db compact", 0, "compacted: 1 record removed, 4 records left\n"},
         {"db a.db columns --format tsv", 0,
          "name\ttype\twidth\toffset\tdecimals\nName\tstring\t8\t0\t\nN\tlong\t4\t8\t\n"},
@@ -257,18 +261,86 @@ TEST_F(DbCommandTest, TextGoesOutAndComesBack) {
     MakeSample();
     Go({{"db a.db set 'Tag = 65' --all", 0, "3 records changed\n"},
         {"db a.db set 'Name = plain' --all", 0, "3 records changed\n"},
-        {"db a.db export a.txt --separator ';' --characters --where 'Price < 100' --sort Price", 0,
+        {"db a.db export a.txt --separator ';' --characters --heading --where 'Price < 100' --sort Price", 0,
          "3 records exported to a.txt\n"}});
-    EXPECT_EQ(shell_.Read("a.txt"), "plain;-1000000.000;00000000;000000;A;\n"
+    EXPECT_EQ(shell_.Read("a.txt"), "Name;Price;Day;At;Tag;\nplain;-1000000.000;00000000;000000;A;\n"
                                     "plain;0.100;00000000;000000;A;\nplain;12.500;20240229;091530;A;\n");
-    Go({{"db a.db load a.txt --separators ';'", 0, "3 records loaded from a.txt\n"},
+    Go({{"db a.db load a.txt --separators ';' --characters --heading", 0, "3 records loaded from a.txt\n"},
         {"db a.db query 'Price = 12.5' --format tsv", 0,
          "record\tName\tPrice\tDay\tAt\tTag\n0\tplain\t12.5\t20240229\t091530\t65\n"
          "5\tplain\t12.5\t20240229\t091530\t65\n"},
         {"db a.db export a.txt --format tsv", 0, "exported\n6\n"},
-        {"db a.db load a.txt --separators ';'", 1, "", {"1802 "}},
+        {"db a.db load a.txt --separators ';'", 1, "", {"a.txt, line 1: 1 field, the data file has 5"}},
+        {"db a.db load a.db", 1, "", {"a.db: 1801 "}},
+        {"db a.db load no/where", 1, "", {"no/where: 1801 ", "(No such file or directory)"}},
         {"db a.db export no/where", 1, "", {"1901 ", "(No such file or directory)"}}});
     EXPECT_EQ(shell_.Read("a.txt").substr(0, 42), "plain\t12.500\t20240229\t091530\t65\t\nplain\t0.1");
+}
+
+// Bytes of every kind in all ways that they can be written, and what is near the limits of its column.
+TEST_F(DbCommandTest, WhatIsExportedLoadsBackTheSame) {
+    Go({{"db a.db create --column A:byte --column Name:string:6 --column F:float::15 --column S:short "
+         "--column L:long --column D:date --column T:time --column One:string:1",
+         0, "created with 8 columns\n"},
+        {"db a.db append A=-128 'Name=a,b;c' F=-3.4028235e38 S=-32768 L=-2147483648 D=99991231 T=235959", 0,
+         "record 0 appended\n"},
+        {"db a.db append A=48 'Name= ' F=0.1 S=32767 L=2147483647", 0, "record 1 appended\n"},
+        {"db a.db append Name=\xFF\\\\ A=0", 0, "record 2 appended\n"}});
+    ASSERT_EQ(Run("db a.db query --format tsv"), 0);
+    const std::string content = shell_.Output();
+    const std::string whole = shell_.Read("a.db");
+    for (const std::string options : {"", " --characters", " --heading", " --characters --heading"}) {
+        Go({{("db a.db export a.txt" + options).c_str(), 0, "3 records exported to a.txt\n"},
+            {"db a.db delete 0 1 2", 0, "3 records deleted\n"},
+            {("db a.db load a.txt" + options).c_str(), 0, "3 records loaded from a.txt\n"},
+            {"db a.db compact", 0, "compacted: 3 records removed, 3 records left\n"},
+            {"db a.db query --format tsv", 0, content.c_str()}});
+        shell_.Write("a.db", whole);
+    }
+}
+
+TEST_F(DbCommandTest, TextWithAWrongLineIsNotLoaded) {
+    MakeSample();
+    const std::string before = shell_.Read("a.db");
+    const std::string good = "Birch\t+1e1\t20240229\t091530\t-7\t\r\n";
+    const std::string names = "Name\tPrice\tDay\tAt\tTag\n";
+    const struct {
+        std::string text;
+        const char* options;
+        const char* wrong; // null when it is loaded
+    } cases[] = {
+        {good + "a\t5,5\t00000000\t000000\t0\n" + "a\n", "", ", line 2: Price: '5,5' is no number"},
+        {good + "\n\n \t5\t2026\t000000\t0", "", ", line 4: Day: '2026' is no date of the form YYYYMMDD"},
+        {"a\t5\t20240229\t246000\t0\n", "", ", line 1: At: '246000' is no time"},
+        {"a\t5\t20240229\t091530\tx\n", "", ", line 1: Tag: 'x' is no whole number from -128 to 127"},
+        {"a\t5\t20240229\t091530\t65\n", "--characters", ", line 1: Tag: '65' is more than one character"},
+        {"sixteen letters!\t5\t20240229\t091530\t0\n", "",
+         "' is too long: 16 bytes, and the column holds 15"},
+        {std::string("a\0b\t5\t20240229\t091530\t0\n", 27), "", ", line 1: Name: 'a\\x00b' has a byte 0"},
+        {good + "a\t\t20240229\t091530\t0\n", "", ", line 2: 4 fields, the data file has 5 columns"},
+        {good + "a\t1\t20240229\t091530\t0\tmore\n", "", ", line 2: 6 fields, the data file has 5 columns"},
+        {good + std::string(500, 'x') + "\n", "", ", line 2: the line is longer than "},
+        {names + good, "", ", line 1: Price: 'Price' is no number"},
+        {good, "--heading", ", line 1: 'Birch' stands where the column Name is to be named"},
+        {"", "--heading", ", line 1: 0 fields, the data file has 5 columns"},
+        {names + "a\n", "--heading", ", line 2: 1 field, the data file has 5 columns"},
+        {names + "\n" + good, "--heading", nullptr},
+        {good, "", nullptr},
+    };
+    for (const auto& c : cases) {
+        SCOPED_TRACE(c.text);
+        shell_.Write("a.txt", c.text);
+        EXPECT_EQ(Run(std::string("db a.db load a.txt ") + c.options), c.wrong == nullptr ? 0 : 1);
+        EXPECT_EQ(shell_.Read("a.db") == before, c.wrong != nullptr);
+        EXPECT_TRUE(c.wrong == nullptr || shell_.Complains((std::string("a.txt") + c.wrong).c_str()) ||
+                    (c.wrong[0] == '\'' && shell_.Complains(c.wrong)))
+            << shell_.Errors();
+        shell_.Write("a.db", before);
+    }
+    shell_.Write("a.txt", good);
+    Go({{"db a.db load a.txt", 0, "1 record loaded from a.txt\n"},
+        {"db a.db query 'Name = Birch' --format tsv", 0,
+         "record\tName\tPrice\tDay\tAt\tTag\n3\tBirch\t10\t20240229\t091530\t-7\n"}});
 }
 
 TEST_F(DbCommandTest, DamageIsToldAndMended) {
