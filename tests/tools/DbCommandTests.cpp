@@ -316,7 +316,7 @@ TEST_F(DbCommandTest, TextWithAWrongLineIsNotLoaded) {
         {"a\t5\t20240229\t091530\t65\n", "--characters", ", line 1: Tag: '65' is more than one character"},
         {"sixteen letters!\t5\t20240229\t091530\t0\n", "",
          "' is too long: 16 bytes, and the column holds 15"},
-        {std::string("a\0b\t5\t20240229\t091530\t0\n", 27), "", ", line 1: Name: 'a\\x00b' has a byte 0"},
+        {std::string("a\0b", 3) + "\t5\t20240229\t091530\t0\n", "", ", line 1: Name: 'a\\x00b' has a byte 0"},
         {good + "a\t\t20240229\t091530\t0\n", "", ", line 2: 4 fields, the data file has 5 columns"},
         {good + "a\t1\t20240229\t091530\t0\tmore\n", "", ", line 2: 6 fields, the data file has 5 columns"},
         {good + std::string(500, 'x') + "\n", "", ", line 2: the line is longer than "},
