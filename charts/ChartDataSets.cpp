@@ -100,7 +100,7 @@ std::int32_t& ChartDataSets::PlaceOf(const CHART_DATA_SET& set, Places& places, 
 }
 
 void ChartDataSets::AddKeyed(CHART_DATA_SET& set, Places& places, std::string_view key, float value) {
-    if (key.empty())
+    if (IsBlank(key))
         return;
     key = key.substr(0, NameSize - 1); // as the label will be
     std::int32_t& slot = PlaceOf(set, places, key);

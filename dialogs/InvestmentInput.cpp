@@ -7,6 +7,7 @@
 #include "util/CharacterBuffer.h"
 #include "util/Dates.h"
 #include "util/Numbers.h"
+#include "util/Strings.h"
 
 namespace {
 
@@ -57,7 +58,7 @@ std::string ShownPrice(const INVESTMENT_DATA& record) {
 }
 
 InvestmentCheck FillInvestment(const InvestmentInput& input, INVESTMENT_DATA* record) {
-    if (input.name.find_first_not_of(' ') == std::string::npos)
+    if (IsBlank(input.name))
         return InvestmentCheck::NoName;
     float shares = record->Shares;
     float price = record->Price;

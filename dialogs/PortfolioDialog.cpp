@@ -1,11 +1,10 @@
 #include "dialogs/PortfolioDialog.h"
 
-#include <cstring>
-
 #include "app/PortfolioRules.h"
 #include "platform/TextControl.h"
 #include "util/CharacterBuffer.h"
 #include "util/InterfaceHelpers.h"
+#include "util/Strings.h"
 
 namespace {
 
@@ -16,7 +15,7 @@ constexpr float Margin = 10;
 } // namespace
 
 PortfolioNameCheck CheckPortfolioName(DATABASE& portfolios, const char* name) {
-    if (!CanBePortfolioName(name) || name[std::strspn(name, " ")] == '\0')
+    if (!CanBePortfolioName(name) || IsBlank(name))
         return PortfolioNameCheck::Invalid;
     return SelectPortfolios(portfolios, name) > 0 ? PortfolioNameCheck::Taken : PortfolioNameCheck::Accepted;
 }

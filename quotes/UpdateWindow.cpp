@@ -13,6 +13,7 @@
 #include "util/CharacterBuffer.h"
 #include "util/InterfaceHelpers.h"
 #include "util/Numbers.h"
+#include "util/Strings.h"
 #include "util/WholeFile.h"
 
 namespace {
@@ -106,7 +107,7 @@ bool UpdateWindow::UpdateOne(int32 recordNumber) {
     }
     const std::string ticker(FieldText(record.Ticker));
     // Without a ticker a page could only give the price of something else.
-    if (ticker.empty()) {
+    if (IsBlank(ticker)) {
         log_.Add("No ticker for '" + std::string(FieldText(record.Name)) + "'\n");
         ShowProgress();
         return true;

@@ -104,7 +104,7 @@ TEST(ApplyQuote, ChangesWhatItShall) {
 
 // A row without a ticker is left out; the others show how their prices moved.
 TEST_F(PriceUpdate, AsksForTheSelectedRowsThatHaveATicker) {
-    AddInvestment(Holding("", 48200, NoPreviousPrice));
+    AddInvestment(Holding(" ", 48200, NoPreviousPrice));
     Mark({5, 0, 1, 2, 3});
     Update();
     UntilDone();

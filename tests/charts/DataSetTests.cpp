@@ -32,7 +32,7 @@ constexpr Held Portfolio[] = {
     {"Acme", "ABC", "Stock Fund", "MED", true, 1, 10},
     {"Birch", "abc", "STOCK", "Med", false, 2, 20},
     {"Acme", "ABC", "Bond Fund", "low", false, 4, 40},
-    {"Cedar", "", "Cash", "Medium", false, 8, 80},
+    {"Cedar", " ", "Cash", "Medium", false, 8, 80},
     {"Dogwood", "", "", "", true, 16, 160},
 };
 
