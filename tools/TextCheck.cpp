@@ -66,7 +66,9 @@ std::string TextCheck::WhatIsWrong(std::span<char> line, std::size_t longest, bo
         return {};
     SplitFields(line);
     if (fields_.size() != columns_.size())
-        return Counted(fields_.size(), "field") + ", the data file has " + Counted(columns_.size(), "column");
+        return Counted(fields_.size(), "field") + ", the data file has " +
+               Counted(columns_.size(), "column") +
+               (fields_.size() < columns_.size() ? " (an empty field needs a blank in it)" : "");
     return heading ? WrongName() : WrongValue();
 }
 
