@@ -187,6 +187,10 @@ TEST(Drawing, BevelsAreLitFromTheLeftTop) {
     ExpectColor(kWhitePixel, shown.Picture(), {{20, 5}, {5, 20}, {70, 44}, {94, 20}});
     ExpectColor(dark, shown.Picture(), {{20, 44}, {44, 20}, {70, 5}, {55, 20}});
     ExpectColor(kBluePixel, shown.Picture(), {{20, 20}, {20, 8}, {70, 41}});
+    int thickness = 0;
+    for (int y = 0; y < 20; ++y)
+        thickness += shown.Picture().pixel(20, y) == (0xFF000000 | kWhitePixel) ? 1 : 0;
+    EXPECT_EQ(thickness, 2);
 }
 
 TEST(Drawing, OutsideAPaintPassItOnlyAsksForOne) {
