@@ -333,7 +333,7 @@ TEST_F(DbCommandTest, TextWithAWrongLineIsNotLoaded) {
         shell_.Write("a.txt", c.text);
         EXPECT_EQ(Run(std::string("db a.db load a.txt ") + c.options), c.wrong == nullptr ? 0 : 1);
         EXPECT_EQ(shell_.Read("a.db") == before, c.wrong != nullptr);
-        EXPECT_TRUE(c.wrong == nullptr || shell_.Complains((std::string("a.txt") + c.wrong).c_str()) ||
+        EXPECT_TRUE(c.wrong == nullptr || shell_.Complains(std::string("a.txt") + c.wrong) ||
                     (c.wrong[0] == '\'' && shell_.Complains(c.wrong)))
             << shell_.Errors();
         shell_.Write("a.db", before);
