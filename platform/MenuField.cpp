@@ -43,13 +43,15 @@ BMenuField::~BMenuField() {
     Button(this)->SetMenu(nullptr);
 }
 
-// The keyboard starts at the marked item.
+// The keyboard starts at the marked item, or at the first one: Return has a choice to take at once.
 void BMenuField::PrepareMenu() {
     QMenu* menu = MenuAccess::Peer(*menu_).menu.get();
     QTimer::singleShot(0, menu, [this, menu] {
-        const BMenuItem* marked = MenuItem();
-        if (marked && menu->isVisible() && !menu->activeAction())
-            menu->setActiveAction(MenuAccess::Peer(*marked).action);
+        const BMenuItem* start = MenuItem();
+        if (!start)
+            start = menu_->ItemAt(0);
+        if (start && menu->isVisible() && !menu->activeAction())
+            menu->setActiveAction(MenuAccess::Peer(*start).action);
     });
 }
 

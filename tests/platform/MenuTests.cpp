@@ -132,6 +132,12 @@ TEST_F(MenuFields, AreOpenedAndChosenFromByKeyAndPointer) {
     Show();
     EXPECT_TRUE(field->IsFocus());
     auto* button = Find<QPushButton>("portfolio");
+    menu->ItemAt(1)->SetMarked(false);
+    QTest::keyClick(button, Qt::Key_Down);
+    QMenu* unmarked = OpenMenu();
+    ASSERT_TRUE(unmarked);
+    EXPECT_TRUE(QTest::qWaitFor([&] { return unmarked->activeAction() == unmarked->actions()[0]; }));
+    QTest::keyClick(unmarked, Qt::Key_Escape);
     for (const Qt::Key key : {Qt::Key_Down, Qt::Key_Up, Qt::Key_Space, Qt::Key_Return}) {
         menu->ItemAt(1)->SetMarked(true);
         QTest::keyClick(QApplication::focusWidget(), key);
