@@ -104,9 +104,6 @@ void FieldChange::Apply(std::uint8_t* data) const {
 }
 
 void FieldChange::ApplyDate(std::uint8_t* field) const {
-    if (op_ == SetOperator::Multiply || op_ == SetOperator::Divide) {
-        return;
-    }
     dbDATE date = UnpackDate(static_cast<std::int32_t>(LoadLittleEndian<std::uint32_t>(field, width_)));
     ChangeDate(op_, &date, static_cast<std::int32_t>(whole_));
     NormaliseDate(&date);
@@ -114,9 +111,6 @@ void FieldChange::ApplyDate(std::uint8_t* field) const {
 }
 
 void FieldChange::ApplyTime(std::uint8_t* field) const {
-    if (op_ == SetOperator::Multiply || op_ == SetOperator::Divide) {
-        return;
-    }
     const std::size_t width = std::min<std::size_t>(width_, sizeof(dbTIME));
     dbTIME time = UnpackTime(static_cast<std::int32_t>(LoadLittleEndian<std::uint32_t>(field, width)));
     ChangeTime(op_, &time, static_cast<std::int32_t>(whole_));

@@ -1,12 +1,14 @@
 #include "db/Statement.h"
 
+#include <algorithm>
 #include <array>
+#include <cmath>
 #include <cstdlib>
 #include <cstring>
 #include <limits>
 #include <string_view>
 
-#include <clocale>
+#include "util/Numbers.h"
 
 namespace {
 
@@ -42,11 +44,6 @@ std::array<std::int32_t, 3> DigitGroups(const char* digits, std::array<int, 3> w
     return numbers;
 }
 
-locale_t PlainLocale() {
-    static const locale_t plain = newlocale(LC_ALL_MASK, "C", nullptr);
-    return plain;
-}
-
 } // namespace
 
 bool SplitStatement(const char* statement, STATEMENT* result) {
@@ -63,12 +60,19 @@ std::int64_t WholeNumber(const char* text) {
 }
 
 float SingleNumber(const char* text) {
-    const double number = strtod_l(text, nullptr, PlainLocale());
-    constexpr double largest = std::numeric_limits<float>::max();
-    if (number > largest || number < -largest) {
-        return number > 0 ? std::numeric_limits<float>::infinity() : -std::numeric_limits<float>::infinity();
+    constexpr float largest = std::numeric_limits<float>::max();
+    constexpr double roundsToInfinity = 0x1.ffffffp127; // half a unit beyond the largest
+    constexpr float infinity = std::numeric_limits<float>::infinity();
+    const std::string_view word(text);
+    if (word == "nan") {
+        return std::numeric_limits<float>::quiet_NaN();
     }
-    return static_cast<float>(number);
+    double number = 0;
+    if (word == "inf" || word == "-inf" || !ReadDecimal(text, &number) ||
+        std::abs(number) >= roundsToInfinity) {
+        return word.find_first_not_of(" \t\n\v\f\r") == word.find('-') ? -infinity : infinity;
+    }
+    return static_cast<float>(std::clamp<double>(number, -largest, largest));
 }
 
 std::int32_t PackedDate(const char* digits) {

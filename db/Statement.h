@@ -25,7 +25,8 @@ struct STATEMENT {
 /// A decimal whole number, as the C library's conversions read it; out of range it stops at the 64-bit
 /// limits.
 [[nodiscard]] std::int64_t WholeNumber(const char* text);
-/// A decimal number rounded to single precision; out of range it is infinite or 0.
+/// A decimal number rounded to single precision; out of range it is infinite or 0. The words "inf", "-inf"
+/// and "nan", alone, are what an export writes for a float that is no number, and are read as that.
 [[nodiscard]] float SingleNumber(const char* text);
 /// YYYYMMDD (up to 4, 2 and 2 digits) as a packed date; parts that are not there are 0.
 [[nodiscard]] std::int32_t PackedDate(const char* digits);

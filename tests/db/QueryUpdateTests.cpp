@@ -1,3 +1,4 @@
+#include <cfloat>
 #include <climits>
 #include <cmath>
 
@@ -70,6 +71,12 @@ TEST_F(QueryUpdateTest, ChangesEveryTypeByEveryOperator) {
         {"Price / 4", price, 0.375, -0.5},
         {"Price / 0", price, INFINITY, -INFINITY},
         {"Price = 1e99", price, INFINITY, INFINITY},
+        {"Price = -1e999", price, -INFINITY, -INFINITY},
+        {"Price = -inf", price, -INFINITY, -INFINITY},
+        {"Price = 3.4028235e38", price, FLT_MAX, FLT_MAX},
+        {"Price = nancy", price, 0, 0},
+        {"Price = infinite", price, 0, 0},
+        {"Price = 0x10", price, 0, 0},
     };
     for (const auto& change : cases) {
         Change(change.statement);
@@ -114,6 +121,15 @@ TEST_F(QueryUpdateTest, ChangesDatesAndTimesByParts) {
     std::int16_t number = 7;
     database_.QueryUpdateFunction<std::int16_t>(5, &number, 2);
     EXPECT_EQ(number, 7);
+}
+
+TEST_F(QueryUpdateTest, CarriesPartsThatAChangeWithoutEffectLeaves) {
+    Append({Row("odd", 0, 0, 0, 0, {31, 2, 1999}, {75, 10, 10})});
+    ASSERT_EQ(database_.Query("Name = odd", QueryMode::New), 1);
+    EXPECT_EQ(database_.QueryUpdate("Day * 2"), 1);
+    EXPECT_EQ(database_.QueryUpdate("At / 2"), 1);
+    EXPECT_EQ(PackDate(At(3).day), PackDate({3, 3, 1999}));
+    EXPECT_EQ(PackTime(At(3).at), PackTime({15, 11, 10}));
 }
 
 // A foreign file may have a column narrower than its type, right before another.
