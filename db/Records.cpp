@@ -48,10 +48,12 @@ long DATABASE::AppendAll(const void* data, std::size_t stride, std::int32_t coun
         code = CountNewRecords(count);
     }
     if (code != DatabaseError::None) {
-        // While the header still announces them.
-        static_cast<void>(file_.Truncate(Area().OffsetOf(number)));
-        header_.reserved = 0;
-        static_cast<void>(WriteHeaderBytes());
+        // While the header still announces them. What cannot be cut off now stays announced, for the next
+        // append to cut it.
+        if (file_.Truncate(Area().OffsetOf(number)) == 0) {
+            header_.reserved = 0;
+            static_cast<void>(WriteDbHeader());
+        }
         return Fail(code);
     }
     currentRecord_ = number + count - 1;

@@ -161,6 +161,48 @@ TEST_F(FaultTest, FailedCallLeavesTheOldContentOrTheNew) {
     }
 }
 
+// Writes records but says that it could not, and cannot take them back; the header it can write.
+class StickyFiles : public FileOperations {
+  public:
+    bool sticky = true;
+    ssize_t WriteAt(int file, const void* data, std::size_t size, off_t offset) override {
+        const ssize_t written = FileOperations::WriteAt(file, data, size, offset);
+        return sticky && size >= 3 * sizeof(ROW) ? Refuse() : written;
+    }
+    int Truncate(int file, off_t length) override {
+        return sticky ? Refuse() : FileOperations::Truncate(file, length);
+    }
+
+  private:
+    static int Refuse() {
+        errno = EIO;
+        return -1;
+    }
+};
+
+TEST_F(FaultTest, RecordsThatCannotBeTakenBackStayAnnounced) {
+    const CONTENT old = ContentOf(*Fresh());
+    StickyFiles sticky;
+    DATABASE database(path_.c_str(), sticky);
+    const ROW rows[] = {NewRow, NewRow, NewRow};
+    EXPECT_EQ(database.AppendAll(rows, sizeof(ROW), 3), -1);
+    EXPECT_EQ(Reopened(), old);
+    sticky.sticky = false;
+    EXPECT_EQ(database.Append(&NewRow), static_cast<long>(old.size()));
+    EXPECT_EQ(Reopened().size(), old.size() + 1);
+}
+
+TEST_F(FaultTest, HeaderThatIsNotToBeWrittenIsNotAfterAFailureEither) {
+    auto database = Fresh();
+    database->SetImmediateHeaderWrite(false);
+    ASSERT_GE(database->Append(&NewRow), 0);
+    const std::string header = folder_.Read("rows.db").substr(0, HeaderSize);
+    files_.Arm(Fault::Error, 0);
+    EXPECT_EQ(database->AppendAll(&NewRow, sizeof(ROW), 1), -1);
+    ASSERT_TRUE(files_.Disarm());
+    EXPECT_EQ(folder_.Read("rows.db").substr(0, HeaderSize), header);
+}
+
 TEST_F(FaultTest, KilledAtAnyCallLeavesTheOldContentOrTheNew) {
     const CONTENT old = ContentOf(*Fresh());
     for (const OPERATION& operation : Operations) {
