@@ -62,7 +62,7 @@ class DATABASE {
     /// Opens an existing file, closing the one that was open. A file that may not be written is opened for
     /// reading: operations that would change it then fail. Nothing is written. Fails with 1103 when the file
     /// cannot be opened, the path is longer than 127 characters, or header and columns make no sense
-    /// (negative counts, a column table that is cut off, a column outside the record), 1105, 1107 or 1108
+    /// (negative counts, a column table that is cut off, a column outside the record), 1105 or 1107
     /// without memory; then no file is open. When fewer records are there than the header counts, those that
     /// are there whole can be read; a deleted count that cannot be is counted afresh. See IsDamaged.
     int Open(const char* path);
@@ -185,7 +185,7 @@ class DATABASE {
     /// query. Texts are compared ignoring the case of A to Z. Equal records keep their order, and so do all
     /// when the column's type is unknown; a record whose float is no number keeps its place, the records
     /// before and behind it being sorted apart. Records deleted since the query drop out. Fewer than two
-    /// records are left as they are. The second argument has no effect. Fails with 1701 column, 1702 to 1704
+    /// records are left as they are. The second argument has no effect. Fails with 1701 column, 1702 or 1704
     /// memory, 1709 read error, or as QueryReset; then the set keeps its order.
     int SortBy(const char* column, int ignored);
     /// Moves a pair of slots one step on: `*first` to the first used slot of the set behind it, `*second` to

@@ -1,7 +1,7 @@
 #pragma once
 
-/// Codes of the record database. The hundreds name the operation; codes that end in 06 to 09 (or begin with
-/// 28 and 29) report that the file itself could not be read or written.
+/// Codes of the record database. The hundreds name the operation, the last two digits what was in its way;
+/// Errors.cpp has a sentence for each.
 namespace DatabaseError {
 enum Code : int {
     None = 0,

@@ -7,9 +7,10 @@
 #include <sys/stat.h>
 #include <sys/types.h>
 
-/// The system calls through which the engine reaches files, one virtual operation each. Results are the
-/// system's: negative (with errno set) on failure. Tests derive from it to make a chosen call fail, write
-/// short or end the process; the program uses SystemFiles().
+/// The system calls through which the engine opens, reads and changes files, one virtual operation each (what
+/// only looks at names, such as FileExists, asks the system itself). Results are the system's: negative (with
+/// errno set) on failure. Tests derive from it to make a chosen call fail, write short or end the process;
+/// the program uses SystemFiles().
 class FileOperations {
   public:
     FileOperations() = default;

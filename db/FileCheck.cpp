@@ -101,8 +101,10 @@ int FileCheck::Examine(const File& file) {
     if (error != 0) {
         Forget();
     } else if (omitted_ > 0) {
-        findings_.push_back({problem_, false, 0, -1,
-                             Text(static_cast<std::int64_t>(omitted_)) + " more findings are not listed"});
+        findings_.push_back(
+            {problem_, false, 0, -1,
+             Counted(static_cast<std::int64_t>(omitted_), "more finding is", "more findings are") +
+                 " not listed"});
     }
     return error;
 }
