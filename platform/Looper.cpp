@@ -116,6 +116,8 @@ void LooperCore::Deliver(Queued queued) {
 }
 
 void LooperCore::Destroy() {
+    if (destroying_)
+        return;
     if (handling_ > 0) {
         destroyWhenDone_ = true;
         return;
@@ -126,8 +128,10 @@ void LooperCore::Destroy() {
         RetrySoon(&LooperCore::Destroy);
         return;
     }
-    if (locked == B_OK)
+    if (locked == B_OK) {
+        destroying_ = true;
         delete looper_;
+    }
 }
 
 void LooperCore::MarkDead() {

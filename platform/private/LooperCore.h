@@ -64,6 +64,7 @@ class LooperCore : public std::enable_shared_from_this<LooperCore> {
     BMessage* current_ = nullptr;
     int32 handling_ = 0;
     bool destroyWhenDone_ = false;
+    bool destroying_ = false; // a destructor that waits for a thread serves the loop, which may ask again
 };
 
 struct LooperAccess {

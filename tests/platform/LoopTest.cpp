@@ -80,6 +80,36 @@ TEST_F(Loopers, AWaitingHandlerHoldsBackItsOwnMessagesOnly) {
     EXPECT_EQ(otherLog_, Log{7});
 }
 
+// As a window does whose worker ends while the application quits.
+TEST_F(Loopers, AskedToQuitWhileItsDestructorWaitsItIsDestroyedOnce) {
+    class Waiting : public BLooper {
+      public:
+        Waiting(std::function<void()> wait, int& destroyed) : wait_(std::move(wait)), destroyed_(destroyed) {}
+        ~Waiting() override {
+            if (++destroyed_ == 1)
+                wait_();
+        }
+
+      private:
+        std::function<void()> wait_;
+        int& destroyed_;
+    };
+    const sem_id sem = create_sem(0, "wait");
+    const auto wait = [&] {
+        second_->PostMessage(1);
+        acquire_sem(sem);
+    };
+    int destroyed = 0;
+    auto* waiting = new Waiting(wait, destroyed);
+    second_->inside = [&](uint32) {
+        waiting->Quit();
+        delete_sem(sem);
+    };
+    waiting->PostMessage(B_QUIT_REQUESTED);
+    EXPECT_TRUE(QTest::qWaitFor([&] { return otherLog_ == Log{1}; }));
+    EXPECT_EQ(destroyed, 1);
+}
+
 TEST_F(Loopers, LockIsRecursiveAndTimesOutForOthers) {
     ASSERT_TRUE(first_->Lock() && first_->Lock());
     std::atomic<int> tried{0};
