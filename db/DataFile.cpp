@@ -8,25 +8,6 @@
 
 namespace {
 
-// Offsets inside the header and inside a column entry.
-namespace HeaderOffset {
-constexpr std::size_t Version = 0;
-constexpr std::size_t Description = 4;
-constexpr std::size_t RecordCount = 36;
-constexpr std::size_t DeletedCount = 40;
-constexpr std::size_t ColumnCount = 44;
-constexpr std::size_t RecordLength = 46;
-constexpr std::size_t Reserved = 48;
-} // namespace HeaderOffset
-
-namespace ColumnOffset {
-constexpr std::size_t Name = 0;
-constexpr std::size_t Type = 32;
-constexpr std::size_t Size = 34;
-constexpr std::size_t Offset = 36;
-constexpr std::size_t Format = 40;
-} // namespace ColumnOffset
-
 std::int16_t LoadInt16(const std::uint8_t* bytes) {
     return static_cast<std::int16_t>(LoadLittleEndian<std::uint16_t>(bytes));
 }

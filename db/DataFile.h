@@ -2,6 +2,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <limits>
 #include <span>
 
 #include "db/RecordTypes.h"
@@ -12,6 +13,26 @@
 
 inline constexpr std::size_t HeaderSize = 52;
 inline constexpr std::size_t ColumnEntrySize = 44;
+/// The most bytes that a record can have: the header counts them in 16 bits.
+inline constexpr std::size_t LongestRecord = std::numeric_limits<std::int16_t>::max();
+
+/// Where the fields of the header lie in the file, and those of a column entry in the entry.
+namespace HeaderOffset {
+inline constexpr std::size_t Version = 0;
+inline constexpr std::size_t Description = 4;
+inline constexpr std::size_t RecordCount = 36;
+inline constexpr std::size_t DeletedCount = 40;
+inline constexpr std::size_t ColumnCount = 44;
+inline constexpr std::size_t RecordLength = 46;
+inline constexpr std::size_t Reserved = 48;
+} // namespace HeaderOffset
+namespace ColumnOffset {
+inline constexpr std::size_t Name = 0;
+inline constexpr std::size_t Type = 32;
+inline constexpr std::size_t Size = 34;
+inline constexpr std::size_t Offset = 36;
+inline constexpr std::size_t Format = 40;
+} // namespace ColumnOffset
 
 /// Values of a record's first byte. Any other value (no version of the engine writes one) counts as active.
 namespace RecordStatus {

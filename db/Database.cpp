@@ -3,9 +3,7 @@
 #include <cerrno>
 #include <cstring>
 #include <limits>
-#include <string_view>
 #include <utility>
-#include <vector>
 
 #include "db/Allocate.h"
 #include "util/CharacterBuffer.h"
@@ -14,7 +12,6 @@ namespace {
 
 constexpr int DefaultCacheKilobytes = 256;
 constexpr std::int32_t DefaultDecimals = 2;
-constexpr std::int32_t DecimalsMask = 15;
 
 bool IsUsablePath(const char* path) {
     return path != nullptr && *path != '\0' && strnlen(path, PathBufferSize) < PathBufferSize;
@@ -217,10 +214,11 @@ bool DATABASE::RecountDeleted() {
     }
     std::int32_t deleted = 0;
     for (std::int32_t i = 0; i < header_.recordCount; ++i) {
-        if (!reader->Holds(i) && reader->FillFrom(file_, Area(), i) != 0) {
+        const std::uint8_t* record = reader->Scan(file_, Area(), i);
+        if (record == nullptr) {
             return false;
         }
-        deleted += *reader->Record(i) == RecordStatus::Deleted ? 1 : 0;
+        deleted += *record == RecordStatus::Deleted ? 1 : 0;
     }
     header_.deletedCount = deleted;
     return true;

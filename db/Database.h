@@ -276,6 +276,8 @@ class DATABASE {
     int Compress(int ignored);
 
   private:
+    static constexpr std::int32_t NotInSet = -1; // in a slot whose record the result set lacks
+
     // File and header
     [[nodiscard]] int Fail(int code);
     [[nodiscard]] int OpenFile(const char* path);

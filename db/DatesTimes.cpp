@@ -1,6 +1,5 @@
 #include "db/DatesTimes.h"
 
-#include <array>
 #include <compare>
 #include <cstdio>
 #include <ctime>
@@ -15,13 +14,6 @@ constexpr int MonthsPerYear = 12;
 constexpr int SecondsPerMinute = 60;
 constexpr int MinutesPerHour = 60;
 constexpr int HoursPerDay = 24;
-constexpr int February = 2;
-
-constexpr std::array<const char*, MonthsPerYear> ShortMonths = {"Jan", "Feb", "Mar", "Apr", "May", "Jun",
-                                                                "Jul", "Aug", "Sep", "Oct", "Nov", "Dec"};
-constexpr std::array<const char*, MonthsPerYear> LongMonths = {
-    "January", "February", "March",     "April",   "May",      "June",
-    "July",    "August",   "September", "October", "November", "December"};
 
 struct DIVISION {
     int quotient; // rounded down
@@ -31,12 +23,6 @@ struct DIVISION {
 constexpr DIVISION DivideDown(int number, int divisor) {
     const int rest = (number % divisor + divisor) % divisor;
     return {(number - rest) / divisor, rest};
-}
-
-int MonthLength(int year, int month) {
-    constexpr std::array<int, MonthsPerYear> lengths = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
-    const int length = lengths[static_cast<std::size_t>(month - 1)];
-    return month == February && IsLeapYear(year) != 0 ? length + 1 : length;
 }
 
 void CarryMonth(dbDATE* date) {
@@ -53,7 +39,7 @@ int Sign(std::strong_ordering order) {
 
 void NormaliseDate(dbDATE* date) {
     CarryMonth(date);
-    const int length = MonthLength(date->year, date->month);
+    const int length = DaysInMonth(date->year, date->month);
     if (date->day > length) {
         date->day = static_cast<std::int8_t>(date->day - length);
         ++date->month;
@@ -61,7 +47,7 @@ void NormaliseDate(dbDATE* date) {
     } else if (date->day < 1) {
         --date->month;
         CarryMonth(date);
-        date->day = static_cast<std::int8_t>(date->day + MonthLength(date->year, date->month));
+        date->day = static_cast<std::int8_t>(date->day + DaysInMonth(date->year, date->month));
     }
 }
 
@@ -95,7 +81,7 @@ void DATABASE::GetFormattedDateString(const dbDATE* date, char* out, int style) 
     } else if (style == 3) {
         std::snprintf(out, FormattedDateSize, "%02d-%02d-%d", date->month, date->day, date->year);
     } else {
-        const auto& names = style == 1 ? ShortMonths : LongMonths;
+        const auto& names = style == 1 ? ShortMonthNames : LongMonthNames;
         const char* name = names[static_cast<std::size_t>(date->month - 1)];
         std::snprintf(out, FormattedDateSize, "%s %02d, %d", name, date->day, date->year);
     }

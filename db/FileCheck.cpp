@@ -12,17 +12,6 @@ namespace {
 
 constexpr std::size_t BlockBytes = 256 * 1024;
 
-// Offsets in the file of what can be wrong in the header.
-constexpr std::int64_t DescriptionAt = 4;
-constexpr std::int64_t RecordCountAt = 36;
-constexpr std::int64_t DeletedCountAt = 40;
-constexpr std::int64_t ColumnCountAt = 44;
-constexpr std::int64_t RecordLengthAt = 46;
-constexpr std::int64_t ReservedAt = 48;
-// Offset in a column entry.
-constexpr std::int64_t TypeAt = 32;
-constexpr std::int64_t OffsetAt = 36;
-
 std::string Text(std::int64_t number) {
     return std::to_string(number);
 }
@@ -122,18 +111,18 @@ int FileCheck::ExamineHeader(const File& file) {
     if (header_.version != 1.0F) {
         Remark(0, "the version is not 1.0");
     }
-    if (!HasTerminator(bytes + DescriptionAt)) {
-        Remark(DescriptionAt, "the description has no end within its 32 bytes");
+    if (!HasTerminator(bytes + HeaderOffset::Description)) {
+        Remark(HeaderOffset::Description, "the description has no end within its 32 bytes");
     }
     if (header_.columnCount < 0) {
-        Problem(ColumnCountAt, "the column count is " + Text(header_.columnCount));
+        Problem(HeaderOffset::ColumnCount, "the column count is " + Text(header_.columnCount));
     } else if (DataStart(header_.columnCount) > length_) {
-        Problem(ColumnCountAt, "header and " + Counted(header_.columnCount, "column", "columns") + " need " +
-                                   Text(DataStart(header_.columnCount)) + " bytes, the file has " +
-                                   Text(length_));
+        Problem(HeaderOffset::ColumnCount, "header and " + Counted(header_.columnCount, "column", "columns") +
+                                               " need " + Text(DataStart(header_.columnCount)) +
+                                               " bytes, the file has " + Text(length_));
     }
     if (header_.recordLength < 1) {
-        Problem(RecordLengthAt, "the record length is " + Text(header_.recordLength));
+        Problem(HeaderOffset::RecordLength, "the record length is " + Text(header_.recordLength));
     }
     laidOut_ = !problem_;
     return 0;
@@ -158,16 +147,16 @@ int FileCheck::ExamineColumns(const File& file) {
             const std::string sentence = name + " begins at byte " + Text(column.offset) +
                                          " of the data, the columns before it end at " + Text(end);
             if (column.offset < end) {
-                Misplaced(at + OffsetAt, sentence);
+                Misplaced(at + ColumnOffset::Offset, sentence);
             } else {
-                Remark(at + OffsetAt, sentence);
+                Remark(at + ColumnOffset::Offset, sentence);
             }
         }
         end = std::max(end, column.offset + column.size);
     }
     const int uncovered = header_.recordLength - 1 - end;
     if (uncovered > 0) {
-        Remark(RecordLengthAt,
+        Remark(HeaderOffset::RecordLength,
                "no column covers the last " + Counted(uncovered, "byte", "bytes") + " of a record");
     }
     return 0;
@@ -179,12 +168,12 @@ void FileCheck::ExamineColumn(const COLUMN_ENTRY& column, bool nameEnds, std::in
         Problem(at, name + " has a name without an end within its 32 bytes");
     }
     if (column.type < ColumnType::String || column.type > ColumnType::Time) {
-        Problem(at + TypeAt, name + " is of the unknown type " + Text(column.type));
+        Problem(at + ColumnOffset::Type, name + " is of the unknown type " + Text(column.type));
     }
     if (!ColumnFits(column, header_.recordLength)) {
-        Misplaced(at + OffsetAt, name + " has " + Text(column.size) + " bytes at " + Text(column.offset) +
-                                     ", outside the " + Text(header_.recordLength - 1) +
-                                     " bytes of a record's data");
+        Misplaced(at + ColumnOffset::Offset,
+                  name + " has " + Text(column.size) + " bytes at " + Text(column.offset) + ", outside the " +
+                      Text(header_.recordLength - 1) + " bytes of a record's data");
     }
 }
 
@@ -198,18 +187,19 @@ void FileCheck::ExamineRecordCount() {
         const std::int64_t end = DataStart(header_.columnCount) + whole * header_.recordLength;
         const std::int64_t rest = length_ - (end - (whole - counted) * header_.recordLength);
         if (header_.reserved != 0) {
-            Remark(ReservedAt, "the reserved field is " + Text(header_.reserved) +
-                                   ", as when adding so many records is interrupted; the next append cuts "
-                                   "off what was written of them");
+            Remark(HeaderOffset::Reserved,
+                   "the reserved field is " + Text(header_.reserved) +
+                       ", as when adding so many records is interrupted; the next append cuts "
+                       "off what was written of them");
         } else if (rest > 0) {
             Remark(length_ - rest, Counted(rest, "byte", "bytes") +
                                        " behind the last record, as an interrupted append leaves them; the "
                                        "next append overwrites them");
         }
     } else if (whole > std::numeric_limits<std::int32_t>::max()) {
-        Problem(RecordCountAt, sentence + ", more than can be counted");
+        Problem(HeaderOffset::RecordCount, sentence + ", more than can be counted");
     } else {
-        Mendable(RecordCountAt, sentence);
+        Mendable(HeaderOffset::RecordCount, sentence);
         header_.recordCount = static_cast<std::int32_t>(whole);
         header_.reserved = 0;
     }
@@ -255,8 +245,8 @@ int FileCheck::ExamineRecords(const File& file) {
 
 void FileCheck::ExamineDeletedCount(std::int32_t deleted) {
     if (header_.deletedCount != deleted) {
-        Mendable(DeletedCountAt, "the header counts " + Text(header_.deletedCount) +
-                                     " deleted, the status bytes " + Text(deleted));
+        Mendable(HeaderOffset::DeletedCount, "the header counts " + Text(header_.deletedCount) +
+                                                 " deleted, the status bytes " + Text(deleted));
         header_.deletedCount = deleted;
     }
 }
@@ -323,9 +313,10 @@ int FileCheck::WriteCounts(File& file) const {
         return error;
     }
     EncodeHeader(header_, mended);
-    constexpr std::size_t size = HeaderSize - static_cast<std::size_t>(RecordCountAt);
-    if (const int error = file.WriteAt(RecordCountAt, mended + RecordCountAt, size); error != 0) {
-        static_cast<void>(file.WriteAt(RecordCountAt, before + RecordCountAt, size));
+    constexpr std::size_t size = HeaderSize - HeaderOffset::RecordCount;
+    if (const int error = file.WriteAt(HeaderOffset::RecordCount, mended + HeaderOffset::RecordCount, size);
+        error != 0) {
+        static_cast<void>(file.WriteAt(HeaderOffset::RecordCount, before + HeaderOffset::RecordCount, size));
         return error;
     }
     return file.Sync();

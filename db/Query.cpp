@@ -8,7 +8,6 @@
 
 namespace {
 
-constexpr std::int32_t NotInSet = -1;
 constexpr std::int32_t BlockSize = 256; // records that a condition is asked about at once
 
 // Records are scanned through the object's cache; without one, through a buffer of this size.
@@ -172,10 +171,11 @@ int DATABASE::TakeOutDeleted() {
         return DatabaseError::ResetNoMemoryForRecord;
     }
     for (std::int32_t i = 0; i < slotCount_; ++i) {
-        if (!reader->Holds(i) && reader->FillFrom(file_, Area(), i) != 0) {
+        const std::uint8_t* record = reader->Scan(file_, Area(), i);
+        if (record == nullptr) {
             return DatabaseError::QueryFailed;
         }
-        if (*reader->Record(i) == RecordStatus::Deleted) {
+        if (*record == RecordStatus::Deleted) {
             slots_[i] = NotInSet;
             --resultCount_;
         }

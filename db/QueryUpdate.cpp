@@ -5,7 +5,6 @@
 #include "db/Database.h"
 
 namespace {
-constexpr std::int32_t NotInSet = -1;
 constexpr std::size_t SpanBytes = 256 * 1024; // the most that is written in one go
 constexpr int MostGapBytes = 4096;            // between two changed records of it
 } // namespace

@@ -7,7 +7,6 @@
 #include "db/Allocate.h"
 
 namespace {
-constexpr std::int64_t LongestRecord = std::numeric_limits<std::int16_t>::max();
 constexpr std::int32_t ScatteredBytes = 4096; // read ahead of a record that does not follow the one before
 } // namespace
 
@@ -21,7 +20,7 @@ bool ReadCache::Resize(int kilobytes) {
     if (kilobytes < 0 || kilobytes > MaximumKilobytes) {
         return false;
     }
-    std::int64_t size = std::max(std::int64_t{kilobytes} * 1024, LongestRecord);
+    std::int64_t size = std::max(std::int64_t{kilobytes} * 1024, std::int64_t{LongestRecord});
     buffer_ = TryAllocate<std::uint8_t>(static_cast<std::size_t>(size));
     size_ = buffer_ ? std::int64_t{kilobytes} * 1024 : 0;
     return HasBuffer();

@@ -40,7 +40,12 @@ class ReadCache {
     [[nodiscard]] int Fill(const File& file, const RECORD_AREA& area, std::int32_t n);
     /// The same with a whole buffer from record n on, for a reader that wants them all.
     [[nodiscard]] int FillFrom(const File& file, const RECORD_AREA& area, std::int32_t n);
-    /// The same with `count` records, at most Capacity, of which one that the file lacks is ENODATA as well.
+    /// Record n for such a reader, read with FillFrom when it is not held; null when it cannot be read. Valid as
+    /// long as what Record returns.
+    [[nodiscard]] const std::uint8_t* Scan(const File& file, const RECORD_AREA& area, std::int32_t n) {
+        return Holds(n) || FillFrom(file, area, n) == 0 ? Record(n) : nullptr;
+    }
+    /// Fills with `count` records, at most Capacity, of which one that the file lacks is ENODATA as well.
     [[nodiscard]] int FillSpan(const File& file, const RECORD_AREA& area, std::int32_t first,
                                std::int32_t count);
     /// How many records of that length it can hold, at least 1.

@@ -13,7 +13,6 @@
 
 namespace {
 
-constexpr std::int32_t DecimalsMask = 15;
 constexpr std::size_t LongestWhole = 11; // -2147483648
 constexpr std::size_t LongestFloat = std::numeric_limits<float>::max_exponent10 + 3 + DecimalsMask; // -, .
 constexpr std::size_t LongestDate = 6 + 4 + 4;

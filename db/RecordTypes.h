@@ -17,6 +17,9 @@ inline constexpr std::int8_t Date = 5;  ///< dbDATE
 inline constexpr std::int8_t Time = 6;  ///< dbTIME
 } // namespace ColumnType
 
+/// The bits of COLUMN_ENTRY::format that hold a float column's decimals.
+inline constexpr std::int32_t DecimalsMask = 15;
+
 inline constexpr int NameSize = 32; ///< bytes of a column name or description, the terminator included
 
 /// The first 52 bytes of a data file.
@@ -37,7 +40,7 @@ struct COLUMN_ENTRY {
     std::int8_t type;    ///< one of ColumnType
     std::int16_t size;   ///< bytes of the column in a record; negative in a request: the type's own width
     std::int16_t offset; ///< where the column begins in a record's data (the status byte not counted)
-    std::int32_t format; ///< float columns: decimals of the text form in the low 4 bits; else 0
+    std::int32_t format; ///< float columns: decimals of the text form in DecimalsMask; else 0
 };
 static_assert(sizeof(COLUMN_ENTRY) == 44);
 

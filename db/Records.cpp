@@ -5,10 +5,6 @@
 #include "db/Allocate.h"
 #include "db/Database.h"
 
-namespace {
-constexpr std::size_t LongestRecord = std::numeric_limits<std::int16_t>::max();
-}
-
 int DATABASE::PrepareAppend(std::int32_t count) {
     if (!IsOpen()) {
         return DatabaseError::AppendNoFile;

@@ -3,10 +3,6 @@
 #include "db/Database.h"
 #include "db/SortKeys.h"
 
-namespace {
-constexpr std::int32_t NotInSet = -1;
-}
-
 int DATABASE::SortBy(const char* column, int /*ignored*/) {
     const COLUMN_ENTRY* by = column != nullptr ? FindColumn(column) : nullptr;
     if (by == nullptr) {

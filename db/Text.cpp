@@ -103,10 +103,10 @@ int DATABASE::ExportAll(EXPORT& work) {
         return DatabaseError::ExportNoMemoryForRecord;
     }
     for (std::int32_t i = 0; i < header_.recordCount; ++i) {
-        if (!reader->Holds(i) && reader->FillFrom(file_, Area(), i) != 0) {
+        const std::uint8_t* record = reader->Scan(file_, Area(), i);
+        if (record == nullptr) {
             return DatabaseError::ExportReadFailed;
         }
-        const std::uint8_t* record = reader->Record(i);
         if (*record != RecordStatus::Deleted && !work.Write(record + 1)) {
             return DatabaseError::ExportWriteFailed;
         }

@@ -4,8 +4,6 @@
 
 namespace {
 
-constexpr std::int32_t NotInSet = -1;
-
 // A position outside the numbers' range stays at its end: still outside the set.
 long Moved(long position, long step) {
     long moved = 0;

@@ -22,7 +22,6 @@ namespace {
 
 constexpr std::array<const char*, 7> TypeNames = {"string", "byte", "short", "long", "float", "date", "time"};
 constexpr std::array<int, 7> TypeBytes = {1, 1, 2, 4, 4, 4, 3}; // that a value takes
-constexpr std::int32_t DecimalsMask = 15;
 constexpr std::size_t DateDigits = 8;
 constexpr std::size_t TimeDigits = 6;
 

@@ -7,13 +7,6 @@
 
 namespace {
 
-constexpr const char* ShortMonthNames[] = {"Jan", "Feb", "Mar", "Apr", "May", "Jun",
-                                           "Jul", "Aug", "Sep", "Oct", "Nov", "Dec"};
-constexpr const char* LongMonthNames[] = {"January",   "February", "March",    "April",
-                                          "May",       "June",     "July",     "August",
-                                          "September", "October",  "November", "December"};
-constexpr int DaysInMonth[] = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
-
 std::tm LocalNow() {
     const std::time_t now = std::time(nullptr);
     std::tm parts{};
@@ -22,9 +15,9 @@ std::tm LocalNow() {
 }
 
 // A month name, or its number where there is none, with the day and the year.
-void FormatWithName(char* out, const char* const (&names)[12], int year, int month, int day) {
+void FormatWithName(char* out, const std::array<const char*, 12>& names, int year, int month, int day) {
     if (month >= 1 && month <= 12)
-        FormatInto(out, FormatDateSize, "%s %02d, %d", names[month - 1], day, year);
+        FormatInto(out, FormatDateSize, "%s %02d, %d", names[static_cast<std::size_t>(month - 1)], day, year);
     else
         FormatInto(out, FormatDateSize, "%02d %02d, %d", month, day, year);
 }
@@ -52,11 +45,15 @@ int IsLeapYear(int year) {
     return (year % 4 == 0 && year % 100 != 0) || year % 400 == 0 ? 1 : 0;
 }
 
+int DaysInMonth(int year, int month) {
+    constexpr std::array<int, 12> days = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
+    return days[static_cast<std::size_t>(month - 1)] + (month == 2 ? IsLeapYear(year) : 0);
+}
+
 int CheckDate(int year, int month, int day) {
     if (month < 1 || month > 12 || day < 1)
         return 1;
-    const int days = month == 2 ? DaysInMonth[1] + IsLeapYear(year) : DaysInMonth[month - 1];
-    return day <= days ? 0 : 1;
+    return day <= DaysInMonth(year, month) ? 0 : 1;
 }
 
 int FormatDate(const char* yyyymmdd, char* out, int style) {

@@ -1,11 +1,19 @@
 #pragma once
 
+#include <array>
 #include <cstddef>
 
 // The calendar as the program shows it: local time, four-digit years, months and days counted from 1.
 
 // What FormatDate writes at most, its NUL included.
 inline constexpr std::size_t FormatDateSize = 32;
+
+// January first.
+inline constexpr std::array<const char*, 12> ShortMonthNames = {"Jan", "Feb", "Mar", "Apr", "May", "Jun",
+                                                                "Jul", "Aug", "Sep", "Oct", "Nov", "Dec"};
+inline constexpr std::array<const char*, 12> LongMonthNames = {
+    "January", "February", "March",     "April",   "May",      "June",
+    "July",    "August",   "September", "October", "November", "December"};
 
 // Today's local date; a null pointer skips that part.
 void GetDate(int* year, int* month, int* day);
@@ -16,6 +24,9 @@ void GetTime(int* hour, int* minute, int* second);
 
 // 1 for a leap year of the Gregorian calendar, else 0.
 [[nodiscard]] int IsLeapYear(int year);
+
+// The days of that month, which is 1 to 12.
+[[nodiscard]] int DaysInMonth(int year, int month);
 
 // 0 when the date exists, 1 when it does not.
 [[nodiscard]] int CheckDate(int year, int month, int day);
