@@ -40,8 +40,8 @@ class ReadCache {
     [[nodiscard]] int Fill(const File& file, const RECORD_AREA& area, std::int32_t n);
     /// The same with a whole buffer from record n on, for a reader that wants them all.
     [[nodiscard]] int FillFrom(const File& file, const RECORD_AREA& area, std::int32_t n);
-    /// Record n for such a reader, read with FillFrom when it is not held; null when it cannot be read. Valid as
-    /// long as what Record returns.
+    /// Record n for such a reader, read with FillFrom when it is not held; null when it cannot be read. Valid
+    /// as long as what Record returns.
     [[nodiscard]] const std::uint8_t* Scan(const File& file, const RECORD_AREA& area, std::int32_t n) {
         return Holds(n) || FillFrom(file, area, n) == 0 ? Record(n) : nullptr;
     }
