@@ -260,5 +260,5 @@ bool NorvelApp::PassPasswordGate() {
 }
 
 void NorvelApp::AboutRequested() {
-    MessageBox("Quorvan version 1.0", B_INFO_ALERT);
+    MessageBox(AboutText, B_INFO_ALERT);
 }

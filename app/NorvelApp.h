@@ -22,6 +22,11 @@
 // main owns the only one, on the interface thread. app_state and the status bitmaps last exactly as long.
 class NorvelApp : public BApplication {
   public:
+    // It says where the manual is, since Help shows nothing where there is no browser.
+    static constexpr const char* AboutText = "Quorvan version 1.0\n\nThe manual is the file "
+                                             "help/Quorvan.html in your Quorvan folder. Help opens it in "
+                                             "your web browser.";
+
     // Ends with the main window shown; or, when the password was refused or the folder cannot be used or is
     // in use, with the quit request posted, so that Run returns at once.
     NorvelApp();

@@ -32,10 +32,26 @@ int DataFileTool::Fail(const std::string& sentence) {
     return 1;
 }
 
+// What the engine's message leaves open to somebody at a prompt.
+const char* DataFileTool::Hint(int code) {
+    switch (code) {
+    case DatabaseError::QueryInvalidStatement:
+    case DatabaseError::QueryInvalidOperator:
+        return ": a condition is a column, an operator and a value with blanks between them, as in "
+               "'Name = Alder'";
+    case DatabaseError::SetInvalidStatement:
+    case DatabaseError::SetInvalidOperator:
+        return ": a change is a column, an operator and a value with blanks between them, as in "
+               "'Name = Alder'";
+    default:
+        return "";
+    }
+}
+
 int DataFileTool::FailWithCode(int code, const std::string& about) {
     const int reason = IsFileFailure(code) ? errno : 0;
     return Fail(about + std::to_string(code) + " " + ErrorMessage(code) +
-                (reason != 0 ? " (" + std::generic_category().message(reason) + ")" : ""));
+                (reason != 0 ? " (" + std::generic_category().message(reason) + ")" : "") + Hint(code));
 }
 
 bool DataFileTool::IsFileFailure(int code) {

@@ -90,6 +90,7 @@ class DataFileTool {
     }
     // The system failed; else the engine refused.
     [[nodiscard]] static bool IsFileFailure(int code);
+    [[nodiscard]] static const char* Hint(int code);
     void Warn(const std::string& sentence);
     void Tell(const char* name, long number, const std::string& sentence);
 

@@ -45,12 +45,13 @@ float QuoteServer::PriceOf(const std::string& ticker) const {
 }
 
 Reply QuoteServer::Answer(const std::string& request) {
+    const std::size_t begin = request.find(Path) + Path.size();
+    const std::string ticker = request.substr(begin, request.find(' ', begin) - begin);
     if (++answered_ == HeldAnswer) {
+        heldTicker_ = ticker;
         holding_ = true;
         return {{}, Reply::End::Hold};
     }
-    const std::size_t begin = request.find(Path) + Path.size();
-    const std::string ticker = request.substr(begin, request.find(' ', begin) - begin);
     if (PriceOf(ticker) <= 0)
         return {{"HTTP/1.0 404 Not Found\r\n\r\n"}};
     char price[32];

@@ -17,7 +17,8 @@ class QuoteServer {
     [[nodiscard]] std::string SourceLine() const;
     // What the page says; 0 without a page.
     [[nodiscard]] float PriceOf(const std::string& ticker) const;
-    [[nodiscard]] bool IsHolding() const { return holding_; }
+    // The ticker at which it has stopped; empty before.
+    [[nodiscard]] std::string HeldTicker() const { return holding_ ? heldTicker_ : ""; }
     void Release() { server_.Release(); }
 
   private:
@@ -25,6 +26,7 @@ class QuoteServer {
 
     std::map<std::string, float> prices_;
     std::atomic<int> answered_ = 0;
+    std::string heldTicker_; // not touched any more once holding_ is set
     std::atomic<bool> holding_ = false;
     LoopbackServer server_;
 };

@@ -13,8 +13,10 @@
 #include <QLineEdit>
 #include <QMenu>
 #include <QMenuBar>
+#include <QProgressBar>
 #include <QPushButton>
 
+#include "app/NorvelApp.h"
 #include "app/NorvelItem.h"
 #include "app/PortfolioRules.h"
 
@@ -152,7 +154,7 @@ void Tour::LookAtDialogs() {
     Choose("Portfolio", "Del");
     AlertAndAnswer("Are you sure you want to delete this portfolio?", "portfolio-delete", "No");
     Choose("Help", "About Quorvan...");
-    AlertAndAnswer("Quorvan version 1.0", "about", "Ok");
+    AlertAndAnswer(NorvelApp::AboutText, "about", "Ok");
 }
 
 void Tour::AddAnInvestment() {
@@ -175,9 +177,12 @@ void Tour::AddAnInvestment() {
 void Tour::UpdatePrices() {
     constexpr const char* title = "Getting current prices...";
     Then("the Update button", [] { Press(MainWindow(), "Update button"); });
-    When(
-        "an update half-way", [this] { return quotes_.IsHolding() && Window("Getting current prices..."); },
-        [] {});
+    Await("an update half-way", [this] {
+        const QWidget* window = Window(title);
+        const auto* bar = window ? window->findChild<QProgressBar*>() : nullptr;
+        const std::string ticker = quotes_.HeldTicker();
+        return bar && !ticker.empty() && bar->accessibleName().endsWith(QString::fromStdString(" " + ticker));
+    });
     Shoot("update");
     When(
         "the update goes on", [] { return Window(title) != nullptr; }, [this] { quotes_.Release(); });

@@ -225,6 +225,9 @@ TEST(Accessibility, EverythingSaysWhatItIs) {
     EXPECT_EQ(Find(window, "graphic", "column labels").description,
               "Columns: Name, Ticker, Type, Shares, Price, Value, Date, Retire, Risk, Agent");
 
+    constexpr const char* about = "Quorvan version 1.0\n\nThe manual is the file help/Quorvan.html in your "
+                                  "Quorvan folder. Help opens it in "
+                                  "your web browser.";
     const struct {
         const char *menu, *item;
         const char* title;
@@ -237,7 +240,7 @@ TEST(Accessibility, EverythingSaysWhatItIs) {
         {"Portfolio", "Del", "Are you sure you want to delete this portfolio?", "No", "graphic", "Warning"},
         {"Investment", "Add", "Add an Investment", "Cancel", "button menu", "Type choices"},
         {"Investment", "Edit", "Edit this Investment", "Cancel", "check box", "Retirement"},
-        {"Help", "About Quorvan...", "Quorvan version 1.0", "Ok", "graphic", "Information"}};
+        {"Help", "About Quorvan...", about, "Ok", "graphic", "Information"}};
     for (const auto& each : dialogs) {
         session.Choose(each.menu, each.item);
         const char* role = std::string(each.way) == "Cancel" ? "dialog" : "alert message";

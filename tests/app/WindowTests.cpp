@@ -203,10 +203,14 @@ TEST_F(MainWindow, SettingsHelpAndAboutOpen) {
     std::filesystem::create_directory(File("help"));
     Write("help/Quorvan.html", "help");
     Send(MessageHelp).Await("help", [] { return !launched.empty(); });
-    Then("main window", [] {
-        Window()->PostMessage(1000);
-        be_app->PostMessage(B_ABOUT_REQUESTED);
-    }).Answer("Quorvan version 1.0", "Ok");
+    Then("main window",
+         [] {
+             Window()->PostMessage(1000);
+             be_app->PostMessage(B_ABOUT_REQUESTED);
+         })
+        .Answer("Quorvan version 1.0\n\nThe manual is the file help/Quorvan.html in your Quorvan folder. "
+                "Help opens it in your web browser.",
+                "Ok");
     When("settings", WindowShown("Settings"), [] {
         EXPECT_EQ(Driver::Window("Settings")->geometry().topLeft(), QPoint(150, 150));
         auto* field = Driver::Window("Settings")->findChild<QLineEdit*>();
