@@ -207,7 +207,7 @@ void NorvelApp::RestoreCut(std::string& complaints) {
         break;
     case CutFile::Outcome::Failed:
         complaints += "What had been cut and not pasted when Quorvan last ended could not be put back. It is "
-                      "kept in the file cut.db.\n";
+                      "kept in the file cut.db, and nothing can be cut while that is there.\n";
         break;
     }
 }

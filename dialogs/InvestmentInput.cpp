@@ -20,7 +20,8 @@ std::string ShownAmount(float amount, int decimals) {
 
 // `shown` is the text for the amount as it is.
 InvestmentCheck ReadAmount(const std::string& text, const std::string& shown, float* amount) {
-    if (!text.empty() && text == shown)
+    // An amount below 0 is shown as no text.
+    if (text == shown && (!text.empty() || *amount < 0))
         return InvestmentCheck::Accepted;
     double number = 0;
     const char* rest = nullptr;

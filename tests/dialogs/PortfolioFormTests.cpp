@@ -202,9 +202,9 @@ TEST(InvestmentInput, AmountsAreNumbersARecordCanHold) {
     }
 }
 
-// The form shows fewer decimals than a record has.
+// The form shows fewer decimals than a record has, and nothing for an amount below 0.
 TEST(InvestmentInput, AmountsLeftAsShownStayWhatTheyWere) {
-    for (const float exact : {45.375F, 1.0044F, 0.001F, 3e38F, 2.5F}) {
+    for (const float exact : {45.375F, 1.0044F, 0.001F, 3e38F, 2.5F, -5.0F}) {
         INVESTMENT_DATA record = MakeInvestment("P", "N");
         record.Shares = 1.0004F;
         record.Price = exact;
