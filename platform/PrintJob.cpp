@@ -4,7 +4,10 @@
 #include <cerrno>
 #include <string>
 
+#include <QDir>
 #include <QFile>
+#include <QLineEdit>
+#include <QLoggingCategory>
 #include <QPageSetupDialog>
 #include <QPainter>
 #include <QPrintDialog>
@@ -72,6 +75,39 @@ QPageLayout LayoutOf(const BMessage& settings, QPageLayout layout) {
     return layout;
 }
 
+// The toolkit puts a file that is named without its folder into the home folder, wherever it offered one.
+class PrintDialog : public QPrintDialog {
+  public:
+    explicit PrintDialog(QPrinter* printer) : QPrintDialog(printer) {}
+
+    void setVisible(bool visible) override {
+        QPrintDialog::setVisible(visible);
+        if (const QLineEdit* file = FileField(); visible && file)
+            offered_ = QFileInfo(file->text()).absoluteDir();
+    }
+    void accept() override {
+        QLineEdit* file = FileField();
+        if (file && !file->text().isEmpty())
+            file->setText(offered_.absoluteFilePath(file->text()));
+        QPrintDialog::accept();
+    }
+
+  private:
+    [[nodiscard]] QLineEdit* FileField() const { return findChild<QLineEdit*>(QStringLiteral("filename")); }
+
+    QDir offered_; // the folder of the file that the dialog proposed
+};
+
+// Without a printer the toolkit warns that the dialog cannot be used, in which it is mistaken.
+std::unique_ptr<QPageSetupDialog> PageSetupDialogFor(QPrinter& printer) {
+    QLoggingCategory* log = QLoggingCategory::defaultCategory();
+    const bool warns = log->isWarningEnabled();
+    log->setEnabled(QtWarningMsg, false);
+    auto dialog = std::make_unique<QPageSetupDialog>(&printer);
+    log->setEnabled(QtWarningMsg, warns);
+    return dialog;
+}
+
 } // namespace
 
 struct PrintJobPeer {
@@ -117,13 +153,13 @@ BPrintJob::~BPrintJob() {
 }
 
 status_t BPrintJob::ConfigPage() {
-    QPageSetupDialog dialog(&peer_->printer);
-    dialog.setObjectName(QStringLiteral("page setup dialog"));
-    return RunDialog(dialog) == QDialog::Accepted ? B_OK : B_ERROR;
+    const std::unique_ptr<QPageSetupDialog> dialog = PageSetupDialogFor(peer_->printer);
+    dialog->setObjectName(QStringLiteral("page setup dialog"));
+    return RunDialog(*dialog) == QDialog::Accepted ? B_OK : B_ERROR;
 }
 
 status_t BPrintJob::ConfigJob() {
-    QPrintDialog dialog(&peer_->printer);
+    PrintDialog dialog(&peer_->printer);
     dialog.setObjectName(QStringLiteral("print dialog"));
     dialog.setOptions(QAbstractPrintDialog::PrintToFile | QAbstractPrintDialog::PrintShowPageSize);
     if (RunDialog(dialog) != QDialog::Accepted)

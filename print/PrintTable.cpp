@@ -91,6 +91,7 @@ void PRINT_TABLE::DrawText(const char* cells, int cellStride) {
         const std::string_view whole(cells + static_cast<std::size_t>(i) * stride, stride);
         const std::string text(whole.substr(0, whole.find('\0')));
         if (columns_[i].alignment & DrawTextRight) {
+            cell.left += LineWidth + RightSlack; // a number that just fits stands free of the line
             cell.right -= CellInset;
             DrawFitting(cell, text.c_str(), columns_[i].alignment, LeastNumberSize);
         } else {

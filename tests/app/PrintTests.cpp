@@ -32,6 +32,32 @@ void ExpectPrinted(Program& program, const std::string& file, const std::string&
         });
 }
 
+std::string* gWarnings = nullptr;
+
+TEST(Print, PutsABareFileNameIntoTheFolderThatItOffered) {
+    Program program;
+    program.AddPortfolio("Full one");
+    program.AddInvestment(MakeInvestment("Full one", "Timber", 1, 100));
+    const TemporaryFolder prints;
+    std::string warnings;
+    gWarnings = &warnings;
+    const auto previous = qInstallMessageHandler(
+        [](QtMsgType, const QMessageLogContext&, const QString& text) { *gWarnings += text.toStdString(); });
+    program.Expect({"Timber"}).Send(MessagePortfolioPrint);
+    Answer(program, "page setup dialog", true);
+    Answer(program, "print dialog", true, prints.File("first.pdf"));
+    ExpectPrinted(program, prints.File("first.pdf"), "Timber");
+    program.Then("in the way", [&] { prints.Write("first.pdf", "kept"); }).Send(MessagePortfolioPrint);
+    const std::string replace =
+        "The file " + prints.File("first.pdf") + " exists. Replace it by this report?";
+    program.Answer(replace.c_str(), "No");
+    Answer(program, "print dialog", true, "second.pdf");
+    ExpectPrinted(program, prints.File("second.pdf"), "Timber");
+    program.RunAndClose();
+    qInstallMessageHandler(previous);
+    EXPECT_EQ(warnings.find("QPageSetupDialog"), std::string::npos) << warnings;
+}
+
 TEST(Print, AsksOnceAndNothingAfterACancel) {
     Program program;
     program.AddPortfolio("Empty one");

@@ -189,7 +189,7 @@ TEST_F(ReportTest, IsOnePageHoweverManyInvestmentsThereAre) {
 }
 
 TEST_F(ReportTest, TheTableFitsThePage) {
-    folder_.AddInvestment(MakeInvestment("Mine", "Name1"));
+    folder_.AddInvestment(MakeInvestment("Mine", "Name1", 1, 18450.37F));
     const float largest = [] {
         BFont font(*be_fixed_font);
         font.SetSize(std::min(font.Size(), 12.0F));
@@ -201,6 +201,7 @@ TEST_F(ReportTest, TheTableFitsThePage) {
         EXPECT_LT(81 * m, page_.Width() + Near) << size;
         EXPECT_LT(Darkest(81 * m - 1, 81 * m + 1.5F, (Word("TICK").top + Word("TICK").bottom) / 2), 100)
             << size; // the last line
+        EXPECT_GT(Word("18,450.37").left, 42 * m + 2) << size;
         if (std::string(size) == "A3")
             EXPECT_NEAR(m, largest, 0.05F);
         else
