@@ -1,7 +1,6 @@
 #include "app/CutFile.h"
 
 #include <algorithm>
-#include <cstdio>
 #include <cstring>
 #include <filesystem>
 #include <vector>
@@ -61,9 +60,11 @@ bool CutFile::Keep(std::span<const INVESTMENT_DATA> investments, std::span<const
     if (file.Create(unfinished.c_str(), "cut investments", static_cast<int>(columns.size()),
                     columns.data()) == 0 &&
         file.AppendAll(records.data(), sizeof(CUT_DATA), static_cast<std::int32_t>(records.size())) >= 0 &&
-        std::rename(unfinished.c_str(), path_.c_str()) == 0)
+        file.Sync() == 0 && RenameFile(SystemFiles(), unfinished, path_) == 0 &&
+        SyncFolderOf(SystemFiles(), path_) == 0)
         return true;
     std::filesystem::remove(unfinished, error);
+    std::filesystem::remove(path_, error);
     return false;
 }
 
@@ -86,7 +87,8 @@ CutFile::Outcome CutFile::Restore(DATABASE& investments) const {
             lost.push_back(each.investment);
     }
     if (investments.AppendAll(lost.data(), sizeof(INVESTMENT_DATA), static_cast<std::int32_t>(lost.size())) <
-        0)
+            0 ||
+        investments.Sync() != 0)
         return Outcome::Failed;
     Forget();
     return Outcome::Restored;

@@ -15,11 +15,12 @@ class CutFile {
   public:
     explicit CutFile(const std::string& folder) : path_(folder + "/cut.db") {}
 
-    // Keeps copies of investments together with their record numbers; to be called before they are deleted.
-    // False, with nothing changed, when they cannot be written, or when something is kept already.
+    // Keeps copies of investments together with their record numbers, on the disk when it returns; to be
+    // called before they are deleted. False, with nothing changed, when they cannot be written, or when
+    // something is kept already.
     [[nodiscard]] bool Keep(std::span<const INVESTMENT_DATA> investments,
                             std::span<const long> numbers) const;
-    // To be called once the investments are elsewhere, or given up.
+    // To be called once the investments are on the disk elsewhere, or given up.
     void Forget() const;
 
     enum class Outcome { NothingKept, Restored, Failed };

@@ -46,9 +46,13 @@ class NorvelWindow : public BWindow {
   private:
     // What a command needs before its menu item can be chosen.
     enum class Needs { Nothing, Portfolio, Investment };
+    // What it changes itself. An update's worker has the investment file to itself while it runs, and sees to
+    // its own changes.
+    enum class Changes { Nothing, Files };
     struct Command {
         uint32 code;
         Needs needs;
+        Changes changes;
         void (NorvelWindow::*run)();
         bool (NorvelWindow::*check)() = nullptr; // tells the person what is missing, and answers false then
     };
@@ -56,7 +60,10 @@ class NorvelWindow : public BWindow {
     static const Command Commands[];
     [[nodiscard]] static const Command* FindCommand(uint32 code);
     [[nodiscard]] bool CanRun(const Command& command) const;
+    // Runs it, and returns when what it changed would outlast a power cut.
     void Execute(const Command& command);
+    // Tells the person when the disk fails.
+    static void SyncDataFiles();
 
     // --- building ---
     BView* AddTopView();

@@ -246,7 +246,8 @@ void NorvelWindow::OnInvestmentPaste() {
         return;
     if (AppendCopies(*state.investments,
                      {state.clipboard.get(), static_cast<std::size_t>(state.clipboardCount)},
-                     currentPortfolio_))
+                     currentPortfolio_) &&
+        state.investments->Sync() == 0) // before cut.db goes
         CutIsSettled();
     else
         TellNotSaved();

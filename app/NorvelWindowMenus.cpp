@@ -6,7 +6,9 @@
 
 #include "ColumnListView/ColumnListView.h"
 #include "app/AppState.h"
+#include "app/FailureAlerts.h"
 #include "app/MessageCodes.h"
+#include "db/Database.h"
 #include "dialogs/SettingsDialog.h"
 #include "platform/Application.h"
 #include "platform/MenuBar.h"
@@ -74,25 +76,25 @@ BMenuItem* NewItem(const ItemInfo& info) {
 } // namespace
 
 const NorvelWindow::Command NorvelWindow::Commands[] = {
-    {MessageSettings, Needs::Nothing, &NorvelWindow::OnSettings},
-    {MessagePortfolioAdd, Needs::Nothing, &NorvelWindow::OnPortfolioAdd},
-    {MessagePortfolioEdit, Needs::Portfolio, &NorvelWindow::OnPortfolioEdit},
-    {MessagePortfolioDelete, Needs::Portfolio, &NorvelWindow::OnPortfolioDelete},
-    {MessagePortfolioChart, Needs::Investment, &NorvelWindow::OnPortfolioChart,
+    {MessageSettings, Needs::Nothing, Changes::Nothing, &NorvelWindow::OnSettings},
+    {MessagePortfolioAdd, Needs::Nothing, Changes::Files, &NorvelWindow::OnPortfolioAdd},
+    {MessagePortfolioEdit, Needs::Portfolio, Changes::Files, &NorvelWindow::OnPortfolioEdit},
+    {MessagePortfolioDelete, Needs::Portfolio, Changes::Files, &NorvelWindow::OnPortfolioDelete},
+    {MessagePortfolioChart, Needs::Investment, Changes::Nothing, &NorvelWindow::OnPortfolioChart,
      &NorvelWindow::IsValuePresent},
-    {MessagePortfolioPrint, Needs::Investment, &NorvelWindow::OnPortfolioPrint,
+    {MessagePortfolioPrint, Needs::Investment, Changes::Nothing, &NorvelWindow::OnPortfolioPrint,
      &NorvelWindow::IsPortfolioPresent},
-    {MessagePortfolioUpdate, Needs::Investment, &NorvelWindow::OnPortfolioUpdate,
+    {MessagePortfolioUpdate, Needs::Investment, Changes::Nothing, &NorvelWindow::OnPortfolioUpdate,
      &NorvelWindow::IsPortfolioPresent},
-    {MessageInvestmentAdd, Needs::Portfolio, &NorvelWindow::OnInvestmentAdd,
+    {MessageInvestmentAdd, Needs::Portfolio, Changes::Files, &NorvelWindow::OnInvestmentAdd,
      &NorvelWindow::IsPortfolioPresent},
-    {MessageInvestmentEdit, Needs::Investment, &NorvelWindow::OnInvestmentEdit},
-    {MessageInvestmentInvoked, Needs::Investment, &NorvelWindow::OnInvestmentEdit},
-    {MessageInvestmentDelete, Needs::Investment, &NorvelWindow::OnInvestmentDelete},
-    {MessageInvestmentCut, Needs::Investment, &NorvelWindow::OnInvestmentCut},
-    {MessageInvestmentCopy, Needs::Investment, &NorvelWindow::OnInvestmentCopy},
-    {MessageInvestmentPaste, Needs::Portfolio, &NorvelWindow::OnInvestmentPaste},
-    {MessageHelp, Needs::Nothing, &NorvelWindow::OnHelp},
+    {MessageInvestmentEdit, Needs::Investment, Changes::Files, &NorvelWindow::OnInvestmentEdit},
+    {MessageInvestmentInvoked, Needs::Investment, Changes::Files, &NorvelWindow::OnInvestmentEdit},
+    {MessageInvestmentDelete, Needs::Investment, Changes::Files, &NorvelWindow::OnInvestmentDelete},
+    {MessageInvestmentCut, Needs::Investment, Changes::Files, &NorvelWindow::OnInvestmentCut},
+    {MessageInvestmentCopy, Needs::Investment, Changes::Nothing, &NorvelWindow::OnInvestmentCopy},
+    {MessageInvestmentPaste, Needs::Portfolio, Changes::Files, &NorvelWindow::OnInvestmentPaste},
+    {MessageHelp, Needs::Nothing, Changes::Nothing, &NorvelWindow::OnHelp},
 };
 
 const NorvelWindow::Command* NorvelWindow::FindCommand(uint32 code) {
@@ -105,6 +107,14 @@ void NorvelWindow::Execute(const Command& command) {
     if (command.check && !(this->*command.check)())
         return;
     (this->*command.run)();
+    if (command.changes == Changes::Files)
+        SyncDataFiles();
+}
+
+void NorvelWindow::SyncDataFiles() {
+    const bool portfolios = app_state->portfolios->Sync() == 0;
+    if (app_state->investments->Sync() != 0 || !portfolios)
+        TellNotSaved();
 }
 
 bool NorvelWindow::CanRun(const Command& command) const {

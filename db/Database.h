@@ -31,8 +31,9 @@ class SortKeys;
 /// rewrites the file without its deleted records. The file's bytes are described in doc/data-file.md.
 ///
 /// It keeps no record that the file does not have: every operation that changes the file returns after the
-/// kernel has taken the bytes. It does not guard the file against other processes, and does not lock: an
-/// object is used by one thread at a time. Any number of objects, each on its own file, work independently.
+/// kernel has taken the bytes, which is enough for them to outlast the program; for them to outlast the
+/// machine there is Sync. It does not guard the file against other processes, and does not lock: an object is
+/// used by one thread at a time. Any number of objects, each on its own file, work independently.
 ///
 /// Unless said otherwise an operation returns 0 on success and -1 on failure and then leaves file, counts and
 /// result set as they were; GetLastError tells why. Record numbers count from 0, deleted records included; a
@@ -81,6 +82,10 @@ class DATABASE {
     /// Switches writing the header after each change of the counts; switching on writes it at once. While
     /// off, the header in the file keeps the old counts, also after the object is gone. Fails with 2901.
     int SetImmediateHeaderWrite(int on);
+    /// Returns when every change made so far is on the disk and outlasts a power cut; at once when there was
+    /// none since the last time, or no file is open. Fails with 3001: the changes are in the file then, but
+    /// nobody knows for how long.
+    int Sync();
     /// Gives a column with a negative size the width of its type; strings and unknown types keep theirs.
     /// Returns 0.
     int AdjustColumnSize(COLUMN_ENTRY* column) const;

@@ -98,6 +98,7 @@ constexpr Entry ErrorMessages[] = {
     {2803, "Append error - file holds more than its header says"},
     {2804, "Append error - too many records"},
     {2901, "Header error - unable to write header"},
+    {3001, "Sync error - unable to reach the disk"},
     {Terminator, "Unknown error"},
 };
 

@@ -107,6 +107,8 @@ enum Code : int {
     AppendFull = 2804,
 
     HeaderFailed = 2901,
+
+    SyncFailed = 3001,
 };
 } // namespace DatabaseError
 

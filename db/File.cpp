@@ -99,13 +99,16 @@ FileOperations& SystemFiles() {
 File::File(FileOperations& operations) : operations_(&operations) {}
 
 File::File(File&& other) noexcept
-    : operations_(other.operations_), descriptor_(std::exchange(other.descriptor_, -1)) {}
+    : operations_(other.operations_),
+      descriptor_(std::exchange(other.descriptor_, -1)),
+      synced_(other.synced_) {}
 
 File& File::operator=(File&& other) noexcept {
     if (this != &other) {
         Close();
         operations_ = other.operations_;
         descriptor_ = std::exchange(other.descriptor_, -1);
+        synced_ = other.synced_;
     }
     return *this;
 }
@@ -122,6 +125,7 @@ int File::Open(const std::string& path, FileMode mode) {
         return errno;
     }
     descriptor_ = opened;
+    synced_ = true;
     struct stat status {};
     int error = ErrorOf(operations_->Status(descriptor_, &status));
     if (error == 0 && !S_ISREG(status.st_mode)) {
@@ -165,6 +169,7 @@ int File::ReadAt(std::int64_t offset, void* data, std::size_t size) const {
 }
 
 int File::WriteAt(std::int64_t offset, const void* data, std::size_t size) {
+    synced_ = false;
     std::size_t done = 0;
     while (done < size) {
         const auto* source = static_cast<const char*>(data) + done;
@@ -190,11 +195,14 @@ int File::Length(std::int64_t* length) const {
 }
 
 int File::Truncate(std::int64_t length) {
+    synced_ = false;
     return ErrorOf(Retry([&] { return operations_->Truncate(descriptor_, length); }));
 }
 
 int File::Sync() {
-    return ErrorOf(Retry([&] { return operations_->Sync(descriptor_); }));
+    const int error = ErrorOf(Retry([&] { return operations_->Sync(descriptor_); }));
+    synced_ = synced_ || error == 0;
+    return error;
 }
 
 int File::TakeOwnerAndMode(const File& other) {

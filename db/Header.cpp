@@ -49,6 +49,10 @@ int DATABASE::WriteHeaderBytes() {
     return 0;
 }
 
+int DATABASE::Sync() {
+    return file_.IsSynced() || file_.Sync() == 0 ? 0 : Fail(DatabaseError::SyncFailed);
+}
+
 int DATABASE::WriteLayout(File& file, const DATABASE_HEADER& header, const COLUMN_ENTRY* columns) {
     std::uint8_t bytes[HeaderSize];
     EncodeHeader(header, bytes);

@@ -97,6 +97,8 @@ void UpdateWindow::UpdateAll() {
     }
     lastConnection_.Close();
     log_.Write();
+    if (database_->Sync() != 0 && !thread_stop_requested())
+        TellNotSaved();
 }
 
 bool UpdateWindow::UpdateOne(int32 recordNumber) {

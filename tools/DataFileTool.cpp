@@ -66,6 +66,7 @@ bool DataFileTool::IsFileFailure(int code) {
     case DatabaseError::CompressReadFailed:
     case DatabaseError::AppendFailed:
     case DatabaseError::HeaderFailed:
+    case DatabaseError::SyncFailed:
         return true;
     default:
         return code % 10 == 9 && code != DatabaseError::CompressNoFile;
@@ -152,6 +153,8 @@ void DataFileTool::Tell(const char* name, long number, const std::string& senten
 }
 
 int DataFileTool::Finish(int status) {
+    if (database_.Sync() != 0)
+        status = FailAsEngine();
     const int error = output_.Flush();
     if (error == 0 || error == EPIPE)
         return status;

@@ -65,8 +65,8 @@ class DataFileTool {
     // puts back the backup of an interrupted compaction first.
     int Check(bool repair);
 
-    // To be called last: writes what is left of the output. A reader that has gone away is no failure; what
-    // else hinders the output makes `status` 1.
+    // To be called last: waits until the changes are on the disk, and writes what is left of the output. A
+    // reader that has gone away is no failure; what else hinders the output makes `status` 1.
     int Finish(int status);
 
   private:

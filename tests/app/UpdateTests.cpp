@@ -4,6 +4,7 @@
 #include <cmath>
 #include <map>
 
+#include "WatchedFiles.h"
 #include "platform/StatusBar.h"
 #include "quotes/LoopbackServer.h"
 #include "quotes/PriceUpdate.h"
@@ -105,12 +106,15 @@ TEST(ApplyQuote, ChangesWhatItShall) {
 // A row without a ticker is left out; the others show how their prices moved.
 TEST_F(PriceUpdate, AsksForTheSelectedRowsThatHaveATicker) {
     AddInvestment(Holding(" ", 48200, NoPreviousPrice));
+    WatchedFiles files;
+    Then("watch the file", [&] { files.Watch(app_state->investments, File("invest.db")); });
     Mark({5, 0, 1, 2, 3});
     Update();
     UntilDone();
     When(
         "the new prices", [] { return std::string(Row(0)->Text(5)) == "12.50"; },
-        [] {
+        [&] {
+            EXPECT_TRUE(files.HaveSynced());
             const PriceMove moves[] = {PriceMove::Up,       PriceMove::Down,    PriceMove::Same,
                                        PriceMove::NotFound, PriceMove::Unknown, PriceMove::Unknown};
             for (int32 row = 0; row < 6; ++row)

@@ -5,6 +5,7 @@
 
 #include <QPushButton>
 
+#include "WatchedFiles.h"
 #include "platform/MenuItem.h"
 #include "platform/Roster.h"
 
@@ -268,6 +269,39 @@ TEST(CutInvestments, ComeBackAtTheNextStart) {
     next.Expect({"b", "a", "c"});
     EXPECT_EQ(next.RunAndClose(), 0);
     EXPECT_FALSE(next.Has("cut.db"));
+}
+
+TEST_F(MainWindow, WhatACommandChangesIsOnTheDiskWhenItEnds) {
+    WatchedFiles portfolios;
+    WatchedFiles investments;
+    AddPortfolio("Old");
+    AddPortfolioOf("P", {"a", "b", "c"});
+    Then("watch the files", [&] {
+        portfolios.Watch(app_state->portfolios, File("portfol.db"));
+        investments.Watch(app_state->investments, File("invest.db"));
+    });
+    const auto done = [&](WatchedFiles& files) {
+        Then("on the disk", [&] { EXPECT_TRUE(files.HaveSynced()); });
+    };
+    Mark({0}).Send(MessageInvestmentDelete).Expect({"b", "c"});
+    done(investments);
+    Mark({0}).Send(MessageInvestmentCut).Expect({"c"});
+    done(investments);
+    Then("what is pasted is there before its copy goes",
+         [&] { investments.beforeSync = [this] { EXPECT_TRUE(Has("cut.db")); }; });
+    Send(MessageInvestmentPaste).Expect({"c", "b"});
+    Then("pasted", [&] { investments.beforeSync = nullptr; });
+    done(investments);
+    Mark({1}).Send(MessageInvestmentEdit);
+    When("the form", WindowShown("Edit this Investment"), [] { Key(Qt::Key_Return); });
+    done(investments);
+    DeletePortfolio("Yes", "Yes");
+    Expect({});
+    done(portfolios);
+    Then("the disk fails", [&] { portfolios.failing = true; });
+    DeletePortfolio("Yes", "Yes");
+    Answer("The change could not be saved! Is the disk full, or the file protected?", "Ok");
+    RunAndClose();
 }
 
 } // namespace

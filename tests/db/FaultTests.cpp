@@ -228,6 +228,27 @@ TEST_F(FaultTest, KilledAtAnyCallLeavesTheOldContentOrTheNew) {
     }
 }
 
+TEST_F(FaultTest, SyncReachesTheDiskAfterEveryChangeAndNotOtherwise) {
+    for (const OPERATION& operation : Operations) {
+        const auto database = Fresh();
+        const auto asks = [&](int code) {
+            files_.Arm(Fault::Error, 0, EIO);
+            EXPECT_EQ(database->Sync(), code == 0 ? 0 : -1);
+            EXPECT_EQ(database->GetLastError(nullptr), code);
+            return files_.Disarm();
+        };
+        EXPECT_FALSE(asks(0)) << operation.name;
+        ASSERT_GE(operation.run(*database), 0);
+        if (!operation.changesFile || operation.name == std::string("Compress")) { // which does so itself
+            EXPECT_FALSE(asks(0)) << operation.name;
+            continue;
+        }
+        EXPECT_TRUE(asks(3001)) << operation.name;
+        EXPECT_EQ(database->Sync(), 0);
+        EXPECT_FALSE(asks(0)) << operation.name;
+    }
+}
+
 TEST_F(FaultTest, CodesNameTheOperationThatFailed) {
     const struct {
         std::size_t operation;
