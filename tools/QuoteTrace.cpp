@@ -103,6 +103,10 @@ void QuoteTrace::PriceRead(std::string_view token, std::string_view following, d
                 : fraction == 0 ? "no fraction"
                                 : "fraction " + Number(fraction, 4))
             << '\n';
+    const bool isNumber = token.find_first_of("0123456789+-.") == 0;
+    if (!isNumber && fraction > 0)
+        output_ << "  careful: the price text is no number, and the price is only the fraction behind it; is "
+                   "the skip one off?\n";
 }
 
 void QuoteTrace::SourceAnswered(float result) {

@@ -63,6 +63,7 @@ TEST_F(QuoteCommand, TriesALine) {
         {Source("/q?s=", "Last", 2), 0, "ABC\t45.38\n", "looking in the given line\n"},
         {Source("/q?s=", "Last", 9), 1, "ABC\t-4.00\n", "  the page ended before the skip count was used up"},
         {Source("/q?s=", "Last", 0), 1, "ABC\t0.00\n", "  price text 'Last\\\\' read as 0.0000\n"},
+        {Source("/q?s=", "Last", 1), 0, "ABC\t15.00\n", "  careful: the price text is no number"},
         {"net 127.0.0.1:x /q?s= Last 2", 1, "ABC\t-4.00\n", "  failed: the host is none of NAME"},
         {"net h /q?s= Last", 2, "", "it has fewer than five fields"},
         {";net h /q?s= Last 2", 2, "", "is no source"},
