@@ -56,12 +56,12 @@ bool CutFile::Keep(std::span<const INVESTMENT_DATA> investments, std::span<const
     const std::string unfinished = path_ + ".tmp";
     std::filesystem::remove(unfinished, error);
     const std::vector<COLUMN_ENTRY> columns = Columns();
-    DATABASE file(nullptr);
+    DATABASE file(nullptr, operations_);
     if (file.Create(unfinished.c_str(), "cut investments", static_cast<int>(columns.size()),
                     columns.data()) == 0 &&
         file.AppendAll(records.data(), sizeof(CUT_DATA), static_cast<std::int32_t>(records.size())) >= 0 &&
-        file.Sync() == 0 && RenameFile(SystemFiles(), unfinished, path_) == 0 &&
-        SyncFolderOf(SystemFiles(), path_) == 0)
+        file.Sync() == 0 && RenameFile(operations_, unfinished, path_) == 0 &&
+        SyncFolderOf(operations_, path_) == 0)
         return true;
     std::filesystem::remove(unfinished, error);
     std::filesystem::remove(path_, error);

@@ -4,6 +4,7 @@
 #include <string>
 
 #include "app/RecordLayouts.h"
+#include "db/File.h"
 
 class DATABASE;
 
@@ -13,7 +14,9 @@ class DATABASE;
 // open. Used on the interface thread, which makes one where it needs one.
 class CutFile {
   public:
-    explicit CutFile(const std::string& folder) : path_(folder + "/cut.db") {}
+    // `operations` must outlive the object.
+    explicit CutFile(const std::string& folder, FileOperations& operations = SystemFiles())
+        : path_(folder + "/cut.db"), operations_(operations) {}
 
     // Keeps copies of investments together with their record numbers, on the disk when it returns; to be
     // called before they are deleted. False, with nothing changed, when they cannot be written, or when
@@ -30,4 +33,5 @@ class CutFile {
 
   private:
     std::string path_;
+    FileOperations& operations_;
 };

@@ -272,4 +272,24 @@ TEST(CutFile, PutsBackWhatIsNotThere) {
     EXPECT_TRUE(folder.Has("cut.db"));
 }
 
+TEST(CutFile, IsThereWholeOrNotAtAll) {
+    const DataFolder folder;
+    const std::vector<INVESTMENT_DATA> cut = {MakeInvestment("P", "a"), MakeInvestment("P", "b")};
+    FaultyFiles files;
+    const CutFile file(folder.Path(), files);
+    const auto keep = [&](int call) {
+        files.Arm(Fault::Error, call);
+        const bool kept = file.Keep(cut, std::vector<long>{0, 1});
+        EXPECT_EQ(kept, !files.Disarm()) << call;
+        return kept;
+    };
+    const auto present = [&] { return folder.Has("cut.db") || folder.Has("cut.db.tmp"); };
+    int call = 0;
+    for (; !keep(call); ++call)
+        EXPECT_FALSE(present()) << call;
+    EXPECT_TRUE(folder.Has("cut.db"));
+    // A killed machine has no file under its name whose bytes are not there.
+    EXPECT_EQ(files.Order().substr(files.Order().size() - 3), "srs");
+}
+
 } // namespace

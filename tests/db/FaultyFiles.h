@@ -3,6 +3,7 @@
 #include <cerrno>
 #include <csignal>
 #include <functional>
+#include <string>
 
 #include <fcntl.h>
 
@@ -34,6 +35,8 @@ class FaultyFiles : public FileOperations {
         at_ = -1;
         return met;
     }
+    // A letter for each write, sync and rename so far: w, s, r.
+    [[nodiscard]] const std::string& Order() const { return order_; }
     // Makes every opening for writing fail so, as for a file that may only be read.
     void RefuseWriting(int error) { refused_ = error; }
 
@@ -46,6 +49,7 @@ class FaultyFiles : public FileOperations {
         return (flags & O_CREAT) != 0 ? Meet<int>(call) : call();
     }
     ssize_t WriteAt(int file, const void* data, std::size_t size, off_t offset) override {
+        order_ += 'w';
         const bool now = calls_ == at_;
         if (now && size > 1 &&
             (fault_ == Fault::ShortWrite || fault_ == Fault::HalfThenError || fault_ == Fault::Broken)) {
@@ -61,6 +65,7 @@ class FaultyFiles : public FileOperations {
         return Meet<int>([&] { return FileOperations::Truncate(file, length); });
     }
     int Sync(int file) override {
+        order_ += 's';
         return Meet<int>([&] { return FileOperations::Sync(file); });
     }
     int SetOwner(int file, uid_t owner, gid_t group) override {
@@ -70,6 +75,7 @@ class FaultyFiles : public FileOperations {
         return Meet<int>([&] { return FileOperations::SetMode(file, mode); });
     }
     int Rename(const char* from, const char* to) override {
+        order_ += 'r';
         return Meet<int>([&] { return FileOperations::Rename(from, to); });
     }
     int Remove(const char* path) override {
@@ -110,4 +116,5 @@ class FaultyFiles : public FileOperations {
     int error_ = ENOSPC;
     int calls_ = 0;
     int refused_ = 0;
+    std::string order_;
 };
