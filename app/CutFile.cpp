@@ -69,8 +69,9 @@ bool CutFile::Keep(std::span<const INVESTMENT_DATA> investments, std::span<const
 }
 
 void CutFile::Forget() const {
-    std::error_code error;
-    std::filesystem::remove(path_, error);
+    // Back after a power cut it would only bring the investments a second time.
+    if (RemoveFile(operations_, path_) == 0)
+        static_cast<void>(SyncFolderOf(operations_, path_));
 }
 
 CutFile::Outcome CutFile::Restore(DATABASE& investments) const {

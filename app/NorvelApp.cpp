@@ -217,6 +217,7 @@ void NorvelApp::RestoreLostPortfolios(std::string& complaints) {
     const std::vector<std::string> names = RestorePortfolios(*state_.portfolios, *state_.investments);
     if (names.empty())
         return;
+    static_cast<void>(state_.portfolios->Sync()); // they would be found again the next time
     std::string list;
     for (std::size_t i = 0; i < std::min(names.size(), named); ++i)
         list += (i == 0 ? "\"" : ", \"") + names[i] + "\"";

@@ -83,8 +83,8 @@ class DATABASE {
     /// off, the header in the file keeps the old counts, also after the object is gone. Fails with 2901.
     int SetImmediateHeaderWrite(int on);
     /// Returns when every change made so far is on the disk and outlasts a power cut; at once when there was
-    /// none since the last time, or no file is open. Fails with 3001: the changes are in the file then, but
-    /// nobody knows for how long.
+    /// none since the last time, or no file is open. Fails with 3001, once: the changes are in the file then,
+    /// but nobody knows for how long, and the system tells no second time.
     int Sync();
     /// Gives a column with a negative size the width of its type; strings and unknown types keep theirs.
     /// Returns 0.

@@ -101,14 +101,14 @@ File::File(FileOperations& operations) : operations_(&operations) {}
 File::File(File&& other) noexcept
     : operations_(other.operations_),
       descriptor_(std::exchange(other.descriptor_, -1)),
-      synced_(other.synced_) {}
+      written_(std::exchange(other.written_, false)) {}
 
 File& File::operator=(File&& other) noexcept {
     if (this != &other) {
         Close();
         operations_ = other.operations_;
         descriptor_ = std::exchange(other.descriptor_, -1);
-        synced_ = other.synced_;
+        written_ = std::exchange(other.written_, false);
     }
     return *this;
 }
@@ -125,7 +125,6 @@ int File::Open(const std::string& path, FileMode mode) {
         return errno;
     }
     descriptor_ = opened;
-    synced_ = true;
     struct stat status {};
     int error = ErrorOf(operations_->Status(descriptor_, &status));
     if (error == 0 && !S_ISREG(status.st_mode)) {
@@ -138,6 +137,7 @@ int File::Open(const std::string& path, FileMode mode) {
 }
 
 void File::Close() {
+    written_ = false;
     if (descriptor_ >= 0) {
         // An interrupted close has closed all the same; the bytes were the kernel's before.
         operations_->Close(std::exchange(descriptor_, -1));
@@ -169,7 +169,7 @@ int File::ReadAt(std::int64_t offset, void* data, std::size_t size) const {
 }
 
 int File::WriteAt(std::int64_t offset, const void* data, std::size_t size) {
-    synced_ = false;
+    written_ = true;
     std::size_t done = 0;
     while (done < size) {
         const auto* source = static_cast<const char*>(data) + done;
@@ -195,14 +195,13 @@ int File::Length(std::int64_t* length) const {
 }
 
 int File::Truncate(std::int64_t length) {
-    synced_ = false;
+    written_ = true;
     return ErrorOf(Retry([&] { return operations_->Truncate(descriptor_, length); }));
 }
 
 int File::Sync() {
-    const int error = ErrorOf(Retry([&] { return operations_->Sync(descriptor_); }));
-    synced_ = synced_ || error == 0;
-    return error;
+    written_ = false;
+    return ErrorOf(Retry([&] { return operations_->Sync(descriptor_); }));
 }
 
 int File::TakeOwnerAndMode(const File& other) {

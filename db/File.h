@@ -74,8 +74,10 @@ class File {
     [[nodiscard]] int Truncate(std::int64_t length);
     /// Returns when the file's bytes have reached the disk.
     [[nodiscard]] int Sync();
-    /// Tells whether all that was written through this object has reached the disk, by Sync.
-    [[nodiscard]] bool IsSynced() const { return synced_; }
+    /// Tells whether anything was written to the open file since it was opened or since the last Sync, a
+    /// failed one included: the system forgets what it could not bring to the disk, and says yes when it is
+    /// asked again.
+    [[nodiscard]] bool IsWritten() const { return written_; }
     /// Gives this file the permissions of `other` and, as far as the process may, its owner and group.
     [[nodiscard]] int TakeOwnerAndMode(const File& other);
     /// Tells whether `path` names this very file.
@@ -84,7 +86,7 @@ class File {
   private:
     FileOperations* operations_;
     int descriptor_ = -1;
-    bool synced_ = true;
+    bool written_ = false;
 };
 
 /// Renames a file, replacing what is at `to`. Returns 0 or an errno number.

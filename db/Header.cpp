@@ -50,7 +50,7 @@ int DATABASE::WriteHeaderBytes() {
 }
 
 int DATABASE::Sync() {
-    return file_.IsSynced() || file_.Sync() == 0 ? 0 : Fail(DatabaseError::SyncFailed);
+    return !file_.IsWritten() || file_.Sync() == 0 ? 0 : Fail(DatabaseError::SyncFailed);
 }
 
 int DATABASE::WriteLayout(File& file, const DATABASE_HEADER& header, const COLUMN_ENTRY* columns) {

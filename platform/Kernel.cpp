@@ -203,6 +203,14 @@ status_t kill_thread(thread_id thread) {
     return WaitForEnd(found, nullptr, B_INFINITE_TIMEOUT);
 }
 
+status_t stop_thread(thread_id thread) {
+    const std::shared_ptr<Thread> found = FindThread(thread);
+    if (!found)
+        return B_BAD_THREAD_ID;
+    RequestStop(*found);
+    return B_OK;
+}
+
 bool thread_stop_requested() {
     return tCurrentThread && tCurrentThread->stopRequested;
 }

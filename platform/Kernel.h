@@ -46,7 +46,10 @@ status_t wait_for_thread(thread_id thread, int32* result);
 // thread's own code is expected to look at thread_stop_requested between steps and return.
 status_t kill_thread(thread_id thread);
 
-// Whether kill_thread was called for the calling thread; false on threads that spawn_thread did not make.
+// Asks the thread to stop in the same way and returns at once. B_OK, or B_BAD_THREAD_ID.
+status_t stop_thread(thread_id thread);
+
+// Whether the calling thread was asked to stop; false on threads that spawn_thread did not make.
 bool thread_stop_requested();
 // A file descriptor that becomes readable when the calling thread is asked to stop, to be polled beside a
 // socket; -1 on threads that spawn_thread did not make. It belongs to the thread and must not be closed.

@@ -73,18 +73,30 @@ void UpdateWindow::StartWorker() {
     Lock();
     statusBar_->Update(1);
     worker_ = spawn_thread(updateThread, "updateThread", suggest_thread_priority(), this);
-    if (worker_ <= 0 || resume_thread(worker_) != B_OK)
+    if (worker_ <= 0 || resume_thread(worker_) != B_OK) {
+        ended_ = true;
         PostMessage(B_QUIT_REQUESTED);
+    }
     Unlock();
+}
+
+void UpdateWindow::MessageReceived(BMessage* message) {
+    if (message->what == B_QUIT_REQUESTED && !ended_) {
+        stop_thread(worker_); // which asks again at its end
+        return;
+    }
+    if (message->what == B_QUIT_REQUESTED && !isOnDisk_)
+        TellNotSaved();
+    BWindow::MessageReceived(message);
 }
 
 int32 UpdateWindow::updateThread(void* window) {
     auto* self = static_cast<UpdateWindow*>(window);
     self->UpdateAll();
-    if (!thread_stop_requested()) {
+    if (!thread_stop_requested())
         self->AskForReload();
-        self->PostMessage(B_QUIT_REQUESTED);
-    }
+    self->ended_ = true;
+    self->PostMessage(B_QUIT_REQUESTED);
     return 0;
 }
 
@@ -97,8 +109,7 @@ void UpdateWindow::UpdateAll() {
     }
     lastConnection_.Close();
     log_.Write();
-    if (database_->Sync() != 0 && !thread_stop_requested())
-        TellNotSaved();
+    isOnDisk_ = database_->Sync() == 0;
 }
 
 bool UpdateWindow::UpdateOne(int32 recordNumber) {

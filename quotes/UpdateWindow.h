@@ -1,5 +1,6 @@
 #pragma once
 
+#include <atomic>
 #include <string>
 #include <vector>
 
@@ -28,8 +29,12 @@ class UpdateWindow : public BWindow {
     // the list's selected rows, or all of them when none is selected. The rows are NorvelItems. An investment
     // without a ticker keeps its price.
     UpdateWindow(BPoint leftTop, const char* portfolioName, DATABASE* database, const ColumnListView* list);
-    // Stops the worker and waits until it has ended, which it does promptly.
+    // Stops the worker, if it still runs, and waits until it has ended, which it does promptly.
     ~UpdateWindow() override;
+
+    // Asked to quit, it asks the worker to end and goes when that has happened: the person is kept out of the
+    // program until then. Tells when what the worker wrote may not be on the disk.
+    void MessageReceived(BMessage* message) override;
 
   private:
     static int32 updateThread(void* window);
@@ -58,6 +63,8 @@ class UpdateWindow : public BWindow {
     std::string portfolioName_;
     LastConnection lastConnection_; // the worker's
     GatheredLog log_;               // the worker's
-    std::string sources_;           // the quote-source file, read once for the run; empty when it cannot be
-    BMessenger mainWindow_;         // found at the start, on the thread on which windows come and go
+    bool isOnDisk_ = true;          // what the worker wrote; to be looked at when that has ended
+    std::atomic<bool> ended_ = false;
+    std::string sources_;   // the quote-source file, read once for the run; empty when it cannot be
+    BMessenger mainWindow_; // found at the start, on the thread on which windows come and go
 };

@@ -20,8 +20,14 @@ std::string FolderOf(const std::string& file) {
 
 } // namespace
 
-DataFileTool::DataFileTool(std::string file, OutputFormat format, TextOutput& output, std::ostream& errors)
-    : file_(std::move(file)), format_(format), output_(output), errors_(errors), database_(nullptr) {}
+DataFileTool::DataFileTool(std::string file, OutputFormat format, TextOutput& output, std::ostream& errors,
+                           FileOperations& operations)
+    : file_(std::move(file)),
+      format_(format),
+      output_(output),
+      errors_(errors),
+      operations_(operations),
+      database_(nullptr, operations) {}
 
 void DataFileTool::Warn(const std::string& sentence) {
     errors_ << "quorvan-cli: " << file_ << ": " << sentence << '\n';

@@ -31,8 +31,9 @@ struct SELECTION {
 // It knows nothing of command-line options. The command owns it, for one operation each.
 class DataFileTool {
   public:
-    // Both streams must outlive the tool.
-    DataFileTool(std::string file, OutputFormat format, TextOutput& output, std::ostream& errors);
+    // Both streams and the operations must outlive the tool.
+    DataFileTool(std::string file, OutputFormat format, TextOutput& output, std::ostream& errors,
+                 FileOperations& operations = SystemFiles());
 
     // The header; the columns.
     int Info();
@@ -111,6 +112,7 @@ class DataFileTool {
     OutputFormat format_;
     TextOutput& output_;
     std::ostream& errors_;
+    FileOperations& operations_;
     FolderLock lock_;
     DATABASE database_;
 };

@@ -98,6 +98,11 @@ int DataFileTool::Create(const std::string& description, const std::vector<std::
     if (database_.Create(file_.c_str(), description.c_str(), static_cast<int>(entries.size()),
                          entries.data()) != 0)
         return FailAsEngine();
+    if (database_.Sync() != 0)
+        return FailAsEngine();
+    errno = SyncFolderOf(operations_, file_);
+    if (errno != 0)
+        return FailWithCode(DatabaseError::SyncFailed);
     Tell("columns", static_cast<long>(entries.size()),
          "created with " + std::to_string(entries.size()) + (entries.size() == 1 ? " column" : " columns"));
     return 0;

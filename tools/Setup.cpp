@@ -185,7 +185,7 @@ bool FolderSetup::PrepareDataFile(const DataFilePlan& plan) {
     DATABASE database(nullptr);
     if (database.Create(temporary.c_str(), plan.description, static_cast<int>(columns.size()),
                         columns.data()) == 0 &&
-        (!plan.fill || plan.fill(database)))
+        (!plan.fill || plan.fill(database)) && database.Sync() == 0)
         return true;
     const int error = errno;
     char message[128] = "";
@@ -224,6 +224,8 @@ void FolderSetup::MakeDataFiles() {
     };
     MakeTogether(sample ? sampled : empty);
     MakeTogether(pickLists);
+    if (const int error = SyncFolderOf(SystemFiles(), PathOf(FileOf("invest"))); error != 0)
+        Fail("The folder " + folder_ + " cannot be brought to the disk: " + Reason(error) + ".");
     if (options_.sample && !sample)
         output_ << "no sample is added: it goes into new data files only\n";
 }

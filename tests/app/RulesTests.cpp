@@ -255,7 +255,8 @@ TEST(CutFile, PutsBackWhatIsNotThere) {
         folder.AddInvestment(cut.back());
     }
     cut[0].Unused[0] = 'x'; // a file with longer records
-    DATABASE investments(folder.File("invest.db").c_str());
+    FaultyFiles files;
+    DATABASE investments(folder.File("invest.db").c_str(), files);
     const CutFile file(folder.Path());
     EXPECT_EQ(file.Restore(investments), CutFile::Outcome::NothingKept);
     folder.Write("cut.db.tmp", "left by a kill");
@@ -266,6 +267,7 @@ TEST(CutFile, PutsBackWhatIsNotThere) {
     investments.Write(2, &other);
     EXPECT_EQ(file.Restore(investments), CutFile::Outcome::Restored);
     EXPECT_EQ(folder.Investments(), (Texts{"P/not reached", "P/other", "P/deleted", "P/changed since"}));
+    EXPECT_EQ(files.Order().back(), 's') << "on the disk before its copy goes";
     EXPECT_FALSE(folder.Has("cut.db") || folder.Has("cut.db.tmp"));
     folder.Write("cut.db", "damaged");
     EXPECT_EQ(file.Restore(investments), CutFile::Outcome::Failed);

@@ -1,8 +1,10 @@
 // Price updates of the whole program against a server on loopback.
 #include "Program.h"
 
+#include <atomic>
 #include <cmath>
 #include <map>
+#include <semaphore>
 
 #include "WatchedFiles.h"
 #include "platform/StatusBar.h"
@@ -149,6 +151,35 @@ TEST_F(PriceUpdate, CancelledHalfWayItLeavesTheFirstHalfUpdated) {
     EXPECT_EQ(Record(1).Price, 10.375F);
     ExpectUntouched(2, "SAME");
     EXPECT_EQ(server_.Requests().size(), 3U); // no reload is shown, and nobody was asked again
+}
+
+// Until then another command would change the file at the same time.
+TEST_F(PriceUpdate, WhenClosedItGoesOnceItsChangesAreOnTheDisk) {
+    WatchedFiles files;
+    std::atomic<bool> syncing = false;
+    std::binary_semaphore go(0);
+    Then("watch the file", [&] {
+        files.Watch(app_state->investments, File("invest.db"));
+        files.failing = true;
+        files.beforeSync = [&] {
+            if (!syncing.exchange(true))
+                go.acquire();
+        };
+    });
+    held_ = "FALL";
+    Update();
+    WhenAsked(2, [] { Driver::Window(Title)->close(); });
+    When(
+        "the worker waits for the disk", [&] { return syncing.load(); },
+        [&] {
+            EXPECT_TRUE(QApplication::activeModalWidget());
+            EXPECT_EQ(QApplication::activeModalWidget(), Driver::Window(Title));
+            go.release();
+        });
+    Answer("The change could not be saved! Is the disk full, or the file protected?", "Ok");
+    UntilDone();
+    RunAndClose();
+    EXPECT_EQ(Record(0).Price, 12.5F);
 }
 
 TEST_F(PriceUpdate, EndsWithAnAlertWhenNobodyCanBeAsked) {

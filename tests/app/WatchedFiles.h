@@ -2,6 +2,9 @@
 
 #include <cerrno>
 #include <functional>
+#include <memory>
+#include <string>
+#include <utility>
 
 #include "app/AppState.h"
 #include "db/Database.h"
@@ -20,6 +23,10 @@ class WatchedFiles : public FileOperations {
     ssize_t WriteAt(int file, const void* data, std::size_t size, off_t offset) override {
         ++changes_;
         return FileOperations::WriteAt(file, data, size, offset);
+    }
+    int Truncate(int file, off_t length) override {
+        ++changes_;
+        return FileOperations::Truncate(file, length);
     }
     int Sync(int file) override {
         if (beforeSync)

@@ -274,14 +274,16 @@ TEST(CutInvestments, ComeBackAtTheNextStart) {
 TEST_F(MainWindow, WhatACommandChangesIsOnTheDiskWhenItEnds) {
     WatchedFiles portfolios;
     WatchedFiles investments;
-    AddPortfolio("Old");
     AddPortfolioOf("P", {"a", "b", "c"});
     Then("watch the files", [&] {
         portfolios.Watch(app_state->portfolios, File("portfol.db"));
         investments.Watch(app_state->investments, File("invest.db"));
     });
-    const auto done = [&](WatchedFiles& files) {
-        Then("on the disk", [&] { EXPECT_TRUE(files.HaveSynced()); });
+    const auto done = [&](WatchedFiles& files) { Await("on the disk", [&] { return files.HaveSynced(); }); };
+    const auto fill = [&](uint32 command, const char* title, const char* name) {
+        Send(command).When(
+            title, [title] { return Field() && WindowShown(title)(); },
+            [name] { TypeOver(name, Qt::Key_Return); });
     };
     Mark({0}).Send(MessageInvestmentDelete).Expect({"b", "c"});
     done(investments);
@@ -292,16 +294,41 @@ TEST_F(MainWindow, WhatACommandChangesIsOnTheDiskWhenItEnds) {
     Send(MessageInvestmentPaste).Expect({"c", "b"});
     Then("pasted", [&] { investments.beforeSync = nullptr; });
     done(investments);
-    Mark({1}).Send(MessageInvestmentEdit);
-    When("the form", WindowShown("Edit this Investment"), [] { Key(Qt::Key_Return); });
+    Mark({1});
+    fill(MessageInvestmentEdit, "Edit this Investment", "e");
     done(investments);
-    DeletePortfolio("Yes", "Yes");
-    Expect({});
+    fill(MessageInvestmentAdd, "Add an Investment", "d");
+    done(investments);
+    fill(MessagePortfolioEdit, "Edit Portfolio", "Q");
     done(portfolios);
-    Then("the disk fails", [&] { portfolios.failing = true; });
+    done(investments);
+    fill(MessagePortfolioAdd, "Add a Portfolio", "R");
+    done(portfolios);
+    Expect({});
     DeletePortfolio("Yes", "Yes");
-    Answer("The change could not be saved! Is the disk full, or the file protected?", "Ok");
+    done(portfolios);
+    Expect({"c", "e", "d"});
     RunAndClose();
+}
+
+TEST_F(MainWindow, ADiskThatFailsIsToldOnce) {
+    WatchedFiles investments;
+    AddPortfolioOf("P", {"a", "b"});
+    Then("watch the file", [&] { investments.Watch(app_state->investments, File("invest.db")); });
+    const auto fails = [&](uint32 command) {
+        Then("the disk fails", [&] { investments.failing = true; });
+        Send(command).Answer("The change could not be saved! Is the disk full, or the file protected?", "Ok");
+        Then("told", [&] { investments.failing = false; });
+    };
+    Mark({0});
+    fails(MessageInvestmentCut);
+    fails(MessageInvestmentPaste);
+    Expect({"b", "a"}).Then("kept", [&] { EXPECT_TRUE(Has("cut.db")); });
+    Mark({0}).Send(MessageInvestmentDelete).Expect({"a"}).Await("on the disk", [&] {
+        return investments.HaveSynced();
+    });
+    Close().Answer("What you cut has not been pasted yet, and would be lost. Go on all the same?", "Yes");
+    Program::Run();
 }
 
 } // namespace

@@ -407,10 +407,10 @@ TEST_F(DbCommandTest, ChangesOnlyWhatItHasToItselfAndHasKept) {
 
 // What the tool tells when its output goes to a descriptor.
 std::string Told(const std::string& path, int file, const std::function<int(DataFileTool&)>& work,
-                 int expected) {
+                 int expected, FileOperations& operations = SystemFiles()) {
     TextOutput output(file);
     std::ostringstream errors;
-    DataFileTool tool(path, OutputFormat::Table, output, errors);
+    DataFileTool tool(path, OutputFormat::Table, output, errors, operations);
     EXPECT_EQ(tool.Finish(work(tool)), expected);
     return errors.str();
 }
@@ -431,6 +431,26 @@ TEST_F(DbCommandTest, FileThatMayOnlyBeReadIsShown) {
                   return HasFailure() ? 1 : 0;
               }),
               0);
+}
+
+TEST_F(DbCommandTest, ADiskThatFailsIsTold) {
+    struct : FileOperations {
+        int Sync(int) override {
+            errno = EIO;
+            return -1;
+        }
+    } failing;
+    MakeSample();
+    const int out = open("/dev/null", O_WRONLY);
+    const std::string message = ": 3001 Sync error - unable to reach the disk (Input/output error)\n";
+    EXPECT_EQ(Told(
+                  path_, out, [](DataFileTool& tool) { return tool.Append({}); }, 1, failing),
+              "quorvan-cli: " + path_ + message);
+    const std::string made = shell_.File("made.db");
+    EXPECT_EQ(Told(
+                  made, out, [](DataFileTool& tool) { return tool.Create("", {"A:long"}); }, 1, failing),
+              "quorvan-cli: " + made + message);
+    close(out);
 }
 
 TEST_F(DbCommandTest, OutputThatNobodyTakesIsNoFailure) {
