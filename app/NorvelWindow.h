@@ -60,7 +60,7 @@ class NorvelWindow : public BWindow {
     static const Command Commands[];
     [[nodiscard]] static const Command* FindCommand(uint32 code);
     [[nodiscard]] bool CanRun(const Command& command) const;
-    // Runs it, and returns when what it changed would outlast a power cut.
+    // Runs it, and returns when what it changed in the data files would outlast a power cut.
     void Execute(const Command& command);
     // Tells the person when the disk fails.
     static void SyncDataFiles();

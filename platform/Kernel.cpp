@@ -77,9 +77,11 @@ void RunThread(const std::shared_ptr<Thread>& thread, thread_id id) {
     tCurrentThread = thread.get();
     pthread_setname_np(pthread_self(), thread->name.substr(0, kThreadNameLimit).c_str());
     WaitUntil([&] { return thread->started; }, B_INFINITE_TIMEOUT);
-    int32 result = 0;
-    if (!thread->stopRequested)
-        result = thread->function(thread->data);
+    // Once it was resumed it runs, even if it is asked to stop before it comes to that: somebody may wait for
+    // what it does at its end.
+    bool started = false;
+    LookAtKernelState([&] { started = thread->started; });
+    const int32 result = started ? thread->function(thread->data) : 0;
     tCurrentThread = nullptr;
     ChangeKernelState([&] {
         thread->result = result;

@@ -1,5 +1,7 @@
 #include "quotes/UpdateWindow.h"
 
+#include <utility>
+
 #include "ColumnListView/ColumnListView.h"
 #include "app/AppState.h"
 #include "app/FailureAlerts.h"
@@ -85,9 +87,19 @@ void UpdateWindow::MessageReceived(BMessage* message) {
         stop_thread(worker_); // which asks again at its end
         return;
     }
-    if (message->what == B_QUIT_REQUESTED && !isOnDisk_)
-        TellNotSaved();
     BWindow::MessageReceived(message);
+}
+
+bool UpdateWindow::QuitRequested() {
+    if (isWaiting_)
+        return false;
+    isWaiting_ = true;
+    kill_thread(worker_);
+    isWaiting_ = false;
+    PostMessage(B_QUIT_REQUESTED); // in case the application goes on after all
+    if (!std::exchange(isOnDisk_, true))
+        TellNotSaved();
+    return true;
 }
 
 int32 UpdateWindow::updateThread(void* window) {

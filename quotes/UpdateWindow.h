@@ -32,9 +32,12 @@ class UpdateWindow : public BWindow {
     // Stops the worker, if it still runs, and waits until it has ended, which it does promptly.
     ~UpdateWindow() override;
 
-    // Asked to quit, it asks the worker to end and goes when that has happened: the person is kept out of the
-    // program until then. Tells when what the worker wrote may not be on the disk.
+    // When it is closed it asks the worker to end and goes once that has happened: the person is kept out of
+    // the program until then.
     void MessageReceived(BMessage* message) override;
+    // Stops the worker and waits for its end, for when the application quits. Tells when what the worker
+    // wrote may not be on the disk.
+    bool QuitRequested() override;
 
   private:
     static int32 updateThread(void* window);
@@ -65,6 +68,7 @@ class UpdateWindow : public BWindow {
     GatheredLog log_;               // the worker's
     bool isOnDisk_ = true;          // what the worker wrote; to be looked at when that has ended
     std::atomic<bool> ended_ = false;
-    std::string sources_;   // the quote-source file, read once for the run; empty when it cannot be
-    BMessenger mainWindow_; // found at the start, on the thread on which windows come and go
+    bool isWaiting_ = false; // for the worker's end; what comes meanwhile must not delete the window
+    std::string sources_;    // the quote-source file, read once for the run; empty when it cannot be
+    BMessenger mainWindow_;  // found at the start, on the thread on which windows come and go
 };

@@ -224,8 +224,10 @@ void FolderSetup::MakeDataFiles() {
     };
     MakeTogether(sample ? sampled : empty);
     MakeTogether(pickLists);
-    if (const int error = SyncFolderOf(SystemFiles(), PathOf(FileOf("invest"))); error != 0)
-        Fail("The folder " + folder_ + " cannot be brought to the disk: " + Reason(error) + ".");
+    for (const std::string& name : {PathOf(FileOf("invest")), folder_}) {
+        if (const int error = SyncFolderOf(SystemFiles(), name); error != 0)
+            Fail("The name of " + name + " cannot be brought to the disk: " + Reason(error) + ".");
+    }
     if (options_.sample && !sample)
         output_ << "no sample is added: it goes into new data files only\n";
 }

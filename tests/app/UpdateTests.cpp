@@ -2,6 +2,7 @@
 #include "Program.h"
 
 #include <atomic>
+#include <chrono>
 #include <cmath>
 #include <map>
 #include <semaphore>
@@ -162,8 +163,8 @@ TEST_F(PriceUpdate, WhenClosedItGoesOnceItsChangesAreOnTheDisk) {
         files.Watch(app_state->investments, File("invest.db"));
         files.failing = true;
         files.beforeSync = [&] {
-            if (!syncing.exchange(true))
-                go.acquire();
+            const bool first = !syncing.exchange(true);
+            EXPECT_TRUE(!first || go.try_acquire_for(std::chrono::seconds(50)));
         };
     });
     held_ = "FALL";
@@ -217,6 +218,20 @@ TEST_F(PriceUpdate, TheProgramsEndStopsIt) {
     Run();
     EXPECT_EQ(Record(0).Price, 12.5F);
     ExpectUntouched(1, "FALL");
+}
+
+TEST_F(PriceUpdate, TheProgramsEndTellsOfADiskThatFails) {
+    WatchedFiles files;
+    Then("watch the file", [&] {
+        files.Watch(app_state->investments, File("invest.db"));
+        files.failing = true;
+    });
+    held_ = "FALL";
+    Update();
+    WhenAsked(2, [] { be_app->PostMessage(B_QUIT_REQUESTED); });
+    Answer("The change could not be saved! Is the disk full, or the file protected?", "Ok");
+    Run();
+    EXPECT_EQ(Record(0).Price, 12.5F);
 }
 
 } // namespace

@@ -35,7 +35,7 @@ class FaultyFiles : public FileOperations {
         at_ = -1;
         return met;
     }
-    // A letter for each write, sync and rename so far: w, s, r.
+    // A letter for each write, sync, rename and removal so far: w, s, r, x.
     [[nodiscard]] const std::string& Order() const { return order_; }
     // Makes every opening for writing fail so, as for a file that may only be read.
     void RefuseWriting(int error) { refused_ = error; }
@@ -79,6 +79,7 @@ class FaultyFiles : public FileOperations {
         return Meet<int>([&] { return FileOperations::Rename(from, to); });
     }
     int Remove(const char* path) override {
+        order_ += 'x';
         return Meet<int>([&] { return FileOperations::Remove(path); });
     }
 

@@ -219,6 +219,22 @@ TEST(Threads, KillEndsEveryKindOfWaitAndThreadsReturnTheirResults) {
     delete_sem(sem);
 }
 
+// Somebody may wait for what it does at its end.
+TEST(Threads, RunOnceResumedEvenIfStoppedAtOnce) {
+    const BApplication application("test");
+    constexpr int all = 100;
+    std::atomic<int> stopped{0};
+    for (int i = 0; i < all; ++i) {
+        const Worker worker([&] {
+            EXPECT_EQ(snooze(3600 * kSecond), B_INTERRUPTED);
+            return stopped += thread_stop_requested();
+        });
+        EXPECT_EQ(stop_thread(worker.Id()), B_OK);
+    }
+    EXPECT_EQ(stopped, all);
+    EXPECT_EQ(stop_thread(-1), B_BAD_THREAD_ID);
+}
+
 TEST(Application, KeepsTheDecimalPoint) {
     setenv("LC_ALL", "de_DE.UTF-8", 1);
     const BApplication application("test");
