@@ -57,7 +57,7 @@ BApplication::BApplication(const char* signature)
     QApplication::setQuitOnLastWindowClosed(false);
     NameAccessibleRoles();
     OpenInterfaceThread();
-    ApplicationAccess::WatchModifiers(*peer_->toolkit);
+    ApplicationAccess::WatchInput(*peer_->toolkit);
     FontAccess::MakeSystemFonts();
 }
 

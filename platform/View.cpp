@@ -6,6 +6,8 @@
 
 #include <QApplication>
 #include <QEvent>
+#include <QKeyEvent>
+#include <QLineEdit>
 #include <QMouseEvent>
 
 #include "platform/Window.h"
@@ -19,16 +21,44 @@ namespace {
 
 std::atomic<uint32> gModifiers{0};
 
-// Looks at every input event for the modifier keys it carries.
-class ModifierWatcher : public QObject {
+// Looks at every input event, for the modifier keys that it carries and for the repeats of a held key. Such a
+// key types on in a text and goes on in a list, but what it has pressed once it does not press again: it
+// would confirm the dialog that the press itself has opened.
+class InputWatcher : public QObject {
   public:
     using QObject::QObject;
 
     bool eventFilter(QObject* watched, QEvent* event) override {
         if (event->isInputEvent())
             gModifiers = ModifierBits(static_cast<QInputEvent*>(event)->modifiers());
-        return QObject::eventFilter(watched, event);
+        if (event->type() == QEvent::KeyRelease)
+            NoteRelease(*static_cast<QKeyEvent*>(event));
+        const bool repeated = event->type() == QEvent::KeyPress &&
+                              IsRepeat(*static_cast<QKeyEvent*>(event)) &&
+                              PressesButtons(static_cast<QKeyEvent*>(event)->key());
+        return repeated || QObject::eventFilter(watched, event);
     }
+
+  private:
+    void NoteRelease(const QKeyEvent& event) {
+        releasedKey_ = event.key();
+        releaseTime_ = event.timestamp();
+    }
+    // The toolkit takes a repeat for a press when it comes to a window that has just opened. No finger
+    // releases a key and presses it again in one millisecond.
+    [[nodiscard]] bool IsRepeat(const QKeyEvent& event) const {
+        return event.isAutoRepeat() ||
+               (event.timestamp() != 0 && event.timestamp() == releaseTime_ && event.key() == releasedKey_);
+    }
+    static bool PressesButtons(int key) {
+        const bool types =
+            !QApplication::activePopupWidget() && qobject_cast<QLineEdit*>(QApplication::focusWidget());
+        return key == Qt::Key_Return || key == Qt::Key_Enter || key == Qt::Key_Escape ||
+               (key == Qt::Key_Space && !types);
+    }
+
+    int releasedKey_ = 0;
+    quint64 releaseTime_ = 0;
 };
 
 // The whole pixels that a frame covers; a part of a pixel belongs to the frame that begins before it.
@@ -69,8 +99,8 @@ uint32 modifiers() {
     return gModifiers;
 }
 
-void ApplicationAccess::WatchModifiers(QApplication& toolkit) {
-    toolkit.installEventFilter(new ModifierWatcher(&toolkit));
+void ApplicationAccess::WatchInput(QApplication& toolkit) {
+    toolkit.installEventFilter(new InputWatcher(&toolkit));
 }
 
 uint32 ButtonBits(Qt::MouseButtons buttons) {

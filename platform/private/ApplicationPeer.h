@@ -22,6 +22,6 @@ struct ApplicationAccess {
     static void RemoveWindow(BWindow* window);
     static void QuitWhenNothingWaits(BApplication& application);
     static void QuitModalWindows(BApplication& application);
-    // Keeps modifiers() true by looking at every event.
-    static void WatchModifiers(QApplication& toolkit);
+    // Looks at every event: keeps modifiers() true, and the repeats of a held key from pressing buttons.
+    static void WatchInput(QApplication& toolkit);
 };

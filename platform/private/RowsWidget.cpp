@@ -294,7 +294,7 @@ void RowsWidget::HandleKey(QKeyEvent* event) {
                                                                  : QScrollBar::SliderSingleStepAdd);
     } else if (plain && (key == Qt::Key_Return || key == Qt::Key_Enter)) {
         event->setAccepted(owner_->InvocationMessage() != nullptr);
-        if (event->isAccepted() && !event->isAutoRepeat())
+        if (event->isAccepted())
             InvokeCurrent();
     } else {
         QListView::keyPressEvent(event);

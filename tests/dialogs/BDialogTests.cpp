@@ -106,6 +106,33 @@ TEST(BDialog, EveryWayOutHasItsResult) {
     }
 }
 
+// The key that opened the dialog may still be down.
+TEST(BDialog, TheRepeatsOfAHeldKeyPressNothing) {
+    const BApplication application("test");
+    TestDialog::destroyed = TestDialog::confirmed = 0;
+    const auto send = [](QEvent::Type type, quint64 time, bool repeat) {
+        QKeyEvent event(type, Qt::Key_Return, {}, "\r", repeat);
+        event.setTimestamp(time);
+        QApplication::sendEvent(QApplication::focusWidget(), &event);
+    };
+    Driver driver;
+    driver.When("dialog", FieldHasFocus, [&] {
+        send(QEvent::KeyPress, 10, true);
+        // Not always does the toolkit see that it is a repeat.
+        send(QEvent::KeyRelease, 20, false);
+        send(QEvent::KeyPress, 20, false);
+    });
+    driver.When(
+        "nothing", [] { return FieldHasFocus(); },
+        [&] {
+            EXPECT_EQ(TestDialog::confirmed, 0);
+            send(QEvent::KeyPress, 30, false);
+        });
+    EXPECT_EQ((new TestDialog)->DoModal(), DialogOk);
+    EXPECT_EQ(TestDialog::confirmed, 1);
+    ExpectGone();
+}
+
 TEST(BDialog, ARefusedOkKeepsItOpenAsItIs) {
     const BApplication application("test");
     TestDialog::accepts = false;
