@@ -1,3 +1,4 @@
+#include <csignal>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
@@ -39,6 +40,8 @@ int main(int argc, char** argv) {
         std::fputs("quorvan: there is no display to show a window on\n", stderr);
         return 1;
     }
+    // A file-size limit shall be a failed write like any other, not a sudden end.
+    std::signal(SIGXFSZ, SIG_IGN);
     const auto application = std::make_unique<NorvelApp>();
     application->Run();
     return application->ExitStatus();

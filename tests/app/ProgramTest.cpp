@@ -82,6 +82,12 @@ TEST_F(BuiltProgram, IsRefusedAFolderUntilItsHolderHasGoneHoweverItWent) {
     EXPECT_FALSE(third->HasEnded());
 }
 
+TEST_F(BuiltProgram, GoesOnWhenAFileMustNotGrow) {
+    Process program({"sh", "-c", "ulimit -f 0; exec " + File("quorvan")});
+    ASSERT_TRUE(WaitUntil([&] { return !WindowOf(program).empty() || program.HasEnded(); }));
+    EXPECT_FALSE(program.HasEnded());
+}
+
 TEST(Program, AnswersWithoutADisplay) {
     const std::pair<const char*, int> cases[] = {
         {"", 1}, {"--help", 0}, {"--version", 0}, {"--help me", 0}, {"nonsense", 2}};
