@@ -1,5 +1,7 @@
 #include "app/FailureAlerts.h"
 
+#include <string>
+
 #include "util/InterfaceHelpers.h"
 
 void TellNotSaved() {
@@ -13,4 +15,13 @@ void TellNotRead() {
 void TellNotConnected() {
     MessageBox("No Internet connection found!\nPlease establish your connection and try again.",
                B_STOP_ALERT);
+}
+
+void TellNotTrusted(const char* host) {
+    MessageBox(
+        (std::string("The server ") + host +
+         " could not be trusted: its certificate was refused, and it was not asked for a price.\nIs the "
+         "name in Quorvan.cfg right, and the date of this computer?")
+            .c_str(),
+        B_STOP_ALERT);
 }

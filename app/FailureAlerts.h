@@ -9,3 +9,5 @@ void TellNotSaved();
 void TellNotRead();
 // The network cannot be reached.
 void TellNotConnected();
+// A quote server's certificate was refused.
+void TellNotTrusted(const char* host);

@@ -70,6 +70,8 @@ class Transfer {
     [[nodiscard]] bool Run(int stopFd);
     [[nodiscard]] CURLcode Result() const { return result_; }
     [[nodiscard]] std::string Problem() const;
+    // Whether there was a connection to be trusted, on which a request goes out at once.
+    [[nodiscard]] bool RequestWasSent() const;
     // Empty when there was no connection.
     [[nodiscard]] std::string Server() const;
     [[nodiscard]] const std::string& PageText() const { return page_.text; }
@@ -149,6 +151,12 @@ std::string Transfer::Problem() const {
     return reason_[0] != '\0' ? reason_ : curl_easy_strerror(result_);
 }
 
+bool Transfer::RequestWasSent() const {
+    curl_off_t handshake = 0;
+    curl_easy_getinfo(easy_.get(), CURLINFO_APPCONNECT_TIME_T, &handshake);
+    return handshake > 0;
+}
+
 std::string Transfer::Server() const {
     char* address = nullptr;
     long port = 0;
@@ -159,16 +167,12 @@ std::string Transfer::Server() const {
     return std::string(address) + " port " + std::to_string(port);
 }
 
-// What a transfer that brought no page says about the price.
+// What a transfer that could not ask says about the price.
 float StatusOf(CURLcode result) {
     switch (result) {
     case CURLE_COULDNT_RESOLVE_HOST:
     case CURLE_COULDNT_RESOLVE_PROXY:
-    case CURLE_HTTP_RETURNED_ERROR:
-    case CURLE_TOO_MANY_REDIRECTS:
-    case CURLE_UNSUPPORTED_PROTOCOL:
     case CURLE_URL_MALFORMAT:
-    case CURLE_WRITE_ERROR:
         return NoQuote;
     default:
         return QuoteNetworkFailure;
@@ -190,7 +194,12 @@ float AskOverTls(const HostField& host, const char* path, QuoteScanner& scanner,
     if (transfer.Result() != CURLE_OK) {
         report.Log("https error: %s\n", transfer.Problem().c_str());
         report.Observer().Failed(transfer.Problem().c_str());
-        return StatusOf(transfer.Result());
+        if (transfer.Result() == CURLE_PEER_FAILED_VERIFICATION) {
+            report.Observer().CertificateRefused(host.name.c_str());
+            return QuoteNetworkFailure;
+        }
+        if (!transfer.RequestWasSent())
+            return StatusOf(transfer.Result());
     }
     report.Log("received %zu bytes\n", transfer.PageText().size());
     report.Observer().PieceReceived(transfer.PageText());

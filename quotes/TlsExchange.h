@@ -11,9 +11,9 @@ class QuoteScanner;
 // system's, or the context's file. It follows up to 5 redirects, and none that leaves TLS; it takes at most
 // 15 s to connect and 30 s in all, and pages of at most 10 MB.
 //
-// The scanner's price once the page is there. NoQuote when the name does not resolve or the server has no
-// such page for us (an error status, redirects without end or away from TLS, too large a page);
-// QuoteNetworkFailure for every other failure of connection, TLS or transfer; QuoteCancelled as soon as the
+// The scanner's price once the request was sent: what has come by then is scanned even if the transfer ends
+// badly. NoQuote when the name does not resolve; QuoteNetworkFailure for every other failure of connection or
+// TLS before, and for a certificate that is refused, also after a redirect; QuoteCancelled as soon as the
 // context's stop descriptor is readable. The report gets a line that says what failed.
 [[nodiscard]] float AskOverTls(const HostField& host, const char* path, QuoteScanner& scanner,
                                const QuoteContext& context, QuoteReport& report);
