@@ -203,7 +203,11 @@ void NorvelWindow::AddButtons(BView* topView) {
 }
 
 void NorvelWindow::MessageReceived(BMessage* message) {
-    if (message->what == MessagePortfolioSelected)
+    if (message->what == MessageUpdateEnded)
+        isUpdating_ = false;
+    else if (isUpdating_)
+        MarkCurrentPortfolio(); // another one may just have been chosen in the selector
+    else if (message->what == MessagePortfolioSelected)
         OnPortfolioSelected(message);
     else if (const Command* command = FindCommand(message->what))
         Execute(*command);

@@ -28,6 +28,8 @@ class NorvelWindow : public BWindow {
     // Saves the column widths.
     ~NorvelWindow() override;
 
+    // From the press of Update until that has ended what else is pressed is dropped: the investment file is
+    // the update's.
     void MessageReceived(BMessage* message) override;
     void MenusBeginning() override;
     // Deletes the rows first.
@@ -98,6 +100,8 @@ class NorvelWindow : public BWindow {
     void OnPortfolioPrint();
     // Opens the window that brings the prices up to date, unless there is no network.
     void OnPortfolioUpdate();
+    // Looks whether there is a network, and tells the person when there is none.
+    [[nodiscard]] bool FindConnection();
     // Takes the marked item out of the selector.
     void RemoveMarkedItem();
 
@@ -126,8 +130,9 @@ class NorvelWindow : public BWindow {
     // --- other commands ---
     void OnSettings();
     void OnHelp();
-    // Where dialogs open.
+    // Where dialogs open, and where other windows do.
     [[nodiscard]] BPoint DialogCorner() const;
+    [[nodiscard]] BPoint WindowCorner() const;
 
     INI_FILEx settings_;
     BMenuBar* menuBar_ = nullptr;
@@ -136,6 +141,7 @@ class NorvelWindow : public BWindow {
     ColumnListView* investmentList_ = nullptr;
     std::unique_ptr<BMessage> printSettings_; // chosen at the first print; null until then
     char currentPortfolio_[NameSize] = "";    // whose investments are shown; empty for none
+    bool isUpdating_ = false;                 // until MessageUpdateEnded
 };
 
 // A new row for the investment, which belongs to the caller until a list takes it.

@@ -152,6 +152,10 @@ BPoint NorvelWindow::DialogCorner() const {
     return Frame().LeftTop() + BPoint(50, 50);
 }
 
+BPoint NorvelWindow::WindowCorner() const {
+    return Frame().LeftTop() + BPoint(100, 100);
+}
+
 void NorvelWindow::OnSettings() {
     (new SettingsDialog(DialogCorner(), DialogHasOk | DialogHasCancel))->DoModal();
 }

@@ -4,16 +4,15 @@
 #include <string>
 
 #include "app/AppState.h"
+#include "app/ConnectionCheck.h"
 #include "app/FailureAlerts.h"
 #include "app/MessageCodes.h"
 #include "app/PortfolioRules.h"
 #include "charts/ChartWindow.h"
 #include "dialogs/PortfolioAddDialog.h"
 #include "dialogs/PortfolioEditDialog.h"
-#include "platform/Kernel.h"
 #include "platform/MenuField.h"
 #include "print/Report.h"
-#include "quotes/QuoteRetrieval.h"
 #include "quotes/UpdateWindow.h"
 #include "util/CharacterBuffer.h"
 #include "util/DebugLog.h"
@@ -34,32 +33,6 @@ void NorvelWindow::LoadPortfolioList() {
     if (const BMenuItem* marked = MarkedPortfolio())
         CopyTextZeroed(currentPortfolio_, marked->Label());
 }
-
-namespace {
-
-struct LookUp {
-    const char* host;
-    bool found = false;
-};
-
-// On a thread of its own, since it can take long: the windows stay painted meanwhile.
-bool HostIsFound(const char* host) {
-    LookUp lookUp{host};
-    const thread_id thread = spawn_thread(
-        [](void* data) -> int32 {
-            auto* request = static_cast<LookUp*>(data);
-            request->found = IsConnected(request->host);
-            return 0;
-        },
-        "look-up", suggest_thread_priority(), &lookUp);
-    if (thread <= 0 || resume_thread(thread) != B_OK)
-        return false;
-    int32 ignored = 0;
-    wait_for_thread(thread, &ignored);
-    return lookUp.found;
-}
-
-} // namespace
 
 void NorvelWindow::AddPortfolioMenuItem(const char* name) {
     AppendMarkedItem(name);
@@ -173,23 +146,30 @@ void NorvelWindow::OnPortfolioDelete() {
 }
 
 void NorvelWindow::OnPortfolioUpdate() {
+    isUpdating_ = true;
     PrintDebugStatement("CLEAR", app_state->logPath);
+    if (FindConnection())
+        new UpdateWindow(WindowCorner(), currentPortfolio_, app_state->investments.get(), investmentList_);
+    else
+        PostMessage(MessageUpdateEnded); // behind what was pressed meanwhile
+}
+
+bool NorvelWindow::FindConnection() {
     char host[128];
     settings_.ReadString("GENERAL", "IsConnectedURL", "", host);
-    const bool connected = HostIsFound(host);
-    const std::string checked = std::string("Checked '") + host + "', ";
-    if (!connected) {
+    const Connection connection = CheckConnection(host, WindowCorner());
+    if (connection == Connection::NotFound)
         TellNotConnected();
-        PrintDebugStatement((checked + "no connection found!\n").c_str(), app_state->logPath);
-        return;
-    }
-    PrintDebugStatement((checked + "connection found ok\n").c_str(), app_state->logPath);
-    new UpdateWindow(Frame().LeftTop() + BPoint(100, 100), currentPortfolio_, app_state->investments.get(),
-                     investmentList_);
+    const char* result = connection == Connection::Found      ? "connection found ok"
+                         : connection == Connection::NotFound ? "no connection found!"
+                                                              : "cancelled";
+    PrintDebugStatement((std::string("Checked '") + host + "', " + result + "\n").c_str(),
+                        app_state->logPath);
+    return connection == Connection::Found;
 }
 
 void NorvelWindow::OnPortfolioChart() {
-    const BPoint corner = Frame().LeftTop() + BPoint(100, 100);
+    const BPoint corner = WindowCorner();
     new ChartWindow(corner.x, corner.y, currentPortfolio_);
 }
 

@@ -11,6 +11,7 @@
 #include "platform/Application.h"
 #include "platform/StatusBar.h"
 #include "quotes/PriceUpdate.h"
+#include "quotes/QuoteObserver.h"
 #include "quotes/QuoteRetrieval.h"
 #include "util/CharacterBuffer.h"
 #include "util/InterfaceHelpers.h"
@@ -36,6 +37,18 @@ std::vector<int32> RecordNumbers(const ColumnListView* list) {
     }
     return numbers;
 }
+
+// Remembers whether the source asked last was one that cannot be trusted.
+class RefusedCertificate : public QuoteObserver {
+  public:
+    void SourceTried(const QuoteSource& /*source*/) override { host_.clear(); }
+    void CertificateRefused(const char* host) override { host_ = host; }
+    // Empty for no.
+    [[nodiscard]] const std::string& Host() const { return host_; }
+
+  private:
+    std::string host_;
+};
 
 } // namespace
 
@@ -77,6 +90,7 @@ void UpdateWindow::StartWorker() {
     worker_ = spawn_thread(updateThread, "updateThread", suggest_thread_priority(), this);
     if (worker_ <= 0 || resume_thread(worker_) != B_OK) {
         ended_ = true;
+        TellMainWindow(true);
         PostMessage(B_QUIT_REQUESTED);
     }
     Unlock();
@@ -105,8 +119,7 @@ bool UpdateWindow::QuitRequested() {
 int32 UpdateWindow::updateThread(void* window) {
     auto* self = static_cast<UpdateWindow*>(window);
     self->UpdateAll();
-    if (!thread_stop_requested())
-        self->AskForReload();
+    self->TellMainWindow(thread_stop_requested());
     self->ended_ = true;
     self->PostMessage(B_QUIT_REQUESTED);
     return 0;
@@ -139,7 +152,9 @@ bool UpdateWindow::UpdateOne(int32 recordNumber) {
     }
     log_.Add("Checking price for '" + ticker + "'\n");
     ShowTicker(ticker.c_str());
+    RefusedCertificate refused;
     QuoteContext context;
+    context.observer = &refused;
     context.sourcePath = app_state->quoteSourcePath;
     context.log = &log_;
     context.lastConnection = &lastConnection_;
@@ -152,16 +167,19 @@ bool UpdateWindow::UpdateOne(int32 recordNumber) {
     char number[64];
     FormatFixed(quote, number, sizeof number, 2);
     log_.Add(std::string("GetPriceQuote() returned ") + number + "\n");
-    if (!Apply(quote, recordNumber, &record))
+    if (!Apply(quote, refused.Host().c_str(), recordNumber, &record))
         return false;
     ShowProgress();
     return true;
 }
 
-bool UpdateWindow::Apply(float quote, int32 recordNumber, INVESTMENT_DATA* record) {
+bool UpdateWindow::Apply(float quote, const char* refused, int32 recordNumber, INVESTMENT_DATA* record) {
     if (ApplyQuote(*record, quote) == QuoteOutcome::Failed) {
         log_.Write();
-        TellNotConnected();
+        if (*refused == '\0')
+            TellNotConnected();
+        else
+            TellNotTrusted(refused);
         return false;
     }
     if (database_->Write(recordNumber, record) != 0) {
@@ -193,7 +211,10 @@ bool UpdateWindow::LockUnlessStopped() {
     return false;
 }
 
-void UpdateWindow::AskForReload() const {
+void UpdateWindow::TellMainWindow(bool cancelled) const {
+    mainWindow_.SendMessage(BMessage(MessageUpdateEnded));
+    if (cancelled)
+        return;
     BMessage message(MessagePortfolioSelected);
     message.AddString(PortfolioNameField, portfolioName_.c_str());
     mainWindow_.SendMessage(message);

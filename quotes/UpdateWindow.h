@@ -50,14 +50,17 @@ class UpdateWindow : public BWindow {
     void UpdateAll();
     // False when the run ends with this investment.
     [[nodiscard]] bool UpdateOne(int32 recordNumber);
-    // False when the run ends with what came back.
-    [[nodiscard]] bool Apply(float quote, int32 recordNumber, INVESTMENT_DATA* record);
+    // False when the run ends with what came back. `refused` names the server that could not be trusted, if
+    // the last one asked was such.
+    [[nodiscard]] bool Apply(float quote, const char* refused, int32 recordNumber, INVESTMENT_DATA* record);
     void ShowTicker(const char* ticker);
     void ShowProgress();
     // False, without the lock, when the worker is to stop: then the window may be going, and its lock would
     // never come.
     [[nodiscard]] bool LockUnlessStopped();
-    void AskForReload() const;
+    // Tells the main window that the investment file is its own again, and has it show the new prices unless
+    // the run was cancelled.
+    void TellMainWindow(bool cancelled) const;
 
     BStatusBar* statusBar_ = nullptr; // the window's
     thread_id worker_ = -1;

@@ -7,15 +7,36 @@
 #include <map>
 #include <semaphore>
 
+#include <dlfcn.h>
+#include <netdb.h>
+
 #include "WatchedFiles.h"
 #include "platform/StatusBar.h"
 #include "quotes/LoopbackServer.h"
 #include "quotes/PriceUpdate.h"
 #include "quotes/QuoteRetrieval.h"
+#include "quotes/TlsServer.h"
 
 namespace {
 
 constexpr const char* Title = "Getting current prices...";
+constexpr const char* NoConnection =
+    "No Internet connection found!\nPlease establish your connection and try again.";
+
+std::counting_semaphore<> slowHostIsFound(0);
+
+} // namespace
+
+// In place of the system's resolver, which takes its time over one host.
+extern "C" int getaddrinfo(const char* name, const char* service, const addrinfo* hints, addrinfo** found) {
+    static const auto system = reinterpret_cast<decltype(&getaddrinfo)>(dlsym(RTLD_NEXT, "getaddrinfo"));
+    if (std::string(name) != "slow.example")
+        return system(name, service, hints, found);
+    slowHostIsFound.acquire();
+    return system("127.0.0.1", service, hints, found);
+}
+
+namespace {
 
 INVESTMENT_DATA Holding(const char* ticker, float price, float previousPrice) {
     INVESTMENT_DATA record = MakeInvestment("A", ticker, 10, price);
@@ -136,6 +157,34 @@ TEST_F(PriceUpdate, AsksForTheSelectedRowsThatHaveATicker) {
     EXPECT_EQ(server_.Requests().size(), 4U);
 }
 
+TEST_F(PriceUpdate, FromThePressToTheEndThereIsNoOtherCommand) {
+    Write("Quorvan.ini", "[GENERAL]\nIsConnectedURL=slow.example\n[DISPLAY]\n");
+    constexpr const char* waiting = "Looking for a connection";
+    const auto press = [] {
+        Press(Main(), "Update button");
+        Press(Main(), "Update button");
+        Window()->PostMessage(1022);
+        BMessage other(1015);
+        other.AddString("PortfolioName", "Other");
+        Window()->PostMessage(&other);
+    };
+    Mark({0});
+    Then("press", press);
+    When("wait", WindowShown(waiting), [] { Press(Driver::Window(waiting), "cancel button"); });
+    Then("press again", [this, press] {
+        EXPECT_EQ(Read("Quorvan.log"), "Checked 'slow.example', cancelled\n");
+        press();
+    });
+    When("wait again", WindowShown(waiting), [] { slowHostIsFound.release(2); });
+    UntilDone();
+    Await("the new price", [] { return std::string(Row(0)->Text(5)) == "12.50"; });
+    Expect({"RISE", "FALL", "SAME", "FAIL", "NEW"});
+    Send(1024); // commands are taken again
+    Answer("You must select a(n) investment(s) to cut or copy.", "Ok");
+    RunAndClose();
+    EXPECT_EQ(server_.Requests().size(), 1U);
+}
+
 TEST_F(PriceUpdate, CancelledHalfWayItLeavesTheFirstHalfUpdated) {
     held_ = "SAME";
     Update();
@@ -184,24 +233,30 @@ TEST_F(PriceUpdate, WhenClosedItGoesOnceItsChangesAreOnTheDisk) {
 }
 
 TEST_F(PriceUpdate, EndsWithAnAlertWhenNobodyCanBeAsked) {
-    static constexpr struct {
+    TlsServer stranger(TlsIdentity("IP:127.0.0.1"), [](const std::string&) { return Reply{}; });
+    const struct {
         const char* ini;
-        const char* sources;
+        std::string sources;
         const char* logged;
+        const char* alert = NoConnection;
     } cases[] = {
-        {"[GENERAL]\nIsConnectedURL=127.0.0.1\n", nullptr, "Unable to open '"},
+        {"[GENERAL]\nIsConnectedURL=127.0.0.1\n", "", "Unable to open '"},
         {"[GENERAL]\nIsConnectedURL=127.0.0.1\n", "reset 127.0.0.1:1 /a Last 1\n", "connect() error\n"},
-        {"[GENERAL]\n", "", "Checked '', no connection found!\n"},
+        {"[GENERAL]\nIsConnectedURL=127.0.0.1\n", "stranger " + stranger.Host() + " /a Last 1\n",
+         "https error: SSL certificate problem",
+         "The server 127.0.0.1 could not be trusted: its certificate was refused, and it was not asked for a "
+         "price.\nIs the name in Quorvan.cfg right, and the date of this computer?"},
+        {"[GENERAL]\n", ";\n", "Checked '', no connection found!\n"},
     };
     for (const auto& each : cases) {
         Then("prepare", [this, &each] {
             Write("Quorvan.ini", each.ini);
             std::filesystem::remove(File("Quorvan.cfg"));
-            if (each.sources)
+            if (!each.sources.empty())
                 Write("Quorvan.cfg", each.sources);
         });
         Update();
-        Answer("No Internet connection found!\nPlease establish your connection and try again.", "Ok");
+        Answer(each.alert, "Ok");
         UntilDone();
         Then("the log", [this, &each] {
             EXPECT_NE(Read("Quorvan.log").find(each.logged), std::string::npos) << Read("Quorvan.log");

@@ -1,0 +1,13 @@
+#pragma once
+
+#include "platform/Rect.h"
+
+// What a look at the network, through a host that the person names for it, comes to.
+enum class Connection { Found, NotFound, Cancelled };
+
+// Finds out whether the host's name resolves. The look-up has a thread of its own, since it can take long:
+// the windows stay painted meanwhile. Unless the answer is there in an instant, a dialog with its left top
+// corner at the given place says what is waited for and offers to cancel it; Cancelled is also the answer
+// when the application quits. It waits for the answer, and messages of the calling window wait with it.
+// Interface thread.
+[[nodiscard]] Connection CheckConnection(const char* host, BPoint leftTop);
