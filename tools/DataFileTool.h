@@ -60,10 +60,11 @@ class DataFileTool {
     int Load(const std::string& path, const TEXT_FORMAT& format);
 
     int Compact();
-    // Makes a new file. The columns are as ParseColumn reads them.
+    // Makes a new file. The columns are as ParseColumn reads them. Refused in the place of a file of which an
+    // interrupted compaction left something: the next compaction would remove that.
     int Create(const std::string& description, const std::vector<std::string>& columns);
     // Says what is wrong with the file and where: 0 only when nothing is. With `repair`, mends counts and
-    // puts back the backup of an interrupted compaction first.
+    // gives what an interrupted compaction left in the file's place its name first.
     int Check(bool repair);
 
     // To be called last: waits until the changes are on the disk, and writes what is left of the output. A
@@ -81,6 +82,8 @@ class DataFileTool {
     // Keeps other programs out of the file's folder while the tool lives.
     [[nodiscard]] bool TakeFolder();
     [[nodiscard]] bool KeepBackup();
+    // The file of an interrupted compaction that lies where the data file itself is missing; empty for none.
+    [[nodiscard]] std::string Leftover() const;
     [[nodiscard]] std::string WhyNotOpened() const;
     [[nodiscard]] int Fail(const std::string& sentence);
     // Tells of a failure of the engine, by default its latest, with the system's reason for one of the file.
@@ -105,7 +108,7 @@ class DataFileTool {
     int Mark(const MARKING& marking, std::vector<long> records, const SELECTION* selection);
     [[nodiscard]] int CheckText(const std::string& path, const TEXT_FORMAT& format,
                                 const std::string& separators);
-    [[nodiscard]] bool RestoreBackup();
+    [[nodiscard]] bool RestoreLeftover();
     void PrintFindings(const class FileCheck& check);
 
     std::string file_;

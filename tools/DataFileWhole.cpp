@@ -94,6 +94,8 @@ int DataFileTool::Create(const std::string& description, const std::vector<std::
         return Fail("the description is longer than 31 bytes");
     if (!TakeFolder())
         return 1;
+    if (!Leftover().empty())
+        return Fail(WhyNotOpened() + "; nothing is made");
     errno = 0;
     if (database_.Create(file_.c_str(), description.c_str(), static_cast<int>(entries.size()),
                          entries.data()) != 0)
@@ -108,20 +110,28 @@ int DataFileTool::Create(const std::string& description, const std::vector<std::
     return 0;
 }
 
-// False when an interrupted compaction's backup could not be given back its name.
-bool DataFileTool::RestoreBackup() {
-    const int restored = RestoreCompactionBackup(file_.c_str());
-    if (restored > 0)
-        Warn("the backup of an interrupted compaction was given back its name");
-    return restored >= 0;
+// Gives what an interrupted compaction left the name of the file that is missing. False when it could not.
+bool DataFileTool::RestoreLeftover() {
+    const std::string leftover = Leftover();
+    if (leftover.empty())
+        return true;
+    if (const int restored = RestoreCompactionBackup(file_.c_str(), operations_); restored != 0) {
+        Warn(restored > 0
+                 ? "the backup of an interrupted compaction was given back its name"
+                 : leftover + " cannot be given back its name: " + std::generic_category().message(errno));
+        return restored > 0;
+    }
+    // Without a backup there is nothing better than the other file, which may have been written in part only.
+    const int error = RenameFile(operations_, leftover, FollowLinks(file_));
+    Warn(leftover + (error == 0
+                         ? ", of an interrupted compaction, was given the file's name; it may lack records"
+                         : " cannot be given the file's name: " + std::generic_category().message(error)));
+    return error == 0;
 }
 
 int DataFileTool::Check(bool repair) {
-    if (repair && !TakeFolder())
+    if (repair && (!TakeFolder() || !RestoreLeftover()))
         return 1;
-    if (repair && !RestoreBackup())
-        return Fail("the backup of an interrupted compaction cannot be given back its name: " +
-                    std::generic_category().message(errno));
     FileCheck check;
     if (const int error = check.Run(file_); error != 0)
         return Fail(error == ENOENT ? WhyNotOpened() : std::generic_category().message(error));
