@@ -99,7 +99,6 @@ int DATABASE::WriteCompacted(File& target) {
     DATABASE_HEADER header = header_;
     header.recordCount = 0;
     header.deletedCount = 0;
-    header.reserved = 0;
     if (WriteLayout(target, header, columns_.get()) != 0) {
         return DatabaseError::CompressWriteFailed;
     }

@@ -21,7 +21,8 @@ class CompactionTest : public testing::Test {
 TEST_F(CompactionTest, DropsDeletedRecordsAndLocks) {
     folder_.Write("rows.bak", "left over");
     folder_.Write("rows.new", std::string(10000, 'x'));
-    static_cast<void>(!chown(path_.c_str(), 12345, 12346)); // where the test may give files away
+    folder_.Write("rows.db", With(folder_.Read("rows.db"), 48, "\x07")); // the reserved field
+    static_cast<void>(!chown(path_.c_str(), 12345, 12346));              // where the test may give files away
     ASSERT_EQ(chmod(path_.c_str(), 0640), 0);
     struct stat before {};
     struct stat after {};
@@ -35,6 +36,7 @@ TEST_F(CompactionTest, DropsDeletedRecordsAndLocks) {
     EXPECT_EQ(after.st_mode, before.st_mode);
     EXPECT_EQ(std::pair(after.st_uid, after.st_gid), std::pair(before.st_uid, before.st_gid));
     const std::string compacted = folder_.Read("rows.db");
+    EXPECT_EQ(compacted.substr(48, 4), std::string("\x07\0\0\0", 4));
     folder_.Write("precious", "untouched");
     std::filesystem::create_symlink("precious", folder_.File("rows.new"));
     EXPECT_EQ(database.Compress(0), 0);
