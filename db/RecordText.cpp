@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <bit>
 #include <charconv>
+#include <cmath>
 #include <cstring>
 #include <limits>
 
@@ -63,7 +64,9 @@ char* PutText(const std::uint8_t* field, std::size_t width, char* out) {
     return std::copy_n(reinterpret_cast<const char*>(field), length, out);
 }
 
+// What is no number has no sign either.
 char* PutFloat(float value, int decimals, char* out) {
+    value = std::isnan(value) ? std::numeric_limits<float>::quiet_NaN() : value;
     return std::to_chars(out, out + LongestFloat, static_cast<double>(value), std::chars_format::fixed,
                          decimals)
         .ptr;
@@ -92,6 +95,11 @@ std::uint8_t ByteIn(std::string_view text, bool character) {
     return static_cast<std::uint8_t>(WholeNumber(text.data()));
 }
 
+// "-nan" is what files have that were exported when the sign of a float that is no number was written.
+float FloatIn(std::string_view text) {
+    return text == "-nan" ? std::numeric_limits<float>::quiet_NaN() : SingleNumber(text.data());
+}
+
 // Sets a column from a field that ends with a NUL, and all bytes of it.
 void StoreField(const COLUMN_ENTRY& column, std::string_view text, bool byteCharacters, std::uint8_t* field) {
     const auto width = static_cast<std::size_t>(column.size);
@@ -110,7 +118,7 @@ void StoreField(const COLUMN_ENTRY& column, std::string_view text, bool byteChar
         StoreLittleEndian(field, static_cast<std::uint32_t>(WholeNumber(text.data())), width);
         break;
     case ColumnType::Float:
-        StoreLittleEndian(field, std::bit_cast<std::uint32_t>(SingleNumber(text.data())), width);
+        StoreLittleEndian(field, std::bit_cast<std::uint32_t>(FloatIn(text)), width);
         break;
     case ColumnType::Date:
         StoreLittleEndian(field, static_cast<std::uint32_t>(PackedDate(text.data())), width);

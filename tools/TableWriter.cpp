@@ -14,6 +14,7 @@ namespace {
 
 // The shortest text that reads back as the same number, without an exponent as long as that is no burden.
 void AppendShortest(std::string& out, float value) {
+    value = std::isnan(value) ? std::fabs(value) : value; // without a sign, as everywhere
     constexpr float large = 1e9F;
     constexpr float small = 1e-4F;
     const float size = std::fabs(value);

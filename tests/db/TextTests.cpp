@@ -36,6 +36,7 @@ TEST_F(TextTest, FieldsAsText) {
          " |-128|-32768|-2147483648|-0.00|00000000|000000|\n"},
         {Row("sixteen letters!", 0, 0, 0, Limits::infinity(), {-128, -1, -32768}, {-1, -10, -128}),
          "sixteen letters!|0|0|0|inf|-32768-1-128|-128-10-1|\n"},
+        {Row("x", 0, 0, 0, -Limits::quiet_NaN()), "x|0|0|0|nan|20000101|120000|\n"},
         {Row("x", 0, 0, 0, -Limits::max(), {1, 1, -5}),
          "x|0|0|0|-340282346638528859811704183484516925440.00|-0050101|120000|\n"},
     };
@@ -100,6 +101,7 @@ TEST_F(TextTest, FieldsOfALine) {
         {"seventeen letters\t65\t65537\t4294967297\t-1.5\t1999\t1", // no newline at the end
          Row("seventeen lette", '6', 1, 1, -1.5F, {0, 0, 1999}, {0, 0, 1})},
         {"short\t-\n", Row("short", '-', 0, 0, 0, {0, 0, 0}, {0, 0, 0})},
+        {"a\t-\t0\t0\t-nan\n", Row("a", '-', 0, 0, std::numeric_limits<float>::quiet_NaN(), {}, {})},
         {"\t\t\n", none},
         {"x\tx\tx\tx\tx\tx\tx\n", Row("x", 'x', 0, 0, 0, {0, 0, 0}, {0, 0, 0})},
     };
