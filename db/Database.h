@@ -207,7 +207,7 @@ class DATABASE {
     /// file is there in part.
     long Export(const char* path, int all, const char* separator);
     /// Appends the records in a text file. A field ends at any of the `separators`, several of them count as
-    /// one; a line that begins with its newline is skipped, and a field that a line lacks is empty or 0. The
+    /// one; a blank line is skipped, and a field that a line lacks is empty or 0. The
     /// newline separates too only when it is given. Returns the number of records; -1 on failure: 1801 the
     /// file cannot be opened, is no regular file or is this data file; 1802 the first line has not as many
     /// fields as there are columns; 1803 or 1804 memory, 1808 no data file is open, 1809 read error, or as

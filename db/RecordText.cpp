@@ -140,6 +140,11 @@ FieldSplitter::FieldSplitter(const char* separators) {
     }
 }
 
+bool FieldSplitter::IsBlank(std::string_view line) const {
+    return line.starts_with('\n') ||
+           (IsSeparator('\r') && IsSeparator('\n') && line.find_first_not_of("\r\n") == line.npos);
+}
+
 void FieldSplitter::Begin(std::span<char> line) {
     next_ = line.data();
     end_ = line.data() + line.size();

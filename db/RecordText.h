@@ -15,6 +15,9 @@ class FieldSplitter {
     /// Null is the empty set: then a line is one field.
     explicit FieldSplitter(const char* separators);
 
+    /// Whether a line is blank: it begins with its newline, or has nothing but carriage returns and newlines
+    /// where both are in the set.
+    [[nodiscard]] bool IsBlank(std::string_view line) const;
     /// Begins a line. It must stay where it is, one byte behind it included, and loses its separators.
     void Begin(std::span<char> line);
     /// The next field, ended by a NUL; empty when there is none left.

@@ -172,7 +172,7 @@ bool DATABASE::BeginLines(LOAD& work) const {
     return !headingLine_ || work.reader.Next(&heading) == 0;
 }
 
-// The first line that is not empty must have as many fields as there are columns.
+// The first line that is not blank must have as many fields as there are columns.
 int DATABASE::CheckFirstLine(LOAD& work) const {
     if (!BeginLines(work)) {
         return DatabaseError::LoadReadFailed;
@@ -185,7 +185,7 @@ int DATABASE::CheckFirstLine(LOAD& work) const {
         if (line.empty()) {
             return DatabaseError::None;
         }
-        if (line.front() != '\n') {
+        if (!work.fields.IsBlank({line.data(), line.size()})) {
             work.fields.Begin(line);
             return work.fields.Count() == header_.columnCount ? DatabaseError::None
                                                               : DatabaseError::LoadInvalidFormat;
@@ -202,7 +202,7 @@ int DATABASE::LoadLines(LOAD& work) {
         std::span<char> line;
         const int error = work.reader.Next(&line);
         const bool over = error != 0 || line.empty();
-        if (!over && line.front() != '\n') {
+        if (!over && !work.fields.IsBlank({line.data(), line.size()})) {
             work.fields.Begin(line);
             work.text.Parse(work.fields, work.batch + static_cast<std::size_t>(waiting) * DataSize());
             ++waiting;

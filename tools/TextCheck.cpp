@@ -62,7 +62,7 @@ int TextCheck::Run(const File& text, std::size_t longest) {
 std::string TextCheck::WhatIsWrong(std::span<char> line, std::size_t longest, bool heading) {
     if (line.size() > longest)
         return "the line is longer than " + std::to_string(longest) + " bytes";
-    if (!heading && line.front() == '\n')
+    if (!heading && splitter_.IsBlank({line.data(), line.size()}))
         return {};
     SplitFields(line);
     if (fields_.size() != columns_.size())

@@ -150,7 +150,7 @@ TEST_F(TextTest, LinesOfAFile) {
         {"", "|\n", 0, 0},
         {"\n\n", "|\n", 0, 0},
         {"\n" + line + "\n\n\n" + line + "\n\n", "|\n", 2, 0},
-        {line + "\r\n" + line + "\r\n", "|\r\n", 2, 0},
+        {"\r\n" + line + "\r\n\r\n" + line + "\r\n\r", "|\r\n", 2, 0},
         {line + "|1\n", "|\n", -1, 1802},
         {"a|1|1|1|1|1\n" + line, "|\n", -1, 1802},
         {line + "|\n", "|", -1, 1802}, // the newline is a field when it does not separate
