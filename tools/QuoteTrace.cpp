@@ -33,6 +33,14 @@ std::string Printable(std::string_view text) {
     return printable;
 }
 
+bool HasCommaBehindNumber(std::string_view token) {
+    const std::string text(token);
+    double number = 0;
+    const char* rest = nullptr;
+    static_cast<void>(ReadDecimal(text.c_str(), &number, &rest));
+    return rest != text.c_str() && *rest == ',';
+}
+
 std::string Number(double value, int decimals) {
     char text[64];
     FormatFixed(value, text, sizeof text, decimals);
@@ -47,7 +55,7 @@ void QuoteTrace::SourceTried(const QuoteSource& source) {
     beginning_.clear();
     lastBytes_.clear();
     received_ = 0;
-    markerFound_ = markerDivided_ = priceRead_ = false;
+    connected_ = failed_ = markerFound_ = markerDivided_ = priceRead_ = false;
     output_ << "source " << Printable(source.label) << ": asking " << Printable(source.host) << " for "
             << Printable(source.path) << ", marker '" << Printable(source.tag) << "', skip " << source.skip
             << '\n';
@@ -62,10 +70,12 @@ void QuoteTrace::ListEnded(int line) {
 }
 
 void QuoteTrace::Connected(const char* server) {
+    connected_ = true;
     output_ << "  connected to " << server << '\n';
 }
 
 void QuoteTrace::Failed(const char* reason) {
+    failed_ = true;
     output_ << "  failed: " << Printable(reason) << '\n';
 }
 
@@ -107,11 +117,16 @@ void QuoteTrace::PriceRead(std::string_view token, std::string_view following, d
     if (!isNumber && fraction > 0)
         output_ << "  careful: the price text is no number, and the price is only the fraction behind it; is "
                    "the skip one off?\n";
+    if (HasCommaBehindNumber(token))
+        output_ << "  careful: the price text is read only up to its comma; a price is written with a "
+                   "decimal point and without other separators\n";
 }
 
 void QuoteTrace::SourceAnswered(float result) {
     if (!priceRead_ && received_ > 0)
         TellWhatIsMissing();
+    else if (received_ == 0 && connected_ && !failed_)
+        output_ << "  the server closed the connection without sending a byte of the page\n";
     output_ << (result > 0 ? "  price " : "  no price, ") << Number(static_cast<double>(result), 2) << '\n';
 }
 

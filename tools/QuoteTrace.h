@@ -36,9 +36,11 @@ class QuoteTrace : public QuoteObserver {
     bool askedAny_ = false;
     // Of the source being asked:
     std::string marker_;
-    std::string beginning_;      // of the page
-    std::string lastBytes_;      // of the page so far, fewer than the marker has
-    std::size_t received_ = 0;   // bytes
+    std::string beginning_;    // of the page
+    std::string lastBytes_;    // of the page so far, fewer than the marker has
+    std::size_t received_ = 0; // bytes
+    bool connected_ = false;
+    bool failed_ = false;        // and the reason was told
     bool markerFound_ = false;   // in one piece
     bool markerDivided_ = false; // between two pieces
     bool priceRead_ = false;

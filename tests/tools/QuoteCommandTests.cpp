@@ -19,6 +19,10 @@ class QuoteCommand : public testing::Test {
     LoopbackServer server_{[](const std::string& request) {
         if (request.find("XYZ") != std::string::npos)
             return Reply{{"HTTP/1.0 301 Moved\r\nLocation: https://\x1B[2J\xFF\r\n\r\n"}};
+        if (request.find("/closes") != std::string::npos)
+            return Reply{};
+        if (request.find("/comma") != std::string::npos)
+            return Reply{{"Last>202,45<Prior>1,023.11<"}};
         return Reply{{std::string(100, 'a') + "\x1B[2JLast\\\n</td><b>45 3/8</b>" + std::string(100, 'z')}};
     }};
 };
@@ -64,6 +68,9 @@ TEST_F(QuoteCommand, TriesALine) {
         {Source("/q?s=", "Last", 9), 1, "ABC\t-4.00\n", "  the page ended before the skip count was used up"},
         {Source("/q?s=", "Last", 0), 1, "ABC\t0.00\n", "  price text 'Last\\\\' read as 0.0000\n"},
         {Source("/q?s=", "Last", 1), 0, "ABC\t15.00\n", "  careful: the price text is no number"},
+        {Source("/closes", "Last", 1), 1, "ABC\t-4.00\n", "  the server closed the connection without"},
+        {Source("/comma", "Last", 1), 0, "ABC\t202.00\n", "  careful: the price text is read only up to its"},
+        {Source("/comma", "Prior", 1), 0, "ABC\t1.00\n", "  careful: the price text is read only up to its"},
         {"net 127.0.0.1:x /q?s= Last 2", 1, "ABC\t-4.00\n", "  failed: the host is none of NAME"},
         {"net h /q?s= Last", 2, "", "it has fewer than five fields"},
         {";net h /q?s= Last 2", 2, "", "is no source"},
@@ -74,6 +81,14 @@ TEST_F(QuoteCommand, TriesALine) {
         EXPECT_EQ(folder_.Output(), c.output) << c.source;
         EXPECT_TRUE(folder_.Complains(c.trace));
     }
+}
+
+// A source in the place of the first file's example: a page without a number marks the investment.
+TEST_F(QuoteCommand, TheFirstFileEndsWithAComment) {
+    folder_.Run("sed 's|^;example.*|" + Source("/q?s=", "Last", 0) +
+                "|' '" QUORVAN_RESOURCES "/Quorvan.cfg' >home/Quorvan.cfg");
+    EXPECT_EQ(Run("--home home ABC"), 1);
+    EXPECT_TRUE(folder_.Complains("  no price, 0.00\n") && folder_.Says("ABC\t-4.00\n"));
 }
 
 TEST_F(QuoteCommand, SaysWhatIsWrong) {
