@@ -1,7 +1,9 @@
 // What DataFileTool does with records: show, change and mark them.
 #include <algorithm>
 #include <cerrno>
+#include <cstring>
 
+#include "db/Statement.h"
 #include "tools/DataFileTool.h"
 #include "tools/RecordFields.h"
 
@@ -9,6 +11,12 @@ namespace {
 
 std::string Records(long count) {
     return std::to_string(count) + (count == 1 ? " record" : " records");
+}
+
+// Stores a value in a record's data. Returns a sentence about what is wrong with it, or nothing.
+std::string StoreIn(const COLUMN_ENTRY& column, const std::string& value, std::uint8_t* data) {
+    const std::string wrong = StoreField(column, value, data);
+    return wrong.empty() ? wrong : std::string(column.name) + ": '" + value + "' " + wrong;
 }
 
 } // namespace
@@ -72,31 +80,48 @@ int DataFileTool::Set(const std::string& statement, const SELECTION& selection) 
     if (!Open(Access::Change))
         return 1;
     STATEMENT parts{};
-    std::string packed = statement;
-    if (SplitStatement(statement.c_str(), &parts)) {
+    if (SplitStatement(statement.c_str(), &parts) && std::strcmp(parts.op, "=") == 0) {
         for (const COLUMN_ENTRY& column : AllColumns()) {
-            if (std::string_view(column.name) == parts.column) {
-                packed = WithPackedValue(statement.c_str(), column);
-                break;
-            }
+            if (std::string_view(column.name) == parts.column)
+                return SetValue(column, parts.value, selection);
         }
     }
     if (!Select(selection))
         return FailAsEngine();
-    const long changed = database_.QueryUpdate(packed.c_str());
+    const long changed = database_.QueryUpdate(statement.c_str());
     if (changed < 0)
         return FailAsEngine();
     Tell("changed", changed, Records(changed) + " changed");
     return 0;
 }
 
+// Sets a column to what Append would store. The engine's statement would store something else for a value
+// that the column cannot hold, and a day that exists for no date.
+int DataFileTool::SetValue(const COLUMN_ENTRY& column, const std::string& value, const SELECTION& selection) {
+    std::vector<std::uint8_t> wanted = EmptyData();
+    if (const std::string wrong = StoreIn(column, value, wanted.data()); !wrong.empty())
+        return Fail(wrong);
+    std::vector<std::uint8_t> data = EmptyData();
+    const auto set = [&](long number) {
+        if (database_.UnBufferedRead(number, data.data()) != 1)
+            return -1;
+        std::copy_n(wanted.begin() + column.offset, column.size, data.begin() + column.offset);
+        return database_.Write(number, data.data());
+    };
+    return Apply({"changed", set}, {}, &selection);
+}
+
+std::vector<std::uint8_t> DataFileTool::EmptyData() const {
+    DATABASE_HEADER header{};
+    database_.GetHeaderInfo(&header);
+    return std::vector<std::uint8_t>(static_cast<std::size_t>(header.recordLength));
+}
+
 int DataFileTool::Append(const std::vector<std::string>& values) {
     if (!Open(Access::Change))
         return 1;
-    DATABASE_HEADER header{};
-    database_.GetHeaderInfo(&header);
     const std::vector<COLUMN_ENTRY> columns = AllColumns();
-    std::vector<std::uint8_t> data(static_cast<std::size_t>(header.recordLength));
+    std::vector<std::uint8_t> data = EmptyData();
     std::vector<bool> given(columns.size(), false);
     for (const std::string& value : values) {
         if (const std::string wrong = StoreValue(columns, value, given, data.data()); !wrong.empty())
@@ -126,9 +151,7 @@ std::string DataFileTool::StoreValue(const std::vector<COLUMN_ENTRY>& columns, c
     if (given[best])
         return std::string("the column ") + columns[best].name + " is given twice";
     given[best] = true;
-    const std::string value = assignment.substr(length);
-    const std::string wrong = StoreField(columns[best], value, data);
-    return wrong.empty() ? wrong : std::string(columns[best].name) + ": '" + value + "' " + wrong;
+    return StoreIn(columns[best], assignment.substr(length), data);
 }
 
 int DataFileTool::Delete(const std::vector<long>& records, const SELECTION* selection) {
@@ -147,9 +170,11 @@ int DataFileTool::UnLock(const std::vector<long>& records, const SELECTION* sele
     return Mark({"unlocked", [this](long n) { return database_.UnLock(n); }}, records, selection);
 }
 
-int DataFileTool::Mark(const MARKING& marking, std::vector<long> records, const SELECTION* selection) {
-    if (!Open(Access::Change))
-        return 1;
+int DataFileTool::Mark(const MARKING& marking, const std::vector<long>& records, const SELECTION* selection) {
+    return Open(Access::Change) ? Apply(marking, records, selection) : 1;
+}
+
+int DataFileTool::Apply(const MARKING& marking, std::vector<long> records, const SELECTION* selection) {
     if (selection != nullptr) {
         if (!Select(*selection))
             return FailAsEngine();

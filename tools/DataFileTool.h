@@ -40,7 +40,7 @@ class DataFileTool {
     int Columns();
     // The records of the selection.
     int Query(const SELECTION& selection);
-    // Applies a set statement to the selection.
+    // Applies a set statement to the selection. With "=" a value is taken as Append takes it, or refused.
     int Set(const std::string& statement, const SELECTION& selection);
     // Adds a record. The values are NAME=VALUE; columns without one are zero or empty.
     int Append(const std::vector<std::string>& values);
@@ -73,9 +73,10 @@ class DataFileTool {
 
   private:
     enum class Access { Read, Change };
+    // What is done to one record after the other.
     struct MARKING {
-        const char* done; // "deleted"
-        std::function<int(long)> apply;
+        const char* done;               // "deleted"
+        std::function<int(long)> apply; // as an operation of the engine
     };
 
     [[nodiscard]] bool Open(Access access);
@@ -105,7 +106,12 @@ class DataFileTool {
     [[nodiscard]] std::string StoreValue(const std::vector<COLUMN_ENTRY>& columns,
                                          const std::string& assignment, std::vector<bool>& given,
                                          std::uint8_t* data) const;
-    int Mark(const MARKING& marking, std::vector<long> records, const SELECTION* selection);
+    [[nodiscard]] int SetValue(const COLUMN_ENTRY& column, const std::string& value,
+                               const SELECTION& selection);
+    [[nodiscard]] std::vector<std::uint8_t> EmptyData() const;
+    int Mark(const MARKING& marking, const std::vector<long>& records, const SELECTION* selection);
+    // To records by number and those of the selection, once the file is open.
+    int Apply(const MARKING& marking, std::vector<long> records, const SELECTION* selection);
     [[nodiscard]] int CheckText(const std::string& path, const TEXT_FORMAT& format,
                                 const std::string& separators);
     [[nodiscard]] bool RestoreLeftover();

@@ -229,15 +229,3 @@ std::string ParseColumn(std::string_view text, COLUMN_ENTRY* column) {
         wrong = ReadDecimals(parts[3], column);
     return wrong;
 }
-
-std::string WithPackedValue(const char* statement, const COLUMN_ENTRY& column) {
-    STATEMENT parts{};
-    std::optional<std::int32_t> packed;
-    if (SplitStatement(statement, &parts) && std::strcmp(parts.op, "=") == 0) {
-        if (column.type == ColumnType::Date)
-            packed = PackedDateIn(parts.value);
-        else if (column.type == ColumnType::Time)
-            packed = PackedTimeIn(parts.value);
-    }
-    return packed ? std::string(parts.column) + " = " + std::to_string(*packed) : statement;
-}

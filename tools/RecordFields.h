@@ -25,8 +25,3 @@ void FillCell(const COLUMN_ENTRY& column, const std::uint8_t* data, CELL* cell);
 // Reads a column's description: NAME:TYPE[:WIDTH[:DECIMALS]]. A string needs its width in bytes, its end
 // included; the other types have one of their own. Returns an empty text on success, else what is wrong.
 [[nodiscard]] std::string ParseColumn(std::string_view text, COLUMN_ENTRY* column);
-
-// Dates and times of set statements are packed numbers. Turns "COLUMN = VALUE" with such a column and a value
-// of the form YYYYMMDD or HHMMSS that exists into the statement that sets it; any other statement is returned
-// as it is.
-[[nodiscard]] std::string WithPackedValue(const char* statement, const COLUMN_ENTRY& column);
