@@ -227,6 +227,9 @@ class DATABASE {
     /// On: Export writes a first line of the columns' names, which its result does not count, and Load skips
     /// the first line, whatever it holds. Off by default.
     void SetHeadingLine(bool on) { headingLine_ = on; }
+    /// On: a UTF-8 byte order mark at the beginning of a text is no part of it for Load. Off by default: then
+    /// it belongs to the first field, as any bytes.
+    void SetByteOrderMark(bool on) { byteOrderMark_ = on; }
 
     // Set statements
 
@@ -367,6 +370,7 @@ class DATABASE {
     int byteOutputFormat_ = 2;
     int byteInputFormat_ = 1;
     bool headingLine_ = false;
+    bool byteOrderMark_ = false; // may be there
     ReadCache cache_;
     std::int64_t dataStart_ = 0;
     int lastError_ = DatabaseError::None;

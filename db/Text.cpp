@@ -150,6 +150,9 @@ long DATABASE::Load(const char* path, const char* separators) {
     if (!reader.Prepare(LongestLoadLine())) {
         return Fail(DatabaseError::LoadNoMemoryForLine);
     }
+    if (byteOrderMark_ && reader.PassByteOrderMark() != 0) {
+        return Fail(DatabaseError::LoadReadFailed);
+    }
     const std::int32_t batchRecords = std::max(batchBytes / header_.recordLength, 1);
     const auto batch = TryAllocate<std::uint8_t>(static_cast<std::size_t>(batchRecords) * DataSize());
     if (!batch) {

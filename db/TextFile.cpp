@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <string_view>
 
 #include "db/Allocate.h"
 
@@ -45,9 +46,21 @@ int LineReader::Next(std::span<char>* line) {
 }
 
 void LineReader::Rewind() {
-    offset_ = 0;
+    offset_ = start_;
     next_ = 0;
     end_ = 0;
+}
+
+int LineReader::PassByteOrderMark() {
+    constexpr std::string_view mark = "\xEF\xBB\xBF";
+    char beginning[mark.size()];
+    std::size_t length = 0;
+    const int error = file_.ReadUpTo(0, beginning, sizeof(beginning), &length);
+    if (error == 0 && std::string_view(beginning, length) == mark) {
+        start_ = mark.size();
+    }
+    Rewind();
+    return error;
 }
 
 bool TextWriter::Prepare(std::size_t longest) {

@@ -20,12 +20,16 @@ class LineReader {
     [[nodiscard]] int Next(std::span<char>* line);
     /// Begins again with the first line.
     void Rewind();
+    /// Makes the text begin behind a UTF-8 byte order mark, where there is one, and begins again. Returns 0
+    /// or an errno number.
+    [[nodiscard]] int PassByteOrderMark();
 
   private:
     const File& file_;
     std::unique_ptr<char[]> block_;
     std::unique_ptr<char[]> line_;
     std::size_t longest_ = 0;
+    std::int64_t start_ = 0;  // of the text, in the file
     std::int64_t offset_ = 0; // in the file, behind the block
     std::size_t next_ = 0;    // in the block
     std::size_t end_ = 0;     // of the block

@@ -35,7 +35,7 @@ int DataFileTool::Export(const std::string& path, const TEXT_FORMAT& format, con
     return 0;
 }
 
-// Tells of the first line that is wrong, or why the text cannot be read. Returns an exit status.
+// Tells of the lines that are wrong, or why the text cannot be read. Returns an exit status.
 int DataFileTool::CheckText(const std::string& path, const TEXT_FORMAT& format,
                             const std::string& separators) {
     File text(SystemFiles());
@@ -46,7 +46,9 @@ int DataFileTool::CheckText(const std::string& path, const TEXT_FORMAT& format,
     TextCheck check(columns, format, separators);
     if (const int code = check.Run(text, database_.LongestLoadLine()); code != 0)
         return FailWithCode(code, path + ": ");
-    return check.Wrong().empty() ? 0 : Fail(path + ", " + check.Wrong());
+    for (const std::string& wrong : check.Wrong())
+        Warn(path + ", " + wrong);
+    return check.Wrong().empty() ? 0 : 1;
 }
 
 int DataFileTool::Load(const std::string& path, const TEXT_FORMAT& format) {
@@ -55,6 +57,7 @@ int DataFileTool::Load(const std::string& path, const TEXT_FORMAT& format) {
         return 1;
     database_.SetByteInputFormat(ByteFormat(format));
     database_.SetHeadingLine(format.heading);
+    database_.SetByteOrderMark(true);
     errno = 0;
     const long loaded = database_.Load(path.c_str(), separators.c_str());
     if (loaded < 0)

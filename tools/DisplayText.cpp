@@ -92,6 +92,16 @@ bool IsPlain(char c) {
 
 } // namespace
 
+bool IsUtf8(std::string_view text) {
+    while (!text.empty()) {
+        const std::size_t length = DecodeFirst(text).length;
+        if (length == 0)
+            return false;
+        text.remove_prefix(length);
+    }
+    return true;
+}
+
 void AppendEscaped(std::string& out, std::string_view text) {
     while (!text.empty()) {
         const auto plain =

@@ -6,6 +6,9 @@
 
 // Text of any bytes as it is shown in one line of a terminal or of a tab-separated file.
 
+// Whether all of `text` is valid UTF-8.
+[[nodiscard]] bool IsUtf8(std::string_view text);
+
 // Appends `text` to `out`: a backslash as "\\", tab, newline and carriage return as "\t", "\n" and "\r", and
 // every other byte that is no printable character of valid UTF-8 as "\x" and two hexadecimal digits. So what
 // is appended is valid UTF-8 on one line, works no terminal, and can be turned back into the bytes.

@@ -5,11 +5,12 @@
 #include <cstring>
 
 #include "db/Errors.h"
-#include "db/TextFile.h"
 #include "tools/DisplayText.h"
 #include "tools/RecordFields.h"
 
 namespace {
+
+constexpr std::size_t MostTold = 20; // wrong lines
 
 std::size_t DataSize(std::span<const COLUMN_ENTRY> columns) {
     int size = 0;
@@ -43,20 +44,40 @@ int TextCheck::Run(const File& text, std::size_t longest) {
     LineReader reader(text);
     if (!reader.Prepare(longest + 1))
         return DatabaseError::LoadNoMemoryForLine;
-    for (long number = 1;; ++number) {
+    errno = reader.PassByteOrderMark();
+    errno = errno != 0 ? errno : ReadLines(reader, longest);
+    if (errno != 0)
+        return DatabaseError::LoadReadFailed;
+    if (wrongLines_ > MostTold)
+        wrong_.push_back(wrongLines_ == MostTold + 1
+                             ? "and 1 more line is wrong"
+                             : "and " + std::to_string(wrongLines_ - MostTold) + " more lines are wrong");
+    return 0;
+}
+
+// Returns 0 or an errno number.
+int TextCheck::ReadLines(LineReader& reader, std::size_t longest) {
+    bool behindPiece = false; // the line began in the piece before
+    for (long number = 1;;) {
         std::span<char> line;
-        errno = reader.Next(&line);
-        if (errno != 0)
-            return DatabaseError::LoadReadFailed;
+        if (const int error = reader.Next(&line); error != 0)
+            return error;
         const bool heading = heading_ && number == 1;
-        if (line.empty() && !heading)
+        if (line.empty() && (behindPiece || !heading))
             return 0;
-        wrong_ = WhatIsWrong(line, longest, heading);
-        if (!wrong_.empty()) {
-            wrong_.insert(0, "line " + std::to_string(number) + ": ");
-            return 0;
-        }
+        const bool ends = line.empty() || line.back() == '\n'; // before it is split
+        if (!behindPiece)
+            Tell(number, WhatIsWrong(line, longest, heading));
+        behindPiece = !ends;
+        number += ends ? 1 : 0;
     }
+}
+
+void TextCheck::Tell(long line, const std::string& wrong) {
+    if (wrong.empty())
+        return;
+    if (++wrongLines_ <= MostTold)
+        wrong_.push_back("line " + std::to_string(line) + ": " + wrong);
 }
 
 std::string TextCheck::WhatIsWrong(std::span<char> line, std::size_t longest, bool heading) {
@@ -102,5 +123,7 @@ std::string TextCheck::Store(const COLUMN_ENTRY& column, std::string_view text) 
         return {}; // also in a column that has no room for it
     if (column.type == ColumnType::Byte && characters_)
         return text.size() == 1 ? std::string() : "is more than one character";
+    if (column.type == ColumnType::String && !IsUtf8(text))
+        return "is no UTF-8";
     return StoreField(column, text, data_.data());
 }

@@ -8,6 +8,7 @@
 
 #include "db/File.h"
 #include "db/RecordText.h"
+#include "db/TextFile.h"
 
 // How records are written as lines of text, and read.
 struct TEXT_FORMAT {
@@ -17,9 +18,9 @@ struct TEXT_FORMAT {
 };
 
 // Looks through a text before it is loaded, because loading takes what it finds: text that is no number for
-// 0, and lines with fields too many or too few. The lines are split as loading does. Each must have a field
-// for every column, one that StoreField takes; a blank is also an empty text, as exporting writes it. Lines
-// without a character are passed over.
+// 0, bytes that are no UTF-8 for a text, and lines with fields too many or too few. The lines are split as
+// loading does. Each must have a field for every column, one that StoreField takes; a blank is also an empty
+// text, as exporting writes it. Blank lines, and a UTF-8 byte order mark at the beginning, are passed over.
 //
 // It changes no file. Its owner uses it for one text, and keeps the columns meanwhile.
 class TextCheck {
@@ -28,13 +29,16 @@ class TextCheck {
     TextCheck(std::span<const COLUMN_ENTRY> columns, const TEXT_FORMAT& format,
               const std::string& separators);
 
-    // Reads the text up to the first line that is wrong. A line may have `longest` characters, its newline
-    // included. Returns 0 or, with errno set, the engine's code of what hindered it.
+    // Reads the whole text. A line may have `longest` characters, its newline included. Returns 0 or, with
+    // errno set, the engine's code of what hindered it.
     [[nodiscard]] int Run(const File& text, std::size_t longest);
-    // Where the text is wrong and why: "line 3: Price: '5,5' is no number". Empty when nothing is.
-    [[nodiscard]] const std::string& Wrong() const { return wrong_; }
+    // Where the text is wrong and why, line by line: "line 3: Price: '5,5' is no number". Behind the first
+    // 20 lines stands how many more are wrong. Empty when nothing is.
+    [[nodiscard]] const std::vector<std::string>& Wrong() const { return wrong_; }
 
   private:
+    [[nodiscard]] int ReadLines(LineReader& reader, std::size_t longest);
+    void Tell(long line, const std::string& wrong);
     void SplitFields(std::span<char> line);
     [[nodiscard]] std::string WhatIsWrong(std::span<char> line, std::size_t longest, bool heading);
     [[nodiscard]] std::string WrongName() const;
@@ -47,5 +51,6 @@ class TextCheck {
     FieldSplitter splitter_;
     std::vector<std::string_view> fields_; // of the line
     std::vector<std::uint8_t> data_;       // a record's, which nobody reads
-    std::string wrong_;
+    std::vector<std::string> wrong_;
+    std::size_t wrongLines_ = 0;
 };

@@ -301,7 +301,7 @@ TEST_F(DbCommandTest, WhatIsExportedLoadsBackTheSame) {
         {"db a.db append A=-128 'Name=a,b;c' F=-3.4028235e38 S=-32768 L=-2147483648 D=99991231 T=235959", 0,
          "record 0 appended\n"},
         {"db a.db append A=48 'Name= ' F=0.1 S=32767 L=2147483647", 0, "record 1 appended\n"},
-        {"db a.db append Name=\xFF\\\\ A=0", 0, "record 2 appended\n"}});
+        {"db a.db append Name=\xC3\xBF\\\\ A=0", 0, "record 2 appended\n"}});
     ASSERT_EQ(Run("db a.db query --format tsv"), 0);
     const std::string content = shell_.Output();
     const std::string whole = shell_.Read("a.db");
@@ -332,6 +332,8 @@ TEST_F(DbCommandTest, TextWithAWrongLineIsNotLoaded) {
         {"a\t5\t20240229\t091530\t65\n", "--characters", ", line 1: Tag: '65' is more than one character"},
         {"sixteen letters!\t5\t20240229\t091530\t0\n", "",
          "' is too long: 16 bytes, and the column holds 15"},
+        {"bad\xFF\t5\t20240229\t091530\t0\n", "", ", line 1: Name: 'bad\\xFF' is no UTF-8"},
+        {std::string(500, 'x') + "\na\n", "", ", line 2: 1 field, the data file has 5"},
         {std::string("a\0b", 3) + "\t5\t20240229\t091530\t0\n", "", ", line 1: Name: 'a\\x00b' has a byte 0"},
         {good + "a\t\t20240229\t091530\t0\n", "",
          ", line 2: 4 fields, the data file has 5 columns (an empty field needs a"},
@@ -354,7 +356,10 @@ TEST_F(DbCommandTest, TextWithAWrongLineIsNotLoaded) {
             << shell_.Errors();
         shell_.Write("a.db", before);
     }
-    shell_.Write("a.txt", good);
+    ASSERT_EQ(shell_.Run("yes a | head -n 22 >a.txt"), 0);
+    Go({{"db a.db load a.txt", 1, "", {", line 20: 1 field", "and 2 more lines are wrong\n"}}});
+    EXPECT_EQ(std::count(shell_.Errors().begin(), shell_.Errors().end(), '\n'), 21);
+    shell_.Write("a.txt", "\xEF\xBB\xBF\r\n" + good + "\r\n");
     Go({{"db a.db load a.txt", 0, "1 record loaded from a.txt\n"},
         {"db a.db query 'Name = Birch' --format tsv", 0,
          "record\tName\tPrice\tDay\tAt\tTag\n3\tBirch\t10\t20240229\t091530\t-7\n"}});
