@@ -23,3 +23,11 @@ echo "Building release"
 quietly "the build of release could not be prepared" cmake --preset release
 quietly "the build of release failed" cmake --build --preset release
 echo "All tests passed."
+
+# Non-blank lines of the files that match.
+lines_of() {
+    git ls-files -z -- "$@" | xargs -0 cat | grep -c '[^[:space:]]'
+}
+tests=$(lines_of 'tests/*.cpp' 'tests/*.h')
+program=$(lines_of '*.cpp' '*.h' ':!tests' ':!bench' ':!fuzz' ':!tour')
+echo "Lines: program $program, tests $tests, which is $((100 * tests / program)) % of it."
