@@ -84,7 +84,10 @@ CutFile::Outcome CutFile::Restore(DATABASE& investments) const {
     std::vector<INVESTMENT_DATA> lost;
     for (const CUT_DATA& each : kept) {
         INVESTMENT_DATA present;
-        if (!ReadInvestment(investments, each.record, &present) || !AreSame(present, each.investment))
+        const bool read = ReadInvestment(investments, each.record, &present);
+        if (!read && investments.GetLastError(nullptr) == DatabaseError::ReadFailed)
+            return Outcome::Failed; // it may be there
+        if (!read || !AreSame(present, each.investment))
             lost.push_back(each.investment);
     }
     if (investments.AppendAll(lost.data(), sizeof(INVESTMENT_DATA), static_cast<std::int32_t>(lost.size())) <

@@ -8,8 +8,8 @@ void TellNotSaved() {
     MessageBox("The change could not be saved! Is the disk full, or the file protected?", B_STOP_ALERT);
 }
 
-void TellNotRead() {
-    MessageBox("An investment could not be read from its file!", B_STOP_ALERT);
+void TellNotRead(const char* what) {
+    MessageBox((std::string(what) + " could not be read from its file!").c_str(), B_STOP_ALERT);
 }
 
 void TellNotConnected() {

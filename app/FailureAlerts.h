@@ -5,8 +5,8 @@
 
 // A change could not be written to its file.
 void TellNotSaved();
-// A record could not be read.
-void TellNotRead();
+// A record could not be read: an investment, unless `what` says otherwise.
+void TellNotRead(const char* what = "An investment");
 // The network cannot be reached.
 void TellNotConnected();
 // A quote server's certificate was refused.

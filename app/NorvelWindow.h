@@ -1,6 +1,7 @@
 #pragma once
 
 #include <memory>
+#include <optional>
 
 #include "app/RecordLayouts.h"
 #include "platform/Window.h"
@@ -37,12 +38,13 @@ class NorvelWindow : public BWindow {
     void Quit() override;
 
     // The sum of the Value of the current portfolio's investments, which are left as the investment
-    // database's result set.
-    [[nodiscard]] float PortfolioTotalValue();
+    // database's result set; nothing, after telling the person so, when they could not all be read.
+    [[nodiscard]] std::optional<float> PortfolioTotalValue();
     // False, after telling the person so, when there is no portfolio, or no row in the list.
     [[nodiscard]] bool IsPortfolioPresent();
     [[nodiscard]] bool IsInvestmentPresent();
-    // Also false, after telling the person so, when all investments together are worth nothing.
+    // Also false, after telling the person so, when all investments together are worth nothing or could not
+    // be read.
     [[nodiscard]] bool IsValuePresent();
 
   private:
@@ -108,7 +110,7 @@ class NorvelWindow : public BWindow {
     // --- investments ---
     void LoadInvestmentList();
     void ClearInvestmentList();
-    // Shows total when it is 0 or more, else the current portfolio's.
+    // Shows total when it is 0 or more, else the current portfolio's, or that this is not known.
     void DisplayTotalValue(float total);
     // Whether what was cut and never pasted may go: the person is asked, since nothing else has it.
     [[nodiscard]] static bool MayForgetClipboard();

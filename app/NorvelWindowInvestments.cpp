@@ -19,6 +19,8 @@
 
 namespace {
 
+constexpr const char* UnknownTotal = "Total Value: not known"; // some of the investments could not be read
+
 // The selected rows from the top.
 std::vector<NorvelItem*> SelectedItems(const ColumnListView* list) {
     std::vector<NorvelItem*> selected;
@@ -45,15 +47,20 @@ void NorvelWindow::LoadInvestmentList() {
     ClearInvestmentList();
     float total = 0;
     BList rows;
-    ForEachInvestment(*app_state->investments, currentPortfolio_,
-                      [&](const INVESTMENT_DATA& record, long number) {
-                          total += record.Value;
-                          rows.AddItem(CreateNewInvestmentItem(record, static_cast<int32>(number)));
-                      });
+    const bool read = ForEachInvestment(
+        *app_state->investments, currentPortfolio_, [&](const INVESTMENT_DATA& record, long number) {
+            total += record.Value;
+            rows.AddItem(CreateNewInvestmentItem(record, static_cast<int32>(number)));
+        });
     investmentList_->AddList(&rows);
     if (investmentList_->PrimarySortKey() >= 0)
         investmentList_->SortItems(); // as the underlined header says
-    DisplayTotalValue(total);
+    if (read) {
+        DisplayTotalValue(total);
+        return;
+    }
+    totalValueView_->SetText(UnknownTotal);
+    TellNotRead();
 }
 
 void NorvelWindow::ClearInvestmentList() {
@@ -67,13 +74,18 @@ void NorvelWindow::ClearInvestmentList() {
 }
 
 void NorvelWindow::DisplayTotalValue(float total) {
-    char number[FormatNumberSize];
-    FormatNumber(total >= 0 ? total : PortfolioTotalValue(), number, 2);
-    totalValueView_->SetText((std::string("Total Value: $") + number).c_str());
+    const std::optional<float> known = total >= 0 ? total : PortfolioTotalValue();
+    char number[FormatNumberSize] = "";
+    if (known)
+        FormatNumber(*known, number, 2);
+    totalValueView_->SetText(known ? (std::string("Total Value: $") + number).c_str() : UnknownTotal);
 }
 
-float NorvelWindow::PortfolioTotalValue() {
-    return TotalValue(*app_state->investments, currentPortfolio_);
+std::optional<float> NorvelWindow::PortfolioTotalValue() {
+    const std::optional<float> total = TotalValue(*app_state->investments, currentPortfolio_);
+    if (!total)
+        TellNotRead();
+    return total;
 }
 
 bool NorvelWindow::IsInvestmentPresent() {
@@ -86,8 +98,9 @@ bool NorvelWindow::IsInvestmentPresent() {
 bool NorvelWindow::IsValuePresent() {
     if (!IsInvestmentPresent())
         return false;
-    if (PortfolioTotalValue() > 0)
-        return true;
+    const std::optional<float> total = PortfolioTotalValue();
+    if (!total || *total > 0)
+        return total.has_value();
     MessageBox("Unable to chart. Total value of portfolio equals zero!", B_INFO_ALERT);
     return false;
 }

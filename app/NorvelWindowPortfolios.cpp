@@ -20,16 +20,16 @@
 
 void NorvelWindow::LoadPortfolioList() {
     DATABASE& portfolios = *app_state->portfolios;
-    if (portfolios.Query(nullptr, QueryMode::New) > 0) {
-        for (const void* data = portfolios.QueryGetFirst(nullptr); data;
-             data = portfolios.QueryGetNext(nullptr)) {
-            PORTFOLIO_DATA record;
-            std::memcpy(&record, data, sizeof record);
-            // Without a message for each to be selected: the list would be loaded once for every portfolio,
-            // to end with the last one's investments, which the constructor loads in any case.
-            AppendMarkedItem(std::string(FieldText(record.Name)).c_str());
-        }
-    }
+    const long all = portfolios.Query(nullptr, QueryMode::New);
+    const bool read = ForEachSelected(portfolios, all, [this](const void* data, long) {
+        PORTFOLIO_DATA record;
+        std::memcpy(&record, data, sizeof record);
+        // Without a message for each to be selected: the list would be loaded once for every portfolio,
+        // to end with the last one's investments, which the constructor loads in any case.
+        AppendMarkedItem(std::string(FieldText(record.Name)).c_str());
+    });
+    if (!read)
+        TellNotRead("A portfolio");
     if (const BMenuItem* marked = MarkedPortfolio())
         CopyTextZeroed(currentPortfolio_, marked->Label());
 }

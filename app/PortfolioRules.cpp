@@ -35,32 +35,32 @@ bool MakeStatement(char (&statement)[StatementSize], const char* column, const c
 
 long Select(DATABASE& database, const char* column, const char* name) {
     char statement[StatementSize];
-    return MakeStatement(statement, column, name) ? database.Query(statement, QueryMode::New) : 0;
+    return database.IsOpen() && MakeStatement(statement, column, name)
+               ? database.Query(statement, QueryMode::New)
+               : 0;
 }
 
-// Deletes the records of the result set. The walk comes first: reading between two deletions would read the
-// file anew each time.
-bool DeleteSelected(DATABASE& database) {
-    std::vector<long> numbers;
-    long number = 0;
-    for (const void* data = database.QueryGetFirst(&number); data; data = database.QueryGetNext(&number))
-        numbers.push_back(number);
+// The numbers of the result set's `selected` records; false when they could not all be read.
+bool CollectNumbers(DATABASE& database, long selected, std::vector<long>* numbers) {
+    return ForEachSelected(database, selected, [&](const void*, long number) { numbers->push_back(number); });
+}
+
+bool DeleteAll(DATABASE& database, const std::vector<long>& numbers) {
     bool all = true;
     for (const long each : numbers)
         all = database.Delete(each) == 0 && all;
     return all;
 }
 
-// Calls visit(record) for each record that can be read, in the order of the file.
-template <class Record, class Visit>
-void ForEachRecord(DATABASE& database, Visit visit) {
-    DATABASE_HEADER header;
-    database.GetHeaderInfo(&header);
-    for (std::int32_t i = 0; i < header.recordCount; ++i) {
-        Record record{};
-        if (database.Read(i, &record) == 1)
-            visit(record);
-    }
+// Appends the text that every record begins with, in the order of the file.
+bool CollectNames(DATABASE& database, std::vector<std::string>* names) {
+    return ForEachSelected(database, database.Query(nullptr, QueryMode::New), [&](const void* data, long) {
+        char name[NameSize];
+        std::memcpy(name, data, sizeof name);
+        // Most often the next investment is of the same portfolio.
+        if (names->empty() || names->back() != FieldText(name))
+            names->emplace_back(FieldText(name));
+    });
 }
 
 // A name as queries compare it.
@@ -102,33 +102,34 @@ bool ReadInvestment(DATABASE& investments, long recordNumber, INVESTMENT_DATA* r
     return investments.Read(recordNumber, record) == 1;
 }
 
-float TotalValue(DATABASE& investments, const char* portfolio) {
+std::optional<float> TotalValue(DATABASE& investments, const char* portfolio) {
     float total = 0;
-    ForEachInvestment(investments, portfolio,
-                      [&](const INVESTMENT_DATA& record, long) { total += record.Value; });
-    return total;
+    const bool read = ForEachInvestment(investments, portfolio,
+                                        [&](const INVESTMENT_DATA& record, long) { total += record.Value; });
+    return read ? std::optional(total) : std::nullopt;
 }
 
 bool AddPortfolio(DATABASE& portfolios, const char* name) {
+    if (!CanBePortfolioName(name) || SelectPortfolios(portfolios, name) != 0)
+        return false;
     PORTFOLIO_DATA record;
     CopyTextZeroed(record.Name, name);
     return portfolios.Append(&record) >= 0;
 }
 
 std::vector<std::string> RestorePortfolios(DATABASE& portfolios, DATABASE& investments) {
+    std::vector<std::string> names;
+    std::vector<std::string> holders;
+    if (!CollectNames(portfolios, &names) || !CollectNames(investments, &holders))
+        return {};
     std::unordered_set<std::string> listed;
-    ForEachRecord<PORTFOLIO_DATA>(
-        portfolios, [&](const PORTFOLIO_DATA& record) { listed.insert(Lowered(FieldText(record.Name))); });
+    for (const std::string& name : names)
+        listed.insert(Lowered(name));
     std::vector<std::string> restored;
-    std::string last; // most often the next investment is of the same portfolio
-    ForEachRecord<INVESTMENT_DATA>(investments, [&](const INVESTMENT_DATA& record) {
-        if (FieldText(record.Portfolio) == last)
-            return;
-        last = FieldText(record.Portfolio);
-        if (CanBePortfolioName(last.c_str()) && listed.insert(Lowered(last)).second &&
-            AddPortfolio(portfolios, last.c_str()))
-            restored.push_back(last);
-    });
+    for (const std::string& holder : holders) {
+        if (listed.insert(Lowered(holder)).second && AddPortfolio(portfolios, holder.c_str()))
+            restored.push_back(holder);
+    }
     return restored;
 }
 
@@ -138,22 +139,30 @@ bool CanBePortfolioName(const char* name) {
 }
 
 bool RenamePortfolio(DATABASE& portfolios, DATABASE& investments, const char* oldName, const char* newName) {
-    // Before anything changes: a name that the investments could not take must not leave them behind.
+    // Before anything changes: investments that cannot be found, or could not take the name, must not be left
+    // behind.
     char statement[StatementSize];
     if (!CanBePortfolioName(newName) || !MakeStatement(statement, "Portfolio", newName) ||
-        SelectPortfolios(portfolios, oldName) <= 0 || !portfolios.QueryGetFirst(nullptr))
+        SelectPortfolios(portfolios, newName) != 0 || !investments.IsOpen())
+        return false;
+    const long held = SelectInvestments(investments, oldName);
+    if (held < 0 || SelectPortfolios(portfolios, oldName) <= 0 || !portfolios.QueryGetFirst(nullptr))
         return false;
     PORTFOLIO_DATA record;
     CopyTextZeroed(record.Name, newName);
-    return portfolios.Update(&record) == 0 &&
-           (SelectInvestments(investments, oldName) <= 0 || investments.QueryUpdate(statement) >= 0);
+    return portfolios.Update(&record) == 0 && (held == 0 || investments.QueryUpdate(statement) >= 0);
 }
 
 bool DeletePortfolio(DATABASE& portfolios, DATABASE& investments, const char* name) {
-    bool all = SelectPortfolios(portfolios, name) <= 0 || DeleteSelected(portfolios);
-    if (SelectInvestments(investments, name) > 0)
-        all = DeleteSelected(investments) && all;
-    return all;
+    // All reading comes first: what cannot be found must not be left behind, and reading between two
+    // deletions would read the file anew each time.
+    std::vector<long> records;
+    std::vector<long> held;
+    if (!investments.IsOpen() || !CollectNumbers(portfolios, SelectPortfolios(portfolios, name), &records) ||
+        !CollectNumbers(investments, SelectInvestments(investments, name), &held))
+        return false;
+    const bool all = DeleteAll(portfolios, records);
+    return DeleteAll(investments, held) && all;
 }
 
 bool AppendCopies(DATABASE& investments, std::span<const INVESTMENT_DATA> records, const char* portfolio) {

@@ -45,10 +45,10 @@ bool Measure(const OPTIONS& options, long records) {
     if (!Fill(file, path, records))
         return false;
     float total = 0;
-    const double walk = Shortest(options.rounds, [&] { total = TotalValue(file, "All"); });
+    const double walk = Shortest(options.rounds, [&] { total = TotalValue(file, "All").value_or(-1); });
     ChartDataSets sets;
     const double data = Shortest(options.rounds, [&] {
-        if (ReadChartData(file, "All", sets, total) != 0)
+        if (ReadChartData(file, "All", sets, total) != ChartData::Read)
             std::abort();
     });
     PieChartView view(ChartArea());

@@ -110,9 +110,11 @@ double SumOfWalkedValues() {
 
 double SumOfValues() {
     double sum = 0;
-    ForEachInvestment(*app_state->investments, "Full",
-                      [&](const INVESTMENT_DATA& record, long) { sum += static_cast<double>(record.Value); });
-    return sum;
+    const bool read =
+        ForEachInvestment(*app_state->investments, "Full", [&](const INVESTMENT_DATA& record, long) {
+            sum += static_cast<double>(record.Value);
+        });
+    return read ? sum : -1;
 }
 
 void Print(const char* what, const char* peer, double ours, double theirs, long records,

@@ -4,6 +4,7 @@
 #include <cmath>
 
 #include "app/AppState.h"
+#include "app/FailureAlerts.h"
 #include "app/PortfolioRules.h"
 #include "charts/PieChartView.h"
 #include "charts/ValueChartView.h"
@@ -25,16 +26,16 @@ BRect FrameAt(float left, float top) {
 
 } // namespace
 
-int ReadChartData(DATABASE& investments, const char* portfolio, ChartDataSets& dataSets, float& total) {
+ChartData ReadChartData(DATABASE& investments, const char* portfolio, ChartDataSets& dataSets, float& total) {
     total = 0;
     if (dataSets.GenerateDataSets(SelectInvestments(investments, portfolio)) != 0)
-        return 1;
+        return ChartData::NoMemory;
     int index = 0;
-    ForEachInvestment(investments, portfolio, [&](const INVESTMENT_DATA& record, long) {
+    const bool read = ForEachInvestment(investments, portfolio, [&](const INVESTMENT_DATA& record, long) {
         dataSets.AccumulateDataSet(index++, record);
         total += record.Value;
     });
-    return 0;
+    return read ? ChartData::Read : ChartData::NotRead;
 }
 
 BRect ChartArea() {
@@ -76,10 +77,12 @@ ChartWindow::ChartWindow(float left, float top, const char* portfolio)
 }
 
 int ChartWindow::GenerateDataSets(const char* portfolio) {
-    if (ReadChartData(*app_state->investments, portfolio, dataSets_, currentValue_) == 0)
-        return 0;
-    MessageBox("GenerateDataSets() malloc error!", B_STOP_ALERT);
-    return 1;
+    const ChartData data = ReadChartData(*app_state->investments, portfolio, dataSets_, currentValue_);
+    if (data == ChartData::NoMemory)
+        MessageBox("GenerateDataSets() malloc error!", B_STOP_ALERT);
+    else if (data == ChartData::NotRead)
+        TellNotRead();
+    return data == ChartData::NoMemory ? 1 : 0;
 }
 
 void ChartWindow::CreateGraphTypeMenu() {

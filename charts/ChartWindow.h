@@ -20,7 +20,7 @@ class ChartWindow : public BWindow {
     void MessageReceived(BMessage* message) override;
 
   private:
-    // Returns 0, or 1 after telling the person that there is no memory.
+    // Returns 0, or 1 after telling the person that there is no memory. What could not be read is told too.
     int GenerateDataSets(const char* portfolio);
     void CreateGraphTypeMenu();
     void ShowChart(uint32 code);
@@ -34,10 +34,12 @@ class ChartWindow : public BWindow {
     BView* topView_ = nullptr;
 };
 
-// Reads the portfolio's investments into the data sets; the sum of their values goes to `total`. Returns 0,
-// or 1 without memory. Investments that cannot be read are none.
-[[nodiscard]] int ReadChartData(DATABASE& investments, const char* portfolio, ChartDataSets& dataSets,
-                                float& total);
+enum class ChartData { Read, NotRead, NoMemory };
+
+// Reads the portfolio's investments into the data sets; the sum of their values goes to `total`. With NotRead
+// some are missing in both.
+[[nodiscard]] ChartData ReadChartData(DATABASE& investments, const char* portfolio, ChartDataSets& dataSets,
+                                      float& total);
 
 // The part of the window that a chart fills, from (0, 0) on.
 [[nodiscard]] BRect ChartArea();

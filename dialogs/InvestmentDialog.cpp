@@ -3,6 +3,7 @@
 #include <string>
 
 #include "app/AppState.h"
+#include "app/FailureAlerts.h"
 #include "app/PortfolioRules.h"
 #include "dialogs/InvestmentInput.h"
 #include "platform/Alert.h"
@@ -143,11 +144,13 @@ void InvestmentDialog::FillRiskMenu(BPopUpMenu* menu) {
 
 void InvestmentDialog::FillFromCategory(BPopUpMenu* menu, const char* category, uint32 code,
                                         const char* field) {
-    ForEachCategoryEntry(*app_state->categories, category, [&](const char* entry) {
+    const bool read = ForEachCategoryEntry(*app_state->categories, category, [&](const char* entry) {
         auto* message = new BMessage(code);
         message->AddString(field, entry);
         menu->AddItem(new BMenuItem(entry, message));
     });
+    if (!read)
+        TellNotRead((std::string("The list for ") + category).c_str());
     if (BMenuItem* first = menu->ItemAt(0))
         first->SetMarked(true);
 }

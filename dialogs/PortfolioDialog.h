@@ -10,7 +10,8 @@ class DATABASE;
 enum class PortfolioNameCheck { Accepted, Invalid, Taken };
 
 // Whether a portfolio may have this name: one that a record and a query can hold (CanBePortfolioName), and
-// none that a portfolio has in any letter case. Replaces the database's result set.
+// none that a portfolio has in any letter case. When the file cannot be read the name is accepted:
+// AddPortfolio and RenamePortfolio find out for themselves. Replaces the database's result set.
 [[nodiscard]] PortfolioNameCheck CheckPortfolioName(DATABASE& portfolios, const char* name);
 
 // Asks for a portfolio's name: one field, which cannot grow beyond what a record holds. It writes nothing to

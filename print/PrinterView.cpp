@@ -78,7 +78,7 @@ PrinterView::Rows PrinterView::DrawInvestments(BRect page) {
     table.DrawHeader();
     const float footerTop = page.bottom - BarHeight;
     Rows rows;
-    ForEachInvestment(*database_, portfolio_, [&](const INVESTMENT_DATA& record, long) {
+    hasAll_ = ForEachInvestment(*database_, portfolio_, [&](const INVESTMENT_DATA& record, long) {
         ++rows.all;
         rows.shown += table.RowEnd() <= footerTop;
         if (table.RowPosition() > footerTop) // unseen, and a hundred thousand would only make the file large

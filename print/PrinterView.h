@@ -15,6 +15,8 @@ class PrinterView : public BView {
 
     // Draws the report into page. The investment file's result set is left on the portfolio.
     void Draw(BRect page) override;
+    // Whether what was drawn has all of the portfolio's investments; false when some could not be read.
+    [[nodiscard]] bool HasAll() const { return hasAll_; }
 
   private:
     struct Rows {
@@ -31,4 +33,5 @@ class PrinterView : public BView {
     DATABASE* database_;
     const char* portfolio_;
     float totalValue_;
+    bool hasAll_ = false;
 };

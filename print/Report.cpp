@@ -1,7 +1,9 @@
 #include "print/Report.h"
 
 #include <filesystem>
+#include <optional>
 #include <string>
+#include <utility>
 
 #include "app/PortfolioRules.h"
 #include "platform/PrintJob.h"
@@ -65,14 +67,16 @@ bool ConfigureJob(BPrintJob& job, std::unique_ptr<BMessage>& settings) {
 ReportResult PrintReport(BPrintJob& job, BWindow* window, const char* portfolio, DATABASE& investments) {
     if (!job.BeginJob())
         return ReportResult::NotPrinted;
-    investments.GetLastError(nullptr); // only what happens from here on counts
-    const float total = TotalValue(investments, portfolio);
-    {
-        const HiddenPage page(
-            window, std::make_unique<PrinterView>(job.PrintableRect(), portfolio, total, &investments));
+    const std::optional<float> total = TotalValue(investments, portfolio);
+    bool read = total.has_value();
+    if (read) {
+        auto view = std::make_unique<PrinterView>(job.PrintableRect(), portfolio, *total, &investments);
+        const PrinterView& drawn = *view;
+        const HiddenPage page(window, std::move(view));
         job.DrawView(page.View(), page.View()->Bounds(), {0, 0});
+        read = drawn.HasAll();
     }
-    if (investments.GetLastError(nullptr) != 0) {
+    if (!read) {
         job.CancelJob();
         return ReportResult::NotRead;
     }

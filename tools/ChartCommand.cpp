@@ -96,7 +96,10 @@ int DrawChart(const ChartOptions& options, const ChartInfo& chart, PictureFormat
     const OffscreenApplication application;
     ChartDataSets dataSets;
     float total = 0;
-    if (ReadChartData(investments, options.portfolio.c_str(), dataSets, total) != 0)
+    const ChartData data = ReadChartData(investments, options.portfolio.c_str(), dataSets, total);
+    if (data == ChartData::NotRead)
+        return Fail("the investments in " + options.home + " could not all be read");
+    if (data == ChartData::NoMemory)
         return Fail("there is not enough memory for the portfolio's charts");
     const BRect area = ChartArea();
     std::string bytes;

@@ -50,10 +50,14 @@ std::unique_ptr<DATABASE> OpenInvestments(const std::string& homeFolder, std::st
     const auto portfolios = OpenFile(homeFolder, "portfol.db", HoldsPortfolios, errors);
     if (!portfolios)
         return nullptr;
-    const void* found =
-        SelectPortfolios(*portfolios, portfolio.c_str()) > 0 ? portfolios->QueryGetFirst(nullptr) : nullptr;
+    const long count = SelectPortfolios(*portfolios, portfolio.c_str());
+    const void* found = count > 0 ? portfolios->QueryGetFirst(nullptr) : nullptr;
     if (!found) {
-        errors << "quorvan-cli: there is no portfolio \"" << portfolio << "\" in " << homeFolder << '\n';
+        errors << "quorvan-cli: ";
+        if (count == 0)
+            errors << "there is no portfolio \"" << portfolio << "\" in " << homeFolder << '\n';
+        else
+            errors << "the portfolios in " << homeFolder << " could not all be read\n";
         return nullptr;
     }
     PORTFOLIO_DATA record;

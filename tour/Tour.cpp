@@ -190,11 +190,11 @@ void Tour::UpdatePrices() {
         int found = 0;
         int missed = 0;
         DATABASE file((folder_ + "/invest.db").c_str());
-        ForEachInvestment(file, SamplePortfolio, [&](const INVESTMENT_DATA& record, long) {
+        const bool read = ForEachInvestment(file, SamplePortfolio, [&](const INVESTMENT_DATA& record, long) {
             found += record.Price == quotes_.PriceOf(record.Ticker) ? 1 : 0;
             missed += record.QuoteError;
         });
-        return found > 10 && missed == 1 && RowsShown() > 10;
+        return read && found > 10 && missed == 1 && RowsShown() > 10;
     });
     Shoot("updated");
 }

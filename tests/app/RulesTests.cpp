@@ -7,6 +7,7 @@
 
 #include "DataFolder.h"
 #include "InChild.h"
+#include "WatchedFiles.h"
 #include "app/CutFile.h"
 #include "app/InvestmentTexts.h"
 #include "app/PortfolioRules.h"
@@ -149,9 +150,9 @@ TEST(PortfolioRules, AWalkVisitsThePortfoliosInvestmentsInRecordOrder) {
     file.Delete(1);
 
     Texts seen;
-    ForEachInvestment(file, "My Fund", [&](const INVESTMENT_DATA& record, long number) {
+    EXPECT_TRUE(ForEachInvestment(file, "My Fund", [&](const INVESTMENT_DATA& record, long number) {
         seen.push_back(std::to_string(number) + record.Name);
-    });
+    }));
     EXPECT_EQ(seen, (Texts{"0a", "2c", "3d"}));
     // In single precision and that order: the tenth and the one are lost beside the large value.
     EXPECT_EQ(TotalValue(file, "My Fund"), 16777216.F);
@@ -199,6 +200,41 @@ TEST(PortfolioRules, ARenameTakesEveryInvestmentAlong) {
             << each.from << " to " << each.to;
     EXPECT_EQ(folder.Portfolios(), (Texts{"  New name", "Alone"}));
     EXPECT_EQ(folder.Investments(), (Texts{"  New name/n", "Alone/n", "  New name/n", "Old one/n"}));
+}
+
+TEST(PortfolioRules, AReadErrorIsNoEmptyPortfolio) {
+    constexpr int all = -1;
+    using File = DATABASE&;
+    const struct {
+        const char* what;
+        int portfolioReads; // before they fail
+        int investmentReads;
+        bool (*done)(DATABASE& portfolios, DATABASE& investments);
+    } cases[] = {
+        {"rename", all, 0, [](File p, File i) { return RenamePortfolio(p, i, "Old", "New"); }},
+        {"delete", all, 0, [](File p, File i) { return DeletePortfolio(p, i, "Old"); }},
+        {"delete", all, 1, [](File p, File i) { return DeletePortfolio(p, i, "Old"); }},
+        {"delete", 0, all, [](File p, File i) { return DeletePortfolio(p, i, "Old"); }},
+        {"add one that is there", 0, all, [](File p, File) { return AddPortfolio(p, "Old"); }},
+        {"total", all, 0, [](File, File i) { return TotalValue(i, "Old").has_value(); }},
+        {"total", all, 1, [](File, File i) { return TotalValue(i, "Old").has_value(); }},
+        {"restore", 0, all, [](File p, File i) { return !RestorePortfolios(p, i).empty(); }},
+    };
+    for (const auto& each : cases) {
+        const FilledFolder folder({"Old"}, {"Other", "Old", "Old"});
+        WatchedFiles portfolioFiles;
+        WatchedFiles investmentFiles;
+        DATABASE portfolios(folder.File("portfol.db").c_str(), portfolioFiles);
+        DATABASE investments(folder.File("invest.db").c_str(), investmentFiles);
+        portfolios.SetReadCache(0);
+        investments.SetReadCache(0);
+        portfolioFiles.reads = each.portfolioReads;
+        investmentFiles.reads = each.investmentReads;
+        SCOPED_TRACE(each.what);
+        EXPECT_FALSE(each.done(portfolios, investments));
+        EXPECT_EQ(folder.Portfolios(), Texts{"Old"});
+        EXPECT_EQ(folder.Investments(), (Texts{"Other/n", "Old/n", "Old/n"}));
+    }
 }
 
 TEST(PortfolioRules, KilledAnywhereARenameLosesNoInvestmentAndADeleteNoOther) {
@@ -262,6 +298,10 @@ TEST(CutFile, PutsBackWhatIsNotThere) {
     folder.Write("cut.db.tmp", "left by a kill");
     ASSERT_TRUE(file.Keep(cut, std::vector<long>{0, 1, 2}));
     EXPECT_FALSE(file.Keep(cut, std::vector<long>{0, 1, 2})) << "what is kept is not replaced";
+    WatchedFiles failing;
+    DATABASE unreadable(folder.File("invest.db").c_str(), failing);
+    failing.reads = 0;
+    EXPECT_EQ(file.Restore(unreadable), CutFile::Outcome::Failed) << "it may all be there";
     investments.Delete(0);
     const INVESTMENT_DATA other = MakeInvestment("P", "other");
     investments.Write(2, &other);

@@ -6,11 +6,10 @@
 #include <string>
 #include <utility>
 
-#include "app/AppState.h"
 #include "db/Database.h"
 
-// Tells whether a data file of the running program has changes that a power cut would take. Used on the
-// threads that use the file, one at a time.
+// Tells whether a data file of the running program has changes that a power cut would take, and lets it fail.
+// Used on the threads that use the file, one at a time.
 class WatchedFiles : public FileOperations {
   public:
     // To be called while the program runs; the database goes before this object.
@@ -20,6 +19,13 @@ class WatchedFiles : public FileOperations {
     // Whether all is on the disk, and was not before.
     [[nodiscard]] bool HaveSynced() { return changes_ == 0 && std::exchange(syncs_, 0) > 0; }
 
+    ssize_t ReadAt(int file, void* data, std::size_t size, off_t offset) override {
+        errno = EIO;
+        if (reads == 0)
+            return -1;
+        reads -= reads > 0 ? 1 : 0;
+        return FileOperations::ReadAt(file, data, size, offset);
+    }
     ssize_t WriteAt(int file, const void* data, std::size_t size, off_t offset) override {
         ++changes_;
         return FileOperations::WriteAt(file, data, size, offset);
@@ -41,6 +47,7 @@ class WatchedFiles : public FileOperations {
     }
 
     bool failing = false;
+    int reads = -1; // how many there are before they fail; negative: all
     std::function<void()> beforeSync;
 
   private:

@@ -195,6 +195,24 @@ TEST_F(MainWindow, DeletesAPortfolioAfterTwoQuestions) {
     EXPECT_EQ(RecordSlots("portfol.db") + RecordSlots("invest.db"), 0);
 }
 
+TEST_F(MainWindow, TellsWhatItCannotReadAndLeavesItAlone) {
+    WatchedFiles files;
+    AddPortfolioOf("A", {"a"});
+    const char* notRead = "An investment could not be read from its file!";
+    Expect({"a"}).Then("the disk fails", [&] {
+        files.Watch(app_state->investments, File("invest.db"));
+        files.reads = 0;
+    });
+    Select("A").Answer(notRead, "Ok");
+    Expect({}, "not known");
+    DeletePortfolio("Yes", "Yes");
+    Answer("The change could not be saved! Is the disk full, or the file protected?", "Ok");
+    Answer(notRead, "Ok");
+    Then("it is back", [&] { files.reads = -1; }).Select("A").Expect({"a"}, "$1.00");
+    RunAndClose();
+    EXPECT_EQ(Portfolios(), Texts{"A"});
+}
+
 TEST_F(MainWindow, SettingsHelpAndAboutOpen) {
     static std::string launched;
     BRoster::SetLauncher([](const char* path) {
