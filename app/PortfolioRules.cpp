@@ -5,8 +5,8 @@
 #include <string_view>
 #include <unordered_set>
 
-#include "db/LoweredText.h"
 #include "util/CharacterBuffer.h"
+#include "util/Strings.h"
 
 namespace {
 
@@ -64,11 +64,9 @@ bool CollectNames(DATABASE& database, std::vector<std::string>* names) {
 }
 
 // A name as queries compare it.
-std::string Lowered(std::string_view name) {
-    std::string lowered(name);
-    for (char& c : lowered)
-        c = static_cast<char>(LoweredByte(static_cast<std::uint8_t>(c)));
-    return lowered;
+std::string Lowered(std::string name) {
+    strlwr(name.data());
+    return name;
 }
 
 } // namespace

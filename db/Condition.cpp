@@ -6,7 +6,7 @@
 #include <string_view>
 
 #include "db/LittleEndian.h"
-#include "db/LoweredText.h"
+#include "util/LoweredText.h"
 #include "util/Strings.h"
 
 namespace {

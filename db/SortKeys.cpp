@@ -10,7 +10,7 @@
 
 #include "db/Allocate.h"
 #include "db/LittleEndian.h"
-#include "db/LoweredText.h"
+#include "util/LoweredText.h"
 
 namespace {
 

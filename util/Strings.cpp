@@ -2,14 +2,16 @@
 
 #include <cstring>
 
+#include "util/LoweredText.h"
+
 namespace {
 
 bool IsAscii(char c) {
-    return static_cast<unsigned char>(c) < 128U;
+    return static_cast<unsigned char>(c) < FirstNonAscii;
 }
 
 char Lowered(char c) {
-    return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c;
+    return static_cast<char>(LoweredByte(static_cast<unsigned char>(c)));
 }
 
 char Raised(char c) {

@@ -17,8 +17,8 @@ TEST(LostPortfolios, AreListedAgainByTheNamesOfTheirInvestments) {
     DATABASE portfolioFile(folder.File("portfol.db").c_str());
     DATABASE investmentFile(folder.File("invest.db").c_str());
     investmentFile.Delete(7);
-    EXPECT_EQ(RestorePortfolios(portfolioFile, investmentFile), (Texts{"Lost"}));
-    EXPECT_EQ(folder.Portfolios(), (Texts{"Kept", umlaut + "ra", "Lost"}));
+    EXPECT_EQ(RestorePortfolios(portfolioFile, investmentFile), (Texts{"Lost", umlaut + "RA"}));
+    EXPECT_EQ(folder.Portfolios(), (Texts{"Kept", umlaut + "ra", "Lost", umlaut + "RA"}));
     EXPECT_EQ(RestorePortfolios(portfolioFile, investmentFile), Texts{});
     EXPECT_EQ(SelectInvestments(investmentFile, "Lost"), 3);
 }
