@@ -9,6 +9,7 @@
 #include <string_view>
 #include <system_error>
 
+#include "app/DataFolders.h"
 #include "util/Dates.h"
 
 namespace {
@@ -42,15 +43,25 @@ std::vector<std::string> DailyBackup::FilesKeptWith(const std::string& name) {
     return {name};
 }
 
-DailyBackup::DailyBackup(std::string folder, std::vector<std::string> names, FileOperations& operations,
-                         Clock clock)
-    : folder_(std::move(folder)), names_(std::move(names)), operations_(operations), clock_(clock) {}
+DailyBackup::DailyBackup(const std::string& folder, const std::vector<std::string>& names,
+                         FileOperations& operations, Clock clock)
+    : operations_(operations), clock_(clock) {
+    for (const std::string& name : names) {
+        if (std::string file = FollowLinks(folder + "/" + name); !file.empty())
+            files_.push_back(std::move(file));
+    }
+}
 
 DailyBackup::~DailyBackup() {
     stop_ = true;
     EndPreparing();
-    for (const std::string& name : prepared_)
-        static_cast<void>(RemoveFile(operations_, Kept(name, PartSuffix)));
+    for (const std::string& file : prepared_)
+        static_cast<void>(RemoveFile(operations_, Kept(file, PartSuffix)));
+}
+
+std::string DailyBackup::Kept(const std::string& file, const std::string& suffix) {
+    const std::filesystem::path path(file);
+    return (path.parent_path() / FolderName / path.filename()).string() + "." + suffix;
 }
 
 void DailyBackup::EndPreparing() {
@@ -74,8 +85,8 @@ bool DailyBackup::BeginDay(std::time_t now) {
     return true;
 }
 
-bool DailyBackup::IsWanted(const std::string& name) const {
-    return FileExists(DataPath(name)) && !FileExists(Kept(name, day_));
+bool DailyBackup::IsWanted(const std::string& file) const {
+    return FileExists(file) && !FileExists(Kept(file, day_));
 }
 
 void DailyBackup::Prepare() {
@@ -85,13 +96,13 @@ void DailyBackup::Prepare() {
         if (!BeginDay(clock_()))
             return;
         dayEnd_ = 0; // no Keep has made sure of it
-        std::copy_if(names_.begin(), names_.end(), std::back_inserter(wanted),
-                     [this](const std::string& name) { return IsWanted(name); });
+        std::copy_if(files_.begin(), files_.end(), std::back_inserter(wanted),
+                     [this](const std::string& file) { return IsWanted(file); });
     }
     const auto copy = [this, wanted] {
-        for (const std::string& name : wanted) {
-            if (!stop_ && CopyToPart(name) == 0)
-                prepared_.push_back(name);
+        for (const std::string& file : wanted) {
+            if (!stop_ && CopyToPart(file) == 0)
+                prepared_.push_back(file);
         }
     };
     try {
@@ -116,47 +127,39 @@ int DailyBackup::Keep() {
 
 int DailyBackup::KeepAll() {
     int error = 0;
-    bool made = false;
-    for (const std::string& name : names_) {
-        if (!IsWanted(name))
-            continue;
-        const int failure = KeepFile(name);
-        made = made || failure == 0;
+    for (const std::string& file : files_) {
+        const int failure = IsWanted(file) ? KeepFile(file) : 0;
         error = error == 0 ? failure : error;
     }
-    if (made) {
-        const int failure = SyncFolderOf(operations_, Kept(names_.front(), day_));
-        error = error == 0 ? failure : error;
-    }
-    for (const std::string& name : names_) {
+    for (const std::string& file : files_) {
         if (error == 0)
-            RemoveOldOf(name);
+            RemoveOldOf(file);
     }
     return error;
 }
 
-int DailyBackup::KeepFile(const std::string& name) {
-    const auto prepared = std::find(prepared_.begin(), prepared_.end(), name);
+int DailyBackup::KeepFile(const std::string& file) {
+    const auto prepared = std::find(prepared_.begin(), prepared_.end(), file);
     if (prepared != prepared_.end())
         prepared_.erase(prepared); // the file is not as it was then for a second time
-    else if (const int error = CopyToPart(name); error != 0)
+    else if (const int error = CopyToPart(file); error != 0)
         return error;
-    const std::string part = Kept(name, PartSuffix);
-    const int error = RenameFile(operations_, part, Kept(name, day_));
+    const std::string part = Kept(file, PartSuffix);
+    const int error = RenameFile(operations_, part, Kept(file, day_));
     if (error != 0)
         static_cast<void>(RemoveFile(operations_, part));
-    return error;
+    return error != 0 ? error : SyncFolderOf(operations_, part);
 }
 
 // The complete copy, on the disk, under the name that it has until it is needed.
-int DailyBackup::CopyToPart(const std::string& name) {
+int DailyBackup::CopyToPart(const std::string& file) {
+    const std::string part = Kept(file, PartSuffix);
     std::error_code ignored; // what is in the folder's place shows when the file is made
-    std::filesystem::create_directory(folder_ + "/" + FolderName, folder_, ignored);
-    const std::string part = Kept(name, PartSuffix);
+    std::filesystem::create_directory(FolderOf(part), FolderOf(file), ignored);
     static_cast<void>(RemoveFile(operations_, part)); // left by a program that was killed
     File source(operations_);
     File target(operations_);
-    int error = source.Open(DataPath(name), FileMode::ReadOnly);
+    int error = source.Open(file, FileMode::ReadOnly);
     if (error == 0)
         error = target.Open(part, FileMode::CreatePrivate);
     if (error != 0)
@@ -187,21 +190,22 @@ int DailyBackup::CopyBytes(const File& source, File& target) const {
     return 0;
 }
 
-void DailyBackup::RemoveOldOf(const std::string& name) {
-    const std::string beginning = name + ".";
+void DailyBackup::RemoveOldOf(const std::string& file) {
+    const std::filesystem::path newest(Kept(file, day_));
+    const std::string beginning = std::filesystem::path(file).filename().string() + ".";
     std::vector<std::string> days;
     std::error_code error;
-    std::filesystem::directory_iterator entry(folder_ + "/" + FolderName, error);
+    std::filesystem::directory_iterator entry(newest.parent_path(), error);
     for (; !error && entry != std::filesystem::directory_iterator(); entry.increment(error)) {
-        const std::string file = entry->path().filename().string();
-        if (!file.starts_with(beginning))
+        const std::string name = entry->path().filename().string();
+        if (!name.starts_with(beginning))
             continue;
-        std::string day = file.substr(beginning.size());
+        std::string day = name.substr(beginning.size());
         // Today's is never too old, whatever a clock that ran ahead has left.
         if (IsDay(day) && day != day_)
             days.push_back(std::move(day));
     }
     std::sort(days.begin(), days.end());
     for (std::size_t i = 0; i + Generations - 1 < days.size(); ++i)
-        static_cast<void>(RemoveFile(operations_, Kept(name, days[i])));
+        static_cast<void>(RemoveFile(operations_, Kept(file, days[i])));
 }

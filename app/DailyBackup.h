@@ -10,14 +10,15 @@
 
 #include "db/File.h"
 
-// Keeps what data files held before the first change of a day: in the folder "backups" beside them, a file
-// such as invest.db.2026-11-22 for each. Each of these is complete and on the disk under its name, or is not
-// there at all; it has the data file's permissions. Of each data file the newest Generations are kept.
-// Nothing that is named otherwise is touched, save NAME.part, where a copy is made.
+// Keeps what data files held before the first change of a day: in the folder "backups" beside each, a file
+// such as invest.db.2026-11-22. Each of these is complete and on the disk under its name, or is not there at
+// all; it has the data file's permissions. Of each data file the newest Generations are kept. Nothing that is
+// named otherwise is touched, save NAME.part, where a copy is made.
 //
 // It does not see changes by itself: who is about to change one of the files calls Keep first (BackedUpFiles
-// does so for a DATABASE), and holds the FolderLock all the while. The application object or a tool owns it.
-// Keep may be called from any thread; everything else belongs to the owner's.
+// does so for a DATABASE), and holds the FolderLock of all their folders (FoldersOf) all the while. The
+// application object or a tool owns it. Keep may be called from any thread; everything else belongs to the
+// owner's.
 class DailyBackup {
   public:
     static constexpr const char* FolderName = "backups";
@@ -26,9 +27,10 @@ class DailyBackup {
     using Clock = std::time_t (*)();
     static std::time_t SystemClock();
 
-    // For the files of these names in the folder; one that does not exist is passed over. They are kept
-    // together, so that the backups of a day fit each other. `operations` must outlive the object.
-    DailyBackup(std::string folder, std::vector<std::string> names,
+    // For the files of these names in the folder; one that does not exist is passed over, and of a symbolic
+    // link the file that it leads to is kept, where that lies. They are kept together, so that the backups of
+    // a day fit each other. `operations` must outlive the object.
+    DailyBackup(const std::string& folder, const std::vector<std::string>& names,
                 FileOperations& operations = SystemFiles(), Clock clock = SystemClock);
     DailyBackup(const DailyBackup&) = delete;
     DailyBackup& operator=(const DailyBackup&) = delete;
@@ -53,28 +55,25 @@ class DailyBackup {
     [[nodiscard]] int Keep();
 
   private:
-    [[nodiscard]] std::string DataPath(const std::string& name) const { return folder_ + "/" + name; }
-    [[nodiscard]] std::string Kept(const std::string& name, const std::string& suffix) const {
-        return folder_ + "/" + FolderName + "/" + name + "." + suffix;
-    }
+    // A file is named by its path.
+    [[nodiscard]] static std::string Kept(const std::string& file, const std::string& suffix);
     [[nodiscard]] bool BeginDay(std::time_t now);
-    [[nodiscard]] bool IsWanted(const std::string& name) const;
+    [[nodiscard]] bool IsWanted(const std::string& file) const;
     [[nodiscard]] int KeepAll();
-    [[nodiscard]] int KeepFile(const std::string& name);
-    [[nodiscard]] int CopyToPart(const std::string& name);
+    [[nodiscard]] int KeepFile(const std::string& file);
+    [[nodiscard]] int CopyToPart(const std::string& file);
     [[nodiscard]] int CopyBytes(const File& source, File& target) const;
     void EndPreparing();
-    void RemoveOldOf(const std::string& name);
+    void RemoveOldOf(const std::string& file);
 
-    const std::string folder_;
-    const std::vector<std::string> names_;
+    std::vector<std::string> files_;
     FileOperations& operations_;
     const Clock clock_;
     std::function<void(int)> tell_;
 
     std::thread worker_;
     std::atomic<bool> stop_ = false;
-    std::vector<std::string> prepared_; // names; the worker's until it has ended
+    std::vector<std::string> prepared_; // the worker's until it has ended
 
     std::mutex mutex_;         // guards what follows
     std::string day_;          // "2026-11-22"

@@ -15,7 +15,8 @@ std::string WhyNotOpened(const std::string& folder, const std::string& name, Fil
     const std::string path = folder + "/" + name;
     File file(operations);
     const int error = file.Open(path, FileMode::ReadOnly);
-    if (error == ENOENT && FileExists(folder + "/" + name.substr(0, name.rfind('.')) + ".bak"))
+    COMPACTION_PATHS paths;
+    if (error == ENOENT && FindCompactionPaths(path, &paths) && FileExists(paths.backup))
         return name + " is missing, but its backup with the extension .bak is there.";
     if (error == ENOENT)
         return name + " is missing. \"quorvan-cli setup " + folder + "\" makes a new one.";

@@ -10,6 +10,7 @@
 #include "ColumnListView/PrefilledBitmap.h"
 #include "app/CutFile.h"
 #include "app/DataFileOpening.h"
+#include "app/DataFolders.h"
 #include "app/NorvelWindow.h"
 #include "app/PortfolioRules.h"
 #include "db/Database.h"
@@ -107,7 +108,7 @@ int NorvelApp::Initialize(std::string& complaints) {
                    B_STOP_ALERT);
         return 1;
     }
-    if (!EnterFolder(complaints))
+    if (!EnterFolders(complaints))
         return 1;
     PrepareBackup();
     OpenDatabases(complaints);
@@ -130,19 +131,27 @@ bool NorvelApp::BuildPaths() {
            JoinPath(state_.logPath, state_.homeFolder, "Quorvan.log");
 }
 
-bool NorvelApp::EnterFolder(std::string& complaints) {
-    const std::string folder = state_.homeFolder;
-    const FolderLock::Outcome outcome = TakeLock();
+bool NorvelApp::EnterFolders(std::string& complaints) {
+    const std::vector<std::string> folders =
+        FoldersOf(state_.homeFolder, DailyBackup::FilesKeptWith("invest.db"));
+    return std::all_of(folders.begin(), folders.end(),
+                       [&](const std::string& folder) { return EnterFolder(folder, complaints); });
+}
+
+bool NorvelApp::EnterFolder(const std::string& folder, std::string& complaints) {
+    FolderLock& lock = locks_.emplace_back();
+    const FolderLock::Outcome outcome = TakeLock(lock, folder);
     if (outcome == FolderLock::Outcome::Held)
         MessageBox(("Quorvan cannot start: its folder " + folder + " is in use by " +
-                    DescribeHolder(lock_.Holder()) + ". Please close that program first.")
+                    DescribeHolder(lock.Holder()) + ". Please close that program first.")
                        .c_str(),
                    B_STOP_ALERT);
     if (outcome == FolderLock::Outcome::Held || outcome == FolderLock::Outcome::Doubtful)
         return false;
-    const int error = outcome == FolderLock::Outcome::Failed ? lock_.Error() : TryWritingIn(folder);
-    lookOnly_ = error != 0 && !(IsFull(error) && lock_.IsTaken());
-    if (lookOnly_)
+    const int error = outcome == FolderLock::Outcome::Failed ? lock.Error() : TryWritingIn(folder);
+    const bool lookOnly = error != 0 && !(IsFull(error) && lock.IsTaken());
+    lookOnly_ = lookOnly_ || lookOnly;
+    if (lookOnly)
         complaints += "The folder " + folder + " cannot be written: " +
                       (error == EINVAL ? std::string(FolderLock::FileName) + " in it is no file of Quorvan's"
                                        : Reason(error)) +
@@ -153,17 +162,15 @@ bool NorvelApp::EnterFolder(std::string& complaints) {
     return true;
 }
 
-FolderLock::Outcome NorvelApp::TakeLock() {
+FolderLock::Outcome NorvelApp::TakeLock(FolderLock& lock, const std::string& folder) {
     constexpr const char* program = "quorvan";
-    FolderLock::Outcome outcome = lock_.Take(state_.homeFolder, program);
+    FolderLock::Outcome outcome = lock.Take(folder, program);
     if (outcome != FolderLock::Outcome::Doubtful)
         return outcome;
-    const std::string question = std::string("The folder ") + state_.homeFolder + " was in use by " +
-                                 DescribeHolder(lock_.Holder()) +
+    const std::string question = "The folder " + folder + " was in use by " + DescribeHolder(lock.Holder()) +
                                  ", and it cannot be seen from here whether it still is. Two programs that "
                                  "change the same files damage them.\n\nHas that program ended?";
-    return YesNoBox(question.c_str()) ? outcome
-                                      : lock_.Take(state_.homeFolder, program, FolderLock::Doubt::PassOver);
+    return YesNoBox(question.c_str()) ? outcome : lock.Take(folder, program, FolderLock::Doubt::PassOver);
 }
 
 void NorvelApp::PrepareBackup() {

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <array>
+#include <list>
 #include <memory>
 #include <optional>
 #include <string>
@@ -45,9 +46,11 @@ class NorvelApp : public BApplication {
     [[nodiscard]] int Initialize(std::string& complaints);
     void MakeStatusBitmaps();
     [[nodiscard]] bool BuildPaths();
-    // Takes the folder for this program. When the folder cannot be written, lookOnly_ is set.
-    [[nodiscard]] bool EnterFolder(std::string& complaints);
-    [[nodiscard]] FolderLock::Outcome TakeLock();
+    // Takes the home folder for this program, and those in which data files lie that are links in it. When
+    // one of them cannot be written, lookOnly_ is set.
+    [[nodiscard]] bool EnterFolders(std::string& complaints);
+    [[nodiscard]] bool EnterFolder(const std::string& folder, std::string& complaints);
+    [[nodiscard]] static FolderLock::Outcome TakeLock(FolderLock& lock, const std::string& folder);
     void OpenDatabases(std::string& complaints);
     void PrepareBackup();
     void RestoreCut(std::string& complaints);
@@ -57,7 +60,7 @@ class NorvelApp : public BApplication {
 
     int exitStatus_ = 0;
     bool lookOnly_ = false;
-    FolderLock lock_;
+    std::list<FolderLock> locks_;
     // What the databases reach their files through.
     ReadOnlyFiles readOnlyFiles_;
     std::optional<DailyBackup> backup_; // unless lookOnly_; and so the next two

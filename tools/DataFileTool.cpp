@@ -1,5 +1,6 @@
 #include "tools/DataFileTool.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <cstring>
 #include <filesystem>
@@ -7,18 +8,10 @@
 #include <system_error>
 
 #include "app/DailyBackup.h"
+#include "app/DataFolders.h"
 #include "db/Compaction.h"
 #include "db/FileCheck.h"
 #include "tools/RecordFields.h"
-
-namespace {
-
-std::string FolderOf(const std::string& file) {
-    const std::filesystem::path path(file);
-    return path.has_parent_path() ? path.parent_path().string() : ".";
-}
-
-} // namespace
 
 DataFileTool::DataFileTool(std::string file, OutputFormat format, TextOutput& output, std::ostream& errors,
                            FileOperations& operations)
@@ -79,27 +72,34 @@ bool DataFileTool::IsFileFailure(int code) {
     }
 }
 
-bool DataFileTool::TakeFolder() {
-    const std::string folder = FolderOf(file_);
-    const FolderLock::Outcome outcome = lock_.Take(folder, "quorvan-cli");
+bool DataFileTool::TakeFolders() {
+    const std::filesystem::path real(RealPath(file_));
+    const std::vector<std::string> together = DailyBackup::FilesKeptWith(real.filename());
+    const std::vector<std::string> folders = FoldersOf(FolderOf(real), together);
+    return std::all_of(folders.begin(), folders.end(),
+                       [this](const std::string& folder) { return TakeFolder(folder); });
+}
+
+bool DataFileTool::TakeFolder(const std::string& folder) {
+    FolderLock& lock = locks_.emplace_back();
+    const FolderLock::Outcome outcome = lock.Take(folder, "quorvan-cli");
     if (outcome == FolderLock::Outcome::Held)
-        Warn("the folder is in use by " + DescribeHolder(lock_.Holder()) + "; nothing is changed");
+        Warn("the folder is in use by " + DescribeHolder(lock.Holder()) + "; nothing is changed");
     else if (outcome == FolderLock::Outcome::Doubtful)
-        Warn("the folder was in use by " + DescribeHolder(lock_.Holder()) +
+        Warn("the folder was in use by " + DescribeHolder(lock.Holder()) +
              "; once that program has ended, delete " + folder + "/" + FolderLock::FileName);
-    else if (outcome == FolderLock::Outcome::Failed && lock_.Error() != ENOENT)
+    else if (outcome == FolderLock::Outcome::Failed && lock.Error() != ENOENT)
         Warn("other programs cannot be kept out of the folder: " + folder + "/" + FolderLock::FileName +
-             (lock_.Error() == EINVAL
-                  ? " is in the way"
-                  : " cannot be made: " + std::generic_category().message(lock_.Error())));
+             (lock.Error() == EINVAL ? " is in the way"
+                                     : " cannot be made: " + std::generic_category().message(lock.Error())));
     else
         return true; // where there is no folder, there is no file either
     return false;
 }
 
 bool DataFileTool::KeepBackup() {
-    const std::filesystem::path path(file_);
-    const int error = DailyBackup(FolderOf(file_), DailyBackup::FilesKeptWith(path.filename())).Keep();
+    const std::filesystem::path real(RealPath(file_));
+    const int error = DailyBackup(FolderOf(real), DailyBackup::FilesKeptWith(real.filename())).Keep();
     if (error != 0)
         Warn(std::string("the day's backup cannot be made in the folder ") + DailyBackup::FolderName +
              " beside it: " + std::generic_category().message(error) + "; nothing is changed");
@@ -108,7 +108,7 @@ bool DataFileTool::KeepBackup() {
 }
 
 bool DataFileTool::Open(Access access) {
-    if (access == Access::Change && !TakeFolder())
+    if (access == Access::Change && !TakeFolders())
         return false;
     if (database_.Open(file_.c_str()) != 0) {
         const int code = database_.GetLastError(nullptr);

@@ -2,6 +2,7 @@
 
 #include <functional>
 #include <iosfwd>
+#include <list>
 #include <string>
 #include <utility>
 #include <vector>
@@ -26,7 +27,7 @@ struct SELECTION {
 // `output` in the chosen format, messages to `errors`: a sentence each, with the engine's code and text where
 // the engine refused. Operations that change the file refuse one that may only be read, one whose header
 // disagrees with it, one in a folder that another program uses, and one whose state before the day's first
-// change cannot be kept.
+// change cannot be kept. A symbolic link stands for the file that it leads to, in the folder of that.
 //
 // It knows nothing of command-line options. The command owns it, for one operation each.
 class DataFileTool {
@@ -80,8 +81,10 @@ class DataFileTool {
     };
 
     [[nodiscard]] bool Open(Access access);
-    // Keeps other programs out of the file's folder while the tool lives.
-    [[nodiscard]] bool TakeFolder();
+    // Keep other programs out of the folders of the file, and of those that are backed up with it, while the
+    // tool lives.
+    [[nodiscard]] bool TakeFolders();
+    [[nodiscard]] bool TakeFolder(const std::string& folder);
     [[nodiscard]] bool KeepBackup();
     // The file of an interrupted compaction that lies where the data file itself is missing; empty for none.
     [[nodiscard]] std::string Leftover() const;
@@ -122,6 +125,6 @@ class DataFileTool {
     TextOutput& output_;
     std::ostream& errors_;
     FileOperations& operations_;
-    FolderLock lock_;
+    std::list<FolderLock> locks_;
     DATABASE database_;
 };

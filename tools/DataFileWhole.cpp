@@ -95,7 +95,7 @@ int DataFileTool::Create(const std::string& description, const std::vector<std::
     }
     if (description.size() >= NameSize)
         return Fail("the description is longer than 31 bytes");
-    if (!TakeFolder())
+    if (!TakeFolders())
         return 1;
     if (!Leftover().empty())
         return Fail(WhyNotOpened() + "; nothing is made");
@@ -133,7 +133,7 @@ bool DataFileTool::RestoreLeftover() {
 }
 
 int DataFileTool::Check(bool repair) {
-    if (repair && (!TakeFolder() || !RestoreLeftover()))
+    if (repair && (!TakeFolders() || !RestoreLeftover()))
         return 1;
     FileCheck check;
     if (const int error = check.Run(file_); error != 0)

@@ -414,8 +414,9 @@ TEST_F(DbCommandTest, ChangesOnlyWhatItHasToItselfAndHasKept) {
     const std::string held = "in use by quorvan (process " + std::to_string(getpid());
     FolderLock lock;
     ASSERT_EQ(lock.Take(shell_.Path(), "quorvan"), FolderLock::Outcome::Taken);
+    ASSERT_EQ(shell_.Run("mkdir else; ln -s ../a.db else/link.db"), 0);
     Go({{"db a.db append", 1, "", {held.c_str()}},
-        {"db a.db compact", 1, "", {held.c_str()}},
+        {"db else/link.db compact", 1, "", {held.c_str()}},
         {"db a.db check --repair", 1, "", {held.c_str()}},
         {"db a.db check", 0, "nothing is wrong\n"},
         {"db a.db query 'Tag = 9' --format tsv", 0, "record\tName\tPrice\tDay\tAt\tTag\n"}});
@@ -425,9 +426,9 @@ TEST_F(DbCommandTest, ChangesOnlyWhatItHasToItselfAndHasKept) {
     Go({{"db a.db append", 1, "", {"the day's backup cannot be made"}}});
     EXPECT_EQ(shell_.Read("a.db"), before);
     std::filesystem::remove(shell_.File("backups"));
-    Go({{"db a.db delete 0", 0, "1 record deleted\n"},
+    Go({{"db else/link.db delete 0", 0, "1 record deleted\n"},
         {"db a.db compact", 0, "compacted: 1 record removed, 2 records left\n"}});
-    ASSERT_EQ(shell_.Run("cat backups/*"), 0);
+    ASSERT_EQ(shell_.Run("cat backups/a.db.*"), 0);
     EXPECT_EQ(shell_.Output(), before) << "there is one backup, of what was there at first";
     EXPECT_FALSE(shell_.Has("Quorvan.lock"));
 }

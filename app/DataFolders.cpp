@@ -1,0 +1,33 @@
+#include "app/DataFolders.h"
+
+#include <algorithm>
+#include <filesystem>
+#include <system_error>
+
+#include "db/File.h"
+
+namespace fs = std::filesystem;
+
+std::string FolderOf(const std::string& path) {
+    const fs::path file(path);
+    return file.has_parent_path() ? file.parent_path().string() : ".";
+}
+
+std::string RealPath(const std::string& path) {
+    std::string real = FollowLinks(path);
+    return real.empty() ? path : real;
+}
+
+std::vector<std::string> FoldersOf(const std::string& folder, const std::vector<std::string>& names) {
+    std::vector<std::string> folders = {folder};
+    for (const std::string& name : names) {
+        const std::string real = FolderOf(RealPath(folder + "/" + name));
+        const auto isReal = [&real](const std::string& each) {
+            std::error_code notThere;
+            return each == real || fs::equivalent(each, real, notThere);
+        };
+        if (std::none_of(folders.begin(), folders.end(), isReal))
+            folders.push_back(real);
+    }
+    return folders;
+}
