@@ -154,19 +154,21 @@ int DailyBackup::KeepFile(const std::string& file) {
 // The complete copy, on the disk, under the name that it has until it is needed.
 int DailyBackup::CopyToPart(const std::string& file) {
     const std::string part = Kept(file, PartSuffix);
-    std::error_code ignored; // what is in the folder's place shows when the file is made
-    std::filesystem::create_directory(FolderOf(part), FolderOf(file), ignored);
+    // What hinders it, or is in the folder's place, shows when the file is made.
+    struct stat around {};
+    if (stat(FolderOf(file).c_str(), &around) == 0)
+        static_cast<void>(mkdir(FolderOf(part).c_str(), PermissionsBeside(around.st_mode)));
     static_cast<void>(RemoveFile(operations_, part)); // left by a program that was killed
     File source(operations_);
     File target(operations_);
     int error = source.Open(file, FileMode::ReadOnly);
     if (error == 0)
-        error = target.Open(part, FileMode::CreatePrivate);
+        error = target.Open(part, FileMode::CreateNew);
     if (error != 0)
         return error;
     error = CopyBytes(source, target);
     if (error == 0)
-        error = target.TakeOwnerAndMode(source);
+        error = target.TakeOwnerForCopy(source);
     if (error == 0)
         error = target.Sync();
     target.Close();

@@ -12,8 +12,9 @@
 
 // Keeps what data files held before the first change of a day: in the folder "backups" beside each, a file
 // such as invest.db.2026-11-22. Each of these is complete and on the disk under its name, or is not there at
-// all; it has the data file's permissions. Of each data file the newest Generations are kept. Nothing that is
-// named otherwise is touched, save NAME.part, where a copy is made.
+// all; it is its owner's alone, unless the data file is several people's (PermissionsBeside). Of each data
+// file the newest Generations are kept. Nothing that is named otherwise is touched, save NAME.part, where a
+// copy is made.
 //
 // It does not see changes by itself: who is about to change one of the files calls Keep first (BackedUpFiles
 // does so for a DATABASE), and holds the FolderLock of all their folders (FoldersOf) all the while. The

@@ -78,7 +78,7 @@ int DATABASE::Compress(int /*ignored*/) {
     static_cast<void>(RemoveFile(operations_, paths.temporary)); // a leftover, or a link to somewhere else
     File target(operations_);
     // Until it has the data file's permissions, nobody may look who may not look into that.
-    if (target.Open(paths.temporary, FileMode::CreatePrivate) != 0) {
+    if (target.Open(paths.temporary, FileMode::CreateNew) != 0) {
         return Fail(DatabaseError::CompressOpenTemporary);
     }
     int code = WriteCompacted(target);

@@ -52,12 +52,13 @@ class DATABASE {
 
     // File and header
 
-    /// Makes a new file without records and opens it. `name`, `type`, `size` and, for floats, `format` are
-    /// taken from each of the `columns`; a negative size becomes the type's own (AdjustColumnSize), a float
-    /// without decimals gets 2. Fails with 1102 when the path exists, 1110 when the columns do not fit a
-    /// record of 32767 bytes, a string has no positive width or there are no column entries for the count,
-    /// 1109 when the file cannot be written or the path is longer than 127 characters, 1104 or 1106 without
-    /// memory. A failure leaves no file behind, and the object with what it had open before.
+    /// Makes a new file without records, its owner's alone, and opens it. `name`, `type`, `size` and, for
+    /// floats, `format` are taken from each of the `columns`; a negative size becomes the type's own
+    /// (AdjustColumnSize), a float without decimals gets 2. Fails with 1102 when the path exists, 1110 when
+    /// the columns do not fit a record of 32767 bytes, a string has no positive width or there are no column
+    /// entries for the count, 1109 when the file cannot be written or the path is longer than 127 characters,
+    /// 1104 or 1106 without memory. A failure leaves no file behind, and the object with what it had open
+    /// before.
     int Create(const char* path, const char* description, int columnCount, const COLUMN_ENTRY* columns);
 
     /// Opens an existing file, closing the one that was open. A file that may not be written is opened for

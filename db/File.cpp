@@ -33,7 +33,6 @@ int FlagsOf(FileMode mode) {
     case FileMode::WriteOnly:
         return O_WRONLY | O_CREAT | common;
     case FileMode::CreateNew:
-    case FileMode::CreatePrivate:
         return O_RDWR | O_CREAT | O_EXCL | common;
     case FileMode::ReadWrite:
         break;
@@ -119,7 +118,7 @@ File::~File() {
 
 int File::Open(const std::string& path, FileMode mode) {
     Close();
-    const mode_t permissions = mode == FileMode::CreatePrivate ? 0600 : 0666; // less the user's mask
+    const mode_t permissions = mode == FileMode::CreateNew ? 0600 : 0666; // less the user's mask
     int opened = Retry([&] { return operations_->Open(path.c_str(), FlagsOf(mode), permissions); });
     if (opened < 0) {
         return errno;
@@ -206,17 +205,33 @@ int File::Sync() {
 
 int File::TakeOwnerAndMode(const File& other) {
     struct stat theirs {};
+    return operations_->Status(other.descriptor_, &theirs) < 0 ? errno
+                                                               : TakeOwner(theirs, theirs.st_mode & 07777);
+}
+
+int File::TakeOwnerForCopy(const File& other) {
+    struct stat theirs {};
+    return operations_->Status(other.descriptor_, &theirs) < 0
+               ? errno
+               : TakeOwner(theirs, PermissionsBeside(theirs.st_mode));
+}
+
+int File::TakeOwner(const struct stat& theirs, mode_t mode) {
     struct stat ours {};
-    if (operations_->Status(other.descriptor_, &theirs) < 0 || operations_->Status(descriptor_, &ours) < 0) {
+    if (operations_->Status(descriptor_, &ours) < 0) {
         return errno;
     }
-    mode_t mode = theirs.st_mode & 07777;
     if (ours.st_uid != theirs.st_uid || ours.st_gid != theirs.st_gid) {
         if (operations_->SetOwner(descriptor_, theirs.st_uid, theirs.st_gid) < 0) {
             mode &= 0777; // another's file: what runs in the owner's name must not move to us
         }
     }
     return ErrorOf(Retry([&] { return operations_->SetMode(descriptor_, mode); }));
+}
+
+mode_t PermissionsBeside(mode_t mode) {
+    constexpr mode_t othersMayWrite = 022;
+    return mode & ((mode & othersMayWrite) != 0 ? 0777 : 0700);
 }
 
 bool File::IsAt(const std::string& path) const {

@@ -36,12 +36,16 @@ FileOperations& SystemFiles();
 
 /// How File::Open treats the file.
 enum class FileMode {
-    ReadWrite,     ///< it must exist
-    ReadOnly,      ///< it must exist
-    WriteOnly,     ///< made when it does not exist; what it holds stays until it is truncated
-    CreateNew,     ///< it must not exist (not even as a symbolic link); opened for reading and writing
-    CreatePrivate, ///< the same, for its owner's eyes only
+    ReadWrite, ///< it must exist
+    ReadOnly,  ///< it must exist
+    WriteOnly, ///< made, as the user's mask has it, when it does not exist; it is not truncated
+    CreateNew, ///< it must not exist (not even as a symbolic link); for reading and writing, its owner's
+               ///< alone
 };
+
+/// The permissions for a copy of a file, or for a folder in a folder, whose permissions are `mode`: the same
+/// where others may write, since it is several people's then; else the owner's alone.
+[[nodiscard]] mode_t PermissionsBeside(mode_t mode);
 
 /// One open file, read and written by position. It is the only place where the engine touches files.
 /// Interrupted calls and short transfers are continued until they are complete or fail. It buffers nothing:
@@ -80,10 +84,14 @@ class File {
     [[nodiscard]] bool IsWritten() const { return written_; }
     /// Gives this file the permissions of `other` and, as far as the process may, its owner and group.
     [[nodiscard]] int TakeOwnerAndMode(const File& other);
+    /// The same for a file that holds a copy of `other`: it gets PermissionsBeside.
+    [[nodiscard]] int TakeOwnerForCopy(const File& other);
     /// Tells whether `path` names this very file.
     [[nodiscard]] bool IsAt(const std::string& path) const;
 
   private:
+    [[nodiscard]] int TakeOwner(const struct stat& theirs, mode_t mode);
+
     FileOperations* operations_;
     int descriptor_ = -1;
     bool written_ = false;

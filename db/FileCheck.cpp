@@ -277,13 +277,13 @@ int FileCheck::WriteBackup(const File& file, const std::string& path, std::strin
             name += "-";
             name += std::to_string(number);
         }
-        error = copy.Open(name, FileMode::CreatePrivate);
+        error = copy.Open(name, FileMode::CreateNew);
     }
     if (error != 0) {
         return error;
     }
     error = CopyTo(copy, file);
-    error = error != 0 ? error : copy.TakeOwnerAndMode(file);
+    error = error != 0 ? error : copy.TakeOwnerForCopy(file);
     error = error != 0 ? error : copy.Sync();
     error = error != 0 ? error : SyncFolderOf(operations_, name);
     if (error != 0) {

@@ -41,12 +41,13 @@ class FileCheck {
     /// Tells whether Repair has a count to set right.
     [[nodiscard]] bool CanRepair() const { return mendable_; }
 
-    /// Runs, copies the file to a new name beside it and sets right the counts in its header: the record
-    /// count to the whole records that are there, the deleted count to the status bytes. No other byte is
-    /// changed, and none at all when the columns do not fit the record: then the counts may be right. Copy
-    /// and counts have reached the disk before it returns. `backup` becomes the copy's path, empty when there
-    /// was nothing to mend. Returns 0, and the findings are what is left; or an errno number, and the counts
-    /// are what they were as far as the file can still be written. A copy that was completed is kept.
+    /// Runs, copies the file to a new name beside it (its owner's alone, unless the file is several people's)
+    /// and sets right the counts in its header: the record count to the whole records that are there, the
+    /// deleted count to the status bytes. No other byte is changed, and none at all when the columns do not
+    /// fit the record: then the counts may be right. Copy and counts have reached the disk before it returns.
+    /// `backup` becomes the copy's path, empty when there was nothing to mend. Returns 0, and the findings
+    /// are what is left; or an errno number, and the counts are what they were as far as the file can still
+    /// be written. A copy that was completed is kept.
     [[nodiscard]] int Repair(const std::string& path, std::string* backup);
 
   private:

@@ -35,10 +35,30 @@ bool Exists(const std::string& path) {
     return lstat(path.c_str(), &status) == 0;
 }
 
-mode_t Permissions(mode_t wanted) {
-    const mode_t mask = umask(0);
-    umask(mask);
-    return wanted & ~mask;
+// What is made here is the person's alone, whatever the mask: it tells what the person owns.
+constexpr mode_t PrivateFile = 0600;
+constexpr mode_t PrivateProgram = 0700;
+constexpr mode_t PrivateFolder = 0700;
+
+// What is replaced keeps its permissions.
+mode_t PermissionsOf(const std::string& path, mode_t ofNew) {
+    struct stat status {};
+    return stat(path.c_str(), &status) == 0 ? status.st_mode & 0777 : ofNew;
+}
+
+// Makes the folder, and those above it that are missing. Returns 0, also when it is there, or an errno
+// number.
+int MakeFolders(const fs::path& path) {
+    if (mkdir(path.c_str(), PrivateFolder) == 0)
+        return 0;
+    std::error_code ignored;
+    if (errno == EEXIST)
+        return fs::is_directory(path, ignored) ? 0 : ENOTDIR;
+    if (errno != ENOENT)
+        return errno;
+    if (const int error = MakeFolders(path.parent_path()); error != 0)
+        return error;
+    return mkdir(path.c_str(), PrivateFolder) == 0 ? 0 : errno;
 }
 
 struct DataFilePlan {
@@ -67,7 +87,7 @@ class FolderSetup {
     // without their portfolios would be no sample.
     void MakeTogether(std::span<const DataFilePlan> plans);
     bool PrepareDataFile(const DataFilePlan& plan);
-    void MakeFile(const std::string& name, std::string_view content, mode_t mode);
+    void MakeFile(const std::string& name, std::string_view content);
     void MakeHelp();
     // A part of the help, which belongs to the program's version: replaced together with the program.
     void MakeHelpFile(const std::string& name, std::string_view content);
@@ -148,13 +168,10 @@ bool FolderSetup::FindFolder() {
 }
 
 bool FolderSetup::MakeFolder() {
-    std::error_code error;
-    fs::create_directories(folder_, error);
-    if (!error && !fs::is_directory(folder_, error) && !error)
-        error = std::make_error_code(std::errc::not_a_directory);
-    if (error)
-        Fail("The folder " + folder_ + " cannot be made: " + error.message() + ".");
-    return !error;
+    const int error = MakeFolders(folder_);
+    if (error != 0)
+        Fail("The folder " + folder_ + " cannot be made: " + Reason(error) + ".");
+    return error == 0;
 }
 
 bool FolderSetup::TakeFolder() {
@@ -170,11 +187,10 @@ bool FolderSetup::TakeFolder() {
 }
 
 bool FolderSetup::MakeSubfolder(const std::string& name) {
-    std::error_code error;
-    fs::create_directory(PathOf(name), error);
-    if (error)
-        Fail(PathOf(name) + " cannot be made: " + error.message() + ".");
-    return !error;
+    const int error = MakeFolders(PathOf(name));
+    if (error != 0)
+        Fail(PathOf(name) + " cannot be made: " + Reason(error) + ".");
+    return error == 0;
 }
 
 bool FolderSetup::PrepareDataFile(const DataFilePlan& plan) {
@@ -232,19 +248,19 @@ void FolderSetup::MakeDataFiles() {
         output_ << "no sample is added: it goes into new data files only\n";
 }
 
-void FolderSetup::MakeFile(const std::string& name, std::string_view content, mode_t mode) {
+void FolderSetup::MakeFile(const std::string& name, std::string_view content) {
     if (Exists(PathOf(name)))
         Kept(name, "");
     else
-        Conclude(
-            WriteWholeFile(PathOf(name), TemporaryFor(name), content, Permissions(mode), ExistingFile::Keep),
-            name, "");
+        Conclude(WriteWholeFile(PathOf(name), TemporaryFor(name), content, PrivateFile, ExistingFile::Keep),
+                 name, "");
 }
 
 void FolderSetup::CopyProgram(const std::string& name, const std::string& from, std::string_view content,
                               ExistingFile existing) {
-    Conclude(WriteWholeFile(PathOf(name), TemporaryFor(name), content, Permissions(0755), existing), name,
-             "copied from " + from);
+    Conclude(WriteWholeFile(PathOf(name), TemporaryFor(name), content,
+                            PermissionsOf(PathOf(name), PrivateProgram), existing),
+             name, "copied from " + from);
 }
 
 void FolderSetup::InstallProgram(const std::string& name, const std::string& from) {
@@ -290,12 +306,12 @@ int FolderSetup::RemoveFromDesktop() {
 void FolderSetup::MakeHelpFile(const std::string& name, std::string_view content) {
     std::string present;
     if (!Exists(PathOf(name)) || !options_.updateProgram) {
-        MakeFile(name, content, 0666);
+        MakeFile(name, content);
     } else if (ReadWholeFile(PathOf(name), present, content.size()) && present == content) {
         Kept(name, "");
     } else {
-        Conclude(WriteWholeFile(PathOf(name), TemporaryFor(name), content, Permissions(0666),
-                                ExistingFile::Replace),
+        Conclude(WriteWholeFile(PathOf(name), TemporaryFor(name), content,
+                                PermissionsOf(PathOf(name), PrivateFile), ExistingFile::Replace),
                  name, "brought up to date");
     }
 }
@@ -317,9 +333,8 @@ int FolderSetup::Run() {
         return 1;
     output_ << "Quorvan folder " << folder_ << '\n';
     MakeDataFiles();
-    // It may come to hold a password.
-    MakeFile("Quorvan.ini", FirstSettings(), 0600);
-    MakeFile("Quorvan.cfg", FirstQuoteSources(), 0666);
+    MakeFile("Quorvan.ini", FirstSettings());
+    MakeFile("Quorvan.cfg", FirstQuoteSources());
     MakeHelp();
     InstallProgram("quorvan", options_.program);
     InstallProgram("quorvan-cli", options_.companion);

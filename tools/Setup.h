@@ -18,7 +18,8 @@ inline constexpr std::size_t MaxFolderLength = 108;
 
 // Makes a folder that the program runs from: the three data files, the settings, the quote sources, the
 // programs and the help. A file that exists is never changed (but for program and help when
-// options.updateProgram is set), and a new one comes into being complete or not at all. Each file gets a line
+// options.updateProgram is set), and a new one comes into being complete or not at all. What is made is the
+// person's alone, whatever the mask; what is there keeps its permissions. Each file gets a line
 // on `output` that tells what was done, each failure a sentence on `errors`; one file's failure does not stop
 // the others, except that no desktop gets a program whose folder is not whole. The sample goes into data
 // files of its own making only: with a portfol.db or invest.db that exists there is none. A folder that

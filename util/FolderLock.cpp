@@ -96,7 +96,8 @@ bool Names(const std::string& path, int file) {
            named.st_ino == opened.st_ino;
 }
 
-// Whoever may make files in the folder may lock it, whatever the maker's file mode mask.
+// Whoever may make files in the folder may lock it, and whoever may look into it may read who has it,
+// whatever the maker's file mode mask.
 void ShareWithFolder(int file, const std::string& lockPath) {
     struct stat folder {};
     struct stat own {};
@@ -160,7 +161,7 @@ FolderLock::Outcome FolderLock::Take(const std::string& folder, const std::strin
 
 std::optional<FolderLock::Outcome> FolderLock::TryToTake(const std::string& program, Doubt doubt) {
     constexpr int common = O_RDWR | O_NOFOLLOW | O_CLOEXEC | O_NONBLOCK | O_NOCTTY;
-    int file = open(path_.c_str(), common | O_CREAT | O_EXCL, 0666);
+    int file = open(path_.c_str(), common | O_CREAT | O_EXCL, 0600);
     if (file >= 0) {
         ShareWithFolder(file, path_);
     } else if (errno == EEXIST) {

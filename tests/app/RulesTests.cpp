@@ -203,37 +203,24 @@ TEST(PortfolioRules, ARenameTakesEveryInvestmentAlong) {
 }
 
 TEST(PortfolioRules, AReadErrorIsNoEmptyPortfolio) {
-    constexpr int all = -1;
     using File = DATABASE&;
-    const struct {
-        const char* what;
-        int portfolioReads; // before they fail
-        int investmentReads;
-        bool (*done)(DATABASE& portfolios, DATABASE& investments);
-    } cases[] = {
-        {"rename", all, 0, [](File p, File i) { return RenamePortfolio(p, i, "Old", "New"); }},
-        {"delete", all, 0, [](File p, File i) { return DeletePortfolio(p, i, "Old"); }},
-        {"delete", all, 1, [](File p, File i) { return DeletePortfolio(p, i, "Old"); }},
-        {"delete", 0, all, [](File p, File i) { return DeletePortfolio(p, i, "Old"); }},
-        {"add one that is there", 0, all, [](File p, File) { return AddPortfolio(p, "Old"); }},
-        {"total", all, 0, [](File, File i) { return TotalValue(i, "Old").has_value(); }},
-        {"total", all, 1, [](File, File i) { return TotalValue(i, "Old").has_value(); }},
-        {"restore", 0, all, [](File p, File i) { return !RestorePortfolios(p, i).empty(); }},
+    const std::tuple<const char*, unsigned, bool (*)(File portfolios, File investments)> cases[] = {
+        {"rename", 1, [](File p, File i) { return RenamePortfolio(p, i, "Old", "New"); }},
+        {"delete", 2, [](File p, File i) { return DeletePortfolio(p, i, "Old"); }},
+        {"add one that is there", 0, [](File p, File) { return AddPortfolio(p, "Old"); }},
+        {"total", 1, [](File, File i) { return TotalValue(i, "Old").has_value(); }},
+        {"restore", 0, [](File p, File i) { return !RestorePortfolios(p, i).empty(); }},
     };
-    for (const auto& each : cases) {
-        const FilledFolder folder({"Old"}, {"Other", "Old", "Old"});
-        WatchedFiles portfolioFiles;
-        WatchedFiles investmentFiles;
-        DATABASE portfolios(folder.File("portfol.db").c_str(), portfolioFiles);
-        DATABASE investments(folder.File("invest.db").c_str(), investmentFiles);
-        portfolios.SetReadCache(0);
-        investments.SetReadCache(0);
-        portfolioFiles.reads = each.portfolioReads;
-        investmentFiles.reads = each.investmentReads;
-        SCOPED_TRACE(each.what);
-        EXPECT_FALSE(each.done(portfolios, investments));
-        EXPECT_EQ(folder.Portfolios(), Texts{"Old"});
-        EXPECT_EQ(folder.Investments(), (Texts{"Other/n", "Old/n", "Old/n"}));
+    for (const auto& [what, reads, done] : cases) {
+        const FilledFolder folder({"Old"}, {"Other", "Old"});
+        WatchedFiles files;
+        DATABASE portfolios(folder.File("portfol.db").c_str(), files);
+        DATABASE investments(folder.File("invest.db").c_str(), files);
+        investments.SetReadCache(0); // so that a walk reads, too
+        files.reads = reads;
+        EXPECT_FALSE(done(portfolios, investments)) << what;
+        EXPECT_EQ(folder.Portfolios(), Texts{"Old"}) << what;
+        EXPECT_EQ(folder.Investments(), (Texts{"Other/n", "Old/n"})) << what;
     }
 }
 
@@ -297,6 +284,7 @@ TEST(CutFile, PutsBackWhatIsNotThere) {
     EXPECT_EQ(file.Restore(investments), CutFile::Outcome::NothingKept);
     folder.Write("cut.db.tmp", "left by a kill");
     ASSERT_TRUE(file.Keep(cut, std::vector<long>{0, 1, 2}));
+    EXPECT_EQ(std::filesystem::status(folder.File("cut.db")).permissions(), std::filesystem::perms{0600});
     EXPECT_FALSE(file.Keep(cut, std::vector<long>{0, 1, 2})) << "what is kept is not replaced";
     WatchedFiles failing;
     DATABASE unreadable(folder.File("invest.db").c_str(), failing);

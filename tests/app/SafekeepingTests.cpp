@@ -57,7 +57,7 @@ class BackupTest : public testing::Test {
 };
 
 TEST_F(BackupTest, TheFirstChangeOfADayKeepsWhatTheFilesHeld) {
-    std::filesystem::permissions(folder_.File("invest.db"), std::filesystem::perms{0640});
+    std::filesystem::permissions(folder_.File("invest.db"), std::filesystem::perms{0660}); // several people's
     const auto backup = MakeBackup();
     BackedUpFiles files(*backup);
     DATABASE invest(folder_.File("invest.db").c_str(), files);
@@ -80,7 +80,7 @@ TEST_F(BackupTest, TheFirstChangeOfADayKeepsWhatTheFilesHeld) {
     }
     EXPECT_EQ(Kept(), kept);
     EXPECT_EQ(std::filesystem::status(folder_.File("backups/invest.db.2026-11-23")).permissions(),
-              std::filesystem::perms{0640});
+              std::filesystem::perms{0660});
 }
 
 TEST_F(BackupTest, WithoutAChangeThereIsNone) {

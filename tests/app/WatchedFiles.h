@@ -8,8 +8,8 @@
 
 #include "db/Database.h"
 
-// Tells whether a data file of the running program has changes that a power cut would take, and lets it fail.
-// Used on the threads that use the file, one at a time.
+// Tells whether a data file of the running program has changes that a power cut would take. Used on the
+// threads that use the file, one at a time.
 class WatchedFiles : public FileOperations {
   public:
     // To be called while the program runs; the database goes before this object.
@@ -21,10 +21,7 @@ class WatchedFiles : public FileOperations {
 
     ssize_t ReadAt(int file, void* data, std::size_t size, off_t offset) override {
         errno = EIO;
-        if (reads == 0)
-            return -1;
-        reads -= reads > 0 ? 1 : 0;
-        return FileOperations::ReadAt(file, data, size, offset);
+        return reads == 0 ? -1 : (--reads, FileOperations::ReadAt(file, data, size, offset));
     }
     ssize_t WriteAt(int file, const void* data, std::size_t size, off_t offset) override {
         ++changes_;
@@ -47,7 +44,7 @@ class WatchedFiles : public FileOperations {
     }
 
     bool failing = false;
-    int reads = -1; // how many there are before they fail; negative: all
+    unsigned reads = -1U; // before they fail
     std::function<void()> beforeSync;
 
   private:

@@ -37,6 +37,8 @@ TEST(FolderLock, IsHeldByOneAndNamesItUntilReleased) {
     FolderLock first;
     ASSERT_EQ(first.Take(folder.Path(), "quorvan"), Outcome::Taken);
     const std::string text = folder.Read("Quorvan.lock");
+    EXPECT_EQ(std::filesystem::status(folder.File("Quorvan.lock")).permissions(),
+              std::filesystem::perms{0600});
     FolderLock second;
     EXPECT_EQ(second.Take(folder.Path(), "quorvan-cli", FolderLock::Doubt::PassOver), Outcome::Held);
     EXPECT_FALSE(second.IsTaken());

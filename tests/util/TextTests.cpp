@@ -141,6 +141,7 @@ TEST(DebugLog, AppendsAsGivenAndClears) {
     const std::string log = folder.File("Quorvan.log");
     PrintDebugStatement("100% %s\n", log.c_str());
     PrintDebugStatement("CLEARX", log.c_str());
+    EXPECT_EQ(std::filesystem::status(log).permissions(), std::filesystem::perms{0600});
     EXPECT_EQ(folder.Read("Quorvan.log"), "100% %s\nCLEARX");
     PrintDebugStatement("CLEAR", log.c_str());
     EXPECT_EQ(folder.Read("Quorvan.log"), "");
