@@ -204,20 +204,20 @@ TEST(PortfolioRules, ARenameTakesEveryInvestmentAlong) {
 
 TEST(PortfolioRules, AReadErrorIsNoEmptyPortfolio) {
     using File = DATABASE&;
-    const std::tuple<const char*, unsigned, bool (*)(File portfolios, File investments)> cases[] = {
-        {"rename", 1, [](File p, File i) { return RenamePortfolio(p, i, "Old", "New"); }},
-        {"delete", 2, [](File p, File i) { return DeletePortfolio(p, i, "Old"); }},
-        {"add one that is there", 0, [](File p, File) { return AddPortfolio(p, "Old"); }},
-        {"total", 1, [](File, File i) { return TotalValue(i, "Old").has_value(); }},
-        {"restore", 0, [](File p, File i) { return !RestorePortfolios(p, i).empty(); }},
+    const std::tuple<const char*, int, unsigned, bool (*)(File portfolios, File investments)> cases[] = {
+        {"rename", 1, 0, [](File p, File i) { return RenamePortfolio(p, i, "Old", "New"); }},
+        {"delete", 1, 1, [](File p, File i) { return DeletePortfolio(p, i, "Old"); }},
+        {"add one that is there", 0, 0, [](File p, File) { return AddPortfolio(p, "Old"); }},
+        {"total", 1, 1, [](File, File i) { return TotalValue(i, "Old").has_value(); }},
+        {"restore", 0, 0, [](File p, File i) { return !RestorePortfolios(p, i).empty(); }},
     };
-    for (const auto& [what, reads, done] : cases) {
+    for (const auto& [what, failing, reads, done] : cases) {
         const FilledFolder folder({"Old"}, {"Other", "Old"});
-        WatchedFiles files;
-        DATABASE portfolios(folder.File("portfol.db").c_str(), files);
-        DATABASE investments(folder.File("invest.db").c_str(), files);
+        WatchedFiles files[2];
+        DATABASE portfolios(folder.File("portfol.db").c_str(), files[0]);
+        DATABASE investments(folder.File("invest.db").c_str(), files[1]);
         investments.SetReadCache(0); // so that a walk reads, too
-        files.reads = reads;
+        files[failing].reads = reads;
         EXPECT_FALSE(done(portfolios, investments)) << what;
         EXPECT_EQ(folder.Portfolios(), Texts{"Old"}) << what;
         EXPECT_EQ(folder.Investments(), (Texts{"Other/n", "Old/n"})) << what;
