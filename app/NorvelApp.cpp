@@ -251,7 +251,7 @@ void NorvelApp::MessageReceived(BMessage* message) {
 
 bool NorvelApp::PassPasswordGate() {
     char password[PasswordSize];
-    INI_FILEx(state_.settingsPath).ReadString("GENERAL", "Password", "", password);
+    ReadSetting(INI_FILEx(state_.settingsPath), "GENERAL", "Password", password);
     if (password[0] == '\0')
         return true;
     BPoint center;

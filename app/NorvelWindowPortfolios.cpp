@@ -156,7 +156,7 @@ void NorvelWindow::OnPortfolioUpdate() {
 
 bool NorvelWindow::FindConnection() {
     char host[128];
-    settings_.ReadString("GENERAL", "IsConnectedURL", "", host);
+    ReadSetting(settings_, "GENERAL", "IsConnectedURL", host);
     const Connection connection = CheckConnection(host, WindowCorner());
     if (connection == Connection::NotFound)
         TellNotConnected();

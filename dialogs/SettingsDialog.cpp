@@ -14,7 +14,7 @@ constexpr const char* Key = "Password";
 SettingsDialog::SettingsDialog(BPoint where, uint16 flags)
     : PasswordForm(where, "Settings", flags), settings_(app_state->settingsPath) {
     char password[PasswordSize];
-    settings_.ReadString(Section, Key, "", password);
+    ReadSetting(settings_, Section, Key, password);
     SetPassword(password);
 }
 

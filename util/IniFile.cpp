@@ -7,6 +7,7 @@
 #include <sys/stat.h>
 
 #include "util/CharacterBuffer.h"
+#include "util/Strings.h"
 #include "util/WholeFile.h"
 
 namespace {
@@ -159,4 +160,13 @@ int INI_FILEx::WriteString(const char* section, const char* key, const char* val
 
 int INI_FILEx::WriteInt(const char* section, const char* key, int value) const {
     return WriteString(section, key, std::to_string(value).c_str());
+}
+
+void ReadSetting(const INI_FILEx& file, const char* section, const char* key, char* result,
+                 std::size_t size) {
+    file.ReadString(section, key, "", result, size);
+    const std::size_t length = std::string_view(result).size();
+    if (length > 0 && result[length - 1] == '\r')
+        result[length - 1] = '\0';
+    Trim(result);
 }

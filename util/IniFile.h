@@ -52,3 +52,12 @@ class INI_FILEx {
 
     char filePath_[PathBufferSize] = "";
 };
+
+// The text that a person wrote as the value of `key`, which may be in a file whose lines end in CR LF:
+// ReadString's value without that carriage return and the blanks before it; empty when there is none.
+void ReadSetting(const INI_FILEx& file, const char* section, const char* key, char* result, std::size_t size);
+
+template <std::size_t Size>
+void ReadSetting(const INI_FILEx& file, const char* section, const char* key, char (&result)[Size]) {
+    ReadSetting(file, section, key, result, Size);
+}

@@ -109,6 +109,7 @@ TEST(Start, ThePasswordOpensTheWindow) {
         {"a blank at the end is not kept", "Secret", "Secret ", Qt::Key_Return, true, nullptr},
         {"another letter case", "Secret", "secret", Qt::Key_Return, false, "Invalid password"},
         {"cancelled", "Secret", "Secret", Qt::Key_Escape, false, nullptr},
+        {"a line that ends in CR LF", "Secret \r", "Secret", Qt::Key_Return, true, nullptr},
         // So that a longer one in the file does not lock anybody out.
         {"15 bytes count", "0123456789abcdeXYZ", "0123456789abcdeXYZ", Qt::Key_Return, true, nullptr},
     };

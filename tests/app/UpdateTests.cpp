@@ -241,7 +241,7 @@ TEST_F(PriceUpdate, EndsWithAnAlertWhenNobodyCanBeAsked) {
         const char* alert = NoConnection;
     } cases[] = {
         {"[GENERAL]\nIsConnectedURL=127.0.0.1\n", "", "Unable to open '"},
-        {"[GENERAL]\nIsConnectedURL=127.0.0.1\n", "reset 127.0.0.1:1 /a Last 1\n", "connect() error\n"},
+        {"[GENERAL]\r\nIsConnectedURL=127.0.0.1\r\n", "reset 127.0.0.1:1 /a Last 1\n", "connect() error\n"},
         {"[GENERAL]\nIsConnectedURL=127.0.0.1\n", "stranger " + stranger.Host() + " /a Last 1\n",
          "https error: SSL certificate problem",
          "The server 127.0.0.1 could not be trusted: its certificate was refused, and it was not asked for a "

@@ -58,6 +58,7 @@ TEST_F(SettingsDialogTest, OkWritesAndCancelDoesNot) {
         const char* shown = "";
     } cases[] = {
         {"[GENERAL]\nPassword=abc\n", "new one", Qt::Key_Return, "[GENERAL]\nPassword=new one\n", "abc"},
+        {"[GENERAL]\r\nPassword=abc\r\n", "n", Qt::Key_Return, "[GENERAL]\r\nPassword=n\n", "abc"},
         {"[GENERAL]\n", "blank ", Qt::Key_Return, "[GENERAL]\nPassword=blank\n"},
         {"[GENERAL]\nPassword=abc\n", "", Qt::Key_Return, "[GENERAL]\nPassword=\n", "abc"},
         {"[GENERAL]\nPassword=0123456789abcdefgh\n", "new", Qt::Key_Escape,
