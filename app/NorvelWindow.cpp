@@ -34,7 +34,9 @@ constexpr const char* WidthKey = "ColumnWidth%d";
 constexpr int DefaultWidth = 50;
 // The size, in pixels, of the list's letters that the widths were saved for.
 constexpr const char* TextSizeKey = "TextSize";
-constexpr float GreatestWidthGrowth = 10;
+// What lies outside is no size of letters that can be read.
+constexpr int LeastTextSize = 6;
+constexpr int GreatestTextSize = 100;
 
 struct ColumnInfo {
     const char* label;
@@ -165,7 +167,9 @@ void NorvelWindow::AddInvestmentList(BView* topView, float top) {
 
 float NorvelWindow::WidthGrowth() const {
     const int size = settings_.ReadInt(WidthSection, TextSizeKey, 0);
-    return size > 0 ? std::min(be_fixed_font->Size() / static_cast<float>(size), GreatestWidthGrowth) : 1;
+    if (size < LeastTextSize || size > GreatestTextSize)
+        return 1;
+    return be_fixed_font->Size() / static_cast<float>(size);
 }
 
 void NorvelWindow::AddColumns() {
