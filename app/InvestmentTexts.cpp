@@ -48,9 +48,7 @@ void FormatPrice(float price, const char* type, FigureText& out) {
 }
 
 void FormatValue(float value, FigureText& out) {
-    char text[FormatNumberSize];
-    FormatNumber(value, text, 2);
-    CopyText(out, text);
+    FormatNumber(value, out, 2);
 }
 
 void FormatDay(const dbDATE& date, FigureText& out) {

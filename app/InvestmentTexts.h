@@ -1,15 +1,13 @@
 #pragma once
 
-#include <cstddef>
-
 #include "app/RecordLayouts.h"
+#include "util/Numbers.h"
 
 // How an investment's figures are written in a row of the list and in a report, and how its price moved. Pure
 // functions of the record.
 
-// At most 15 characters and a NUL: a text that is longer is cut.
-inline constexpr std::size_t FigureTextSize = 16;
-using FigureText = char[FigureTextSize];
+// Holds the longest text of any figure: a cut one would be another number.
+using FigureText = char[FormatNumberSize];
 
 // With three decimals.
 void FormatShares(float shares, FigureText& out);

@@ -112,27 +112,32 @@ const char* NorvelItem::Text(int32 column) const {
 }
 
 const char* NorvelItem::FigureOf(InvestmentColumn column) const {
+    if (column < InvestmentColumn::Shares || column > InvestmentColumn::Date)
+        return "";
     if (!figures_)
         figures_ = std::make_unique<Figures>();
+    const auto place = static_cast<int32>(column) - static_cast<int32>(InvestmentColumn::Shares);
+    std::unique_ptr<char[]>& figure = (*figures_)[static_cast<std::size_t>(place)];
+    if (!figure) {
+        FigureText text;
+        Format(column, text);
+        const std::size_t size = std::strlen(text) + 1;
+        figure = std::make_unique<char[]>(size);
+        std::copy_n(text, size, figure.get());
+    }
+    return figure.get();
+}
+
+void NorvelItem::Format(InvestmentColumn column, FigureText& out) const {
     switch (column) {
     case InvestmentColumn::Shares:
-        if (figures_->shares[0] == '\0')
-            FormatShares(shares_, figures_->shares);
-        return figures_->shares;
+        return FormatShares(shares_, out);
     case InvestmentColumn::Price:
-        if (figures_->price[0] == '\0')
-            FormatPrice(price_, FieldText(Type), figures_->price);
-        return figures_->price;
+        return FormatPrice(price_, FieldText(Type), out);
     case InvestmentColumn::Value:
-        if (figures_->value[0] == '\0')
-            FormatValue(value_, figures_->value);
-        return figures_->value;
-    case InvestmentColumn::Date:
-        if (figures_->date[0] == '\0')
-            FormatDay(date_, figures_->date);
-        return figures_->date;
+        return FormatValue(value_, out);
     default:
-        return "";
+        return FormatDay(date_, out);
     }
 }
 

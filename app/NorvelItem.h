@@ -1,5 +1,6 @@
 #pragma once
 
+#include <array>
 #include <memory>
 
 #include "ColumnListView/CLVListItem.h"
@@ -56,14 +57,9 @@ class NorvelItem : public CLVListItem {
     // The fields of a record that are shown as they are stored, one behind the other at the row's end.
     enum Field { Name, Ticker, Type, Agent, Risk, FieldCount };
     struct Fields;
-    // The texts of the figures, each empty until it is asked for. Formatting every figure of every row would
-    // take longer than reading the file, and most rows are never seen.
-    struct Figures {
-        FigureText shares = "";
-        FigureText price = "";
-        FigureText value = "";
-        FigureText date = "";
-    };
+    // The texts of the columns from Shares to Date, each null until it is asked for. Formatting every figure
+    // of every row would take longer than reading the file, and most rows are never seen.
+    using Figures = std::array<std::unique_ptr<char[]>, 4>;
 
     struct TextBytes {
         std::size_t count;
@@ -78,6 +74,7 @@ class NorvelItem : public CLVListItem {
         return reinterpret_cast<const char*>(this + 1) + begins_[field];
     }
     [[nodiscard]] const char* FigureOf(InvestmentColumn column) const;
+    void Format(InvestmentColumn column, FigureText& out) const;
     void DrawStatus(BView* owner, BRect columnRect) const;
 
     int32 recordNumber_;

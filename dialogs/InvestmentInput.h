@@ -24,8 +24,9 @@ enum class InvestmentCheck {
     TooLarge, // shares, price or their product is beyond what a record can hold
 };
 
-// What the form's fields can hold for shares and price: more than any amount that is worth typing.
-inline constexpr int MaxAmountBytes = 31;
+// What the form's fields can hold for shares and price: more than the longest amount of a record is shown
+// with.
+inline constexpr int MaxAmountBytes = 47;
 
 // A record's shares and price as the form shows them, with three and two decimals; empty unless above 0.
 [[nodiscard]] std::string ShownShares(const INVESTMENT_DATA& record);

@@ -32,7 +32,7 @@ TEST(NorvelItem, FieldsWithoutAnEndAreShownToTheirs) {
                                          {Column::Type, 31},
                                          {Column::Agent, 31},
                                          {Column::Risk, 71},
-                                         {Column::Price, 15}})
+                                         {Column::Price, 38}})
         EXPECT_EQ(std::strlen(item->Text(static_cast<int32>(column))), length);
 }
 

@@ -213,6 +213,7 @@ TEST(InvestmentInput, AmountsLeftAsShownStayWhatTheyWere) {
         input.shares = ShownShares(record);
         input.price = ShownPrice(record);
         EXPECT_LE(input.price.size(), std::size_t{MaxAmountBytes});
+        EXPECT_TRUE(exact < 1e9F || std::stof(input.price) == exact) << input.price;
         EXPECT_EQ(FillInvestment(input, &record), InvestmentCheck::Accepted);
         EXPECT_EQ(record.Shares, 1.0004F);
         EXPECT_EQ(record.Price, exact);
