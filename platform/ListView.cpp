@@ -220,6 +220,14 @@ int32 BListView::CurrentSelection(int32 index) const {
     return ListAccess::Peer(*this).selection.Nth(index);
 }
 
+int32 BListView::CurrentRow() const {
+    return ListAccess::Peer(*this).selection.Current();
+}
+
+void BListView::SetCurrentRow(int32 index) {
+    ListAccess::Peer(*this).selection.SetCurrent(index);
+}
+
 void BListView::SortItems(const std::function<int(const BListItem*, const BListItem*)>& compare) {
     ListPeer& peer = ListAccess::Peer(*this);
     std::vector<BListItem*> rows = peer.model.Rows();
@@ -270,6 +278,13 @@ void BListView::ScrollTo(BPoint where) {
     RowsWidget* rows = ListAccess::Peer(*this).Rows();
     if (where != rows->Offset())
         rows->SetOffset(where);
+}
+
+void BListView::ScrollToRow(int32 index) {
+    const BRect row = ItemFrame(index);
+    const BRect seen = Bounds();
+    if (row.IsValid())
+        ScrollTo({seen.left, std::min(row.top, std::max(seen.top, row.bottom - seen.Height()))});
 }
 
 BRect BListView::Bounds() const {

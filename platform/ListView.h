@@ -51,7 +51,8 @@ enum list_view_type { B_SINGLE_SELECTION_LIST, B_MULTIPLE_SELECTION_LIST };
 
 // A list of rows, drawn for the visible ones only, so that its size costs nothing but memory. Rows are
 // borrowed. Selection and keys are the toolkit's own: arrows, Home, End, Page keys, Shift and Control clicks,
-// typed letters; Left and Right scroll. A double click or Enter sends the invocation message.
+// typed letters; Left and Right scroll. As long as no row was chosen, they begin at the first row, and End at
+// the last. A double click or Enter sends the invocation message.
 class BListView : public BView, public BInvoker {
   public:
     BListView(BRect frame, const char* name, list_view_type type = B_SINGLE_SELECTION_LIST,
@@ -90,6 +91,10 @@ class BListView : public BView, public BInvoker {
     [[nodiscard]] int32 CurrentSelection(int32 index = 0) const;
     // Called after the selection has changed.
     virtual void SelectionChanged() {}
+    // The row that keys go on from, selected or not; -1 when there is none.
+    [[nodiscard]] int32 CurrentRow() const;
+    // Makes it this one, without selecting it and without scrolling.
+    void SetCurrentRow(int32 index);
 
     // Takes ownership of message.
     void SetInvocationMessage(BMessage* message) { SetMessage(message); }
@@ -109,6 +114,8 @@ class BListView : public BView, public BInvoker {
     void MouseDown(BPoint where) override;
     // Called when the rows were scrolled, by whatever means, and to scroll them.
     void ScrollTo(BPoint where) override;
+    // Scrolls up or down, no further than needed, until the row is seen.
+    void ScrollToRow(int32 index);
     [[nodiscard]] BRect Bounds() const override;
     void SetFont(const BFont* font, uint32 properties = B_FONT_ALL) override;
 

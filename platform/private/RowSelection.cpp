@@ -76,13 +76,24 @@ int32 RowSelection::Nth(int32 n) const {
     return n < 0 || place >= order_.size() ? -1 : order_[place] - shift_;
 }
 
-// The program's selecting never scrolls.
-void RowSelection::Select(int32 first, int32 last, bool extend) {
+int32 RowSelection::Current() const {
+    if (attached_)
+        return view_.currentIndex().row();
+    return current_ ? view_.IndexOf(current_) : -1;
+}
+
+// The program's choosing never scrolls.
+void RowSelection::SetCurrent(int32 index) {
     Attach();
     view_.setAutoScroll(false);
-    if (!extend)
-        view_.selectionModel()->setCurrentIndex(model_.index(first), QItemSelectionModel::NoUpdate);
+    view_.selectionModel()->setCurrentIndex(model_.index(index), QItemSelectionModel::NoUpdate);
     view_.setAutoScroll(true);
+}
+
+void RowSelection::Select(int32 first, int32 last, bool extend) {
+    Attach();
+    if (!extend)
+        SetCurrent(first);
     view_.selectionModel()->select(QItemSelection(model_.index(first), model_.index(last)),
                                    extend ? QItemSelectionModel::Select
                                           : QItemSelectionModel::ClearAndSelect);

@@ -28,6 +28,10 @@ class RowSelection {
     void Deselect(int32 index);
     void Clear();
 
+    // The index of the row that keys go on from, or -1.
+    [[nodiscard]] int32 Current() const;
+    void SetCurrent(int32 index);
+
     // To be called before rows change.
     void Detach();
     // Brings the toolkit's selection and current row in line again; nothing when it is.

@@ -83,6 +83,7 @@ BPoint RowsWidget::Offset() const {
 }
 
 void RowsWidget::SetOffset(BPoint offset) {
+    executeDelayedItemsLayout(); // so that the bars know how far rows that just came reach
     settingOffset_ = true;
     horizontalScrollBar()->setValue(static_cast<int>(std::lround(offset.x)));
     verticalScrollBar()->setValue(static_cast<int>(std::lround(offset.y)));
@@ -201,7 +202,17 @@ void RowsWidget::changeEvent(QEvent* event) {
 void RowsWidget::focusInEvent(QFocusEvent* event) {
     if (peer_)
         peer_->selection.Attach();
+    const bool chosen = currentIndex().isValid();
     QListView::focusInEvent(event);
+    if (!chosen)
+        focusMark_ = currentIndex();
+}
+
+// Without a row to go on from, the toolkit would take End to the first one, too.
+QModelIndex RowsWidget::moveCursor(CursorAction action, Qt::KeyboardModifiers modifiers) {
+    if (action == MoveEnd && !currentIndex().isValid())
+        return model()->index(model()->rowCount() - 1, 0);
+    return QListView::moveCursor(action, modifiers);
 }
 
 void RowsWidget::Input(QInputEvent* event) {
@@ -297,14 +308,33 @@ void RowsWidget::HandleKey(QKeyEvent* event) {
         if (event->isAccepted())
             InvokeCurrent();
     } else {
-        QListView::keyPressEvent(event);
+        HandleListKey(event);
     }
+}
+
+// A row that is only marked because the focus came was chosen by nobody, so keys do not go on from it. One
+// that keys cannot leave, such as the first by Home, is selected where it is.
+void RowsWidget::HandleListKey(QKeyEvent* event) {
+    constexpr int moving[] = {Qt::Key_Up,  Qt::Key_Down,   Qt::Key_Home,
+                              Qt::Key_End, Qt::Key_PageUp, Qt::Key_PageDown};
+    const bool moves = std::find(std::begin(moving), std::end(moving), event->key()) != std::end(moving);
+    if (moves && !selectionModel()->hasSelection() && currentIndex() == focusMark_)
+        selectionModel()->clearCurrentIndex();
+    QListView::keyPressEvent(event);
+    if (!moves || (event->modifiers() & Qt::ControlModifier) || selectionModel()->hasSelection())
+        return;
+    SelectCurrentIfNone();
+    owner_->ScrollToRow(currentIndex().row());
 }
 
 // What is invoked is what is selected; a row that only has the keyboard's mark is selected first.
 void RowsWidget::InvokeCurrent() {
-    if (peer_->selection.Nth(0) < 0 && currentIndex().isValid())
-        peer_->selection.Select(currentIndex().row(), currentIndex().row(), false);
+    SelectCurrentIfNone();
     if (peer_->selection.Nth(0) >= 0)
         owner_->Invoke();
+}
+
+void RowsWidget::SelectCurrentIfNone() {
+    if (!selectionModel()->hasSelection() && currentIndex().isValid())
+        peer_->selection.Select(currentIndex().row(), currentIndex().row(), false);
 }

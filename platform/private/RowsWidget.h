@@ -50,6 +50,7 @@ class RowsWidget : public QListView {
     void updateGeometries() override;
     void changeEvent(QEvent* event) override;
     void focusInEvent(QFocusEvent* event) override;
+    QModelIndex moveCursor(CursorAction action, Qt::KeyboardModifiers modifiers) override;
     void keyPressEvent(QKeyEvent* event) override { Input(event); }
     void mousePressEvent(QMouseEvent* event) override { Input(event); }
     void mouseDoubleClickEvent(QMouseEvent* event) override { Input(event); }
@@ -62,6 +63,8 @@ class RowsWidget : public QListView {
     void Handle(QInputEvent* event);
     void HandlePress(QMouseEvent* event);
     void HandleKey(QKeyEvent* event);
+    void HandleListKey(QKeyEvent* event);
+    void SelectCurrentIfNone();
     void InvokeCurrent();
     void ShowBarIfNeeded();
     [[nodiscard]] int ContentWidth() const;
@@ -72,6 +75,7 @@ class RowsWidget : public QListView {
     std::deque<std::unique_ptr<QInputEvent>> heldBack_;
     QMouseEvent* press_ = nullptr;     // while MouseDown runs
     QPersistentModelIndex pressedRow_; // by the last press that was forwarded
+    QPersistentModelIndex focusMark_;  // the row that the toolkit made current as the focus came
     bool pressForwarded_ = false;
     bool mayScrollSideways_ = false;
     bool settingOffset_ = false;

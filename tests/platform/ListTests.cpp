@@ -257,6 +257,23 @@ TEST(Lists, AreWorkedWithKeysAndPointer) {
     EXPECT_EQ(stage.Selected(), Indexes{99 - 42});
 }
 
+TEST(Lists, KeysBeginAtAnEndUntilARowIsChosen) {
+    for (const auto& [key, selected] : {std::pair{Qt::Key_Down, 0}, {Qt::Key_Home, 0}, {Qt::Key_End, 9}}) {
+        ListStage stage(10);
+        stage.Show();
+        stage.Key(key);
+        EXPECT_EQ(stage.Selected(), Indexes{selected});
+        stage.list->DeselectAll();
+        stage.Key(selected == 0 ? Qt::Key_Up : Qt::Key_Down); // nowhere to go
+        EXPECT_EQ(stage.Selected(), Indexes{selected});
+        stage.list->MakeEmpty(); // other rows come
+        for (std::size_t row = 0; row < 5; row++)
+            stage.list->AddItem(stage.rows[row].get());
+        stage.Key(key);
+        EXPECT_EQ(stage.Selected(), Indexes{selected / 2});
+    }
+}
+
 TEST(Lists, OfOneSelectionKeepToOneAndTellIt) {
     ListStage stage(10, B_SINGLE_SELECTION_LIST);
     stage.Show();
