@@ -109,6 +109,16 @@ class NorvelWindow : public BWindow {
 
     // --- investments ---
     void LoadInvestmentList();
+    // The same for the portfolio that is shown already: the list stays where it is scrolled to, and its
+    // current row stays current.
+    void ReloadInvestmentList();
+    void ScrollToFirstRow();
+    // Scrolls the row into sight and makes it the current one; what is selected stays.
+    void ShowRow(int32 index);
+    // The same for the first row of those whose records came from this number on; all are seen that fit.
+    void ShowRowsFrom(int32 recordNumber);
+    // Null when the index lies outside.
+    [[nodiscard]] NorvelItem* RowAt(int32 index) const;
     void ClearInvestmentList();
     // Shows total when it is 0 or more, else the current portfolio's, or that this is not known.
     void DisplayTotalValue(float total);

@@ -63,6 +63,46 @@ void NorvelWindow::LoadInvestmentList() {
     TellNotRead();
 }
 
+void NorvelWindow::ReloadInvestmentList() {
+    const BPoint place = investmentList_->Bounds().LeftTop();
+    const auto* current = RowAt(investmentList_->CurrentRow());
+    const int32 number = current ? current->RecordNumber() : -1;
+    LoadInvestmentList();
+    for (int32 i = 0; current && i < investmentList_->CountItems(); ++i) {
+        if (RowAt(i)->RecordNumber() == number)
+            investmentList_->SetCurrentRow(i);
+    }
+    investmentList_->ScrollTo(place);
+}
+
+void NorvelWindow::ScrollToFirstRow() {
+    investmentList_->ScrollTo({investmentList_->Bounds().left, 0});
+}
+
+void NorvelWindow::ShowRow(int32 index) {
+    investmentList_->SetCurrentRow(index);
+    investmentList_->ScrollToRow(index);
+}
+
+void NorvelWindow::ShowRowsFrom(int32 recordNumber) {
+    int32 first = -1;
+    int32 last = -1;
+    for (int32 i = 0; i < investmentList_->CountItems(); ++i) {
+        if (RowAt(i)->RecordNumber() < recordNumber)
+            continue;
+        first = first < 0 ? i : first;
+        last = i;
+    }
+    if (first < 0)
+        return;
+    investmentList_->ScrollToRow(last);
+    ShowRow(first);
+}
+
+NorvelItem* NorvelWindow::RowAt(int32 index) const {
+    return static_cast<NorvelItem*>(investmentList_->ItemAt(index));
+}
+
 void NorvelWindow::ClearInvestmentList() {
     std::vector<BListItem*> rows;
     rows.reserve(static_cast<std::size_t>(investmentList_->CountItems()));
@@ -127,12 +167,13 @@ void NorvelWindow::OnInvestmentAdd() {
         return;
     }
     investmentList_->AddItem(CreateNewInvestmentItem(record, static_cast<int32>(number)));
+    ShowRow(investmentList_->CountItems() - 1);
     DisplayTotalValue(-1);
 }
 
 void NorvelWindow::OnInvestmentEdit() {
     const int32 index = investmentList_->CurrentSelection();
-    auto* row = static_cast<NorvelItem*>(investmentList_->ItemAt(index));
+    const NorvelItem* row = RowAt(index);
     if (!row) {
         MessageBox("You must select an investment to edit!", B_INFO_ALERT);
         return;
@@ -149,11 +190,10 @@ void NorvelWindow::OnInvestmentEdit() {
         TellNotSaved();
         return;
     }
-    // The new row first: then the keyboard stays on it when the old one goes.
-    investmentList_->AddItem(CreateNewInvestmentItem(record, number), index + 1);
     investmentList_->RemoveItem(index);
+    investmentList_->AddItem(CreateNewInvestmentItem(record, number), index);
     delete row;
-    investmentList_->Select(index, true);
+    ShowRow(index);
     DisplayTotalValue(-1);
 }
 
@@ -169,7 +209,7 @@ void NorvelWindow::OnInvestmentDelete() {
         all = app_state->investments->Delete(row->RecordNumber()) == 0 && all;
     if (!all) {
         TellNotSaved();
-        LoadInvestmentList();
+        ReloadInvestmentList();
         return;
     }
     RemoveSelectedRows();
@@ -257,6 +297,8 @@ void NorvelWindow::OnInvestmentPaste() {
     AppState& state = *app_state;
     if (state.clipboardCount <= 0 || currentPortfolio_[0] == '\0')
         return;
+    DATABASE_HEADER before{};
+    state.investments->GetHeaderInfo(&before);
     if (AppendCopies(*state.investments,
                      {state.clipboard.get(), static_cast<std::size_t>(state.clipboardCount)},
                      currentPortfolio_) &&
@@ -264,5 +306,6 @@ void NorvelWindow::OnInvestmentPaste() {
         CutIsSettled();
     else
         TellNotSaved();
-    LoadInvestmentList();
+    ReloadInvestmentList();
+    ShowRowsFrom(before.recordCount);
 }

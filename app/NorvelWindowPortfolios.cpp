@@ -64,6 +64,7 @@ void NorvelWindow::SelectFirstPortfolioMenuItem() {
     }
     first->SetMarked(true);
     CopyTextZeroed(currentPortfolio_, first->Label());
+    ScrollToFirstRow(); // of the list that is about to be shown
     PostSelection(currentPortfolio_);
 }
 
@@ -91,9 +92,15 @@ void NorvelWindow::OnPortfolioSelected(BMessage* message) {
     const char* name = nullptr;
     if (message->FindString(PortfolioNameField, &name) != B_OK)
         return;
+    const bool shown = std::strcmp(currentPortfolio_, name) == 0;
     CopyTextZeroed(currentPortfolio_, name);
     MarkCurrentPortfolio();
-    LoadInvestmentList();
+    if (shown) {
+        ReloadInvestmentList();
+    } else {
+        LoadInvestmentList();
+        ScrollToFirstRow();
+    }
 }
 
 void NorvelWindow::OnPortfolioAdd() {
@@ -138,7 +145,7 @@ void NorvelWindow::OnPortfolioDelete() {
         return;
     if (!DeletePortfolio(*app_state->portfolios, *app_state->investments, currentPortfolio_)) {
         TellNotSaved();
-        LoadInvestmentList();
+        ReloadInvestmentList();
         return;
     }
     RemoveMarkedItem();

@@ -114,9 +114,11 @@ class Program : public DataFolder, public Driver {
         return names;
     }
     static QAbstractItemView* RowsWidget() { return Main()->findChild<QAbstractItemView*>(); }
+    // Once the row is in sight.
     static QPoint PlaceOfRow(int32 index) {
+        List()->ScrollToRow(index);
         const BRect frame = List()->ItemFrame(index);
-        return {30, static_cast<int>((frame.top + frame.bottom) / 2)};
+        return {30, static_cast<int>((frame.top + frame.bottom) / 2 - List()->Bounds().top)};
     }
     static void ClickRow(int32 index, Qt::KeyboardModifiers keys = {}) {
         QTest::mouseClick(RowsWidget()->viewport(), Qt::LeftButton, keys, PlaceOfRow(index));
