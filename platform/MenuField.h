@@ -6,7 +6,8 @@
 
 // A label with a button that shows a menu's marked item and opens the menu. Owns the menu. The button is as
 // wide as its text asks for, within the frame; a text that does not fit is shortened in the middle and shown
-// whole as a tool tip.
+// whole as a tool tip. The menu is one column that stays on the screen and scrolls where it is too high for
+// it.
 class BMenuField : public BView {
   public:
     // The height is adjusted to what the button needs. Takes ownership of menu.

@@ -17,12 +17,15 @@ void FieldButton::SetMenu(QMenu* menu) {
     setMenu(menu);
     if (!menu)
         return;
+    // One column that scrolls: the toolkit would go on in further columns, beyond the screen's edge.
+    menu->setStyleSheet(QStringLiteral("QMenu { menu-scrollable: 1; }"));
     disconnect(this, &QPushButton::pressed, this, nullptr);
     connect(this, &QPushButton::pressed, this, [this] { Open(); });
     connect(menu, &QMenu::aboutToHide, this, [this] { setDown(false); });
 }
 
-// Below the button, or above it where the screen ends. A press outside only closes the menu.
+// Below the button, or above it where the screen ends. Where neither has room for all of it, the toolkit
+// uses the screen's whole height. A press outside only closes the menu.
 void FieldButton::Open() {
     QMenu* opened = menu();
     if (!opened || opened->isVisible())
