@@ -5,7 +5,6 @@
 #include "app/AppState.h"
 #include "app/FailureAlerts.h"
 #include "app/PortfolioRules.h"
-#include "dialogs/InvestmentInput.h"
 #include "platform/Alert.h"
 #include "platform/CheckBox.h"
 #include "platform/MenuField.h"
@@ -33,6 +32,23 @@ void MarkItem(BMenu* menu, const std::string& label) {
 
 void Warn(const char* text) {
     (new BAlert("", text, "Ok", nullptr, nullptr, B_WIDTH_AS_USUAL, B_WARNING_ALERT))->Go();
+}
+
+const char* WhyNot(InvestmentCheck check) {
+    switch (check) {
+    case InvestmentCheck::NoName:
+        return "You must enter a Name!";
+    case InvestmentCheck::SharesNotPlain:
+        return "Shares must be a plain number such as 1250.5, with a point and no other separator!";
+    case InvestmentCheck::PriceNotPlain:
+        return "Share price must be a plain number such as 1250.5, with a point and no other separator!";
+    case InvestmentCheck::SharesTooLarge:
+        return "The number of shares is too large!";
+    case InvestmentCheck::PriceTooLarge:
+        return "The share price is too large!";
+    default:
+        return "Shares times share price is too large!";
+    }
 }
 
 } // namespace
@@ -166,20 +182,24 @@ int InvestmentDialog::OnOK() {
         input.risk = risk->Label();
     input.agent = agentControl_->Text();
     input.retirement = retirementCheckBox_->Value() == B_CONTROL_ON;
-    switch (FillInvestment(input, investment_)) {
+    const InvestmentCheck check = FillInvestment(input, investment_);
+    if (check == InvestmentCheck::Accepted)
+        return 1;
+    Warn(WhyNot(check));
+    ControlOf(check)->MakeFocus();
+    return 0;
+}
+
+BTextControl* InvestmentDialog::ControlOf(InvestmentCheck check) const {
+    switch (check) {
     case InvestmentCheck::NoName:
-        Warn("You must enter a Name!");
-        return 0;
-    case InvestmentCheck::NotPlain:
-        Warn("Shares or price is not a plain number such as 1250.5!");
-        return 0;
-    case InvestmentCheck::TooLarge:
-        Warn("Shares or price is too large!");
-        return 0;
-    case InvestmentCheck::Accepted:
-        break;
+        return nameControl_;
+    case InvestmentCheck::PriceNotPlain:
+    case InvestmentCheck::PriceTooLarge:
+        return priceControl_;
+    default:
+        return sharesControl_;
     }
-    return 1;
 }
 
 int InvestmentDialog::HandleMessage(BMessage* message) {

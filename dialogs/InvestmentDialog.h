@@ -2,6 +2,7 @@
 
 #include "app/RecordLayouts.h"
 #include "dialogs/BDialog.h"
+#include "dialogs/InvestmentInput.h"
 
 class BCheckBox;
 class BMenuField;
@@ -28,6 +29,9 @@ class InvestmentDialog : public BDialog {
     int HandleMessage(BMessage* message) override;
 
   private:
+    // The field that what was refused is in.
+    [[nodiscard]] BTextControl* ControlOf(InvestmentCheck check) const;
+
     void AddRows();
     void AddRetirementRow();
     BTextControl* AddTextRow(const char* name, const char* label, const char* text, float width,

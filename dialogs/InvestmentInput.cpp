@@ -19,7 +19,8 @@ std::string ShownAmount(float amount, int decimals) {
 }
 
 // `shown` is the text for the amount as it is.
-InvestmentCheck ReadAmount(const std::string& text, const std::string& shown, float* amount) {
+InvestmentCheck ReadAmount(const std::string& text, const std::string& shown, float* amount,
+                           InvestmentCheck notPlain, InvestmentCheck tooLarge) {
     // An amount below 0 is shown as no text.
     if (text == shown && (!text.empty() || *amount < 0))
         return InvestmentCheck::Accepted;
@@ -28,10 +29,10 @@ InvestmentCheck ReadAmount(const std::string& text, const std::string& shown, fl
     const bool inRange = ReadDecimal(text.c_str(), &number, &rest);
     const bool anyNumber = text.find_first_of("0123456789") != std::string::npos;
     if (anyNumber && (rest == text.c_str() || rest[std::strspn(rest, " \t")] != '\0'))
-        return InvestmentCheck::NotPlain;
+        return notPlain;
     // In a record's single precision it would be stored as infinite.
     if (!inRange || std::fabs(number) > std::numeric_limits<float>::max())
-        return InvestmentCheck::TooLarge;
+        return tooLarge;
     *amount = static_cast<float>(number);
     return InvestmentCheck::Accepted;
 }
@@ -63,13 +64,16 @@ InvestmentCheck FillInvestment(const InvestmentInput& input, INVESTMENT_DATA* re
         return InvestmentCheck::NoName;
     float shares = record->Shares;
     float price = record->Price;
-    for (const InvestmentCheck check : {ReadAmount(input.shares, ShownShares(*record), &shares),
-                                        ReadAmount(input.price, ShownPrice(*record), &price)}) {
+    for (const InvestmentCheck check :
+         {ReadAmount(input.shares, ShownShares(*record), &shares, InvestmentCheck::SharesNotPlain,
+                     InvestmentCheck::SharesTooLarge),
+          ReadAmount(input.price, ShownPrice(*record), &price, InvestmentCheck::PriceNotPlain,
+                     InvestmentCheck::PriceTooLarge)}) {
         if (check != InvestmentCheck::Accepted)
             return check;
     }
     if (!std::isfinite(shares * price))
-        return InvestmentCheck::TooLarge;
+        return InvestmentCheck::ValueTooLarge;
     CopyTextZeroed(record->Name, input.name);
     CopyTextZeroed(record->Ticker, input.ticker);
     CopyTextZeroed(record->Type, input.type);

@@ -18,10 +18,14 @@ struct InvestmentInput {
 
 enum class InvestmentCheck {
     Accepted,
-    NoName,   // empty, or nothing but blanks
-    NotPlain, // there are digits in shares or price, and more than a number: "44,50", "12 3/8" or "$5" must
-              // not become 44, 12 or 0
-    TooLarge, // shares, price or their product is beyond what a record can hold
+    NoName, // empty, or nothing but blanks
+    // There are digits, and more than a number: "44,50", "12 3/8" or "$5" must not become 44, 12 or 0.
+    SharesNotPlain,
+    PriceNotPlain,
+    // Beyond what a record can hold.
+    SharesTooLarge,
+    PriceTooLarge,
+    ValueTooLarge,
 };
 
 // What the form's fields can hold for shares and price: more than the longest amount of a record is shown

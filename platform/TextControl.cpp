@@ -4,8 +4,10 @@
 #include <cmath>
 #include <limits>
 
+#include <QApplication>
 #include <QLineEdit>
 #include <QTextBoundaryFinder>
+#include <QToolTip>
 #include <QValidator>
 
 #include "platform/private/LabelledBox.h"
@@ -13,11 +15,15 @@
 
 namespace {
 
+// What comes from a table or an editor often ends in a line end, which nobody means.
 QString WithoutControls(QString text) {
-    for (QChar& letter : text)
-        if (letter.category() == QChar::Other_Control || letter == QChar::LineSeparator ||
-            letter == QChar::ParagraphSeparator)
-            letter = QLatin1Char(' ');
+    const auto isControl = [](QChar letter) {
+        return letter.category() == QChar::Other_Control || letter == QChar::LineSeparator ||
+               letter == QChar::ParagraphSeparator;
+    };
+    while (!text.isEmpty() && isControl(text.back()))
+        text.chop(1);
+    std::replace_if(text.begin(), text.end(), isControl, QLatin1Char(' '));
     return text;
 }
 
@@ -38,25 +44,6 @@ QString CutToBytes(const QString& text, qsizetype room) {
     return text.left(fits);
 }
 
-// The part of a changed text that was put in: what lies between the beginning and the end that it shares with
-// the text before. The end starts at the cursor, which stands behind what was put in.
-struct Change {
-    qsizetype start;
-    qsizetype length;
-
-    Change(const QString& before, const QString& after, qsizetype cursor) {
-        const auto common = std::min(before.size(), after.size());
-        qsizetype tail = 0;
-        while (tail < std::min(common, after.size() - cursor) &&
-               before[before.size() - 1 - tail] == after[after.size() - 1 - tail])
-            tail++;
-        start = 0;
-        while (start < common - tail && before[start] == after[start])
-            start++;
-        length = after.size() - tail - start;
-    }
-};
-
 } // namespace
 
 // Keeps a line's text within its bounds whatever way it is changed: the toolkit asks a validator about every
@@ -65,35 +52,40 @@ class TextControlFilter : public QValidator {
     Q_DISABLE_COPY_MOVE(TextControlFilter)
 
   public:
-    explicit TextControlFilter(QLineEdit* line) : QValidator(line) {
+    explicit TextControlFilter(QLineEdit* line) : QValidator(line), line_(line) {
         line->setValidator(this);
-        QObject::connect(line, &QLineEdit::textChanged, this,
-                         [this](const QString& text) { before_ = text; });
+        QObject::connect(line, &QLineEdit::inputRejected, this, [this] { TellTooLong(); });
+        QObject::connect(line, &QLineEdit::textEdited, this, [] { QToolTip::hideText(); });
     }
 
-    void SetMaxBytes(qsizetype bytes) { maxBytes_ = bytes; }
+    void SetMaxBytes(qsizetype bytes) {
+        maxBytes_ = bytes;
+        line_->setToolTip(QStringLiteral("At most %1 characters").arg(bytes));
+    }
     [[nodiscard]] QString Fit(const QString& text) const {
         return CutToBytes(WithoutControls(text), maxBytes_);
     }
 
     State validate(QString& text, int& cursor) const override {
-        const Change change(before_, text, cursor);
-        const QString put = text.mid(change.start, change.length);
-        const QString kept = text.left(change.start) + text.mid(change.start + change.length);
-        const QString taken = CutToBytes(WithoutControls(put), maxBytes_ - kept.toUtf8().size());
-        if (taken == put)
-            return Acceptable;
-        QString result = kept;
-        result.insert(change.start, taken);
-        if (result == before_)
+        const QString clean = WithoutControls(text);
+        if (clean.toUtf8().size() > maxBytes_)
             return Invalid;
-        text = result;
-        cursor = std::min(cursor, static_cast<int>(change.start + taken.size()));
+        text = clean;
+        cursor = std::min(cursor, static_cast<int>(clean.size()));
         return Acceptable;
     }
 
   private:
-    QString before_;
+    void TellTooLong() const {
+        QApplication::beep();
+        QToolTip::showText(line_->mapToGlobal(QPoint(0, line_->height())),
+                           QStringLiteral("This is too long. At most %1 characters fit here; a letter with "
+                                          "an accent counts as two.")
+                               .arg(maxBytes_),
+                           line_);
+    }
+
+    QLineEdit* line_;
     qsizetype maxBytes_ = std::numeric_limits<int32>::max();
 };
 

@@ -22,9 +22,11 @@ class BTextControl : public BControl {
     void SetDivider(float divider);
     [[nodiscard]] float Divider() const;
 
-    // Limits the text to a number of bytes of UTF-8, typed, pasted, dropped or set: what is put in is cut,
-    // between whole characters, and what was there stays (a text too long when the limit is set is cut at its
-    // end). With or without a limit, line ends, tabs and other control characters are turned into blanks.
+    // Limits the text to a number of bytes of UTF-8. What is typed, pasted or dropped and does not fit is not
+    // taken, not even in part, and the person hears and reads so; the tool tip names the limit. What the
+    // program sets, or had set before the limit, is cut at its end, between whole characters. With or without
+    // a limit, line ends, tabs and other control characters are left out at the end and turned into blanks
+    // elsewhere.
     void SetMaxBytes(int32 bytes);
 
     void MakeFocus(bool focus = true) override;

@@ -114,7 +114,6 @@ class Program : public DataFolder, public Driver {
         return names;
     }
     static QAbstractItemView* RowsWidget() { return Main()->findChild<QAbstractItemView*>(); }
-    // Once the row is in sight.
     static QPoint PlaceOfRow(int32 index) {
         List()->ScrollToRow(index);
         const BRect frame = List()->ItemFrame(index);

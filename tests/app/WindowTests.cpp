@@ -27,24 +27,6 @@ class MainWindow : public testing::Test, protected Program {
         if (second)
             Answer("Are you really sure?", second);
     }
-    // Sends a command and types the name into its form.
-    void Fill(uint32 command, const char* title, const char* name) {
-        Send(command).When(
-            title, [title] { return Field() && WindowShown(title)(); },
-            [name] { TypeOver(name, Qt::Key_Return); });
-    }
-    // A step that waits for this current row, with none selected and the rows from it on in sight.
-    void ExpectCurrent(int32 row, int32 rows, int32 count) {
-        const auto reached = [=] {
-            return Main() && List()->CountItems() == count && List()->CurrentRow() == row &&
-                   CountSelectedItems(List()) == 0;
-        };
-        When("current row " + std::to_string(row), reached, [=] {
-            const BRect seen = List()->Bounds();
-            EXPECT_LE(seen.top, List()->ItemFrame(row).top);
-            EXPECT_GE(seen.bottom, List()->ItemFrame(row + rows - 1).bottom);
-        });
-    }
     static std::string Marked() {
         const BMenuItem* marked = Selector()->FindMarked();
         return marked ? marked->Label() : "";
@@ -140,45 +122,17 @@ TEST_F(MainWindow, TheTotalStandsClearOfTheSelector) {
     RunAndClose();
 }
 
-TEST_F(MainWindow, TheListKeepsItsPlaceUnlessAnotherPortfolioIsShown) {
-    const auto scroll = [this](int32 row, float top) {
-        Then("scroll", [=] {
-            Locked([=] {
-                List()->Select(row);
-                List()->ScrollTo({30, top});
-            });
+TEST_F(MainWindow, AListLoadedAnewKeepsItsPlaceAndAnotherBegins) {
+    for (const char* name : {"Other", "P"})
+        AddPortfolioOf(name, Texts(30, name));
+    for (const auto& [name, current] : {std::pair{"P", 20}, {"Other", -1}}) {
+        Then("scroll", [] { ClickRow(20); }).Select(name);
+        Await(name, [name = name] { return Names()[0] == name && CountSelectedItems(List()) == 0; });
+        Then("loaded", [current = current] {
+            EXPECT_EQ(List()->CurrentRow(), current);
+            EXPECT_EQ(List()->Bounds().top > 0, current > 0);
         });
-    };
-    AddPortfolioOf("Other", Texts(30, "o"));
-    AddPortfolioOf("P", Texts(30, "p"));
-    Expect(Texts(30, "p"));
-    scroll(20, 400);
-    Select("P");
-    ExpectCurrent(20, 1, 30);
-    Then("loaded anew", [] {
-        EXPECT_EQ(List()->Bounds().LeftTop(), BPoint(30, 400));
-        QTest::keyClick(RowsWidget(), Qt::Key_Down);
-        EXPECT_EQ(List()->CurrentSelection(), 21);
-    });
-    Select("Other").Expect(Texts(30, "o")).Then("another one", [] {
-        EXPECT_EQ(List()->Bounds().LeftTop(), BPoint(30, 0));
-        EXPECT_EQ(List()->CurrentRow(), -1);
-    });
-    scroll(29, 400);
-    DeletePortfolio("Yes", "Yes");
-    Expect(Texts(30, "p")).Then("the first one", [] { EXPECT_EQ(List()->Bounds().top, 0); });
-    RunAndClose();
-}
-
-TEST_F(MainWindow, ARowThatWasAddedEditedOrPastedIsSeenButNotSelected) {
-    AddPortfolioOf("P", Texts(30, "p"));
-    Fill(MessageInvestmentAdd, "Add an Investment", "added");
-    ExpectCurrent(30, 1, 31);
-    Mark({3});
-    Fill(MessageInvestmentEdit, "Edit this Investment", "edited");
-    ExpectCurrent(3, 1, 31);
-    Mark({4, 5}).Send(MessageInvestmentCopy).Send(MessageInvestmentPaste);
-    ExpectCurrent(31, 2, 33);
+    }
     RunAndClose();
 }
 
@@ -357,6 +311,14 @@ TEST_F(MainWindow, WhatACommandChangesIsOnTheDiskWhenItEnds) {
         investments.Watch(app_state->investments, File("invest.db"));
     });
     const auto done = [&](WatchedFiles& files) { Await("on the disk", [&] { return files.HaveSynced(); }); };
+    const auto fill = [&](uint32 command, const char* title, const char* name) {
+        Send(command).When(
+            title, [title] { return Field() && WindowShown(title)(); },
+            [name] { TypeOver(name, Qt::Key_Return); });
+    };
+    const auto shown = [&](int32 row) {
+        Await("current", [row] { return List()->CurrentRow() == row && CountSelectedItems(List()) == 0; });
+    };
     Mark({0}).Send(MessageInvestmentDelete).Expect({"b", "c"});
     done(investments);
     Mark({0}).Send(MessageInvestmentCut).Expect({"c"});
@@ -365,16 +327,19 @@ TEST_F(MainWindow, WhatACommandChangesIsOnTheDiskWhenItEnds) {
          [&] { investments.beforeSync = [this] { EXPECT_TRUE(Has("cut.db")); }; });
     Send(MessageInvestmentPaste).Expect({"c", "b"});
     Then("pasted", [&] { investments.beforeSync = nullptr; });
+    shown(1);
     done(investments);
     Mark({1});
-    Fill(MessageInvestmentEdit, "Edit this Investment", "e");
+    fill(MessageInvestmentEdit, "Edit this Investment", "e");
     done(investments);
-    Fill(MessageInvestmentAdd, "Add an Investment", "d");
+    shown(1);
+    fill(MessageInvestmentAdd, "Add an Investment", "d");
     done(investments);
-    Fill(MessagePortfolioEdit, "Edit Portfolio", "Q");
+    shown(2);
+    fill(MessagePortfolioEdit, "Edit Portfolio", "Q");
     done(portfolios);
     done(investments);
-    Fill(MessagePortfolioAdd, "Add a Portfolio", "R");
+    fill(MessagePortfolioAdd, "Add a Portfolio", "R");
     done(portfolios);
     Expect({});
     DeletePortfolio("Yes", "Yes");

@@ -264,13 +264,8 @@ TEST(Lists, KeysBeginAtAnEndUntilARowIsChosen) {
         stage.Key(key);
         EXPECT_EQ(stage.Selected(), Indexes{selected});
         stage.list->DeselectAll();
-        stage.Key(selected == 0 ? Qt::Key_Up : Qt::Key_Down); // nowhere to go
+        stage.Key(selected == 0 ? Qt::Key_Home : Qt::Key_End);
         EXPECT_EQ(stage.Selected(), Indexes{selected});
-        stage.list->MakeEmpty(); // other rows come
-        for (std::size_t row = 0; row < 5; row++)
-            stage.list->AddItem(stage.rows[row].get());
-        stage.Key(key);
-        EXPECT_EQ(stage.Selected(), Indexes{selected / 2});
     }
 }
 

