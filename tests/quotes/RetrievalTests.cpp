@@ -2,6 +2,7 @@
 
 #include <future>
 #include <netdb.h>
+#include <poll.h>
 #include <semaphore>
 #include <string>
 #include <vector>

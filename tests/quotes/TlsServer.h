@@ -14,22 +14,25 @@ class TlsIdentity {
   public:
     // `names` as in "IP:127.0.0.1,DNS:localhost".
     explicit TlsIdentity(const std::string& names) {
-        X509_set_version(certificate_.get(), 2);
-        ASN1_INTEGER_set(X509_get_serialNumber(certificate_.get()), 1);
-        X509_gmtime_adj(X509_getm_notBefore(certificate_.get()), -3600);
-        X509_gmtime_adj(X509_getm_notAfter(certificate_.get()), 3600);
-        X509_NAME* name = X509_get_subject_name(certificate_.get());
-        X509_NAME_add_entry_by_txt(name, "CN", MBSTRING_ASC,
-                                   reinterpret_cast<const unsigned char*>("loopback"), -1, -1, 0);
-        X509_set_issuer_name(certificate_.get(), name);
-        X509_set_pubkey(certificate_.get(), key_.get());
+        const std::unique_ptr<EVP_PKEY, decltype(&EVP_PKEY_free)> key(EVP_EC_gen("P-256"), EVP_PKEY_free);
+        X509* certificate = certificate_.get();
+        X509_set_version(certificate, 2);
+        ASN1_INTEGER_set(X509_get_serialNumber(certificate), 1);
+        X509_gmtime_adj(X509_getm_notBefore(certificate), -3600);
+        X509_gmtime_adj(X509_getm_notAfter(certificate), 3600);
+        const auto* name = reinterpret_cast<const unsigned char*>("loopback");
+        X509_NAME_add_entry_by_txt(X509_get_subject_name(certificate), "CN", MBSTRING_ASC, name, -1, -1, 0);
+        X509_set_issuer_name(certificate, X509_get_subject_name(certificate));
+        X509_set_pubkey(certificate, key.get());
         Extend(NID_basic_constraints, "critical,CA:TRUE");
         Extend(NID_subject_alt_name, names);
-        X509_sign(certificate_.get(), key_.get(), EVP_sha256());
+        X509_sign(certificate, key.get(), EVP_sha256());
+        SSL_CTX_use_certificate(context_.get(), certificate);
+        SSL_CTX_use_PrivateKey(context_.get(), key.get());
     }
 
-    [[nodiscard]] EVP_PKEY* Key() const { return key_.get(); }
-    [[nodiscard]] X509* Certificate() const { return certificate_.get(); }
+    // For a server that shows the certificate.
+    [[nodiscard]] std::shared_ptr<SSL_CTX> Context() const { return context_; }
     void WriteCertificate(const std::string& path) const {
         std::FILE* file = std::fopen(path.c_str(), "w");
         PEM_write_X509(file, certificate_.get());
@@ -43,8 +46,8 @@ class TlsIdentity {
         X509_EXTENSION_free(extension);
     }
 
-    std::unique_ptr<EVP_PKEY, decltype(&EVP_PKEY_free)> key_{EVP_EC_gen("P-256"), EVP_PKEY_free};
     std::unique_ptr<X509, decltype(&X509_free)> certificate_{X509_new(), X509_free};
+    std::shared_ptr<SSL_CTX> context_{SSL_CTX_new(TLS_server_method()), SSL_CTX_free};
 };
 
 class TlsStream : public ServerStream {
@@ -53,46 +56,25 @@ class TlsStream : public ServerStream {
         SSL_set_fd(ssl_.get(), fd);
         SSL_set_accept_state(ssl_.get());
     }
-    ssize_t Read(char* bytes, std::size_t size) override {
-        return Result(SSL_read(ssl_.get(), bytes, static_cast<int>(size)));
+    long Read(char* bytes, std::size_t size) override {
+        return SSL_read(ssl_.get(), bytes, static_cast<int>(size));
     }
-    ssize_t Write(const char* bytes, std::size_t size) override {
-        return Result(SSL_write(ssl_.get(), bytes, static_cast<int>(std::min(size, std::size_t{16'000}))));
+    long Write(const std::string& bytes) override {
+        return SSL_write(ssl_.get(), bytes.data(), static_cast<int>(bytes.size()));
     }
     void Finish() override { SSL_shutdown(ssl_.get()); }
 
   private:
-    ssize_t Result(int result) {
-        const int error = SSL_get_error(ssl_.get(), result);
-        errno = error == SSL_ERROR_WANT_READ || error == SSL_ERROR_WANT_WRITE ? EAGAIN : EPROTO;
-        return result > 0 ? result : -1;
-    }
-
     std::unique_ptr<SSL, decltype(&SSL_free)> ssl_;
 };
 
 // A loopback server behind TLS.
-class TlsServer {
+class TlsServer : public LoopbackServer {
   public:
-    TlsServer(const TlsIdentity& identity, LoopbackServer::Answer answer)
-        : context_(MakeContext(identity)), server_(std::move(answer), 0, [this](int fd) {
-              return std::make_unique<TlsStream>(fd, context_.get());
+    TlsServer(const TlsIdentity& identity, Answer answer)
+        : LoopbackServer(std::move(answer), [context = identity.Context()](int fd) {
+              return std::make_unique<TlsStream>(fd, context.get());
           }) {}
 
-    [[nodiscard]] LoopbackServer& Server() { return server_; }
-    // As a quote source's host field.
-    [[nodiscard]] std::string Host() const { return "https://" + server_.Host(); }
-
-  private:
-    using Context = std::unique_ptr<SSL_CTX, decltype(&SSL_CTX_free)>;
-    static Context MakeContext(const TlsIdentity& identity) {
-        Context context(SSL_CTX_new(TLS_server_method()), SSL_CTX_free);
-        SSL_CTX_use_certificate(context.get(), identity.Certificate());
-        SSL_CTX_use_PrivateKey(context.get(), identity.Key());
-        SSL_CTX_set_mode(context.get(), SSL_MODE_ENABLE_PARTIAL_WRITE | SSL_MODE_ACCEPT_MOVING_WRITE_BUFFER);
-        return context;
-    }
-
-    Context context_;
-    LoopbackServer server_;
+    [[nodiscard]] std::string Host() const { return "https://" + LoopbackServer::Host(); }
 };

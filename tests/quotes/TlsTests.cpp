@@ -2,6 +2,7 @@
 
 #include <cstdlib>
 #include <future>
+#include <poll.h>
 #include <string>
 
 #include "LoopbackServer.h"
@@ -41,8 +42,8 @@ class Tls : public QuoteTest {
 TEST_F(Tls, APageIsScannedInOnePiece) {
     TlsServer server(identity_, [&](const std::string&) { return Reply{SingleBytes(Page)}; });
     EXPECT_EQ(Quote(server.Host(), "q?s=B C#\xC3\xA4%20\n"), 45.375F);
-    EXPECT_TRUE(server.Server().Requests().at(0).starts_with("GET /q?s=B%20C%23%C3%A4%20%0A HTTP/1.1\r\n"));
-    EXPECT_EQ(Log(), "In GetQuote\nconnected to 127.0.0.1 port " + std::to_string(server.Server().Port()) +
+    EXPECT_TRUE(server.Requests().at(0).starts_with("GET /q?s=B%20C%23%C3%A4%20%0A HTTP/1.1\r\n"));
+    EXPECT_EQ(Log(), "In GetQuote\nconnected to 127.0.0.1 port " + std::to_string(server.Port()) +
                          "\nreceived 35 bytes\nfound tag\nskipped ok\nvalue string is '45'\n"
                          "Returning price = 45.38\n");
 }
@@ -103,7 +104,7 @@ TEST_F(Tls, AConnectionThatCannotBeTrustedIsAFailure) {
     TlsServer misnamed(otherName, answer);
     otherName.WriteCertificate(caFile_);
     ExpectFailure(misnamed.Host(), QuoteNetworkFailure, "no alternative certificate subject name matches");
-    EXPECT_TRUE(unknown.Server().Requests().empty() && misnamed.Server().Requests().empty());
+    EXPECT_TRUE(unknown.Requests().empty() && misnamed.Requests().empty());
 }
 
 TEST_F(Tls, NoConnectionIsAFailureAndNoNameIsNoPrice) {
@@ -118,10 +119,10 @@ TEST_F(Tls, StopsAtOnceWhereverTheServerIs) {
         const StopSwitch stop;
         context_.stopFd = stop.Fd();
         auto quote = std::async(std::launch::async, [&] { return Quote(server.Host()); });
-        EXPECT_TRUE(server.Server().WaitForRequests(1));
+        EXPECT_TRUE(server.WaitForRequests(1));
         stop.Stop();
         EXPECT_EQ(quote.get(), QuoteCancelled);
-        EXPECT_TRUE(server.Server().WaitForEnds(1));
+        EXPECT_TRUE(server.WaitForEnds(1));
     }
     // A server that never answers the first greeting.
     context_.stopFd = stop_.Fd();
