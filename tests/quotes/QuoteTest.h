@@ -1,10 +1,12 @@
 #pragma once
 
+#include <regex>
 #include <string>
+#include <sys/eventfd.h>
+#include <unistd.h>
 
 #include <gtest/gtest.h>
 
-#include "StopSwitch.h"
 #include "TemporaryFolder.h"
 #include "quotes/QuoteRetrieval.h"
 #include "util/GatheredLog.h"
@@ -14,28 +16,20 @@ class QuoteTest : public testing::Test {
   protected:
     QuoteTest() {
         context_.log = &log_;
-        context_.stopFd = stop_.Fd();
+        context_.stopFd = eventfd(0, EFD_CLOEXEC);
     }
+    ~QuoteTest() override { close(context_.stopFd); }
 
-    // What has been logged since the last call.
+    // What has been logged since the last call, with HOST for any loopback server.
     [[nodiscard]] std::string Log() {
         log_.Write();
-        std::string text = folder_.Read("log");
+        const std::string text = folder_.Read("log");
         folder_.Write("log", "");
-        return text;
+        return std::regex_replace(text, std::regex(R"(127\.0\.0\.1:\d+)"), "HOST");
     }
 
     TemporaryFolder folder_;
     std::string logPath_ = folder_.File("log");
     GatheredLog log_{logPath_.c_str()};
-    StopSwitch stop_;
     QuoteContext context_;
 };
-
-// As the pieces of a reply.
-inline std::vector<std::string> SingleBytes(const std::string& text) {
-    std::vector<std::string> bytes;
-    for (const char byte : text)
-        bytes.emplace_back(1, byte);
-    return bytes;
-}

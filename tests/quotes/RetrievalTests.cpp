@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include <cstdlib>
 #include <future>
 #include <netdb.h>
 #include <poll.h>
@@ -7,34 +8,33 @@
 #include <string>
 #include <vector>
 
-#include "LoopbackServer.h"
 #include "QuoteTest.h"
+#include "TlsServer.h"
 #include "quotes/HostLookup.h"
 #include "quotes/LastConnection.h"
 #include "quotes/QuoteObserver.h"
-#include "quotes/QuoteReport.h"
-#include "quotes/QuoteScanner.h"
+#include "quotes/StopSignal.h"
 
 namespace {
 
 using namespace std::string_literals;
+using End = Reply::End;
 
 // Fails at once and asks no name server.
 constexpr const char* NoSuchHost = "no..such..host";
 
 // Lets a server that replies in step send its next piece.
-class StepByStep : public QuoteObserver {
-  public:
-    explicit StepByStep(LoopbackServer& server) : server_(server) {}
-    void PieceReceived(std::string_view piece) override { server_.Taken(piece.size()); }
-
-  private:
-    LoopbackServer& server_;
+struct StepByStep : QuoteObserver {
+    void PieceReceived(std::string_view piece) override { server->Taken(piece.size()); }
+    LoopbackServer* server = nullptr;
 };
 
 class Retrieval : public QuoteTest {
   protected:
     Retrieval() {
+        setenv("no_proxy", "*", 1);
+        identity_.AddCertificateTo(caFile_);
+        context_.caFile = caFile_.c_str();
         context_.sourcePath = sourcePath_.c_str();
         context_.lastConnection = &lastConnection_;
     }
@@ -45,69 +45,139 @@ class Retrieval : public QuoteTest {
         static_cast<void>(Log());
         return GetPriceQuote("ABC", context_);
     }
-    std::future<float> QuoteMeanwhile(const std::string& lines) {
-        return std::async(std::launch::async, [this, lines] { return Quote(lines); });
+    float Ask(const std::string& host) { return Quote("net " + host + " /q?s= Last 3"); }
+    // The text, which may leave out the last line's end, is at the end of the log.
+    void ExpectLogsEnd(const std::string& text) {
+        const std::string log = Log();
+        const std::size_t at = log.rfind(text);
+        EXPECT_TRUE(at != log.npos && log.find('\n', at + text.size() - 1) == log.size() - 1) << log << text;
+    }
+    // What the call answers when it is stopped once it has come so far.
+    template <class Call, class Wait>
+    auto Stopped(Call call, Wait comesSoFar) {
+        auto answer = std::async(std::launch::async, call);
+        comesSoFar();
+        eventfd_write(context_.stopFd, 1);
+        const auto answered = answer.get();
+        eventfd_t count = 0;
+        eventfd_read(context_.stopFd, &count);
+        return answered;
+    }
+    template <class Wait>
+    void ExpectCancelled(const std::string& host, Wait comesSoFar, const std::string& last = "") {
+        EXPECT_EQ(Stopped([&] { return Ask(host); }, comesSoFar), QuoteCancelled);
+        ExpectLogsEnd(last + "cancelled\n");
     }
 
+    TlsIdentity identity_{"IP:127.0.0.1"};
+    std::string caFile_ = folder_.File("ca.pem");
     std::string sourcePath_ = folder_.File("Quorvan.cfg");
     LastConnection lastConnection_;
 };
 
-std::string Replace(std::string text, const std::string& from, const std::string& to) {
-    for (std::size_t at = text.find(from); at != text.npos; at = text.find(from, at + to.size()))
-        text.replace(at, from.size(), to);
-    return text;
-}
-
 const std::string Page = "HTTP/1.0 200 OK\r\n\r\n<td>Last</td><td><b>45 3/8</b></td>";
-const std::string Before = "Checking 'HOST/q?s=ABC'\nIn GetQuote\ngethostname() ok\nsocket created ok\n";
-const std::string Asked = Before + "connected ok\nGET /q?s=ABC HTTP/1.0\n\n";
+const std::string Asked = "In GetQuote\n";
+const std::string Created = Asked + "gethostname() ok\nsocket created ok\n";
 const std::string NoPrice = "Returning price = -4.00\n";
 
+struct Answered {
+    Reply reply;
+    float price;
+    std::string log;
+    int redirects = 0;
+};
+
 TEST_F(Retrieval, AsksByABareRequestAndLogsEveryStep) {
-    const std::string priced = "found tag\nskipped ok\nvalue string is '45'\n"
-                               "Returning price = 45.38\nPrice = 45.38\n";
-    const struct {
-        Reply reply;
-        int skip;
-        float price;
-        std::string log; // behind the request
-    } cases[] = {
-        {{{Page}}, 3, 45.375F, priced},
-        {{{Page}, Reply::End::Hold}, 3, 45.375F, priced},
-        {{{Page}, Reply::End::Endless}, 3, 45.375F, priced},
-        {{{"Last</td>"}}, 2, NoQuote, "found tag\nreceived zero bytes\n" + NoPrice},
-        {{{"\0\xFF%s%n\x1B[2J"s}}, 2, NoQuote, "received zero bytes\n" + NoPrice},
-        {{{"Last></>%s%n%s"}},
-         2,
-         0,
-         "found tag\nskipped ok\nvalue string is '%s%n%s'\nReturning price = 0.00\n"},
-        {{{}}, 2, NoQuote, "received zero bytes\n" + NoPrice},
-        {{{}, Reply::End::Reset}, 2, NoQuote, "recv() error\n" + NoPrice},
+    const std::string request = "GET /q?s=ABC HTTP/1.0\n\n";
+    const std::string found = "found tag\nskipped ok\nvalue string is '";
+    const std::string priced = found + "45'\nReturning price = 45.38\nPrice = 45.38\n";
+    const Answered cases[] = {
+        {{{Page}}, 45.375F, priced},
+        {{{Page}, End::Hold}, 45.375F, priced},
+        {{{Page}, End::Endless}, 45.375F, priced},
+        // Each piece is read as it arrives.
+        {{{"La", "st>7", "Last>>>8"}, {}, true}, 8, found + "8'\nReturning price = 8.00\nPrice = 8.00\n"},
+        {{{"Last<", "b>>>7 ", "1/2"}, {}, true}, 7, found + "7'\nReturning price = 7.00\nPrice = 7.00\n"},
+        {{{"Last</td>"}}, NoQuote, "found tag\nreceived zero bytes\n" + NoPrice},
+        {{{"\0\xFF%s%n\x1B[2J"s}}, NoQuote, "received zero bytes\n" + NoPrice},
+        {{{"Last></>>%s%n%s"}}, 0, found + "%s%n%s'\nReturning price = 0.00\n"},
+        {{}, NoQuote, "received zero bytes\n" + NoPrice},
+        {{{}, End::Reset}, NoQuote, "recv() error\n" + NoPrice},
     };
+    StepByStep steps;
+    context_.observer = &steps;
     for (const auto& c : cases) {
         LoopbackServer server(c.reply);
-        EXPECT_EQ(Quote("net " + server.Host() + " /q?s= Last " + std::to_string(c.skip)), c.price) << c.log;
-        EXPECT_EQ(Replace(Log(), server.Host(), "HOST"), Asked + c.log);
-        EXPECT_EQ(server.Requests(), std::vector<std::string>{"GET /q?s=ABC HTTP/1.0\n\n"});
+        steps.server = &server;
+        EXPECT_EQ(Ask(server.Host()), c.price) << c.log;
+        EXPECT_EQ(Log(), "Checking 'HOST/q?s=ABC'\n" + Created + "connected ok\n" + request + c.log);
+        EXPECT_EQ(server.Requests(), std::vector{request});
     }
 }
 
+TEST_F(Retrieval, ScansAPageBehindTlsInOnePiece) {
+    std::vector<std::string> bytes;
+    for (const char byte : Page)
+        bytes.emplace_back(1, byte);
+    TlsServer server(identity_, [&](const std::string&) { return Reply{bytes}; });
+    EXPECT_EQ(GetQuote(server.Host().c_str(), "q?s=B C#\xC3\xA4%20\n", "Last", 3, context_), 45.375F);
+    EXPECT_TRUE(server.Requests().at(0).starts_with("GET /q?s=B%20C%23%C3%A4%20%0A HTTP/1.1\r\n"));
+    EXPECT_EQ(Log(), Asked + "connected to 127.0.0.1 port " + std::to_string(server.Port()) +
+                         "\nreceived 35 bytes\nfound tag\nskipped ok\nvalue string is '45'\n"
+                         "Returning price = 45.38\n");
+}
+
+TEST_F(Retrieval, OnceAskedTheAnswerBehindTlsCountsWhateverItsEnd) {
+    LoopbackServer plain(Reply{{Page}});
+    const auto redirect = [](const std::string& address) {
+        return Reply{{"HTTP/1.0 302 Found\r\nLocation: " + address + "\r\nContent-Length: 0\r\n\r\n"}};
+    };
+    const Answered cases[] = {
+        {{{Page}}, 45.375F, "value string is '45'\n", 5},
+        {{{Page}}, NoQuote, "https error: Maximum (5) redirects followed\n", 6},
+        {redirect("http://" + plain.Host()), NoQuote, "https error: Protocol \"http\" not supported"},
+        {{{"HTTP/1.0 404 Not Found\r\n\r\n" + Page}}, NoQuote, "The requested URL returned error: 404\n"},
+        {{{Page, std::string(100'000, 'x')}, End::Endless}, 45.375F, "the page has more than 10 MB\n"},
+        {{}, NoQuote, "https error: "},
+        {{{Page.substr(0, 30)}, End::Reset}, NoQuote, "https error: "},
+        {{{"HTTP/1.0 200 OK\r\nContent-Length: 999\r\n\r\n" + Page}}, 45.375F, "https error: "},
+    };
+    for (const auto& c : cases) {
+        int redirects = c.redirects;
+        TlsServer server(identity_,
+                         [&](const std::string&) { return redirects-- > 0 ? redirect("/") : c.reply; });
+        EXPECT_EQ(Ask(server.Host()), c.price) << c.log;
+        const std::string log = Log();
+        EXPECT_NE(log.find(c.log), std::string::npos) << log;
+    }
+    EXPECT_TRUE(plain.Requests().empty());
+}
+
 TEST_F(Retrieval, SaysWhyThereIsNoConnection) {
+    const auto answer = [](const std::string&) { return Reply{{Page}}; };
+    const TlsIdentity stranger("IP:127.0.0.1");
+    const TlsIdentity otherName("DNS:quotes.example");
+    otherName.AddCertificateTo(caFile_);
+    TlsServer unknown(stranger, answer);
+    TlsServer misnamed(otherName, answer);
     const LoopbackSocket refusing;
-    EXPECT_EQ(Quote("net " + refusing.Host() + " /q?s= Last 3"), QuoteNetworkFailure);
-    EXPECT_EQ(Replace(Log(), refusing.Host(), "HOST"), Before + "connect() error\n");
-    EXPECT_EQ(Quote("net "s + NoSuchHost + " /q?s= Last 3"), NoQuote);
-    EXPECT_EQ(Replace(Log(), NoSuchHost, "HOST"),
-              "Checking 'HOST/q?s=ABC'\nIn GetQuote\ngethostbyname() error\n");
-    EXPECT_EQ(Quote("net host:port /q?s= Last 3"), NoQuote);
-    EXPECT_EQ(Log(), "Checking 'host:port/q?s=ABC'\nIn GetQuote\n"
-                     "'host:port': the host is none of NAME, NAME:PORT and https://NAME[:PORT]\n");
-    context_.sourcePath = "/nowhere/Quorvan.cfg";
-    EXPECT_EQ(Quote(""), NoQuoteSources);
-    EXPECT_EQ(Log(), "Unable to open '/nowhere/Quorvan.cfg'\n");
-    EXPECT_EQ(GetPriceQuoteFrom("; nothing but a comment\n", "ABC", context_), NoQuote);
-    EXPECT_EQ(Log(), "no source to ask\n");
+    const struct {
+        std::string host, log;
+        float result = QuoteNetworkFailure;
+    } cases[] = {
+        {refusing.Host(), Created + "connect() error\n"},
+        {NoSuchHost, Asked + "gethostbyname() error\n", NoQuote},
+        {"h:port", "'h:port': the host is none of NAME, NAME:PORT and https://NAME[:PORT]\n", NoQuote},
+        {unknown.Host(), "https error: SSL certificate problem"},
+        {misnamed.Host(), "no alternative certificate subject name matches"},
+        {"https://" + refusing.Host(), Asked + "https error: Failed to connect"},
+        {"https://"s + NoSuchHost, Asked + "https error: Could not resolve host", NoQuote},
+    };
+    for (const auto& c : cases) {
+        EXPECT_EQ(Ask(c.host), c.result) << c.host;
+        ExpectLogsEnd(c.log);
+    }
+    EXPECT_TRUE(unknown.Requests().empty() && misnamed.Requests().empty());
 }
 
 TEST_F(Retrieval, TriesTheSourcesInOrder) {
@@ -127,22 +197,21 @@ TEST_F(Retrieval, TriesTheSourcesInOrder) {
         float price;
         std::size_t requests;
     } cases[] = {
-        {"", NoQuote, 0},
         {"\n" + line("4"), NoQuote, 0},
-        {comment, NoQuote, 0},
         {nowhere + line("42.5") + line("7"), 42.5F, 1},
         {refused + line("42.5"), 42.5F, 1},
         {line("0") + line("-3") + line("7"), 7, 3},
         {line("-2") + line("7"), QuoteSearchEnded, 1},
-        {line("7") + comment, 7, 1},
         // Only the last line read can leave a status other than "no quote".
         {refused, QuoteNetworkFailure, 0},
         {line("0"), 0, 1},
         {line("0") + comment, NoQuote, 1},
         {line("0") + "\n", NoQuote, 1},
         {refused + "a line of four fields\n", NoQuote, 0},
-        {"a line of four\n" + line("7"), 7, 1},
-        {"net " + server.Host() + " /" + std::string(124, 'p') + " @ 1\n" + line("7"), 7, 1},
+        {"a line of four\n" + line("7") + comment, 7, 1},
+        // Path and ticker have room for 127 bytes.
+        {line(std::string(121, '0') + '7'), 7, 1},
+        {line(std::string(122, '0') + '7'), NoQuote, 0},
     };
     std::size_t before = 0;
     for (const auto& c : cases) {
@@ -150,103 +219,45 @@ TEST_F(Retrieval, TriesTheSourcesInOrder) {
         EXPECT_EQ(server.Requests().size() - before, c.requests) << c.lines;
         before = server.Requests().size();
     }
-    const QuoteContext none;
-    EXPECT_EQ(GetPriceQuoteFrom(refused + line("7"), "ABC", none), 7);
+    EXPECT_EQ(GetPriceQuoteFrom(refused + line("7"), "ABC", {}), 7);
+    static_cast<void>(Log());
+    EXPECT_EQ(GetPriceQuoteFrom(comment, "ABC", context_), NoQuote);
+    EXPECT_EQ(Log(), "no source to ask\n");
+    context_.sourcePath = "/nowhere/Quorvan.cfg";
+    EXPECT_EQ(GetPriceQuote("ABC", context_), NoQuoteSources);
+    EXPECT_EQ(Log(), "Unable to open '/nowhere/Quorvan.cfg'\n");
 }
 
-// A page in these pieces is read off the network as the scanner reads it.
-TEST_F(Retrieval, ReadsEachPieceAsItArrives) {
-    std::vector<std::vector<std::string>> pages{SingleBytes("#>\n<7 1/2")};
-    for (std::size_t split = 1; split < Page.size(); ++split)
-        pages.push_back({Page.substr(0, split), Page.substr(split)});
-    QuoteReport nobody(nullptr, nullptr);
-    for (const auto& pieces : pages) {
-        const char* tag = pieces.size() == 2 ? "Last" : "#";
-        const int skip = pieces.size() == 2 ? 3 : 1;
-        QuoteScanner scanner(tag, skip, nobody);
-        for (const std::string& piece : pieces) {
-            if (scanner.Scan(piece))
-                break;
-        }
-        LoopbackServer server(Reply{pieces, Reply::End::Close, true});
-        StepByStep steps(server);
-        context_.observer = &steps;
-        EXPECT_EQ(GetQuote(server.Host().c_str(), "/", tag, skip, context_), scanner.Price()) << pieces[0];
-    }
-}
-
-// Stops the call once the server has the request, and waits until the server saw the connection end.
-TEST_F(Retrieval, StopsAtOnceWhereverTheServerIs) {
-    const Reply replies[] = {{{}, Reply::End::Hold},
-                             {{"Last>"}, Reply::End::Hold},
-                             {{std::string(4096, 'x')}, Reply::End::Endless},
-                             {{"Last>", std::string(4096, '>')}, Reply::End::Endless}};
-    for (const Reply& reply : replies) {
+TEST_F(Retrieval, StopsAtOnceWhereverItIs) {
+    for (const Reply& reply : {Reply{{}, End::Hold}, Reply{{"Last>"}, End::Hold}, Reply{{"x"}, End::Endless},
+                               Reply{{"Last>", ">"}, End::Endless}}) {
         LoopbackServer server(reply);
-        const StopSwitch stop;
-        context_.stopFd = stop.Fd();
-        auto quote = QuoteMeanwhile("net " + server.Host() + " /q?s= Last 1\nnet h /q Last 1");
-        EXPECT_TRUE(server.WaitForRequests(1));
-        stop.Stop();
-        EXPECT_EQ(quote.get(), QuoteCancelled);
-        EXPECT_TRUE(server.WaitForEnds(1));
-        const std::string log = Log();
-        EXPECT_TRUE(log.ends_with("\ncancelled\n")) << log;
+        ExpectCancelled(server.Host(), [&] { EXPECT_TRUE(server.WaitFor(1)); });
+        EXPECT_TRUE(server.WaitFor(1, 1));
+        if (reply.end == End::Endless)
+            continue; // behind TLS a page has its end
+        TlsServer tls(identity_, [&](const std::string&) { return reply; });
+        ExpectCancelled(tls.Host(), [&] { EXPECT_TRUE(tls.WaitFor(1)); });
+        EXPECT_TRUE(tls.WaitFor(1, 1));
     }
-}
-
-TEST_F(Retrieval, ClosesAConnectionWhileTheNextServerThinks) {
-    LoopbackServer server(Reply{{Page}, Reply::End::Hold}); // serves nobody else before the client goes
-    const std::string source = "net " + server.Host() + " /q?s= Last 3";
-    EXPECT_EQ(Quote(source), 45.375F);
-    EXPECT_EQ(Quote(source), 45.375F);
-    EXPECT_TRUE(server.WaitForEnds(1));
-    lastConnection_.Close();
-    EXPECT_TRUE(server.WaitForEnds(2));
-    context_.lastConnection = nullptr;
-    EXPECT_EQ(Quote(source), 45.375F);
-    EXPECT_TRUE(server.WaitForEnds(3));
-}
-
-TEST_F(Retrieval, StopsWhileItConnects) {
-    // A server whose queue is full leaves further connections waiting.
-    const LoopbackSocket server;
-    ASSERT_EQ(listen(server.Fd(), 0), 0);
-    sockaddr_in address{};
-    socklen_t size = sizeof address;
-    ASSERT_EQ(getsockname(server.Fd(), reinterpret_cast<sockaddr*>(&address), &size), 0);
-    std::vector<int> waiting;
-    while (waiting.size() < 64) {
-        pollfd last{socket(AF_INET, SOCK_STREAM | SOCK_NONBLOCK | SOCK_CLOEXEC, 0), POLLOUT, 0};
-        waiting.push_back(last.fd);
-        if (connect(last.fd, reinterpret_cast<sockaddr*>(&address), size) != 0 && poll(&last, 1, 50) == 0)
-            break;
-    }
-    auto quote = QuoteMeanwhile("net " + server.Host() + " /q?s= Last 1");
-    while (folder_.Read("log").find("socket created ok\n") == std::string::npos)
-        std::this_thread::yield();
-    stop_.Stop();
-    EXPECT_EQ(quote.get(), QuoteCancelled);
-    for (const int fd : waiting)
-        close(fd);
-}
-
-TEST_F(Retrieval, AsksNobodyWhenItIsToStopAlready) {
+    // A server that accepts nobody: one waits for its greeting, and leaves no place in the queue.
+    const LoopbackSocket deaf;
+    listen(deaf.Fd(), 0);
+    EXPECT_EQ(WaitUnlessStopped(deaf.Fd(), POLLIN, context_.stopFd, 0), Waited::NotYet);
+    pollfd connection{deaf.Fd(), POLLIN, 0};
+    ExpectCancelled("https://" + deaf.Host(), [&] { EXPECT_EQ(poll(&connection, 1, 10'000), 1); });
+    const auto connects = [&] {
+        for (int i = 0; i < 10'000 && !folder_.Read("log").ends_with(Created); ++i)
+            poll(nullptr, 0, 1);
+    };
+    ExpectCancelled(deaf.Host(), connects, Created);
+    // One that is not asked, since it is to stop already.
     LoopbackServer server(Reply{{Page}});
-    stop_.Stop();
-    EXPECT_EQ(Quote("net " + server.Host() + " /q?s= Last 3"), QuoteCancelled);
-    EXPECT_EQ(Quote("net https://" + server.Host() + " /q?s= Last 3"), QuoteCancelled);
+    eventfd_write(context_.stopFd, 1);
+    for (const std::string& host : {server.Host(), "https://" + server.Host()})
+        EXPECT_EQ(Ask(host), QuoteCancelled);
     EXPECT_TRUE(server.Requests().empty());
-    EXPECT_FALSE(IsConnected("127.0.0.1", stop_.Fd()));
-}
-
-TEST_F(Retrieval, TheNetworkIsThereWhenANameResolves) {
-    if (!gethostbyname("localhost"))
-        GTEST_SKIP() << "this machine knows no name at all, not even its own";
-    for (const int stopFd : {-1, stop_.Fd()})
-        for (const auto& [name, there] :
-             {std::pair{"localhost", true}, {"127.0.0.1", true}, {NoSuchHost, false}, {"", false}})
-            EXPECT_EQ(IsConnected(name, stopFd), there) << name;
+    EXPECT_FALSE(IsConnected("127.0.0.1", context_.stopFd));
 }
 
 std::binary_semaphore resolving(0), resolverMayEnd(0), resolverEnded(0);
@@ -260,20 +271,34 @@ TEST_F(Retrieval, StopsWhileANameIsLookedUp) {
         return found;
     };
     in_addr address{};
-    // The program may end while a resolver is still at work: the second one.
-    for (const bool resolverEnds : {true, false}) {
-        const StopSwitch stop;
-        auto lookup = std::async(std::launch::async,
-                                 [&] { return LookUpHost("localhost", stop.Fd(), &address, slow); });
-        resolving.acquire();
-        stop.Stop();
-        EXPECT_EQ(lookup.get(), HostLookup::Stopped);
-        if (resolverEnds) {
-            resolverMayEnd.release();
-            resolverEnded.acquire();
-            EXPECT_EQ(address.s_addr, 0U);
-        }
-    }
+    const auto lookUp = [&] { return LookUpHost("localhost", context_.stopFd, &address, slow); };
+    EXPECT_EQ(Stopped(lookUp, [] { resolving.acquire(); }), HostLookup::Stopped);
+    resolverMayEnd.release();
+    resolverEnded.acquire();
+    EXPECT_EQ(address.s_addr, 0U);
+    // The program may end while a resolver is still at work.
+    EXPECT_EQ(Stopped(lookUp, [] { resolving.acquire(); }), HostLookup::Stopped);
+}
+
+TEST_F(Retrieval, ClosesAConnectionWhileTheNextServerThinks) {
+    LoopbackServer server(Reply{{Page}, End::Hold}); // serves nobody else before the client goes
+    EXPECT_EQ(Ask(server.Host()), 45.375F);
+    EXPECT_EQ(Ask(server.Host()), 45.375F);
+    EXPECT_TRUE(server.WaitFor(1, 1));
+    lastConnection_.Close();
+    EXPECT_TRUE(server.WaitFor(2, 2));
+    context_.lastConnection = nullptr;
+    EXPECT_EQ(Ask(server.Host()), 45.375F);
+    EXPECT_TRUE(server.WaitFor(3, 3));
+}
+
+TEST_F(Retrieval, TheNetworkIsThereWhenANameResolves) {
+    if (!gethostbyname("localhost"))
+        GTEST_SKIP() << "this machine knows no name at all, not even its own";
+    for (const int stopFd : {-1, context_.stopFd})
+        for (const auto& [name, there] :
+             {std::pair{"localhost", true}, {"127.0.0.1", true}, {NoSuchHost, false}, {"", false}})
+            EXPECT_EQ(IsConnected(name, stopFd), there) << name;
 }
 
 } // namespace

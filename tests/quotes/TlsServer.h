@@ -15,38 +15,36 @@ class TlsIdentity {
     // `names` as in "IP:127.0.0.1,DNS:localhost".
     explicit TlsIdentity(const std::string& names) {
         const std::unique_ptr<EVP_PKEY, decltype(&EVP_PKEY_free)> key(EVP_EC_gen("P-256"), EVP_PKEY_free);
-        X509* certificate = certificate_.get();
-        X509_set_version(certificate, 2);
-        ASN1_INTEGER_set(X509_get_serialNumber(certificate), 1);
-        X509_gmtime_adj(X509_getm_notBefore(certificate), -3600);
-        X509_gmtime_adj(X509_getm_notAfter(certificate), 3600);
-        const auto* name = reinterpret_cast<const unsigned char*>("loopback");
-        X509_NAME_add_entry_by_txt(X509_get_subject_name(certificate), "CN", MBSTRING_ASC, name, -1, -1, 0);
-        X509_set_issuer_name(certificate, X509_get_subject_name(certificate));
-        X509_set_pubkey(certificate, key.get());
-        Extend(NID_basic_constraints, "critical,CA:TRUE");
-        Extend(NID_subject_alt_name, names);
-        X509_sign(certificate, key.get(), EVP_sha256());
-        SSL_CTX_use_certificate(context_.get(), certificate);
+        const std::unique_ptr<X509, decltype(&X509_free)> certificate(X509_new(), X509_free);
+        X509_set_version(certificate.get(), 2);
+        X509_gmtime_adj(X509_getm_notBefore(certificate.get()), -3600);
+        X509_gmtime_adj(X509_getm_notAfter(certificate.get()), 3600);
+        X509_NAME* name = X509_get_subject_name(certificate.get());
+        X509_NAME_add_entry_by_txt(name, "CN", MBSTRING_ASC, reinterpret_cast<const unsigned char*>("test"),
+                                   -1, -1, 0);
+        X509_set_issuer_name(certificate.get(), name);
+        X509_set_pubkey(certificate.get(), key.get());
+        for (const auto& [kind, value] :
+             {std::pair<int, std::string>{NID_basic_constraints, "critical,CA:TRUE"},
+              {NID_subject_alt_name, names}}) {
+            X509_EXTENSION* extension = X509V3_EXT_conf_nid(nullptr, nullptr, kind, value.c_str());
+            X509_add_ext(certificate.get(), extension, -1);
+            X509_EXTENSION_free(extension);
+        }
+        X509_sign(certificate.get(), key.get(), EVP_sha256());
+        SSL_CTX_use_certificate(context_.get(), certificate.get());
         SSL_CTX_use_PrivateKey(context_.get(), key.get());
     }
 
     // For a server that shows the certificate.
     [[nodiscard]] std::shared_ptr<SSL_CTX> Context() const { return context_; }
-    void WriteCertificate(const std::string& path) const {
-        std::FILE* file = std::fopen(path.c_str(), "w");
-        PEM_write_X509(file, certificate_.get());
+    void AddCertificateTo(const std::string& path) const {
+        std::FILE* file = std::fopen(path.c_str(), "a");
+        PEM_write_X509(file, SSL_CTX_get0_certificate(context_.get()));
         std::fclose(file);
     }
 
   private:
-    void Extend(int kind, const std::string& value) {
-        X509_EXTENSION* extension = X509V3_EXT_conf_nid(nullptr, nullptr, kind, value.c_str());
-        X509_add_ext(certificate_.get(), extension, -1);
-        X509_EXTENSION_free(extension);
-    }
-
-    std::unique_ptr<X509, decltype(&X509_free)> certificate_{X509_new(), X509_free};
     std::shared_ptr<SSL_CTX> context_{SSL_CTX_new(TLS_server_method()), SSL_CTX_free};
 };
 
