@@ -1,33 +1,33 @@
-// The charts as they are drawn, read pixel by pixel and text by text, and the window they stand in.
+// The charts as they are drawn, read pixel by pixel and text by text, the window they stand in, and what they
+// are made of: slices and lines.
 #include "DataFolder.h"
 #include "Driver.h"
 
 #include <cmath>
+#include <limits>
 #include <regex>
 
-#include <QCheckBox>
 #include <QImage>
 #include <QPushButton>
 
 #include "app/AppState.h"
+#include "charts/ChartDataSets.h"
+#include "charts/ChartGeometry.h"
 #include "charts/ChartWindow.h"
 #include "charts/PieChartView.h"
 #include "charts/ValueChartView.h"
-#include "platform/CheckBox.h"
 #include "platform/ViewPicture.h"
 #include "util/Dates.h"
 #include "util/InterfaceHelpers.h"
 
 namespace {
 
-class Picture {
-  public:
-    explicit Picture(BView& view, float scale = 1) : scale_(scale) {
-        image_.loadFromData(QByteArray::fromStdString(DrawPicture(&view, PictureFormat::Png, scale)));
-        EXPECT_FALSE(image_.isNull());
+struct Picture : QImage {
+    explicit Picture(BView& view, float scaling = 1) : scale(scaling) {
+        loadFromData(QByteArray::fromStdString(DrawPicture(&view, PictureFormat::Png, scale)));
     }
     [[nodiscard]] rgb_color At(float x, float y) const {
-        const QColor color = image_.pixelColor(static_cast<int>(x * scale_), static_cast<int>(y * scale_));
+        const QColor color = pixelColor(static_cast<int>(x * scale), static_cast<int>(y * scale));
         return {static_cast<uint8>(color.red()), static_cast<uint8>(color.green()),
                 static_cast<uint8>(color.blue()), 255};
     }
@@ -38,11 +38,7 @@ class Picture {
                 has |= At(part.left + static_cast<float>(x), part.top + static_cast<float>(y)) == color;
         return has;
     }
-    [[nodiscard]] int Width() const { return image_.width(); }
-
-  private:
-    QImage image_;
-    float scale_;
+    float scale;
 };
 
 // All that is written in the view, in the order it is drawn.
@@ -53,10 +49,6 @@ std::string Texts(BView& view) {
     for (std::sregex_iterator found(svg.begin(), svg.end(), text); found != std::sregex_iterator(); ++found)
         all += (*found)[1].str() + '|';
     return all;
-}
-
-rgb_color SliceColor(std::size_t index) {
-    return PieChartColors[index % PieChartColors.size()];
 }
 
 class Chart : public testing::Test {
@@ -90,16 +82,56 @@ class Chart : public testing::Test {
     const BRect legend_ = LayOutPie(area_).legend;
 };
 
+using Slices = std::vector<std::pair<std::string, float>>;
+
+Slices SlicesIn(const CHART_DATA_SET& set) {
+    Slices slices;
+    for (std::size_t i = 0; i < static_cast<std::size_t>(set.count); ++i)
+        slices.emplace_back(set.labels[i].data(), set.values[i]);
+    return slices;
+}
+
+struct Held {
+    const char* name;
+    const char* ticker;
+    const char* type;
+    const char* risk;
+    bool retire;
+    float shares, value;
+};
+constexpr Held Portfolio[] = {
+    {"Acme", "ABC", "Stock Fund", "MED", true, 1, 10},
+    {"Birch", "abc", "STOCK", "Med", false, 2, 20},
+    {"Acme", "ABC", "Bond Fund", "low", false, 4, 40},
+    {"Cedar", " ", "Cash", "Medium", false, 8, 80},
+    {"Dogwood", "", "", "", true, 16, 160},
+};
+
+ChartDataSets SetsOf(std::span<const Held> all) {
+    ChartDataSets sets;
+    EXPECT_EQ(sets.GenerateDataSets(static_cast<long>(all.size())), 0);
+    int index = 0;
+    for (const Held& held : all) {
+        INVESTMENT_DATA record = MakeInvestment("P", held.name, held.shares, 1, held.type);
+        CopyTextZeroed(record.Ticker, held.ticker);
+        CopyTextZeroed(record.Risk, held.risk);
+        record.Retire = held.retire ? 1 : 0;
+        record.Value = held.value;
+        sets.AccumulateDataSet(index++, record);
+    }
+    return sets;
+}
+
 } // namespace
 
 TEST_F(Chart, SlicesRunCounterClockwiseFromThreeOClock) {
     for (const float scale : {1.0F, 2.0F}) {
         // The last one's sweep is out of the legend's way.
         const Picture picture = Show({1, 2, 1, 4}, {"", "", "", ""}, scale);
-        EXPECT_EQ(picture.Width(), scale * (area_.Width() + 1));
+        EXPECT_EQ(picture.width(), scale * (area_.Width() + 1));
         const double middles[] = {22.5, 90, 157.5, 270};
         for (std::size_t i = 0; i < std::size(middles); ++i)
-            EXPECT_EQ(AtAngle(picture, middles[i]), SliceColor(i)) << i;
+            EXPECT_EQ(AtAngle(picture, middles[i]), PieChartColors[i]) << i;
         EXPECT_EQ(picture.At(pie_.center.x, pie_.center.y + pie_.yRadius + 3), colors::dark_gray);
         EXPECT_EQ(picture.At(pie_.center.x, pie_.center.y - pie_.yRadius - 4), colors::gray);
     }
@@ -108,7 +140,7 @@ TEST_F(Chart, SlicesRunCounterClockwiseFromThreeOClock) {
 
 TEST_F(Chart, LegendLinesKeepStepWithTheirSlices) {
     const Picture picture = Show({1, 1, 0, 1}, {"First", "", "Nothing", "A label of thirty-one bytes, aaa"});
-    const rgb_color boxes[] = {SliceColor(0), colors::gray, SliceColor(2), SliceColor(3)};
+    const rgb_color boxes[] = {PieChartColors[0], colors::gray, PieChartColors[2], PieChartColors[3]};
     for (int i = 0; i < 4; ++i) {
         EXPECT_EQ(picture.At(Box(i).left, Box(i).top), boxes[i]) << i;
         EXPECT_EQ(picture.At(Box(i).right, Box(i).bottom), boxes[i]) << i;
@@ -121,11 +153,11 @@ TEST_F(Chart, LegendLinesKeepStepWithTheirSlices) {
 
 TEST_F(Chart, ColorsBeginAgainAndALongLegendSaysWhatIsMissing) {
     const Picture picture = Show(std::vector<float>(60, 1), std::vector<const char*>(60, "x"));
-    EXPECT_EQ(AtAngle(picture, 16.5 / 60 * 360), SliceColor(0));
-    EXPECT_EQ(picture.At(Box(16).left, Box(16).top), SliceColor(0));
+    EXPECT_EQ(AtAngle(picture, 16.5 / 60 * 360), PieChartColors[0]);
+    EXPECT_EQ(picture.At(Box(16).left, Box(16).top), PieChartColors[0]);
     const int room = static_cast<int>((legend_.Height() + 2) / (lineHeight_ + 2));
     EXPECT_EQ(picture.At(Box(room - 2).left, Box(room - 2).top),
-              SliceColor(static_cast<std::size_t>(room - 2)));
+              PieChartColors[static_cast<std::size_t>(room - 2) % 16]);
     EXPECT_EQ(picture.At(Box(room - 1).left, Box(room - 1).top), colors::gray);
     EXPECT_TRUE(Texts(view_).ends_with("|x: $1.00 1.67%|and " + std::to_string(60 - room + 1) + " more|"));
 }
@@ -140,9 +172,9 @@ TEST_F(Chart, LegendTextsStayReadableAndInTheView) {
         EXPECT_EQ(picture.At(area_.right, Box(0).top + y), colors::gray) << "the percentage is cut off";
     // At the top of a line's text, which no letter reaches, and on the pie's free half.
     const rgb_color veiled = picture.At(pie_.center.x - pie_.xRadius / 2, Box(9).top - 2);
-    EXPECT_GT(veiled.red, SliceColor(11).red);
+    EXPECT_GT(veiled.red, PieChartColors[11].red);
     EXPECT_LT(veiled.red, colors::gray.red);
-    EXPECT_EQ(picture.At(pie_.center.x + pie_.xRadius * 0.9F, pie_.center.y), SliceColor(11));
+    EXPECT_EQ(picture.At(pie_.center.x + pie_.xRadius * 0.9F, pie_.center.y), PieChartColors[11]);
 
     PieChartView tiny({0, 0, 60, 9}); // without room for a line
     tiny.SetData(values_.data(), 12);
@@ -156,7 +188,7 @@ TEST_F(Chart, SaysWhenThereIsNothingToChart) {
         const Picture picture = Show(values, {});
         EXPECT_EQ(Texts(view_), "Title|Nothing to Chart!|");
         EXPECT_TRUE(picture.Has({100, 170, 250, 200}, colors::black)) << values.size();
-        EXPECT_FALSE(picture.Has(area_, SliceColor(0))) << values.size();
+        EXPECT_FALSE(picture.Has(area_, PieChartColors[0])) << values.size();
     }
 }
 
@@ -227,7 +259,7 @@ TEST(ChartWindow, TheMenuAndTheCheckBoxChooseWhatIsShown) {
         "growth", [&] { return !view("value chart view")->IsHidden(); },
         [&] {
             EXPECT_TRUE(view("pie chart view")->IsHidden());
-            QTest::mouseClick(Driver::Window("Quorvan")->findChild<QCheckBox*>(), Qt::LeftButton, {}, {6, 6});
+            Driver::Press(Driver::Window("Quorvan"), "last percentage check");
         });
     driver.When(
         "without 25%",
@@ -239,4 +271,68 @@ TEST(ChartWindow, TheMenuAndTheCheckBoxChooseWhatIsShown) {
     new ChartWindow(50, 50, "P");
     application.Run();
     app_state = nullptr;
+}
+
+TEST(ChartDataSets, GroupByTheirKeysInTheOrderMet) {
+    const ChartDataSets sets = SetsOf(Portfolio);
+    const Slices expected[] = {
+        {{"Acme", 10}, {"Birch", 20}, {"Acme", 40}, {"Cedar", 80}, {"Dogwood", 160}},
+        {{"ABC", 50}, {"abc", 20}},
+        {{"Stock Fund", 10}, {"STOCK", 20}, {"Bond Fund", 40}, {"Cash", 80}},
+        {{"Fund", 50}, {"Stock", 20}, {"Other", 240}},
+        {{"Low", 40}, {"Med", 30}, {"High", 0}},
+        {{"Retirement", 170}, {"Non-Retirement", 140}},
+        {{"Acme", 5}, {"Birch", 2}, {"Cedar", 8}, {"Dogwood", 16}},
+    };
+    for (std::uint32_t i = 0; i < std::size(expected); ++i)
+        EXPECT_EQ(SlicesIn(sets.ForChart(FirstChart + i)), expected[i]) << Charts[i].title;
+    EXPECT_EQ(&sets.ForChart(1), &sets.ForChart(FirstChart));
+}
+
+TEST(ChartDataSets, HaveTheirFixedSlicesAndKeepWithinTheirCapacity) {
+    ChartDataSets sets = SetsOf({Portfolio, 1});
+    for (int i = 1; i < 10; ++i)
+        sets.AccumulateDataSet(i, MakeInvestment("P", std::to_string(i), 1, 1, std::to_string(i)));
+    for (const std::uint32_t chart : {2000, 2002, 2006})
+        EXPECT_EQ(sets.ForChart(chart).count, 3) << chart;
+    EXPECT_EQ(SlicesIn(sets.ForChart(2005)), (Slices{{"Retirement", 10}, {"Non-Retirement", 9}}));
+    EXPECT_EQ(sets.GenerateDataSets(-1), 0); // a query that failed
+    EXPECT_EQ(SlicesIn(sets.ForChart(2002)), Slices{});
+    EXPECT_EQ(SlicesIn(sets.ForChart(2005)), (Slices{{"Retirement", 0}, {"Non-Retirement", 0}}));
+    EXPECT_EQ(sets.GenerateDataSets(std::numeric_limits<long>::max()), 1);
+}
+
+TEST(ChartGeometry, SlicesTakeTheirShareOfTheTurn) {
+    const float values[] = {1, 0, 2, 1};
+    std::string slices;
+    for (const PieSlice& slice : SlicesOf(values, 4, 4))
+        slices += std::to_string(slice.value) + ": " + std::to_string(std::lround(slice.start)) + " + " +
+                  std::to_string(std::lround(slice.sweep)) + '\n';
+    EXPECT_EQ(slices, "0: 0 + 90\n2: 90 + 180\n3: 270 + 90\n");
+    const std::vector<float> many(100'000, 0.5F);
+    EXPECT_LT(SlicesOf(many.data(), 100'000, 50'000).size(), 4000U);
+    for (const float total : {0.0F, std::nanf(""), std::numeric_limits<float>::infinity()})
+        EXPECT_TRUE(SlicesOf(values, 4, total).empty()) << total;
+    const float mixed[] = {1e9F, -1e9F, 1};
+    for (const PieSlice& slice : SlicesOf(mixed, 3, 1))
+        EXPECT_LE(std::abs(slice.sweep), 360);
+}
+
+TEST(ChartGeometry, LegendLinesFollowTheDecimalPlacesAndTheWidth) {
+    const auto letters = [](const std::string& text) { return static_cast<float>(text.size()); };
+    EXPECT_EQ(LegendLine("Acme", 1200.5F, 3201.333F, 2), "Acme: $1200.50 37.50%");
+    EXPECT_EQ(LegendLine("Acme", 150, 400, 3), "Acme: 150.00 37.50%");
+    EXPECT_EQ(FittedLegendLine("Maple Timber", 5, 10, 2, 26, letters), "Maple Timber: $5.00 50.00%");
+    EXPECT_EQ(FittedLegendLine("Maple Timber", 5, 10, 2, 25, letters), "Maple Ti...: $5.00 50.00%");
+    EXPECT_EQ(FittedLegendLine("Maple Timber", 5, 10, 0, 8, letters), "Maple...");
+    EXPECT_EQ(LegendLine("Huge", -3e38F, 3e38F, 2).substr(0, 14), "Huge: $-300000");
+}
+
+TEST(ChartGeometry, GrowthIsWorkedOutYearByYear) {
+    EXPECT_NEAR(Grow(1000, Percentages[4])[25], 264'698, 1);
+    EXPECT_NEAR(Grow(1000, Percentages[2])[25], 32'919, 1);
+    EXPECT_EQ(Grow(-5, 0.05F)[0], -5);
+    EXPECT_FLOAT_EQ(PlaceOnAxis(1500, 1000, 2000, 300, 100), 200);
+    EXPECT_FLOAT_EQ(PlaceOnAxis(0, 0, 0, 300, 100), 300); // nothing grows
+    EXPECT_FLOAT_EQ(PlaceOnAxis(1, 0, std::numeric_limits<float>::infinity(), 300, 100), 300);
 }
