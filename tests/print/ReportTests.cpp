@@ -6,7 +6,6 @@
 #include <functional>
 #include <limits>
 
-#include <QDialog>
 #include <QImage>
 
 #include "Pdf.h"
@@ -174,11 +173,13 @@ TEST_F(ReportTest, ItsJobSaysWhatBecameOfIt) {
     const auto run = [&] { return RunReportJob(nullptr, "Mine", investments, settings); };
     Driver driver;
     const auto cancel = [&](const char* dialog) {
-        const auto shown = [dialog] {
-            auto* found = qobject_cast<QDialog*>(QApplication::activeModalWidget());
-            return found && found->objectName() == dialog ? found : nullptr;
-        };
-        driver.When(dialog, shown, [=] { shown()->reject(); });
+        driver.When(
+            dialog,
+            [dialog] {
+                const QWidget* shown = QApplication::activeModalWidget();
+                return shown && shown->objectName() == dialog;
+            },
+            [] { QApplication::activeModalWidget()->close(); });
     };
     const std::string replace =
         "The file " + folder_.File("page.pdf") + " exists. Replace it by this report?";

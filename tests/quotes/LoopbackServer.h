@@ -125,6 +125,7 @@ class LoopbackServer {
         work();
         changed_.notify_all();
     }
+
     void Run() {
         sigset_t all; // a stream may write to a client that has gone
         sigfillset(&all);
