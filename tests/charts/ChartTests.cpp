@@ -5,7 +5,6 @@
 
 #include <cmath>
 #include <limits>
-#include <regex>
 
 #include <QImage>
 #include <QPushButton>
@@ -44,10 +43,11 @@ struct Picture : QImage {
 // All that is written in the view, in the order it is drawn.
 std::string Texts(BView& view) {
     const std::string svg = DrawPicture(&view, PictureFormat::Svg);
-    const std::regex text(">([^<]*)</text>");
     std::string all;
-    for (std::sregex_iterator found(svg.begin(), svg.end(), text); found != std::sregex_iterator(); ++found)
-        all += (*found)[1].str() + '|';
+    for (std::size_t end = svg.find("</text>"); end != svg.npos; end = svg.find("</text>", end + 1)) {
+        const std::size_t begin = svg.rfind('>', end) + 1;
+        all += svg.substr(begin, end - begin) + '|';
+    }
     return all;
 }
 
