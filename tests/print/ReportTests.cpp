@@ -2,6 +2,7 @@
 #include "DataFolder.h"
 #include "Driver.h"
 
+#include <algorithm>
 #include <cstring>
 #include <functional>
 #include <limits>
@@ -51,8 +52,7 @@ class ReportTest : public testing::Test {
     [[nodiscard]] PdfWord Word(const std::string& text) const { return FindWord(words_, text); }
     [[nodiscard]] float Height(const std::string& text) const { return Word(text).bottom - Word(text).top; }
     [[nodiscard]] long Count(const std::string& text) const {
-        return std::count_if(words_.begin(), words_.end(),
-                             [&](const PdfWord& word) { return word.text == text; });
+        return std::ranges::count(words_, text, &PdfWord::text);
     }
     // The darkest place of a piece of a line, 0 to 255.
     [[nodiscard]] int Darkest(float from, float to, float y) const {

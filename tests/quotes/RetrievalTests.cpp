@@ -121,7 +121,9 @@ TEST_F(Retrieval, ScansAPageBehindTlsInOnePiece) {
         bytes.emplace_back(1, byte);
     TlsServer server(identity_, [&](const std::string&) { return Reply{bytes}; });
     EXPECT_EQ(GetQuote(server.Host().c_str(), "q?s=B C#\xC3\xA4%20\n", "Last", 3, context_), 45.375F);
-    EXPECT_TRUE(server.Requests().at(0).starts_with("GET /q?s=B%20C%23%C3%A4%20%0A HTTP/1.1\r\n"));
+    const std::string request = server.Requests().at(0);
+    EXPECT_TRUE(request.starts_with("GET /q?s=B%20C%23%C3%A4%20%0A HTTP/1.1\r\n")) << request;
+    EXPECT_NE(request.find("\r\nUser-Agent: Quorvan\r\n"), request.npos) << request;
     EXPECT_EQ(Log(), Asked + "connected to 127.0.0.1 port " + std::to_string(server.Port()) +
                          "\nreceived 35 bytes\nfound tag\nskipped ok\nvalue string is '45'\n"
                          "Returning price = 45.38\n");
@@ -192,11 +194,7 @@ TEST_F(Retrieval, TriesTheSourcesInOrder) {
     const std::string refused = "net " + refusing.Host() + " /q?s= Last 3\n";
     const std::string nowhere = "net "s + NoSuchHost + " /q?s= Last 3\n";
     const std::string comment = ";a comment that is long enough\n";
-    const struct {
-        std::string lines;
-        float price;
-        std::size_t requests;
-    } cases[] = {
+    const std::tuple<std::string, float, std::size_t> cases[] = {
         {"\n" + line("4"), NoQuote, 0},
         {nowhere + line("42.5") + line("7"), 42.5F, 1},
         {refused + line("42.5"), 42.5F, 1},
@@ -214,9 +212,9 @@ TEST_F(Retrieval, TriesTheSourcesInOrder) {
         {line(std::string(122, '0') + '7'), NoQuote, 0},
     };
     std::size_t before = 0;
-    for (const auto& c : cases) {
-        EXPECT_EQ(Quote(c.lines), c.price) << c.lines;
-        EXPECT_EQ(server.Requests().size() - before, c.requests) << c.lines;
+    for (const auto& [lines, price, requests] : cases) {
+        EXPECT_EQ(Quote(lines), price) << lines;
+        EXPECT_EQ(server.Requests().size() - before, requests) << lines;
         before = server.Requests().size();
     }
     EXPECT_EQ(GetPriceQuoteFrom(refused + line("7"), "ABC", {}), 7);

@@ -30,12 +30,7 @@ class Scanner : public QuoteTest {
 TEST_F(Scanner, ReadsThePriceBehindTheMarker) {
     const std::string found = "found tag\nskipped ok\n";
     const std::string longValue(1000, '7');
-    const struct {
-        std::vector<std::string> pieces;
-        int skip;
-        float price;
-        std::string log;
-    } cases[] = {
+    const std::tuple<std::vector<std::string>, int, float, std::string> cases[] = {
         {{"a Last</td><td><b>45<sup>3</sup>/<sub>8</sub></b>"}, 3, 45.375F, found + "value string is '45'\n"},
         {{"Last<b>45</b> and support follows"}, 1, NoQuote, found + "value string is '45'\n"},
         {{"Last<b>45</b> and no more"}, 1, 45, found + "value string is '45'\n"},
@@ -59,9 +54,9 @@ TEST_F(Scanner, ReadsThePriceBehindTheMarker) {
         {{"\0\xFF\0Last\0>45 \0 1/2"s}, 1, 45, found + "value string is '45'\n"},
         {{"Last>" + longValue}, 1, NoQuote, found + "value string is '" + longValue.substr(0, 109) + "\n"},
     };
-    for (const auto& c : cases) {
-        EXPECT_EQ(Scan(c.pieces, c.skip), c.price) << c.pieces[0];
-        EXPECT_EQ(Log(), c.log) << c.pieces[0];
+    for (const auto& [pieces, skip, price, log] : cases) {
+        EXPECT_EQ(Scan(pieces, skip), price) << pieces[0];
+        EXPECT_EQ(Log(), log) << pieces[0];
     }
 }
 
@@ -121,10 +116,7 @@ std::string Described(QuoteSourceReader& reader) {
 TEST(QuoteSource, LinesAreReadUpToTheListsEnd) {
     const std::string comment = ";" + std::string(253, 'x') + "\n";
     const std::string label(31, 'l'), host(63, 'h'), path(127, 'p'), tag(31, 't');
-    const struct {
-        std::string content;
-        std::vector<std::string> lines;
-    } cases[] = {
+    const std::pair<std::string, std::vector<std::string>> cases[] = {
         {";2345678\nnet h /q Last 3\n", {"end of list"}},
         {";23456789\nnet h /q Last 3", {"1 comment", "2 net|h|/q|Last|3", "end of file"}},
         {"net h\t /q \v Last\r+3x more", {"1 net|h|/q|Last|3", "end of file"}},
@@ -145,10 +137,10 @@ TEST(QuoteSource, LinesAreReadUpToTheListsEnd) {
         {"net h p" + path + " Last 3", {"1its path has more than 127 bytes"}},
         {"net h /q t" + tag + " 3", {"1its marker has more than 31 bytes"}},
     };
-    for (const auto& c : cases) {
-        QuoteSourceReader reader(c.content);
-        for (const std::string& line : c.lines)
-            EXPECT_EQ(Described(reader), line) << c.content;
+    for (const auto& [content, lines] : cases) {
+        QuoteSourceReader reader(content);
+        for (const std::string& line : lines)
+            EXPECT_EQ(Described(reader), line) << content;
     }
 }
 
