@@ -37,8 +37,8 @@ class LoopbackSocket {
         address.sin_family = AF_INET;
         address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
         socklen_t size = sizeof address;
-        bind(fd_, reinterpret_cast<sockaddr*>(&address), size);
-        getsockname(fd_, reinterpret_cast<sockaddr*>(&address), &size);
+        if (bind(fd_, reinterpret_cast<sockaddr*>(&address), size) == 0)
+            getsockname(fd_, reinterpret_cast<sockaddr*>(&address), &size);
         port_ = ntohs(address.sin_port);
     }
     LoopbackSocket(const LoopbackSocket&) = delete;

@@ -82,8 +82,8 @@ const std::string NoPrice = "Returning price = -4.00\n";
 
 struct Answered {
     Reply reply;
-    float price;
     std::string log;
+    float price;
     int redirects = 0;
 };
 
@@ -92,25 +92,26 @@ TEST_F(Retrieval, AsksByABareRequestAndLogsEveryStep) {
     const std::string found = "found tag\nskipped ok\nvalue string is '";
     const std::string priced = found + "45'\nReturning price = 45.38\nPrice = 45.38\n";
     const Answered cases[] = {
-        {{{Page}}, 45.375F, priced},
-        {{{Page}, End::Hold}, 45.375F, priced},
-        {{{Page}, End::Endless}, 45.375F, priced},
+        {{{Page}}, priced, 45.375F},
+        {{{Page}, End::Hold}, priced, 45.375F},
+        {{{Page}, End::Endless}, priced, 45.375F},
         // Each piece is read as it arrives.
-        {{{"La", "st>7", "Last>>>8"}, {}, true}, 8, found + "8'\nReturning price = 8.00\nPrice = 8.00\n"},
-        {{{"Last<", "b>>>7 ", "1/2"}, {}, true}, 7, found + "7'\nReturning price = 7.00\nPrice = 7.00\n"},
-        {{{"Last</td>"}}, NoQuote, "found tag\nreceived zero bytes\n" + NoPrice},
-        {{{"\0\xFF%s%n\x1B[2J"s}}, NoQuote, "received zero bytes\n" + NoPrice},
-        {{{"Last></>>%s%n%s"}}, 0, found + "%s%n%s'\nReturning price = 0.00\n"},
-        {{}, NoQuote, "received zero bytes\n" + NoPrice},
-        {{{}, End::Reset}, NoQuote, "recv() error\n" + NoPrice},
+        {{{"La", "st>7", "Last>>>8"}, {}, true}, found + "8'\nReturning price = 8.00\nPrice = 8.00\n", 8},
+        {{{"Last<", "b>>>7 ", "1/2"}, {}, true}, found + "7'\nReturning price = 7.00\nPrice = 7.00\n", 7},
+        {{{"Last</td>"}}, "found tag\nreceived zero bytes\n" + NoPrice, NoQuote},
+        {{{"\0\xFF%s%n\x1B[2J"s}}, "received zero bytes\n" + NoPrice, NoQuote},
+        {{{"Last></>>%s%n%s"}}, found + "%s%n%s'\nReturning price = 0.00\n", 0},
+        {{}, "received zero bytes\n" + NoPrice, NoQuote},
+        {{{}, End::Reset}, "recv() error\n" + NoPrice, NoQuote},
     };
+    const std::string asked = "Checking 'HOST/q?s=ABC'\n" + Created + "connected ok\n" + request;
     StepByStep steps;
     context_.observer = &steps;
     for (const auto& c : cases) {
         LoopbackServer server(c.reply);
         steps.server = &server;
         EXPECT_EQ(Ask(server.Host()), c.price) << c.log;
-        EXPECT_EQ(Log(), "Checking 'HOST/q?s=ABC'\n" + Created + "connected ok\n" + request + c.log);
+        EXPECT_EQ(Log(), asked + c.log);
         EXPECT_EQ(server.Requests(), std::vector{request});
     }
 }
@@ -135,14 +136,14 @@ TEST_F(Retrieval, OnceAskedTheAnswerBehindTlsCountsWhateverItsEnd) {
         return Reply{{"HTTP/1.0 302 Found\r\nLocation: " + address + "\r\nContent-Length: 0\r\n\r\n"}};
     };
     const Answered cases[] = {
-        {{{Page}}, 45.375F, "value string is '45'\n", 5},
-        {{{Page}}, NoQuote, "https error: Maximum (5) redirects followed\n", 6},
-        {redirect("http://" + plain.Host()), NoQuote, "https error: Protocol \"http\" not supported"},
-        {{{"HTTP/1.0 404 Not Found\r\n\r\n" + Page}}, NoQuote, "The requested URL returned error: 404\n"},
-        {{{Page, std::string(100'000, 'x')}, End::Endless}, 45.375F, "the page has more than 10 MB\n"},
-        {{}, NoQuote, "https error: "},
-        {{{Page.substr(0, 30)}, End::Reset}, NoQuote, "https error: "},
-        {{{"HTTP/1.0 200 OK\r\nContent-Length: 999\r\n\r\n" + Page}}, 45.375F, "https error: "},
+        {{{Page}}, "value string is '45'\n", 45.375F, 5},
+        {{{Page}}, "https error: Maximum (5) redirects followed\n", NoQuote, 6},
+        {redirect("http://" + plain.Host()), "https error: Protocol \"http\" not supported", NoQuote},
+        {{{"HTTP/1.0 404 Not Found\r\n\r\n" + Page}}, "The requested URL returned error: 404\n", NoQuote},
+        {{{Page, std::string(100'000, 'x')}, End::Endless}, "the page has more than 10 MB\n", 45.375F},
+        {{}, "https error: ", NoQuote},
+        {{{Page.substr(0, 30)}, End::Reset}, "https error: ", NoQuote},
+        {{{"HTTP/1.0 200 OK\r\nContent-Length: 999\r\n\r\n" + Page}}, "https error: ", 45.375F},
     };
     for (const auto& c : cases) {
         int redirects = c.redirects;
