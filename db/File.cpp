@@ -230,8 +230,9 @@ int File::TakeOwner(const struct stat& theirs, mode_t mode) {
 }
 
 mode_t PermissionsBeside(mode_t mode) {
-    constexpr mode_t othersMayWrite = 022;
-    return mode & ((mode & othersMayWrite) != 0 ? 0777 : 0700);
+    const mode_t group = (mode & 020) != 0 ? 070 : 0;
+    const mode_t others = (mode & 002) != 0 ? 007 : 0;
+    return mode & (0700 | group | others);
 }
 
 bool File::IsAt(const std::string& path) const {

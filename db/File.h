@@ -43,8 +43,9 @@ enum class FileMode {
                ///< alone
 };
 
-/// The permissions for a copy of a file, or for a folder in a folder, whose permissions are `mode`: the same
-/// where others may write, since it is several people's then; else the owner's alone.
+/// The permissions for a copy of a file, or for a folder in a folder, whose permissions are `mode`: the
+/// owner's, and those of the group and of all others as far as they may write there, since it is theirs then
+/// too. Who may only read gets none.
 [[nodiscard]] mode_t PermissionsBeside(mode_t mode);
 
 /// One open file, read and written by position. It is the only place where the engine touches files.

@@ -57,7 +57,7 @@ class BackupTest : public testing::Test {
 };
 
 TEST_F(BackupTest, TheFirstChangeOfADayKeepsWhatTheFilesHeld) {
-    std::filesystem::permissions(folder_.File("invest.db"), std::filesystem::perms{0660}); // several people's
+    std::filesystem::permissions(folder_.File("invest.db"), std::filesystem::perms{0664}); // a group's
     const auto backup = MakeBackup();
     BackedUpFiles files(*backup);
     DATABASE invest(folder_.File("invest.db").c_str(), files);
