@@ -15,9 +15,10 @@ std::string WhyNotOpened(const std::string& folder, const std::string& name, Fil
     const std::string path = folder + "/" + name;
     File file(operations);
     const int error = file.Open(path, FileMode::ReadOnly);
-    COMPACTION_PATHS paths;
-    if (error == ENOENT && FindCompactionPaths(path, &paths) && FileExists(paths.backup))
-        return name + " is missing, but its backup with the extension .bak is there.";
+    if (const std::string leftover = FindCompactionLeftover(path); error == ENOENT && !leftover.empty())
+        return name + " is missing, but " + leftover +
+               " is there, as an interrupted compaction leaves it. \"quorvan-cli db " + path +
+               " check --repair\" gives it the file's name.";
     if (error == ENOENT)
         return name + " is missing. \"quorvan-cli setup " + folder + "\" makes a new one.";
     if (error != 0)

@@ -50,6 +50,17 @@ bool FindCompactionPaths(const std::string& path, COMPACTION_PATHS* paths) {
            paths->data != paths->backup;
 }
 
+std::string FindCompactionLeftover(const std::string& path) {
+    COMPACTION_PATHS paths;
+    if (!FindCompactionPaths(path, &paths) || FileExists(paths.data)) {
+        return {};
+    }
+    if (FileExists(paths.backup)) {
+        return paths.backup;
+    }
+    return FileExists(paths.temporary) ? paths.temporary : std::string();
+}
+
 int RestoreCompactionBackup(const char* path, FileOperations& operations) {
     COMPACTION_PATHS paths;
     if (path == nullptr || !FindCompactionPaths(path, &paths) || FileExists(paths.data) ||

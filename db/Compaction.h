@@ -16,6 +16,11 @@ struct COMPACTION_PATHS {
 /// names.
 [[nodiscard]] bool FindCompactionPaths(const std::string& path, COMPACTION_PATHS* paths);
 
+/// What an interrupted compaction left where nothing is at `path` itself: its backup, which is whole for
+/// certain, or else its temporary file. Empty for neither. No new file may be made there: the next compaction
+/// of that would remove it.
+[[nodiscard]] std::string FindCompactionLeftover(const std::string& path);
+
 /// Undoes what a compaction that was ended between its two renames leaves behind: when nothing is at `path`
 /// but its backup lies beside it, the backup gets its name back. To be called before the file is opened.
 /// Nothing else is touched; a temporary file that was left over is overwritten by the next compaction.

@@ -129,22 +129,12 @@ bool DataFileTool::Open(Access access) {
     return access == Access::Read || KeepBackup();
 }
 
-// Of the two, the backup is the one that is whole for certain.
-std::string DataFileTool::Leftover() const {
-    COMPACTION_PATHS paths;
-    if (!FindCompactionPaths(file_, &paths) || FileExists(paths.data))
-        return {};
-    if (FileExists(paths.backup))
-        return paths.backup;
-    return FileExists(paths.temporary) ? paths.temporary : std::string();
-}
-
 std::string DataFileTool::WhyNotOpened() const {
     FileCheck check;
     const int error = check.Run(file_);
     if (error == 0 && !check.Findings().empty() && !check.IsSound())
         return check.Findings().front().text;
-    if (const std::string leftover = Leftover(); error == ENOENT && !leftover.empty())
+    if (const std::string leftover = FindCompactionLeftover(file_); error == ENOENT && !leftover.empty())
         return "there is no such file, but " + leftover +
                ", as an interrupted compaction leaves it; `check --repair` gives it the file's name";
     if (error == EINVAL)

@@ -86,8 +86,6 @@ class DataFileTool {
     [[nodiscard]] bool TakeFolders();
     [[nodiscard]] bool TakeFolder(const std::string& folder);
     [[nodiscard]] bool KeepBackup();
-    // The file of an interrupted compaction that lies where the data file itself is missing; empty for none.
-    [[nodiscard]] std::string Leftover() const;
     [[nodiscard]] std::string WhyNotOpened() const;
     [[nodiscard]] int Fail(const std::string& sentence);
     // Tells of a failure of the engine, by default its latest, with the system's reason for one of the file.

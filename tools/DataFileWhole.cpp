@@ -97,7 +97,7 @@ int DataFileTool::Create(const std::string& description, const std::vector<std::
         return Fail("the description is longer than 31 bytes");
     if (!TakeFolders())
         return 1;
-    if (!Leftover().empty())
+    if (!FindCompactionLeftover(file_).empty())
         return Fail(WhyNotOpened() + "; nothing is made");
     errno = 0;
     if (database_.Create(file_.c_str(), description.c_str(), static_cast<int>(entries.size()),
@@ -115,7 +115,7 @@ int DataFileTool::Create(const std::string& description, const std::vector<std::
 
 // Gives what an interrupted compaction left the name of the file that is missing. False when it could not.
 bool DataFileTool::RestoreLeftover() {
-    const std::string leftover = Leftover();
+    const std::string leftover = FindCompactionLeftover(file_);
     if (leftover.empty())
         return true;
     if (const int restored = RestoreCompactionBackup(file_.c_str(), operations_); restored != 0) {

@@ -12,6 +12,7 @@
 #include <utility>
 
 #include "app/RecordLayouts.h"
+#include "db/Compaction.h"
 #include "db/Database.h"
 #include "tools/DesktopFiles.h"
 #include "tools/FirstFiles.h"
@@ -104,13 +105,10 @@ class FolderSetup {
     void Kept(const std::string& name, const std::string& remark);
     void Fail(const std::string& sentence);
 
-    // Whether the data file has data: in its backup when the program was killed while it rewrote the file.
-    // The program puts that back, unless a new file has taken its place.
-    [[nodiscard]] bool IsThere(const std::string& stem) const {
-        return Exists(PathOf(FileOf(stem))) || Exists(PathOf(BackupOf(stem)));
-    }
+    // The name under which the data file's data is there, which an interrupted compaction may have left in
+    // another place; empty for none.
+    [[nodiscard]] std::string Present(const std::string& stem) const;
     [[nodiscard]] static std::string FileOf(const std::string& stem) { return stem + ".db"; }
-    [[nodiscard]] static std::string BackupOf(const std::string& stem) { return stem + ".bak"; }
     [[nodiscard]] std::string PathOf(const std::string& name) const { return folder_ + "/" + name; }
     [[nodiscard]] std::string TemporaryFor(const std::string& name) const { return PathOf(name) + ".part"; }
 
@@ -211,14 +209,19 @@ bool FolderSetup::PrepareDataFile(const DataFilePlan& plan) {
     return false;
 }
 
+std::string FolderSetup::Present(const std::string& stem) const {
+    std::string name = FileOf(stem);
+    return Exists(PathOf(name)) ? name : fs::path(FindCompactionLeftover(PathOf(name))).filename().string();
+}
+
 void FolderSetup::MakeTogether(std::span<const DataFilePlan> plans) {
     bool prepared = true;
     for (const DataFilePlan& plan : plans)
-        prepared = prepared && (IsThere(plan.stem) || PrepareDataFile(plan));
+        prepared = prepared && (!Present(plan.stem).empty() || PrepareDataFile(plan));
     for (const DataFilePlan& plan : plans) {
         const std::string name = FileOf(plan.stem);
-        if (IsThere(plan.stem))
-            Kept(Exists(PathOf(name)) ? name : BackupOf(plan.stem), "");
+        if (const std::string present = Present(plan.stem); !present.empty())
+            Kept(present, "");
         else if (prepared)
             Conclude(MoveWithoutReplacing(TemporaryFor(name), PathOf(name)), name, plan.content);
         unlink(TemporaryFor(name).c_str());
@@ -226,7 +229,7 @@ void FolderSetup::MakeTogether(std::span<const DataFilePlan> plans) {
 }
 
 void FolderSetup::MakeDataFiles() {
-    const bool sample = options_.sample && !IsThere("portfol") && !IsThere("invest");
+    const bool sample = options_.sample && Present("portfol").empty() && Present("invest").empty();
     const DataFilePlan empty[] = {
         {"invest", "Quorvan investments", InvestmentColumns, {}, "empty"},
         {"portfol", "Quorvan portfolios", PortfolioColumns, {}, "empty"},

@@ -199,6 +199,11 @@ TEST(DataFileOpening, SaysWhatIsWrongByName) {
     const auto any = [](DATABASE&) { return true; };
     const auto noneOfOurs = [](DATABASE&) { return false; };
     const auto nothing = [] {};
+    const auto leftover = [&](const char* extension) {
+        return "is missing, but " + folder.File("invest") + extension +
+               " is there, as an interrupted compaction leaves it. \"quorvan-cli db " + path +
+               " check --repair\" gives it the file's name.\n";
+    };
     const struct {
         std::string what;
         std::function<void()> spoil;
@@ -211,7 +216,9 @@ TEST(DataFileOpening, SaysWhatIsWrongByName) {
         {"missing", [&] { std::filesystem::remove(path); },
          "is missing. \"quorvan-cli setup " + folder.Path() + "\" makes a new one.\n"},
         {"its backup cannot be put back", [&] { std::filesystem::rename(path, folder.File("invest.bak")); },
-         "is missing, but its backup with the extension .bak is there.\n", false, any, readOnly},
+         leftover(".bak"), false, any, readOnly},
+        {"only a compaction's file", [&] { std::filesystem::rename(path, folder.File("invest.new")); },
+         leftover(".new")},
         {"a folder",
          [&] {
              std::filesystem::remove(path);

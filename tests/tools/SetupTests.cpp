@@ -144,12 +144,16 @@ TEST_F(SetupTest, NeverChangesAFileThatExists) {
     EXPECT_EQ(folder_.Read("home/Quorvan.ini"), "mine");
 }
 
-TEST_F(SetupTest, LeavesABackupItsPlace) {
+TEST_F(SetupTest, LeavesWhatACompactionLeftItsPlace) {
     ASSERT_EQ(Setup("--sample"), 0);
-    fs::rename(folder_.File("home/invest.db"), folder_.File("home/invest.bak"));
-    ASSERT_EQ(Setup(), 0);
-    EXPECT_TRUE(folder_.Says("kept  invest.bak\n"));
-    EXPECT_FALSE(folder_.Has("home/invest.db"));
+    std::string last = "invest.db";
+    for (const char* name : {"invest.bak", "invest.new"}) {
+        fs::rename(folder_.File("home/" + last), folder_.File(std::string("home/") + name));
+        last = name;
+        ASSERT_EQ(Setup(), 0);
+        EXPECT_TRUE(folder_.Says("kept  " + last + "\n")) << last;
+        EXPECT_FALSE(folder_.Has("home/invest.db")) << last;
+    }
 }
 
 std::string Movement(const INVESTMENT_DATA& record) {
