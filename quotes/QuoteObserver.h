@@ -25,8 +25,8 @@ class QuoteObserver {
     virtual void Connected(const char* /*server*/) {}
     // The exchange ended without a whole page for the reason given.
     virtual void Failed(const char* /*reason*/) {}
-    // Failed was because this source's server, or one that it redirects to, showed no certificate that is
-    // trusted here for its name.
+    // Failed was because the host, which is this source's or one that it redirects to, showed no certificate
+    // that is trusted here for its name.
     virtual void CertificateRefused(const char* /*host*/) {}
     // A piece of the page arrived.
     virtual void PieceReceived(std::string_view /*piece*/) {}

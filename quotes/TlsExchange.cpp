@@ -1,5 +1,6 @@
 #include "quotes/TlsExchange.h"
 
+#include <algorithm>
 #include <curl/curl.h>
 #include <memory>
 #include <string_view>
@@ -74,6 +75,8 @@ class Transfer {
     [[nodiscard]] bool RequestWasSent() const;
     // Empty when there was no connection.
     [[nodiscard]] std::string Server() const;
+    // The host asked last, which is another one after a redirect.
+    [[nodiscard]] std::string LastHost() const;
     [[nodiscard]] const std::string& PageText() const { return page_.text; }
 
   private:
@@ -167,6 +170,14 @@ std::string Transfer::Server() const {
     return std::string(address) + " port " + std::to_string(port);
 }
 
+std::string Transfer::LastHost() const {
+    const char* address = nullptr;
+    curl_easy_getinfo(easy_.get(), CURLINFO_EFFECTIVE_URL, &address);
+    std::string_view host(address ? address : "");
+    host.remove_prefix(std::min(host.size(), std::string_view("https://").size()));
+    return std::string(host.substr(0, host.find_first_of(":/?#")));
+}
+
 // What a transfer that could not ask says about the price.
 float StatusOf(CURLcode result) {
     switch (result) {
@@ -195,7 +206,7 @@ float AskOverTls(const HostField& host, const char* path, QuoteScanner& scanner,
         report.Log("https error: %s\n", transfer.Problem().c_str());
         report.Observer().Failed(transfer.Problem().c_str());
         if (transfer.Result() == CURLE_PEER_FAILED_VERIFICATION) {
-            report.Observer().CertificateRefused(host.name.c_str());
+            report.Observer().CertificateRefused(transfer.LastHost().c_str());
             return QuoteNetworkFailure;
         }
         if (!transfer.RequestWasSent())

@@ -163,6 +163,15 @@ TEST_F(Retrieval, SaysWhyThereIsNoConnection) {
     otherName.AddCertificateTo(caFile_);
     TlsServer unknown(stranger, answer);
     TlsServer misnamed(otherName, answer);
+    const std::string elsewhere = "https://localhost" + unknown.Host().substr(unknown.Host().rfind(':'));
+    TlsServer redirecting(identity_, [&](const std::string&) {
+        return Reply{{"HTTP/1.0 302 Found\r\nLocation: " + elsewhere + "\r\nContent-Length: 0\r\n\r\n"}};
+    });
+    struct : QuoteObserver {
+        void CertificateRefused(const char* host) override { refused = host; }
+        std::string refused;
+    } observer;
+    context_.observer = &observer;
     const LoopbackSocket refusing;
     const struct {
         std::string host, log;
@@ -175,11 +184,13 @@ TEST_F(Retrieval, SaysWhyThereIsNoConnection) {
         {misnamed.Host(), "no alternative certificate subject name matches"},
         {"https://" + refusing.Host(), Asked + "https error: Failed to connect"},
         {"https://"s + NoSuchHost, Asked + "https error: Could not resolve host", NoQuote},
+        {redirecting.Host(), "https error: SSL certificate problem"},
     };
     for (const auto& c : cases) {
         EXPECT_EQ(Ask(c.host), c.result) << c.host;
         ExpectLogsEnd(c.log);
     }
+    EXPECT_EQ(observer.refused, "localhost");
     EXPECT_TRUE(unknown.Requests().empty() && misnamed.Requests().empty());
 }
 
