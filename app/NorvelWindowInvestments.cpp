@@ -264,14 +264,15 @@ bool NorvelWindow::CopySelection() {
         MessageBox("Clipboard memory error!", B_INFO_ALERT);
         return false;
     }
+    int32 copied = 0;
     for (const NorvelItem* row : selected) {
-        if (ReadInvestment(*state.investments, row->RecordNumber(), &state.clipboard[state.clipboardCount]))
-            ++state.clipboardCount;
+        if (!ReadInvestment(*state.investments, row->RecordNumber(), &state.clipboard[copied++])) {
+            TellNotRead();
+            return false;
+        }
     }
-    if (state.clipboardCount == static_cast<int32>(selected.size()))
-        return true;
-    TellNotRead();
-    return false;
+    state.clipboardCount = copied; // all of them, or none
+    return true;
 }
 
 void NorvelWindow::OnInvestmentCopy() {

@@ -211,12 +211,15 @@ TEST_F(MainWindow, DeletesAPortfolioAfterTwoQuestions) {
 
 TEST_F(MainWindow, TellsWhatItCannotReadAndLeavesItAlone) {
     WatchedFiles files;
-    AddPortfolioOf("A", {"a"});
+    AddPortfolioOf("A", {"a", "b"});
     const char* notRead = "An investment could not be read from its file!";
-    Expect({"a"}).Then("the disk fails", [&] {
+    Expect({"a", "b"}).Mark({0, 1}).Then("the disk fails", [&] {
         files.Watch(app_state->investments, File("invest.db"));
-        files.reads = 0;
+        app_state->investments->SetReadCache(0);
+        files.reads = 1;
     });
+    Refused(MessageInvestmentCopy, notRead);
+    Then("nothing copied", [] { EXPECT_EQ(app_state->clipboardCount, 0); });
     Select("A").Answer(notRead, "Ok");
     Expect({}, "not known");
     DeletePortfolio("Yes", "Yes");
