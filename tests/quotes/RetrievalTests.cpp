@@ -23,6 +23,10 @@ using End = Reply::End;
 // Fails at once and asks no name server.
 constexpr const char* NoSuchHost = "no..such..host";
 
+Reply Redirect(const std::string& address) {
+    return {{"HTTP/1.0 302 Found\r\nLocation: " + address + "\r\nContent-Length: 0\r\n\r\n"}};
+}
+
 // Lets a server that replies in step send its next piece.
 struct StepByStep : QuoteObserver {
     void PieceReceived(std::string_view piece) override { server->Taken(piece.size()); }
@@ -132,13 +136,10 @@ TEST_F(Retrieval, ScansAPageBehindTlsInOnePiece) {
 
 TEST_F(Retrieval, OnceAskedTheAnswerBehindTlsCountsWhateverItsEnd) {
     LoopbackServer plain(Reply{{Page}});
-    const auto redirect = [](const std::string& address) {
-        return Reply{{"HTTP/1.0 302 Found\r\nLocation: " + address + "\r\nContent-Length: 0\r\n\r\n"}};
-    };
     const Answered cases[] = {
         {{{Page}}, "value string is '45'\n", 45.375F, 5},
         {{{Page}}, "https error: Maximum (5) redirects followed\n", NoQuote, 6},
-        {redirect("http://" + plain.Host()), "https error: Protocol \"http\" not supported", NoQuote},
+        {Redirect("http://" + plain.Host()), "https error: Protocol \"http\" not supported", NoQuote},
         {{{"HTTP/1.0 404 Not Found\r\n\r\n" + Page}}, "The requested URL returned error: 404\n", NoQuote},
         {{{Page, std::string(100'000, 'x')}, End::Endless}, "the page has more than 10 MB\n", 45.375F},
         {{}, "https error: ", NoQuote},
@@ -148,7 +149,7 @@ TEST_F(Retrieval, OnceAskedTheAnswerBehindTlsCountsWhateverItsEnd) {
     for (const auto& c : cases) {
         int redirects = c.redirects;
         TlsServer server(identity_,
-                         [&](const std::string&) { return redirects-- > 0 ? redirect("/") : c.reply; });
+                         [&](const std::string&) { return redirects-- > 0 ? Redirect("/") : c.reply; });
         EXPECT_EQ(Ask(server.Host()), c.price) << c.log;
         const std::string log = Log();
         EXPECT_NE(log.find(c.log), std::string::npos) << log;
@@ -164,9 +165,7 @@ TEST_F(Retrieval, SaysWhyThereIsNoConnection) {
     TlsServer unknown(stranger, answer);
     TlsServer misnamed(otherName, answer);
     const std::string elsewhere = "https://localhost" + unknown.Host().substr(unknown.Host().rfind(':'));
-    TlsServer redirecting(identity_, [&](const std::string&) {
-        return Reply{{"HTTP/1.0 302 Found\r\nLocation: " + elsewhere + "\r\nContent-Length: 0\r\n\r\n"}};
-    });
+    TlsServer redirecting(identity_, [&](const std::string&) { return Redirect(elsewhere); });
     struct : QuoteObserver {
         void CertificateRefused(const char* host) override { refused = host; }
         std::string refused;
