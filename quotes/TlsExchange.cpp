@@ -116,7 +116,6 @@ void Transfer::SetUp(const std::string& address, const char* caFile) {
     Set(CURLOPT_REDIR_PROTOCOLS_STR, "https");
     Set(CURLOPT_FOLLOWLOCATION, 1L);
     Set(CURLOPT_MAXREDIRS, MaxRedirects);
-    Set(CURLOPT_FAILONERROR, 1L);
     Set(CURLOPT_CONNECTTIMEOUT, ConnectSeconds);
     Set(CURLOPT_TIMEOUT, TotalSeconds);
     Set(CURLOPT_NOSIGNAL, 1L);
