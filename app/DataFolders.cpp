@@ -8,11 +8,6 @@
 
 namespace fs = std::filesystem;
 
-std::string FolderOf(const std::string& path) {
-    const fs::path file(path);
-    return file.has_parent_path() ? file.parent_path().string() : ".";
-}
-
 std::string RealPath(const std::string& path) {
     std::string real = FollowLinks(path);
     return real.empty() ? path : real;

@@ -6,9 +6,6 @@
 // A data file may be a symbolic link. What belongs to it, its folder's lock and its backups, belongs to the
 // folder in which it really lies: there other programs find it by its own name.
 
-// The folder of a path, "." for a mere name.
-[[nodiscard]] std::string FolderOf(const std::string& path);
-
 // The path of the data file itself; `path` as it is where links lead nowhere.
 [[nodiscard]] std::string RealPath(const std::string& path);
 

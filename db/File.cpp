@@ -40,10 +40,6 @@ int FlagsOf(FileMode mode) {
     return O_RDWR | common;
 }
 
-std::filesystem::path FolderOf(const std::filesystem::path& path) {
-    return path.has_parent_path() ? path.parent_path() : std::filesystem::path(".");
-}
-
 } // namespace
 
 int FileOperations::Open(const char* path, int flags, mode_t mode) {
@@ -251,7 +247,7 @@ int RemoveFile(FileOperations& operations, const std::string& path) {
 }
 
 int SyncFolderOf(FileOperations& operations, const std::string& path) {
-    const std::filesystem::path folder = FolderOf(path);
+    const std::string folder = FolderOf(path);
     int descriptor =
         Retry([&] { return operations.Open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC, 0); });
     if (descriptor < 0) {
@@ -260,6 +256,11 @@ int SyncFolderOf(FileOperations& operations, const std::string& path) {
     const int error = ErrorOf(Retry([&] { return operations.Sync(descriptor); }));
     operations.Close(descriptor);
     return error == EINVAL ? 0 : error;
+}
+
+std::string FolderOf(const std::string& path) {
+    const std::filesystem::path file(path);
+    return file.has_parent_path() ? file.parent_path().string() : ".";
 }
 
 bool FileExists(const std::string& path) {
@@ -273,7 +274,7 @@ std::string FollowLinks(const std::string& path) {
     std::error_code error;
     fs::path current(path);
     for (int links = 0; links <= mostLinks; ++links) {
-        fs::path folder = fs::canonical(FolderOf(current), error);
+        fs::path folder = fs::canonical(FolderOf(current.string()), error);
         if (error) {
             return {};
         }

@@ -106,6 +106,8 @@ class File {
 /// has no way to wait for it: in a folder that may not be read, or a file system that does not know how.
 /// Returns 0 or an errno number.
 [[nodiscard]] int SyncFolderOf(FileOperations& operations, const std::string& path);
+/// The folder of a path, "." for a mere name.
+[[nodiscard]] std::string FolderOf(const std::string& path);
 /// Tells whether a file, folder or symbolic link of that name exists.
 [[nodiscard]] bool FileExists(const std::string& path);
 /// The absolute path of the file that `path` leads to through symbolic links, also when that file does not
