@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <atomic>
 #include <cmath>
+#include <iterator>
 
 #include <QApplication>
 #include <QEvent>
@@ -33,10 +34,14 @@ class InputWatcher : public QObject {
             gModifiers = ModifierBits(static_cast<QInputEvent*>(event)->modifiers());
         if (event->type() == QEvent::KeyRelease)
             NoteRelease(*static_cast<QKeyEvent*>(event));
-        const bool repeated = event->type() == QEvent::KeyPress &&
-                              IsRepeat(*static_cast<QKeyEvent*>(event)) &&
-                              PressesButtons(static_cast<QKeyEvent*>(event)->key());
-        return repeated || QObject::eventFilter(watched, event);
+        if (event->type() == QEvent::KeyPress || event->type() == QEvent::ShortcutOverride) {
+            const auto* key = static_cast<QKeyEvent*>(event);
+            if (IsRepeat(*key) && Presses(*key)) {
+                event->accept(); // as no shortcut
+                return true;
+            }
+        }
+        return QObject::eventFilter(watched, event);
     }
 
   private:
@@ -50,11 +55,16 @@ class InputWatcher : public QObject {
         return event.isAutoRepeat() ||
                (event.timestamp() != 0 && event.timestamp() == releaseTime_ && event.key() == releasedKey_);
     }
-    static bool PressesButtons(int key) {
-        const bool types =
-            !QApplication::activePopupWidget() && qobject_cast<QLineEdit*>(QApplication::focusWidget());
+    // A button, or an item of a menu, where a letter alone does.
+    static bool Presses(const QKeyEvent& event) {
+        constexpr int moving[] = {Qt::Key_Left, Qt::Key_Right, Qt::Key_Up,     Qt::Key_Down,
+                                  Qt::Key_Home, Qt::Key_End,   Qt::Key_PageUp, Qt::Key_PageDown};
+        const int key = event.key();
+        if (QApplication::activePopupWidget())
+            return std::find(std::begin(moving), std::end(moving), key) == std::end(moving);
         return key == Qt::Key_Return || key == Qt::Key_Enter || key == Qt::Key_Escape ||
-               (key == Qt::Key_Space && !types);
+               (key == Qt::Key_Space && !qobject_cast<QLineEdit*>(QApplication::focusWidget())) ||
+               (event.modifiers() & Qt::AltModifier);
     }
 
     int releasedKey_ = 0;

@@ -4,6 +4,8 @@
 
 #include <atomic>
 
+#include <QPushButton>
+
 #include "dialogs/BDialog.h"
 #include "platform/Button.h"
 #include "platform/Font.h"
@@ -110,8 +112,8 @@ TEST(BDialog, EveryWayOutHasItsResult) {
 TEST(BDialog, TheRepeatsOfAHeldKeyPressNothing) {
     const BApplication application("test");
     TestDialog::destroyed = TestDialog::confirmed = 0;
-    const auto send = [](QEvent::Type type, quint64 time, bool repeat) {
-        QKeyEvent event(type, Qt::Key_Return, {}, "\r", repeat);
+    const auto send = [](QEvent::Type type, quint64 time, bool repeat, int key = Qt::Key_Return) {
+        QKeyEvent event(type, key, {}, "\r", repeat);
         event.setTimestamp(time);
         QApplication::sendEvent(QApplication::focusWidget(), &event);
     };
@@ -121,6 +123,9 @@ TEST(BDialog, TheRepeatsOfAHeldKeyPressNothing) {
         // Not always does the toolkit see that it is a repeat.
         send(QEvent::KeyRelease, 20, false);
         send(QEvent::KeyPress, 20, false);
+        send(QEvent::KeyRelease, 25, false, Qt::Key_C);
+        qt_sendShortcutOverrideEvent(QApplication::focusWidget(), 25, Qt::Key_C, Qt::AltModifier);
+        EXPECT_FALSE(Shown()->findChild<QPushButton*>("cancel button")->isDown());
     });
     driver.When(
         "nothing", [] { return FieldHasFocus(); },

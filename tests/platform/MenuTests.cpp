@@ -73,6 +73,9 @@ TEST_F(MenuBars, AskTheirWindowAndSendToTheItemsTarget) {
     auto* first = open->findChild<QAction*>("Save & <b>go</b>");
     ASSERT_TRUE(first);
     EXPECT_EQ(first->text(), "&Save && <b>go</b>");
+    QKeyEvent held(QEvent::KeyPress, Qt::Key_S, Qt::AltModifier, "s", true);
+    QApplication::sendEvent(open, &held);
+    EXPECT_TRUE(open->isVisible());
     QTest::mouseClick(open, Qt::LeftButton, {}, open->actionGeometry(first).center());
     EXPECT_EQ(Received(1), Codes{1});
 
