@@ -9,6 +9,7 @@
 #include <QEvent>
 #include <QKeyEvent>
 #include <QLineEdit>
+#include <QMessageBox>
 #include <QMouseEvent>
 
 #include "platform/Window.h"
@@ -55,12 +56,13 @@ class InputWatcher : public QObject {
         return event.isAutoRepeat() ||
                (event.timestamp() != 0 && event.timestamp() == releaseTime_ && event.key() == releasedKey_);
     }
-    // A button, or an item of a menu, where a letter alone does.
+    // A button, or an item of a menu; there and in an alert a letter alone does.
     static bool Presses(const QKeyEvent& event) {
         constexpr int moving[] = {Qt::Key_Left, Qt::Key_Right, Qt::Key_Up,     Qt::Key_Down,
                                   Qt::Key_Home, Qt::Key_End,   Qt::Key_PageUp, Qt::Key_PageDown};
         const int key = event.key();
-        if (QApplication::activePopupWidget())
+        if (QApplication::activePopupWidget() ||
+            qobject_cast<QMessageBox*>(QApplication::activeModalWidget()))
             return std::find(std::begin(moving), std::end(moving), key) == std::end(moving);
         return key == Qt::Key_Return || key == Qt::Key_Enter || key == Qt::Key_Escape ||
                (key == Qt::Key_Space && !qobject_cast<QLineEdit*>(QApplication::focusWidget())) ||

@@ -73,8 +73,7 @@ TEST_F(MenuBars, AskTheirWindowAndSendToTheItemsTarget) {
     auto* first = open->findChild<QAction*>("Save & <b>go</b>");
     ASSERT_TRUE(first);
     EXPECT_EQ(first->text(), "&Save && <b>go</b>");
-    QKeyEvent held(QEvent::KeyPress, Qt::Key_S, Qt::AltModifier, "s", true);
-    QApplication::sendEvent(open, &held);
+    QTest::simulateEvent(open, true, Qt::Key_S, Qt::AltModifier, "s", true);
     EXPECT_TRUE(open->isVisible());
     QTest::mouseClick(open, Qt::LeftButton, {}, open->actionGeometry(first).center());
     EXPECT_EQ(Received(1), Codes{1});
@@ -206,6 +205,8 @@ TEST_F(Alerts, AnswerWithTheButtonPressed) {
             EXPECT_LT(place("Yes"), place("Perhaps"));
             EXPECT_LT(place("Perhaps"), place("No"));
             EXPECT_TRUE(box->findChild<QPushButton*>("No")->isDefault());
+            QTest::simulateEvent(box, true, Qt::Key_Y, {}, "y", true);
+            EXPECT_FALSE(box->findChild<QPushButton*>("Yes")->isDown());
             if (std::string("Escape") == button)
                 QTest::keyClick(box, Qt::Key_Escape);
             else
