@@ -78,7 +78,7 @@ int32 RowSelection::Nth(int32 n) const {
 
 int32 RowSelection::Current() const {
     if (attached_)
-        return view_.currentIndex().row();
+        return view_.ChosenRow();
     return current_ ? view_.IndexOf(current_) : -1;
 }
 

@@ -312,13 +312,17 @@ void RowsWidget::HandleKey(QKeyEvent* event) {
     }
 }
 
-// A row that is only marked because the focus came was chosen by nobody, so keys do not go on from it. One
-// that keys cannot leave, such as the first by Home, is selected where it is.
+// A row that is only marked because the focus came was chosen by nobody.
+int32 RowsWidget::ChosenRow() const {
+    return currentIndex() == focusMark_ && !selectionModel()->hasSelection() ? -1 : currentIndex().row();
+}
+
+// A row that keys cannot leave, such as the first by Home, is selected where it is.
 void RowsWidget::HandleListKey(QKeyEvent* event) {
     constexpr int moving[] = {Qt::Key_Up,  Qt::Key_Down,   Qt::Key_Home,
                               Qt::Key_End, Qt::Key_PageUp, Qt::Key_PageDown};
     const bool moves = std::find(std::begin(moving), std::end(moving), event->key()) != std::end(moving);
-    if (moves && !selectionModel()->hasSelection() && currentIndex() == focusMark_)
+    if (moves && ChosenRow() < 0)
         selectionModel()->clearCurrentIndex();
     QListView::keyPressEvent(event);
     if (!moves || (event->modifiers() & Qt::ControlModifier) || selectionModel()->hasSelection())

@@ -25,6 +25,8 @@ class RowsWidget : public QListView {
     // No hook of the view is called from now on.
     void Orphan() { peer_ = nullptr; }
     [[nodiscard]] int32 IndexOf(const BListItem* row) const;
+    // The row that keys go on from; -1 for none.
+    [[nodiscard]] int32 ChosenRow() const;
 
     // The bars that the list may show.
     void SetBars(bool horizontal, bool vertical);

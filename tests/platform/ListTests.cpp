@@ -261,6 +261,7 @@ TEST(Lists, KeysBeginAtAnEndUntilARowIsChosen) {
     for (const auto& [key, selected] : {std::pair{Qt::Key_Down, 0}, {Qt::Key_Home, 0}, {Qt::Key_End, 9}}) {
         ListStage stage(10);
         stage.Show();
+        EXPECT_EQ(stage.list->CurrentRow(), -1);
         stage.Key(key);
         EXPECT_EQ(stage.Selected(), Indexes{selected});
         stage.list->DeselectAll();
