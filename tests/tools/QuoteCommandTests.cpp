@@ -1,21 +1,15 @@
-#include <gtest/gtest.h>
-
-#include "Shell.h"
+#include "CommandTest.h"
 #include "quotes/LoopbackServer.h"
 
 namespace {
 
-class QuoteCommand : public testing::Test {
+class QuoteCommandTest : public CommandTest {
   protected:
-    QuoteCommand() { std::filesystem::create_directory(folder_.File("home")); }
+    QuoteCommandTest() { std::filesystem::create_directory(folder_.File("home")); }
 
-    int Run(const std::string& arguments) { return folder_.Run("'" QUORVAN_CLI "' quote " + arguments); }
-    // A source on the server, with the page's text before the marker.
-    std::string Source(const std::string& path, const std::string& marker, int skip) const {
-        return "net " + server_.Host() + " " + path + " " + marker + " " + std::to_string(skip);
-    }
+    // A source on the server.
+    std::string Source(const std::string& rest) const { return "net " + server_.Host() + " " + rest; }
 
-    Shell folder_;
     LoopbackServer server_{[](const std::string& request) {
         if (request.find("XYZ") != std::string::npos)
             return Reply{{"HTTP/1.0 301 Moved\r\nLocation: https://\x1B[2J\xFF\r\n\r\n"}};
@@ -27,83 +21,66 @@ class QuoteCommand : public testing::Test {
     }};
 };
 
-TEST_F(QuoteCommand, ShowsWhatEachSourceGives) {
-    folder_.Write("home/Quorvan.cfg", "one no..such..host /q?s= Last 2\n"
-                                      "two fields\n" +
-                                          Source("/q?s=", "Last", 2) + "\n");
-    EXPECT_EQ(Run("--home home ABC"), 0);
+TEST_F(QuoteCommandTest, ShowsWhatEachSourceGives) {
+    folder_.Write("home/Quorvan.cfg",
+                  "one no..such..host /q?s= Last 2\ntwo fields\n" + Source("/q?s= Last 2\n"));
+    const std::string before = State();
+    EXPECT_EQ(folder_.Run("quorvan-cli quote --home home ABC"), 0);
     EXPECT_EQ(folder_.Output(), "ABC\t45.38\n");
-    const std::string host = server_.Host();
-    const std::string port = std::to_string(server_.Port());
-    EXPECT_EQ(folder_.Errors(), "ABC: looking in home/Quorvan.cfg\n"
-                                "source one: asking no..such..host for /q?s=ABC, marker 'Last', skip 2\n"
-                                "  failed: gethostbyname() error: the name does not resolve\n"
-                                "  no price, -4.00\n"
-                                "line 2 is no source: it has fewer than five fields\n"
-                                "source net: asking " +
-                                    host +
-                                    " for /q?s=ABC, marker 'Last', skip 2\n  connected to 127.0.0.1 port " +
-                                    port + "\n  marker found: ..." + std::string(56, 'a') +
-                                    "\\x1B[2J[Last]\\\\\\n</td><b>45 3/8</b>" + std::string(40, 'z') +
-                                    "...\n"
-                                    "  price text '45' read as 45.0000\n"
-                                    "  behind it '3/8</b>" +
-                                    std::string(53, 'z') + "': fraction 0.3750\n  price 45.38\n");
-    EXPECT_EQ(Run("--home home XYZ ABC"), 1);
+    EXPECT_EQ(folder_.Errors(),
+              "ABC: looking in home/Quorvan.cfg\n"
+              "source one: asking no..such..host for /q?s=ABC, marker 'Last', skip 2\n"
+              "  failed: gethostbyname() error: the name does not resolve\n"
+              "  no price, -4.00\n"
+              "line 2 is no source: it has fewer than five fields\n"
+              "source net: asking " +
+                  server_.Host() + " for /q?s=ABC, marker 'Last', skip 2\n  connected to 127.0.0.1 port " +
+                  std::to_string(server_.Port()) + "\n  marker found: ..." + std::string(56, 'a') +
+                  "\\x1B[2J[Last]\\\\\\n</td><b>45 3/8</b>" + std::string(40, 'z') +
+                  "...\n  price text '45' read as 45.0000\n  behind it '3/8</b>" + std::string(53, 'z') +
+                  "': fraction 0.3750\n  price 45.38\n");
+    EXPECT_EQ(folder_.Run("quorvan-cli quote --home home XYZ ABC"), 1);
     EXPECT_EQ(folder_.Output(), "XYZ\t-4.00\nABC\t45.38\n");
     EXPECT_TRUE(folder_.Complains(
         "  marker not found in the 47 bytes received, which begin: HTTP/1.0 301 Moved\\r\\nLocation: "
         "https://\\x1B[2J\\xFF\\r\\n\\r\\n\n"));
-    EXPECT_EQ(folder_.Names(), std::vector<std::string>{"home"});
+    EXPECT_EQ(State(), before);
 }
 
-TEST_F(QuoteCommand, TriesALine) {
+TEST_F(QuoteCommandTest, SaysWhyThereIsNoPrice) {
+    // An empty line ends the list; nothing behind it is asked.
+    folder_.Write("home/Quorvan.cfg", "; comment\n\n" + Source("/q?s= Last 2\n"));
+    // A source in the place of the first file's example: a page without a number marks the investment.
+    ASSERT_EQ(folder_.Run("mkdir first; sed 's|^;example.*|" + Source("/q?s= Last 0") +
+                          "|' '" QUORVAN_SOURCES "/resources/Quorvan.cfg' >first/Quorvan.cfg"),
+              0);
     const struct {
-        std::string source;
+        std::string from;
         int status;
         const char* output;
         const char* trace;
     } cases[] = {
-        {Source("/q?s=", "Last", 2), 0, "ABC\t45.38\n", "looking in the given line\n"},
-        {Source("/q?s=", "Last", 9), 1, "ABC\t-4.00\n", "  the page ended before the skip count was used up"},
-        {Source("/q?s=", "Last", 0), 1, "ABC\t0.00\n", "  price text 'Last\\\\' read as 0.0000\n"},
-        {Source("/q?s=", "Last", 1), 0, "ABC\t15.00\n", "  careful: the price text is no number"},
-        {Source("/closes", "Last", 1), 1, "ABC\t-4.00\n", "  the server closed the connection without"},
-        {Source("/comma", "Last", 1), 0, "ABC\t202.00\n", "  careful: the price text is read only up to its"},
-        {Source("/comma", "Prior", 1), 0, "ABC\t1.00\n", "  careful: the price text is read only up to its"},
+        {"--home first", 1, "ABC\t-4.00\n", "  no price, 0.00\n"},
+        {"--home home", 1, "ABC\t-4.00\n",
+         "line 2 ends the list, since it is empty or too short for a source\nthere is no source to ask\n"},
+        {"--home nowhere", 1, "ABC\t-3.00\n", "failed: the file nowhere/Quorvan.cfg cannot be read\n"},
+        {Source("/q?s= Last 2"), 0, "ABC\t45.38\n", "looking in the given line\n"},
+        {Source("/q?s= Last 9"), 1, "ABC\t-4.00\n", "  the page ended before the skip count was used up"},
+        {Source("/q?s= Last 0"), 1, "ABC\t0.00\n", "  price text 'Last\\\\' read as 0.0000\n"},
+        {Source("/q?s= Last 1"), 0, "ABC\t15.00\n", "  careful: the price text is no number"},
+        {Source("/closes Last 1"), 1, "ABC\t-4.00\n", "  the server closed the connection without"},
+        {Source("/comma Last 1"), 0, "ABC\t202.00\n", "  careful: the price text is read only up to its"},
+        {Source("/comma Prior 1"), 0, "ABC\t1.00\n", "  careful: the price text is read only up to its"},
         {"net 127.0.0.1:x /q?s= Last 2", 1, "ABC\t-4.00\n", "  failed: the host is none of NAME"},
-        {"net h /q?s= Last", 2, "", "it has fewer than five fields"},
-        {";net h /q?s= Last 2", 2, "", "is no source"},
-        {"a b c d 1", 2, "", "is no source"},
     };
     for (const auto& c : cases) {
-        EXPECT_EQ(Run("--source '" + c.source + "' ABC"), c.status) << c.source;
-        EXPECT_EQ(folder_.Output(), c.output) << c.source;
+        const bool line = c.from[0] == 'n';
+        EXPECT_EQ(folder_.Run("quorvan-cli quote ABC " + (line ? "--source '" + c.from + "'" : c.from)),
+                  c.status)
+            << c.from;
+        EXPECT_EQ(folder_.Output(), c.output) << c.from;
         EXPECT_TRUE(folder_.Complains(c.trace));
     }
-}
-
-// A source in the place of the first file's example: a page without a number marks the investment.
-TEST_F(QuoteCommand, TheFirstFileEndsWithAComment) {
-    folder_.Run("sed 's|^;example.*|" + Source("/q?s=", "Last", 0) +
-                "|' '" QUORVAN_RESOURCES "/Quorvan.cfg' >home/Quorvan.cfg");
-    EXPECT_EQ(Run("--home home ABC"), 1);
-    EXPECT_TRUE(folder_.Complains("  no price, 0.00\n") && folder_.Says("ABC\t-4.00\n"));
-}
-
-TEST_F(QuoteCommand, SaysWhatIsWrong) {
-    // An empty line ends the list; nothing behind it is asked.
-    folder_.Write("home/Quorvan.cfg", "; comment\n\n" + Source("/q?s=", "Last", 2) + "\n");
-    EXPECT_EQ(Run("--home home ABC"), 1);
-    EXPECT_EQ(folder_.Errors(), "ABC: looking in home/Quorvan.cfg\n"
-                                "line 2 ends the list, since it is empty or too short for a source\n"
-                                "there is no source to ask\n");
-    EXPECT_EQ(Run("--home nowhere ABC"), 1);
-    EXPECT_EQ(folder_.Output(), "ABC\t-3.00\n");
-    EXPECT_TRUE(folder_.Complains("failed: the file nowhere/Quorvan.cfg cannot be read\n"));
-    for (const char* arguments :
-         {"", "''", "--home", "\"$(printf 'A\\tB')\"", "--home home --source 'n h /q Last 2' A"})
-        EXPECT_EQ(Run(arguments), 2) << arguments;
 }
 
 } // namespace

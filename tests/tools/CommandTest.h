@@ -1,0 +1,43 @@
+#pragma once
+
+#include <gtest/gtest.h>
+
+#include <string>
+
+#include "Shell.h"
+
+// The built quorvan-cli as a person runs it in a folder, with `built` for the program and without a display.
+class CommandTest : public testing::Test {
+  protected:
+    CommandTest() {
+        unsetenv("DISPLAY");
+        unsetenv("XDG_RUNTIME_DIR");
+        setenv("XDG_DATA_HOME", folder_.File("data").c_str(), 1);
+        setenv("PATH", (QUORVAN_CLI_FOLDER ":" + std::string(getenv("PATH"))).c_str(), 1);
+        folder_.Write("built", "#!/bin/sh\necho \"$#\" >\"$(dirname \"$0\")/started\"\n");
+    }
+
+    // The command for a folder, in whose name is no single quote.
+    static std::string Setup(const std::string& options = "", const std::string& folder = "home") {
+        return "quorvan-cli setup '" + folder + "' --program built " + options;
+    }
+    // Whether a command succeeds and says so.
+    testing::AssertionResult Works(const std::string& command, const std::string& text = "") {
+        if (folder_.Run(command) == 0)
+            return folder_.Says(text);
+        return testing::AssertionFailure() << command << ":\n" << folder_.Output() << folder_.Errors();
+    }
+    // All that a command prints, which must succeed.
+    std::string Printed(const std::string& command) {
+        EXPECT_TRUE(Works("export LC_ALL=C; " + command));
+        return folder_.Output() + folder_.Errors();
+    }
+    // Everything below the folder: names, permissions and where links lead; of files what is in them and when
+    // they were changed.
+    std::string State(const std::string& below = ".") {
+        return Printed("find '" + below +
+                       "' -printf '%p %M %l\\n' -type f -printf '%p %T@\\n' -exec md5sum {} + | sort");
+    }
+
+    Shell folder_;
+};
