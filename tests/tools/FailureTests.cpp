@@ -55,7 +55,11 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
         cp -r home new; rm new/quorvan; cp "$(command -v quorvan-cli)" alone
         cp -r home "$(printf '\377')"; cp -r home "$(printf 'a\tb')"
         XDG_DATA_HOME=$PWD/full quorvan-cli setup home --program built --desktop
-        rm -r full/applications; echo >full/applications)sh"));
+        rm -r full/applications; echo >full/applications
+        mkdir kept; cp a.db kept; chmod 444 kept/a.db; chmod 777 . kept)sh"));
+    // As an ordinary user, also where the tests run as root, whom no permission keeps out.
+    const std::string reader = getuid() == 0 ? "setpriv --reuid 65534 --clear-groups ./alone" : "./alone";
+    EXPECT_TRUE(Works(reader + " db kept/a.db query --format tsv", "record\tN\tName\n0\t1\t\n"));
     FolderLock lock;
     ASSERT_EQ(lock.Take(folder_.File("held"), "quorvan"), FolderLock::Outcome::Taken);
     folder_.Write("other/Quorvan.lock", "program: quorvan\nprocess: 17\nhost: elsewhere\n");
@@ -122,6 +126,8 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
         {"quorvan-cli db bad.db delete 0", damage},
         {"quorvan-cli db bad.db compact", damage},
         {"quorvan-cli db bad.db load old.png", damage},
+        {reader + " db kept/a.db append", "the file may only be read, not changed"},
+        {reader + " db kept/a.db compact", "the file may only be read, not changed"},
         {"quorvan-cli db held/a.db append", held},
         {"quorvan-cli db other/link.db compact", held},
         {"quorvan-cli db held/a.db check --repair", held},

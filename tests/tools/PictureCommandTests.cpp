@@ -35,12 +35,13 @@ TEST_F(PictureCommandTest, WritesEachKindOfFileAndChangesNoData) {
     EXPECT_EQ(home_.Read("invest.db") + home_.Read("portfol.db"), before);
 }
 
-// Given no folder, it takes its own, or Quorvan in the person's.
 TEST_F(PictureCommandTest, PicturesAreAsPrivateAsThePersonWants) {
+    // Without --home the folder is the program's own, or Quorvan in the person's.
     ASSERT_TRUE(Works("ln -s '" + home_.Path() + "' Quorvan; cp \"$(command -v quorvan-cli)\" Quorvan"));
     EXPECT_TRUE(Works("umask 077; HOME=$PWD quorvan-cli chart 'My Fund' 2000 -o new.svg"));
     EXPECT_TRUE(Works("echo >kept.svg; chmod 640 kept.svg; ln -s kept.svg link.svg; "
                       "HOME=/nowhere Quorvan/quorvan-cli chart 'My Fund' 2000 -o link.svg"));
+    EXPECT_TRUE(Works("HOME=$PWD quorvan-cli report 'My Fund' -o out.pdf; pdftotext out.pdf -", "My Fund"));
     EXPECT_EQ(Printed("stat -c '%n %A' *.svg; cmp kept.svg new.svg"),
               "kept.svg -rw-r-----\nlink.svg lrwxrwxrwx\nnew.svg -rw-------\n");
 }

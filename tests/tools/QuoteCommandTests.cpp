@@ -1,3 +1,5 @@
+#include <tuple>
+
 #include "CommandTest.h"
 #include "quotes/LoopbackServer.h"
 
@@ -24,7 +26,6 @@ class QuoteCommandTest : public CommandTest {
 TEST_F(QuoteCommandTest, ShowsWhatEachSourceGives) {
     folder_.Write("home/Quorvan.cfg",
                   "one no..such..host /q?s= Last 2\ntwo fields\n" + Source("/q?s= Last 2\n"));
-    const std::string before = State();
     EXPECT_EQ(folder_.Run("quorvan-cli quote --home home ABC"), 0);
     EXPECT_EQ(folder_.Output(), "ABC\t45.38\n");
     EXPECT_EQ(folder_.Errors(),
@@ -41,25 +42,19 @@ TEST_F(QuoteCommandTest, ShowsWhatEachSourceGives) {
                   "': fraction 0.3750\n  price 45.38\n");
     EXPECT_EQ(folder_.Run("quorvan-cli quote --home home XYZ ABC"), 1);
     EXPECT_EQ(folder_.Output(), "XYZ\t-4.00\nABC\t45.38\n");
-    EXPECT_TRUE(folder_.Complains(
-        "  marker not found in the 47 bytes received, which begin: HTTP/1.0 301 Moved\\r\\nLocation: "
-        "https://\\x1B[2J\\xFF\\r\\n\\r\\n\n"));
-    EXPECT_EQ(State(), before);
+    EXPECT_TRUE(
+        folder_.Complains("  marker not found in the 47 bytes received, which begin: HTTP/1.0 301 Moved\\r\\n"
+                          "Location: https://\\x1B[2J\\xFF\\r\\n\\r\\n\n"));
+    EXPECT_EQ(Printed("find . -type f | sort"), "./built\n./home/Quorvan.cfg\n");
 }
 
 TEST_F(QuoteCommandTest, SaysWhyThereIsNoPrice) {
     // An empty line ends the list; nothing behind it is asked.
     folder_.Write("home/Quorvan.cfg", "; comment\n\n" + Source("/q?s= Last 2\n"));
     // A source in the place of the first file's example: a page without a number marks the investment.
-    ASSERT_EQ(folder_.Run("mkdir first; sed 's|^;example.*|" + Source("/q?s= Last 0") +
-                          "|' '" QUORVAN_SOURCES "/resources/Quorvan.cfg' >first/Quorvan.cfg"),
-              0);
-    const struct {
-        std::string from;
-        int status;
-        const char* output;
-        const char* trace;
-    } cases[] = {
+    ASSERT_TRUE(Works("mkdir first; sed 's|^;example.*|" + Source("/q?s= Last 0") +
+                      "|' '" QUORVAN_SOURCES "/resources/Quorvan.cfg' >first/Quorvan.cfg"));
+    const std::tuple<std::string, int, const char*, const char*> cases[] = {
         {"--home first", 1, "ABC\t-4.00\n", "  no price, 0.00\n"},
         {"--home home", 1, "ABC\t-4.00\n",
          "line 2 ends the list, since it is empty or too short for a source\nthere is no source to ask\n"},
@@ -73,13 +68,11 @@ TEST_F(QuoteCommandTest, SaysWhyThereIsNoPrice) {
         {Source("/comma Prior 1"), 0, "ABC\t1.00\n", "  careful: the price text is read only up to its"},
         {"net 127.0.0.1:x /q?s= Last 2", 1, "ABC\t-4.00\n", "  failed: the host is none of NAME"},
     };
-    for (const auto& c : cases) {
-        const bool line = c.from[0] == 'n';
-        EXPECT_EQ(folder_.Run("quorvan-cli quote ABC " + (line ? "--source '" + c.from + "'" : c.from)),
-                  c.status)
-            << c.from;
-        EXPECT_EQ(folder_.Output(), c.output) << c.from;
-        EXPECT_TRUE(folder_.Complains(c.trace));
+    for (const auto& [from, status, output, trace] : cases) {
+        const std::string options = from[0] == 'n' ? "--source '" + from + "'" : from;
+        EXPECT_EQ(folder_.Run("quorvan-cli quote ABC " + options), status) << from;
+        EXPECT_EQ(folder_.Output(), output) << from;
+        EXPECT_TRUE(folder_.Complains(trace));
     }
 }
 
