@@ -86,6 +86,7 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
         {report + ".", ". cannot be written: Is a directory"},
         {"ulimit -f 4; " + report + "old.pdf", "old.pdf cannot be written: "},
         {Setup("", "built/home"), "cannot be made: Not a directory"},
+        {Setup("", "/proc/no/home"), "The folder /proc/no/home cannot be made: No such file"},
         {Setup("", "built"), "cannot be made: Not a directory"},
         {Setup("", ""), "the name is empty"},
         {Setup("", std::string(109, 'd')), "path is too long"},
