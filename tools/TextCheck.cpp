@@ -10,8 +10,6 @@
 
 namespace {
 
-constexpr std::size_t MostTold = 20; // wrong lines
-
 std::size_t DataSize(std::span<const COLUMN_ENTRY> columns) {
     int size = 0;
     for (const COLUMN_ENTRY& column : columns)
@@ -46,13 +44,7 @@ int TextCheck::Run(const File& text, std::size_t longest) {
         return DatabaseError::LoadNoMemoryForLine;
     errno = reader.PassByteOrderMark();
     errno = errno != 0 ? errno : ReadLines(reader, longest);
-    if (errno != 0)
-        return DatabaseError::LoadReadFailed;
-    if (wrongLines_ > MostTold)
-        wrong_.push_back(wrongLines_ == MostTold + 1
-                             ? "and 1 more line is wrong"
-                             : "and " + std::to_string(wrongLines_ - MostTold) + " more lines are wrong");
-    return 0;
+    return errno == 0 ? 0 : DatabaseError::LoadReadFailed;
 }
 
 // Returns 0 or an errno number.
@@ -74,9 +66,7 @@ int TextCheck::ReadLines(LineReader& reader, std::size_t longest) {
 }
 
 void TextCheck::Tell(long line, const std::string& wrong) {
-    if (wrong.empty())
-        return;
-    if (++wrongLines_ <= MostTold)
+    if (!wrong.empty())
         wrong_.push_back("line " + std::to_string(line) + ": " + wrong);
 }
 

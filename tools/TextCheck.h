@@ -32,8 +32,8 @@ class TextCheck {
     // Reads the whole text. A line may have `longest` characters, its newline included. Returns 0 or, with
     // errno set, the engine's code of what hindered it.
     [[nodiscard]] int Run(const File& text, std::size_t longest);
-    // Where the text is wrong and why, line by line: "line 3: Price: '5,5' is no number". Behind the first
-    // 20 lines stands how many more are wrong. Empty when nothing is.
+    // Where the text is wrong and why, line by line: "line 3: Price: '5,5' is no number". Empty when nothing
+    // is.
     [[nodiscard]] const std::vector<std::string>& Wrong() const { return wrong_; }
 
   private:
@@ -52,5 +52,4 @@ class TextCheck {
     std::vector<std::string_view> fields_; // of the line
     std::vector<std::uint8_t> data_;       // a record's, which nobody reads
     std::vector<std::string> wrong_;
-    std::size_t wrongLines_ = 0;
 };

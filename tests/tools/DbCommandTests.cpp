@@ -226,11 +226,8 @@ TEST_F(DbCommandTest, TextWithAWrongLineIsNotLoaded) {
         folder_.Write("a.txt", text);
         EXPECT_TRUE(folder_.Fails("quorvan-cli db a.db load a.txt " + options, 1, "a.txt, line " + wrong));
     }
-    folder_.Write("a.txt", longLine + "\na\n"); // each is told, of many the first
+    folder_.Write("a.txt", longLine + "\na\n"); // each is told
     Db({{"load a.txt", "", {"line 1: the line is longer than ", "line 2: 1 field, the data file has 5"}}});
-    ASSERT_EQ(folder_.Run("yes a | head -n 22 >a.txt"), 0);
-    Db({{"load a.txt", "", {", line 20: 1 field", "and 2 more lines are wrong\n"}}});
-    EXPECT_EQ(std::count(folder_.Errors().begin(), folder_.Errors().end(), '\n'), 21);
     EXPECT_EQ(folder_.Read("a.db"), before);
     folder_.Write("a.txt", "\xEF\xBB\xBF\r\n" + good + "\r\n");
     Db({{"load a.txt", "1 record loaded from a.txt\n"}});
