@@ -69,6 +69,7 @@ TEST_F(SetupTest, NeverChangesAFileThatExists) {
          {"kept  Quorvan.ini\n", "kept  quorvan: it differs", "kept  misc.bak\n", "no sample"})
         EXPECT_NE(told.find(part), told.npos) << told;
     EXPECT_EQ(told.find("made"), told.npos) << told;
+    EXPECT_TRUE(Works("mv home/misc.bak home/misc.new; " + Setup(), "kept  misc.new\n"));
     // What is missing is made anew, without a sample while the other data file has its own.
     EXPECT_TRUE(Works("rm home/invest.db; " + Setup("--sample"), "made  invest.db: empty\n"));
     EXPECT_TRUE(Works("chmod 755 home/quorvan; " + Setup("--update-program"),
