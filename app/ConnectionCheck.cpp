@@ -10,6 +10,7 @@
 #include "platform/Message.h"
 #include "platform/StringView.h"
 #include "quotes/QuoteRetrieval.h"
+#include "util/CharacterBuffer.h"
 #include "util/InterfaceHelpers.h"
 
 namespace {
@@ -40,8 +41,11 @@ int32 LookForHost(void* data) {
     return 0;
 }
 
+// A longer name, which no host has, would put Cancel off the screen.
+constexpr std::size_t LongestShown = 63;
+
 std::string Sentence(const char* host) {
-    return std::string("Looking for ") + host + "...";
+    return "Looking for " + std::string(CutToBytes(host, LongestShown)) + "...";
 }
 
 // Says what is waited for, until the answer comes or the person cancels.
@@ -72,6 +76,7 @@ bool WillTell(LookUp& lookUp, const BDialog* dialog) {
     return !lookUp.ended;
 }
 
+// The dialog is made only now: an application that quits takes down every window that waits to be shown.
 // False when the person cancelled.
 bool WaitWithDialog(LookUp& lookUp, BPoint leftTop) {
     auto* dialog = new ConnectionDialog(leftTop, lookUp.host);

@@ -68,9 +68,11 @@ void NorvelWindow::ReloadInvestmentList() {
     const auto* current = RowAt(investmentList_->CurrentRow());
     const int32 number = current ? current->RecordNumber() : -1;
     LoadInvestmentList();
-    for (int32 i = 0; current && i < investmentList_->CountItems(); ++i) {
-        if (RowAt(i)->RecordNumber() == number)
+    for (int32 i = 0; number >= 0 && i < investmentList_->CountItems(); ++i) {
+        if (RowAt(i)->RecordNumber() == number) {
             investmentList_->SetCurrentRow(i);
+            break;
+        }
     }
     investmentList_->ScrollTo(place);
 }
