@@ -17,6 +17,8 @@ class QuoteCommandTest : public CommandTest {
             return Reply{{"HTTP/1.0 301 Moved\r\nLocation: https://\x1B[2J\xFF\r\n\r\n"}};
         if (request.find("/closes") != std::string::npos)
             return Reply{};
+        if (request.find("/resets") != std::string::npos)
+            return Reply{{}, Reply::End::Reset};
         if (request.find("/comma") != std::string::npos)
             return Reply{{"Last>202,45<Prior>1,023.11<"}};
         return Reply{{std::string(100, 'a') + "\x1B[2JLast\\\n</td><b>45 3/8</b>" + std::string(100, 'z')}};
@@ -64,6 +66,7 @@ TEST_F(QuoteCommandTest, SaysWhyThereIsNoPrice) {
         {Source("/q?s= Last 0"), 1, "ABC\t0.00\n", "  price text 'Last\\\\' read as 0.0000\n"},
         {Source("/q?s= Last 1"), 0, "ABC\t15.00\n", "  careful: the price text is no number"},
         {Source("/closes Last 1"), 1, "ABC\t-4.00\n", "  the server closed the connection without"},
+        {Source("/resets Last 1"), 1, "ABC\t-4.00\n", "reset by peer\n  no price"},
         {Source("/comma Last 1"), 0, "ABC\t202.00\n", "  careful: the price text is read only up to its"},
         {Source("/comma Prior 1"), 0, "ABC\t1.00\n", "  careful: the price text is read only up to its"},
         {"net 127.0.0.1:x /q?s= Last 2", 1, "ABC\t-4.00\n", "  failed: the host is none of NAME"},
