@@ -85,6 +85,46 @@ TEST_F(QueryUpdateTest, ChangesEveryTypeByEveryOperator) {
     }
 }
 
+// Whatever the set, its order and the cache: each of its records, and not a byte of another.
+TEST_F(QueryUpdateTest, ChangesTheSetAndNothingElse) {
+    std::vector<ROW> rows;
+    for (int i = 0; i < 400; ++i) {
+        rows.push_back(Row(std::to_string(i), i % 7, i % 150, i));
+    }
+    Append(rows);
+    ASSERT_EQ(database_.Delete(10) + database_.Lock(20), 0);
+    const std::string start = folder_.Read("rows.db");
+    const ROW mark = Row("mark");
+    for (const char* statement : {"Tag = 3", "Small < 2", "Count > 390", "Name contains 1", "Count = -1"}) {
+        for (const auto& [kilobytes, sorted] : {std::pair(0, true), {1, false}, {1, true}, {256, false}}) {
+            SCOPED_TRACE(testing::Message() << statement << " cache " << kilobytes << " sorted " << sorted);
+            folder_.Write("rows.db", start);
+            ASSERT_EQ(database_.Open(path_.c_str()) + database_.SetReadCache(kilobytes), 0);
+            ASSERT_GE(database_.Query(statement, QueryMode::New), 0);
+            ASSERT_EQ(sorted ? database_.SortBy("Name", 0) : 0, 0);
+            ASSERT_EQ(kilobytes > 1 ? 0 : DATABASE(path_.c_str()).Delete(17), 0); // in two of the sets
+            std::string expected = folder_.Read("rows.db");
+            long changed = 0;
+            std::size_t last = 0;
+            for (std::size_t n = 0; n < rows.size() + 3; ++n) {
+                const std::size_t at = DataStartOfRows + n * RowLength;
+                if (database_.ConvertPhysToLogRecordNumber(static_cast<long>(n)) >= 0 && expected[at] != 1) {
+                    expected[at] = 0;
+                    expected[at + 17] = 99;
+                    last = at;
+                    ++changed;
+                }
+            }
+            EXPECT_EQ(database_.QueryUpdate("Tag = 99"), changed);
+            EXPECT_EQ(folder_.Read("rows.db"), expected);
+            EXPECT_EQ(CodeOf(database_.Update(&mark)), changed == 0 ? 2101 : 0) << "the last one is current";
+            EXPECT_EQ(folder_.Read("rows.db"),
+                      changed == 0 ? expected : expected.replace(last, RowLength, '\0' + BytesOf(mark)));
+            EXPECT_TRUE(ContentOf(database_) == ContentOf(*std::make_unique<DATABASE>(path_.c_str())));
+        }
+    }
+}
+
 TEST_F(QueryUpdateTest, ChangesDatesAndTimesByParts) {
     const struct {
         const char* statement;

@@ -55,6 +55,14 @@ inline int CreateRows(DATABASE& database, const std::string& path) {
     return database.Create(path.c_str(), "rows", static_cast<int>(columns.size()), columns.data());
 }
 
+// What queries and sorts go by in a column of numbers.
+inline double KeyOf(const ROW& row, int column) {
+    const double price = row.price;
+    const double keys[] = {0,     row.tag * 1.0,           row.small * 1.0,       row.count * 1.0,
+                           price, PackDate(row.day) * 1.0, PackTime(row.at) * 1.0};
+    return keys[column];
+}
+
 // A file of rows of which record 1 is deleted and one is locked.
 inline void MakeRows(const std::string& path, int count, long locked = 2) {
     DATABASE database(nullptr);
@@ -83,6 +91,10 @@ inline int Code(DATABASE& database, long result) {
 
 inline std::string BytesOf(const ROW& row) {
     return {reinterpret_cast<const char*>(&row), sizeof(row)};
+}
+
+inline std::string NameOf(const ROW& row) {
+    return {row.name, strnlen(row.name, sizeof(row.name))};
 }
 
 // What can be read of a file: the records' bytes, nothing where one is deleted.

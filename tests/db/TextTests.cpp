@@ -1,4 +1,5 @@
 #include <limits>
+#include <sstream>
 
 #include "SampleFile.h"
 
@@ -66,6 +67,24 @@ TEST_F(TextTest, LinesAreAsDocumented) {
     database_.SetByteOutputFormat(1);
     EXPECT_EQ(database_.Export(text_.c_str(), 1, "|"), 2);
     EXPECT_EQ(folder_.Read("rows.txt"), example);
+}
+
+TEST_F(TextTest, ExportsAllOrTheSetInItsOrder) {
+    Append({Row("cherry", 1), Row("gone", 1), Row("apple", 1), Row("bread", 2)});
+    ASSERT_EQ(database_.Delete(1), 0);
+    const auto names = [this](DATABASE& database, int all) {
+        const long lines = database.Export(text_.c_str(), all, "|");
+        std::istringstream text(folder_.Read("rows.txt"));
+        std::string found;
+        for (std::string line; std::getline(text, line);) {
+            found += line.substr(0, line.find('|')) + " ";
+        }
+        return found + std::to_string(lines);
+    };
+    EXPECT_EQ(names(database_, 0), "cherry apple bread 3") << "without a set, all";
+    ASSERT_EQ(database_.Query("Tag = 1", QueryMode::New) + database_.SortBy("Name", 0), 2);
+    EXPECT_EQ(names(database_, 0), "apple cherry 2");
+    EXPECT_EQ(names(database_, 1), "cherry apple bread 3");
 }
 
 // Several blocks, batches and lines across them.
