@@ -207,6 +207,8 @@ TEST_F(RowsTest, CountsAreWrittenAtOnceOrWhenAskedFor) {
     EXPECT_EQ(counts(), std::pair('\2', '\0'));
     EXPECT_EQ(database_.SetImmediateHeaderWrite(1), 0);
     EXPECT_EQ(counts(), std::pair('\3', '\1'));
+    EXPECT_EQ(database_.Open("no such file"), -1);
+    EXPECT_EQ(database_.Sync(), 0) << "nothing of a file that is closed";
 }
 
 TEST_F(RowsTest, ErrorsStayUntilAsked) {
