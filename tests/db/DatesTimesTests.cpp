@@ -1,12 +1,25 @@
 #include <gtest/gtest.h>
 
 #include <ctime>
+#include <string>
 
 #include "db/Database.h"
 
 namespace {
 
 const DATABASE Rules(nullptr);
+
+std::string Formatted(const dbDATE& date, int style) {
+    char text[FormattedDateSize] = "untouched";
+    Rules.GetFormattedDateString(&date, text, style);
+    return text;
+}
+
+std::string Formatted(const dbTIME& time, int style) {
+    char text[FormattedTimeSize] = "untouched";
+    Rules.GetFormattedTimeString(&time, text, style);
+    return text;
+}
 
 TEST(Dates, AreMadeValid) {
     const struct {
@@ -16,74 +29,52 @@ TEST(Dates, AreMadeValid) {
         {{29, 2, 1999}, {1, 3, 1999}},    {{0, 3, 1999}, {28, 2, 1999}},  {{0, 1, 2000}, {31, 12, 1999}},
         {{1, 13, 1999}, {1, 1, 2000}},    {{1, 24, 1999}, {1, 12, 2000}}, {{1, 0, 1999}, {1, 12, 1998}},
         {{1, -12, 1999}, {1, 12, 1997}},  {{70, 1, 1999}, {39, 2, 1999}}, {{32, 12, 1999}, {1, 1, 2000}},
-        {{-40, 3, 2000}, {-11, 2, 2000}}, {{31, 4, 2001}, {1, 5, 2001}},  {{1, 127, 32767}, {1, 7, -32759}},
-    };
-    for (const auto& date : cases) {
-        dbDATE made = date.before;
-        Rules.MakeDateValid(&made);
-        EXPECT_EQ(PackDate(made), PackDate(date.after))
-            << static_cast<int>(date.before.day) << "." << static_cast<int>(date.before.month);
+        {{-40, 3, 2000}, {-11, 2, 2000}}, {{31, 4, 2001}, {1, 5, 2001}},  {{1, 127, 32767}, {1, 7, -32759}}};
+    for (auto [date, after] : cases) {
+        Rules.MakeDateValid(&date);
+        EXPECT_EQ(PackDate(date), PackDate(after)) << "case " << Formatted(after, 3);
     }
 }
 
 TEST(Times, AreMadeValid) {
     const struct {
         dbTIME before, after;
-    } cases[] = {
-        {{0, 0, 0}, {0, 0, 0}},     {{-60, 5, 5}, {0, 4, 5}},    {{125, 5, 5}, {5, 7, 5}},
-        {{125, 127, 0}, {5, 9, 2}}, {{0, 0, 24}, {0, 0, 0}},     {{0, 0, -1}, {0, 0, 23}},
-        {{-1, 0, 0}, {59, 59, 23}}, {{60, 59, 23}, {0, 0, 0}},   {{0, 0, 50}, {0, 0, 26}},
-        {{0, 0, -30}, {0, 0, -6}},  {{-128, 0, 1}, {52, 57, 0}},
-    };
-    for (const auto& time : cases) {
-        dbTIME made = time.before;
-        Rules.MakeTimeValid(&made);
-        EXPECT_EQ(PackTime(made), PackTime(time.after));
+    } cases[] = {{{0, 0, 0}, {0, 0, 0}},     {{-60, 5, 5}, {0, 4, 5}},   {{125, 5, 5}, {5, 7, 5}},
+                 {{125, 127, 0}, {5, 9, 2}}, {{0, 0, 24}, {0, 0, 0}},    {{0, 0, -1}, {0, 0, 23}},
+                 {{-1, 0, 0}, {59, 59, 23}}, {{60, 59, 23}, {0, 0, 0}},  {{0, 0, 50}, {0, 0, 26}},
+                 {{0, 0, -30}, {0, 0, -6}},  {{-128, 0, 1}, {52, 57, 0}}};
+    for (auto [time, after] : cases) {
+        Rules.MakeTimeValid(&time);
+        EXPECT_EQ(PackTime(time), PackTime(after)) << "case " << Formatted(after, 2);
     }
 }
 
-TEST(Dates, AreFormatted) {
+TEST(DatesAndTimes, AreFormatted) {
+    const std::string invalid = "Invalid date";
     const struct {
         dbDATE date;
-        int style;
-        const char* text;
-    } cases[] = {
-        {{5, 1, 1999}, 1, "Jan 05, 1999"},
-        {{5, 1, 1999}, 2, "January 05, 1999"},
-        {{5, 1, 1999}, 3, "01-05-1999"},
-        {{5, 1, 1999}, 0, "untouched"},
-        {{5, 1, 1999}, 4, "untouched"},
-        {{5, 0, 1999}, 1, "Invalid date"},
-        {{5, 0, 1999}, 3, "Invalid date"},
-        {{0, 5, 1999}, 2, "Invalid date"},
-        {{5, 13, 1999}, 1, "Invalid date"},
-        {{5, 13, 1999}, 2, "Invalid date"},
-        {{5, 13, 1999}, 3, "13-05-1999"},
-        {{127, 9, -32768}, 2, "September 127, -32768"},
-        {{127, 127, -32768}, 3, "127-127--32768"},
-    };
-    for (const auto& format : cases) {
-        char text[FormattedDateSize] = "untouched";
-        Rules.GetFormattedDateString(&format.date, text, format.style);
-        EXPECT_STREQ(text, format.text);
+        std::string texts[3]; // in styles 1 to 3
+    } dates[] = {{{5, 1, 1999}, {"Jan 05, 1999", "January 05, 1999", "01-05-1999"}},
+                 {{5, 0, 1999}, {invalid, invalid, invalid}},
+                 {{0, 5, 1999}, {invalid, invalid, invalid}},
+                 {{5, 13, 1999}, {invalid, invalid, "13-05-1999"}},
+                 {{127, 9, -32768}, {"Sep 127, -32768", "September 127, -32768", "09-127--32768"}},
+                 {{127, 127, -32768}, {invalid, invalid, "127-127--32768"}}};
+    for (const auto& [date, texts] : dates) {
+        for (int style = 0; style <= 4; ++style) {
+            EXPECT_EQ(Formatted(date, style), style % 4 == 0 ? "untouched" : texts[style - 1]);
+        }
     }
-}
-
-TEST(Times, AreFormatted) {
     const struct {
         dbTIME time;
-        const char *clock12, *clock24;
-    } cases[] = {
+        std::string clock12, clock24;
+    } times[] = {
         {{7, 5, 9}, "09:05:07", "09:05:07"},  {{0, 30, 21}, "09:30:00", "21:30:00"},
         {{0, 15, 0}, "12:15:00", "00:15:00"}, {{0, 0, 12}, "12:00:00", "12:00:00"},
-        {{0, 0, 13}, "01:00:00", "13:00:00"}, {{-128, -128, -128}, "-128:-128:-128", "-128:-128:-128"},
-    };
-    for (const auto& format : cases) {
-        char text[FormattedTimeSize];
-        Rules.GetFormattedTimeString(&format.time, text, 1);
-        EXPECT_STREQ(text, format.clock12);
-        Rules.GetFormattedTimeString(&format.time, text, 2);
-        EXPECT_STREQ(text, format.clock24);
+        {{0, 0, 13}, "01:00:00", "13:00:00"}, {{-128, -128, -128}, "-128:-128:-128", "-128:-128:-128"}};
+    for (const auto& [time, clock12, clock24] : times) {
+        EXPECT_EQ(Formatted(time, 1), clock12);
+        EXPECT_EQ(Formatted(time, 2), clock24);
     }
 }
 
@@ -100,25 +91,23 @@ TEST(DatesAndTimes, AreCompared) {
 }
 
 TEST(DatesAndTimes, AreReadFromTheClock) {
-    const std::time_t before = std::time(nullptr);
-    std::tm now{};
-    dbDATE date{};
-    dbDATE dateAfter{};
-    dbTIME time{};
-    do { // until no midnight lies between
+    const auto now = [] {
+        const std::time_t seconds = std::time(nullptr);
+        char text[40];
+        std::strftime(text, sizeof(text), "%m-%d-%Y %H:%M:%S", std::localtime(&seconds));
+        return std::string(text);
+    };
+    std::string before;
+    std::string found;
+    do { // until no second ends in between
+        before = now();
+        dbDATE date{};
+        dbTIME time{};
         Rules.SetToCurrentDate(&date);
         Rules.SetToCurrentTime(&time);
-        Rules.SetToCurrentDate(&dateAfter);
-    } while (Rules.CompareDates(&date, &dateAfter) != 0);
-    now.tm_year = date.year - 1900;
-    now.tm_mon = int{date.month} - 1;
-    now.tm_mday = int{date.day};
-    now.tm_hour = int{time.hour};
-    now.tm_min = int{time.minute};
-    now.tm_sec = int{time.second};
-    now.tm_isdst = -1;
-    const double late = std::difftime(std::mktime(&now), before);
-    EXPECT_TRUE(late >= 0 && late < 100) << late;
+        found = Formatted(date, 3) + " " + Formatted(time, 2);
+    } while (before != now());
+    EXPECT_EQ(found, before);
 }
 
 } // namespace

@@ -5,7 +5,6 @@
 #include <cerrno>
 #include <climits>
 #include <csignal>
-#include <functional>
 #include <string>
 
 #include <fcntl.h>
@@ -27,6 +26,8 @@ enum class Fault {
 // The system's file operations, of which one call that changes something meets a fault. A read gives half of
 // what is asked for. At the end no file may be open.
 class FaultyFiles : public FileOperations {
+    using System = FileOperations;
+
   public:
     ~FaultyFiles() override { EXPECT_EQ(open_, 0); }
 
@@ -52,86 +53,69 @@ class FaultyFiles : public FileOperations {
 
     int Open(const char* path, int flags, mode_t mode) override {
         if ((flags & O_ACCMODE) == O_RDWR && refused_ != 0) {
-            errno = refused_;
-            return -1;
+            return Failed(refused_);
         }
-        const auto call = [&] {
-            const int file = FileOperations::Open(path, flags, mode);
-            open_ += file >= 0 ? 1 : 0;
-            return file;
-        };
-        if ((flags & O_CREAT) == 0) {
-            return call();
-        }
-        firstMode_ = mode;
-        return Meet<int>(call);
+        firstMode_ = (flags & O_CREAT) != 0 ? mode : firstMode_;
+        const auto call = [&] { return System::Open(path, flags, mode); };
+        const int file = (flags & O_CREAT) != 0 ? Meet(call) : call();
+        open_ += file >= 0 ? 1 : 0;
+        return file;
     }
     int Close(int file) override {
         --open_;
-        return FileOperations::Close(file);
+        return System::Close(file);
     }
     ssize_t ReadAt(int file, void* data, std::size_t size, off_t offset) override {
-        if (fault_ == Fault::NoRead && calls_++ == at_) {
-            errno = error_;
-            return -1;
-        }
-        return FileOperations::ReadAt(file, data, (size + 1) / 2, offset);
+        const bool fails = fault_ == Fault::NoRead && calls_++ == at_;
+        return fails ? Failed(error_) : System::ReadAt(file, data, (size + 1) / 2, offset);
     }
     ssize_t WriteAt(int file, const void* data, std::size_t size, off_t offset) override {
         order_ += 'w';
-        const bool halved =
-            calls_ == at_ && size > 1 && fault_ >= Fault::HalfThenError && fault_ <= Fault::Broken;
-        if (!halved) {
-            return Meet<ssize_t>([&] { return FileOperations::WriteAt(file, data, size, offset); });
+        if (calls_ != at_ || size < 2 || fault_ < Fault::HalfThenError || fault_ > Fault::Broken) {
+            return Meet([&] { return System::WriteAt(file, data, size, offset); });
         }
-        const ssize_t half = FileOperations::WriteAt(file, data, size / 2, offset);
-        return Meet<ssize_t>([half] { return half; });
+        const ssize_t half = System::WriteAt(file, data, size / 2, offset);
+        return Meet([half] { return half; });
     }
-    int Truncate(int file, off_t length) override {
-        return Meet<int>([&] { return FileOperations::Truncate(file, length); });
+    int Truncate(int file, off_t size) override {
+        return Meet([&] { return System::Truncate(file, size); });
     }
     int Sync(int file) override {
-        order_ += 's';
-        return Meet<int>([&] { return FileOperations::Sync(file); });
+        return Meet([&] { return System::Sync(file); }, 's');
     }
-    int SetOwner(int file, uid_t owner, gid_t group) override {
-        return Meet<int>([&] { return FileOperations::SetOwner(file, owner, group); });
+    int SetOwner(int file, uid_t user, gid_t group) override {
+        return Meet([&] { return System::SetOwner(file, user, group); });
     }
     int SetMode(int file, mode_t mode) override {
-        return Meet<int>([&] { return FileOperations::SetMode(file, mode); });
+        return Meet([&] { return System::SetMode(file, mode); });
     }
     int Rename(const char* from, const char* to) override {
-        order_ += 'r';
-        return Meet<int>([&] { return FileOperations::Rename(from, to); });
+        return Meet([&] { return System::Rename(from, to); }, 'r');
     }
     int Remove(const char* path) override {
-        order_ += 'x';
-        return Meet<int>([&] { return FileOperations::Remove(path); });
+        return Meet([&] { return System::Remove(path); }, 'x');
     }
 
   private:
-    template <class Result>
-    Result Meet(const std::function<Result()>& call) {
+    static int Failed(int error) {
+        errno = error;
+        return -1;
+    }
+    template <class Call>
+    auto Meet(const Call& call, char letter = 0) -> decltype(call()) {
+        order_ += letter == 0 ? "" : std::string(1, letter);
         const int after = fault_ == Fault::NoRead ? -1 : calls_++ - at_;
-        if (at_ < 0 || after < 0 ||
-            after > (fault_ == Fault::Broken  ? INT_MAX
-                     : fault_ == Fault::Twice ? 1
-                                              : 0)) {
+        const int met = fault_ == Fault::Broken ? INT_MAX : fault_ == Fault::Twice ? 1 : 0;
+        if (at_ < 0 || after < 0 || after > met) {
             return call();
         }
-        switch (fault_) {
-        case Fault::KilledAfter:
+        if (fault_ == Fault::KilledAfter) {
             call();
-            [[fallthrough]];
-        case Fault::KilledBefore:
-            std::raise(SIGKILL);
-            [[fallthrough]];
-        case Fault::ShortWrite:
-            return call();
-        default:
-            errno = fault_ == Fault::Interrupted ? EINTR : error_;
-            return -1;
         }
+        if (fault_ >= Fault::KilledBefore) {
+            std::raise(SIGKILL);
+        }
+        return fault_ == Fault::ShortWrite ? call() : Failed(fault_ == Fault::Interrupted ? EINTR : error_);
     }
 
     Fault fault_ = Fault::Error;

@@ -4,6 +4,7 @@
 
 #include <cstring>
 #include <optional>
+#include <sstream>
 #include <string>
 #include <vector>
 
@@ -22,11 +23,8 @@ struct __attribute__((packed)) ROW {
 };
 
 inline COLUMN_ENTRY Column(const char* name, std::int8_t type, int size = -1, int format = 0) {
-    COLUMN_ENTRY column{};
+    COLUMN_ENTRY column{{}, type, static_cast<std::int16_t>(size), 0, format};
     std::strncpy(column.name, name, NameSize - 1);
-    column.type = type;
-    column.size = static_cast<std::int16_t>(size);
-    column.format = format;
     return column;
 }
 
@@ -39,14 +37,8 @@ inline std::vector<COLUMN_ENTRY> RowColumns() {
 
 inline ROW Row(const std::string& name, int tag = 0, int small = 0, int count = 0, float price = 0,
                dbDATE day = {1, 1, 2000}, dbTIME at = {0, 0, 12}) {
-    ROW row{};
+    ROW row{{}, static_cast<std::int8_t>(tag), static_cast<std::int16_t>(small), count, price, day, at};
     name.copy(row.name, sizeof(row.name));
-    row.tag = static_cast<std::int8_t>(tag);
-    row.small = static_cast<std::int16_t>(small);
-    row.count = count;
-    row.price = price;
-    row.day = day;
-    row.at = at;
     return row;
 }
 
@@ -97,6 +89,17 @@ inline std::string NameOf(const ROW& row) {
     return {row.name, strnlen(row.name, sizeof(row.name))};
 }
 
+// The rows of a table that is written as text: " what: outcome; what: outcome".
+inline std::vector<std::pair<std::string, std::string>> Cases(const std::string& table) {
+    std::vector<std::pair<std::string, std::string>> cases;
+    std::istringstream rows(table);
+    for (std::string row; std::getline(rows, row, ';');) {
+        const std::size_t colon = row.find(": ");
+        cases.emplace_back(row.substr(1, colon - 1), row.substr(colon + 2));
+    }
+    return cases;
+}
+
 // What can be read of a file: the records' bytes, nothing where one is deleted.
 using CONTENT = std::vector<std::optional<std::string>>;
 
@@ -113,6 +116,17 @@ inline CONTENT ContentOf(DATABASE& database) {
     }
     database.GetLastError(nullptr);
     return content;
+}
+
+// A row's field as text.
+inline std::string FieldOf(const DATABASE& database, const ROW& row, int column) {
+    std::string text;
+    database.FormatRecordData(&text, &row, "\n");
+    std::istringstream fields(text);
+    for (int i = 0; i <= column; ++i) {
+        std::getline(fields, text);
+    }
+    return text;
 }
 
 // The numbers of the result set's records in the order of the walk.

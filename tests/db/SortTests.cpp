@@ -94,23 +94,6 @@ TEST_F(SortTest, LongTextsThatDifferLate) {
     EXPECT_EQ(Walked(database), (std::vector<long>{2, 5, 1, 4, 3, 0}));
 }
 
-TEST_F(SortTest, WhatBecomesOfTheSet) {
-    Append({Row("cherry", 1), Row("Banana", 2), Row("apple", 3), Row("date", 4)});
-    // A set of one is not sorted: it can still be refined.
-    EXPECT_EQ(database_.Query("Tag = 2", QueryMode::New), 1);
-    EXPECT_EQ(database_.SortBy("Name", 0), 0);
-    EXPECT_EQ(database_.Query("Tag = 4", QueryMode::Or), 2);
-    EXPECT_EQ(CodeOf(database_.SortBy("name", 0)), 1701);
-    EXPECT_EQ(Walked(database_), (std::vector<long>{1, 3})) << "a failed sort changes nothing";
-    // Records deleted since the query drop out, where they stood.
-    EXPECT_EQ(database_.QueryReset(), 4);
-    EXPECT_EQ(DATABASE(path_.c_str()).Delete(1), 0);
-    database_.SetReadCache(256);
-    EXPECT_EQ(database_.SortBy("Name", 0), 0);
-    EXPECT_EQ(Walked(database_), (std::vector<long>{2, 0, 3}));
-    EXPECT_EQ(database_.ConvertPhysToLogRecordNumber(3), 2);
-}
-
 TEST_F(SortTest, NextSortSlots) {
     Append({Row("a", 1), Row("b"), Row("c", 1), Row("d", 1)});
     EXPECT_EQ(database_.Query("Tag = 1", QueryMode::New), 3);
