@@ -29,8 +29,8 @@ TEST_F(CompactionTest, DropsDeletedRecordsAndLocks) {
     ASSERT_EQ(database.Query("Name contains row", QueryMode::New), 8999);
     ASSERT_EQ(database.Compress(1), 0);
     EXPECT_EQ(folder_.Names(), Names{"rows.db"});
-    bytes =
-        With(bytes.erase(DataStartOfRows + RowLength, RowLength), 36, std::string("\x27\x23\0\0\0\0\0\0", 8));
+    bytes.erase(DataStartOfRows + RowLength, RowLength);
+    bytes.replace(36, 8, std::string("\x27\x23\0\0\0\0\0\0", 8)); // the counts
     bytes[DataStartOfRows + RowLength] = RecordStatus::Active;
     EXPECT_TRUE(folder_.Read("rows.db") == bytes);
     EXPECT_EQ(files_.Order(), "x" + std::string(18, 'w') + "ssxrrsx") << "on the disk before the swap";
@@ -69,8 +69,6 @@ TEST_F(CompactionTest, OutcomesOfFailingSteps) {
     } cases[] = {
         {1, EACCES, 2705, {"rows.db"}, 3},
         {2, ENOSPC, 2706, {"rows.db"}, 3},
-        {10, ENOSPC, 2706, {"rows.db"}, 3},
-        {18, EIO, 2706, {"rows.db"}, 3},
         {20, EIO, 2706, {"rows.db"}, 3},
         {21, EIO, 2706, {"rows.db"}, 3},
         {22, EACCES, 2704, {"rows.bak", "rows.db", "rows.new"}, 3},
@@ -107,11 +105,7 @@ TEST_F(CompactionTest, WorksOnTheTargetOfALink) {
     std::filesystem::create_directory(folder_.File("home"));
     std::filesystem::rename(path_, folder_.File("home/rows.db"));
     std::filesystem::create_symlink("home/rows.db", path_);
-    {
-        DATABASE database(path_.c_str());
-        ASSERT_EQ(database.Compress(0), 0);
-        EXPECT_EQ(ContentOf(database).size(), 2U);
-    }
+    ASSERT_EQ(std::make_unique<DATABASE>(path_.c_str())->Compress(0), 0);
     EXPECT_TRUE(std::filesystem::is_symlink(path_));
     EXPECT_FALSE(folder_.Has("home/rows.bak") || folder_.Has("home/rows.new"));
     std::filesystem::rename(folder_.File("home/rows.db"), folder_.File("home/rows.bak"));

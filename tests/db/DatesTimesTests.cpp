@@ -22,9 +22,7 @@ std::string Formatted(const dbTIME& time, int style) {
 }
 
 TEST(Dates, AreMadeValid) {
-    const struct {
-        dbDATE before, after;
-    } cases[] = {
+    const std::pair<dbDATE, dbDATE> cases[] = {
         {{29, 2, 2000}, {29, 2, 2000}},   {{29, 2, 1900}, {1, 3, 1900}},  {{29, 2, 1996}, {29, 2, 1996}},
         {{29, 2, 1999}, {1, 3, 1999}},    {{0, 3, 1999}, {28, 2, 1999}},  {{0, 1, 2000}, {31, 12, 1999}},
         {{1, 13, 1999}, {1, 1, 2000}},    {{1, 24, 1999}, {1, 12, 2000}}, {{1, 0, 1999}, {1, 12, 1998}},
@@ -37,12 +35,11 @@ TEST(Dates, AreMadeValid) {
 }
 
 TEST(Times, AreMadeValid) {
-    const struct {
-        dbTIME before, after;
-    } cases[] = {{{0, 0, 0}, {0, 0, 0}},     {{-60, 5, 5}, {0, 4, 5}},   {{125, 5, 5}, {5, 7, 5}},
-                 {{125, 127, 0}, {5, 9, 2}}, {{0, 0, 24}, {0, 0, 0}},    {{0, 0, -1}, {0, 0, 23}},
-                 {{-1, 0, 0}, {59, 59, 23}}, {{60, 59, 23}, {0, 0, 0}},  {{0, 0, 50}, {0, 0, 26}},
-                 {{0, 0, -30}, {0, 0, -6}},  {{-128, 0, 1}, {52, 57, 0}}};
+    const std::pair<dbTIME, dbTIME> cases[] = {
+        {{0, 0, 0}, {0, 0, 0}},     {{-60, 5, 5}, {0, 4, 5}},   {{125, 5, 5}, {5, 7, 5}},
+        {{125, 127, 0}, {5, 9, 2}}, {{0, 0, 24}, {0, 0, 0}},    {{0, 0, -1}, {0, 0, 23}},
+        {{-1, 0, 0}, {59, 59, 23}}, {{60, 59, 23}, {0, 0, 0}},  {{0, 0, 50}, {0, 0, 26}},
+        {{0, 0, -30}, {0, 0, -6}},  {{-128, 0, 1}, {52, 57, 0}}};
     for (auto [time, after] : cases) {
         Rules.MakeTimeValid(&time);
         EXPECT_EQ(PackTime(time), PackTime(after)) << "case " << Formatted(after, 2);
@@ -91,23 +88,17 @@ TEST(DatesAndTimes, AreCompared) {
 }
 
 TEST(DatesAndTimes, AreReadFromTheClock) {
-    const auto now = [] {
-        const std::time_t seconds = std::time(nullptr);
-        char text[40];
-        std::strftime(text, sizeof(text), "%m-%d-%Y %H:%M:%S", std::localtime(&seconds));
-        return std::string(text);
-    };
-    std::string before;
-    std::string found;
+    std::time_t now = 0;
+    dbDATE date{};
+    dbTIME time{};
     do { // until no second ends in between
-        before = now();
-        dbDATE date{};
-        dbTIME time{};
+        now = std::time(nullptr);
         Rules.SetToCurrentDate(&date);
         Rules.SetToCurrentTime(&time);
-        found = Formatted(date, 3) + " " + Formatted(time, 2);
-    } while (before != now());
-    EXPECT_EQ(found, before);
+    } while (std::time(nullptr) != now);
+    char text[40];
+    std::strftime(text, sizeof(text), "%m-%d-%Y %H:%M:%S", std::localtime(&now));
+    EXPECT_EQ(Formatted(date, 3) + " " + Formatted(time, 2), text);
 }
 
 } // namespace

@@ -202,7 +202,7 @@ TEST_F(QueryTest, WalkKeepsWithinTheSetOfTheMoment) {
 
 // Every way to compare texts agrees with the comparison of two plain strings, whatever the column's width and
 // wherever letters beyond ASCII stand.
-TEST(TextQuery, AgreesWithPlainComparison) {
+TEST_F(RowsTest, TextQueriesAgreeWithPlainComparison) {
     std::mt19937 random(20260101);
     const auto text = [&](std::size_t longest) {
         std::string result;
@@ -211,30 +211,27 @@ TEST(TextQuery, AgreesWithPlainComparison) {
         }
         return result;
     };
-    for (int width : {1, 3, 8, 16, 24, 31, 40}) {
-        TemporaryFolder folder;
-        DATABASE database(nullptr);
-        const COLUMN_ENTRY columns[] = {Column("T", ColumnType::String, width),
+    for (std::size_t width : {1, 3, 8, 16, 24, 31, 40}) {
+        const COLUMN_ENTRY columns[] = {Column("T", ColumnType::String, static_cast<int>(width)),
                                         Column("After", ColumnType::String, 9)};
-        ASSERT_EQ(database.Create(folder.File("t.db").c_str(), "", 2, columns), 0);
+        ASSERT_EQ(database_.Create(folder_.File(std::to_string(width)).c_str(), "", 2, columns), 0);
         std::vector<std::string> texts;
         for (std::size_t i = 0; i < 300; ++i) {
-            texts.push_back(
-                text(std::min<std::size_t>(static_cast<std::size_t>(width), i % 4 == 0 ? 40 : 5)));
-            std::string data(static_cast<std::size_t>(width) + 9, 'a'); // behind the terminator lies anything
+            texts.push_back(text(std::min<std::size_t>(width, i % 4 == 0 ? 40 : 5)));
+            std::string data(width + 9, 'a'); // behind the terminator lies anything
             data.replace(0, texts[i].size() + 1, texts[i] + '\0');
-            ASSERT_GE(database.Append(data.data()), 0);
+            ASSERT_GE(database_.Append(data.data()), 0);
         }
         for (std::size_t i = 0; i < 300; ++i) {
             const int op = static_cast<int>(random() % 7);
             const std::string value = i % 2 == 0 || texts[i].empty() ? text(4) + "a" : texts[i].substr(0, 31);
-            database.SetCaseSensitivity(i % 5 == 0 ? 1 : 0);
+            database_.SetCaseSensitivity(i % 5 == 0 ? 1 : 0);
             const std::string statement = "T " + std::string(Operators[op]) + " " + value;
-            ASSERT_GE(database.Query(statement.c_str(), New), 0);
+            ASSERT_GE(database_.Query(statement.c_str(), New), 0);
             for (long n = 0; n < 300; ++n) {
                 const std::string& field = texts[static_cast<std::size_t>(n)];
-                ASSERT_EQ(database.ConvertPhysToLogRecordNumber(n) >= 0,
-                          database.CompareStringVals(op, field.c_str(), value.c_str()) == 1)
+                ASSERT_EQ(database_.ConvertPhysToLogRecordNumber(n) >= 0,
+                          database_.CompareStringVals(op, field.c_str(), value.c_str()) == 1)
                     << field << ": " << statement << " width " << width;
             }
         }

@@ -1,4 +1,5 @@
 #include <algorithm>
+#include <cfloat>
 #include <climits>
 
 #include "SampleFile.h"
@@ -23,8 +24,7 @@ TEST_F(QueryUpdateTest, RefusesAndChangesNothing) {
     const std::pair<const char*, int> cases[] = {
         {nullptr, 2201},    {"", 2201},          {"Name", 2205},     {"Name =", 2205},
         {"Name ~ x", 2201}, {"Name == x", 2201}, {"name = x", 2202}, {"Nothing ~ x", 2201},
-        {"Name + x", 2203}, {"Name * 2", 2203},
-    };
+        {"Name + x", 2203}, {"Name * 2", 2203}};
     for (const auto& [statement, code] : cases) {
         EXPECT_EQ(CodeOf(database_.QueryUpdate(statement)), code) << statement;
     }
@@ -33,11 +33,10 @@ TEST_F(QueryUpdateTest, RefusesAndChangesNothing) {
 
 // What the column of the first three records is then, as text.
 TEST_F(QueryUpdateTest, ChangesEveryTypeByEveryOperator) {
-    const std::string most = "340282346638528859811704183484516925440.00";
     for (const auto& [statement, expected] : Cases(
              " Tag = 300: 44 44 44; Tag + 100: -56 -28 107; Tag - 1: 99 127 6; Tag * 3: 44 -128 21;"
-             " Tag / 7: 14 -18 1; Tag / -1: -100 -128 -7; Tag / 0: 100 -128 7; Small + 40000: 4464 7232 "
-             "-25529;"
+             " Tag / 7: 14 -18 1; Tag / -1: -100 -128 -7; Tag / 0: 100 -128 7;"
+             " Small + 40000: 4464 7232 -25529;"
              " Small * -1: -30000 -32768 -7; Small / -1: -30000 -32768 -7; Count / 3: 3 -715827882 2;"
              " Count / -1: -10 -2147483648 -7; Count / word: 10 -2147483648 7; Count - 1: 9 2147483647 6;"
              " Count * 2147483647: -10 -2147483648 2147483641; Count = 4294967297: 1 1 1;"
@@ -45,9 +44,6 @@ TEST_F(QueryUpdateTest, ChangesEveryTypeByEveryOperator) {
              " Price * 2: 3.00 -4.00 14.00; Price / 4: 0.38 -0.50 1.75; Price / 0: inf -inf inf;"
              " Price = 1e99: inf inf inf; Price = -1e999: -inf -inf -inf; Price = -inf: -inf -inf -inf;"
              " Price = nancy: 0.00 0.00 0.00; Price = infinite: 0.00 0.00 0.00; Price = 0x10: 0.00 0.00 0.00;"
-             " Price = 3.4028235e38: " +
-             most + " " + most + " " + most +
-             ";"
              // The parts of a packed number; a part that is too much is carried, also when nothing changes.
              " Day + 1: 20000101 19990616 19990304; Day + 256: 20000131 19990715 19990331;"
              " Day + -1: 19981130 19980514 19980130; Day - 65536: 19981231 19980615 19980303;"
@@ -104,7 +100,9 @@ TEST_F(QueryUpdateTest, ChangesTheSetAndNothingElse) {
     }
 }
 
-TEST_F(QueryUpdateTest, PartsWrapAndAreNotCarried) {
+TEST_F(QueryUpdateTest, NumbersStayAsTheyAreAndPartsWrap) {
+    EXPECT_EQ(database_.QueryUpdate("Price = 3.4028235e38"), 3);
+    EXPECT_EQ(At(2).price, FLT_MAX);
     EXPECT_EQ(database_.QueryUpdate("Day = 131006725"), 3);
     EXPECT_EQ(database_.Query("Day = 19990105", QueryMode::New), 3);
     dbDATE date{31, 12, 32767};
@@ -136,7 +134,7 @@ TEST_F(QueryUpdateTest, DoesNotWritePastNarrowColumns) {
         std::string after = BytesOf(At(0));
         const auto offset = static_cast<std::size_t>(info.offset);
         const auto size = static_cast<std::size_t>(info.size);
-        EXPECT_EQ(size > 0 && after.substr(offset, size) == before.substr(offset, size), false) << info.name;
+        EXPECT_TRUE(size == 0 || after.substr(offset, size) != before.substr(offset, size)) << info.name;
         after.replace(offset, size, before, offset, size);
         EXPECT_EQ(after, before) << info.name;
     }

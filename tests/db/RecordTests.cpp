@@ -113,6 +113,7 @@ TEST_F(RowsTest, OperationsByStatus) {
     ASSERT_EQ(database_.Delete(1) + database_.Lock(2), 0);
     const std::string start = folder_.Read("rows.db");
     const ROW mark = Row("mark");
+    const auto record = [](long n) { return DataStartOfRows + static_cast<std::size_t>(n) * RowLength; };
     for (const auto& operation : operations) {
         for (const long n : {0L, 1L, 2L, 4L, -1L, 1L << 32}) {
             SCOPED_TRACE(std::string(operation.name) + " " + std::to_string(n));
@@ -125,9 +126,6 @@ TEST_F(RowsTest, OperationsByStatus) {
             EXPECT_EQ(CodeOf(result), answer < 1000 ? 0 : answer);
             EXPECT_EQ(result, answer < 1000 ? answer : -1);
             std::string expected = start;
-            const auto record = [](long i) {
-                return DataStartOfRows + static_cast<std::size_t>(i) * RowLength;
-            };
             if (inside) {
                 expected[record(n)] = static_cast<char>(operation.after[n] - '0');
                 expected[40] = static_cast<char>((n == 1 ? 0 : 1) + (operation.after[n] == '1' ? 1 : 0));
@@ -207,9 +205,8 @@ TEST_F(RowsTest, ErrorsStayUntilAsked) {
     EXPECT_STREQ(ErrorMessage(4711), "Unknown error");
     EXPECT_STREQ(ErrorMessage(65535), "Unknown error");
     EXPECT_STREQ(ErrorMessage(1607), "Query error - A NEW query must precede an OR or AND query");
-    for (int kilobytes : {-1, ReadCache::MaximumKilobytes + 1}) {
-        EXPECT_EQ(CodeOf(database_.SetReadCache(kilobytes)), 2601);
-    }
+    EXPECT_EQ(CodeOf(database_.SetReadCache(-1)), 2601);
+    EXPECT_EQ(CodeOf(database_.SetReadCache(ReadCache::MaximumKilobytes + 1)), 2601);
 }
 
 TEST(ClosedDatabase, AnswersSafely) {

@@ -1,4 +1,7 @@
-#include <limits>
+#include <array>
+#include <cfloat>
+#include <climits>
+#include <cmath>
 #include <random>
 
 #include "SampleFile.h"
@@ -9,23 +12,18 @@ using SortTest = RowsTest;
 
 // A record with few and extreme values, so that there are equal ones and those that a careless key misplaces.
 ROW RandomRow(std::mt19937& random) {
-    const auto pick = [&random](auto values) {
-        return *(values.begin() + static_cast<std::ptrdiff_t>(random() % values.size()));
-    };
-    using Limits = std::numeric_limits<float>;
-    const auto byte = [&] { return pick(std::initializer_list<std::int8_t>{-128, -1, 0, 1, 127}); };
-    ROW row = Row(pick(std::initializer_list<const char*>{
-                      "", "a", "A", "ab", "AB", "investm", "INVESTME", "investment", "Investment 1",
-                      "investment 2", "investment 10", "[", "_", "\xC3\x84pfel", "\xC3\xA4PFEL", "a\xC3\x84X",
-                      "A\xC3\x84x", "sixteen letters!", "SIXTEEN LETTERS?"}),
-                  byte(), pick(std::initializer_list<int>{-32768, -1, 0, 1, 300, 32767}),
-                  pick(std::initializer_list<int>{std::numeric_limits<int>::min(), -1, 0, 1, 256, 65536,
-                                                  std::numeric_limits<int>::max()}),
-                  pick(std::initializer_list<float>{
-                      Limits::quiet_NaN(), -Limits::quiet_NaN(), Limits::infinity(), -Limits::infinity(),
-                      0.0F, -0.0F, 1, -1, 1.5F, Limits::max(), Limits::denorm_min(), -Limits::denorm_min()}),
-                  {byte(), byte(), pick(std::initializer_list<std::int16_t>{-1, 0, 1999, 2000})},
-                  {byte(), byte(), byte()});
+    static const auto names = std::to_array<const char*>(
+        {"", "a", "A", "ab", "AB", "investm", "INVESTME", "investment", "Investment 1", "investment 2",
+         "investment 10", "[", "_", "\xC3\x84pfel", "\xC3\xA4PFEL", "a\xC3\x84X", "A\xC3\x84x",
+         "sixteen letters!", "SIXTEEN LETTERS?"});
+    static constexpr std::int8_t bytes[] = {-128, -1, 0, 1, 127};
+    static constexpr std::int16_t shorts[] = {-32768, -1, 0, 1, 300, 1999, 2000, 32767};
+    static constexpr int longs[] = {INT_MIN, -1, 0, 1, 256, 65536, INT_MAX};
+    static constexpr float floats[] = {NAN,  -NAN,    INFINITY,     -INFINITY,    0, -0.0F, 1, -1,
+                                       1.5F, FLT_MAX, FLT_TRUE_MIN, -FLT_TRUE_MIN};
+    const auto any = [&random](const auto& values) { return values[random() % std::size(values)]; };
+    ROW row = Row(any(names), any(bytes), any(shorts), any(longs), any(floats),
+                  {any(bytes), any(bytes), any(shorts)}, {any(bytes), any(bytes), any(bytes)});
     if (random() % 4 == 0) {
         std::memcpy(row.name, "ab\0garbage\xFF", 12); // what follows a text's end means nothing
     }
@@ -98,16 +96,13 @@ TEST_F(SortTest, NextSortSlots) {
     Append({Row("a", 1), Row("b"), Row("c", 1), Row("d", 1)});
     EXPECT_EQ(database_.Query("Tag = 1", QueryMode::New), 3);
     Append({Row("e", 1)}); // has no slot
-    const struct {
-        long from, first, second;
-    } cases[] = {{-1, 0, 2}, {-7, 0, 2}, {0, 2, 3}, {1, 2, 3},
-                 {2, 3, 5},  {3, 5, 5},  {5, 5, 5}, {std::numeric_limits<long>::max(), 5, 5}};
-    for (const auto& pair : cases) {
-        long first = pair.from;
-        long second = 0;
-        database_.GetNextSortSlots(&first, &second);
-        EXPECT_EQ(first, pair.first) << pair.from;
-        EXPECT_EQ(second, pair.second) << pair.from;
+    const std::tuple<long, long, long> cases[] = {{-1, 0, 2}, {-7, 0, 2}, {0, 2, 3}, {1, 2, 3},
+                                                  {2, 3, 5},  {3, 5, 5},  {5, 5, 5}, {LONG_MAX, 5, 5}};
+    for (const auto& [from, first, second] : cases) {
+        long next = from;
+        long afterNext = 0;
+        database_.GetNextSortSlots(&next, &afterNext);
+        EXPECT_EQ(std::pair(next, afterNext), std::pair(first, second)) << from;
     }
 }
 

@@ -27,10 +27,7 @@ class TextTest : public RowsTest {
 
 TEST_F(TextTest, FieldsAsText) {
     using Limits = std::numeric_limits<float>;
-    const struct {
-        ROW row;
-        const char* line;
-    } cases[] = {
+    const std::pair<ROW, const char*> cases[] = {
         {Row("Acorn", 65, 7, 8, 1.005F, {5, 1, 1999}, {30, 15, 9}), "Acorn|65|7|8|1.00|19990105|091530|\n"},
         {Row("", -128, -32768, std::numeric_limits<int>::min(), -0.005F, {0, 0, 0}, {0, 0, 0}),
          " |-128|-32768|-2147483648|-0.00|00000000|000000|\n"},
@@ -38,10 +35,9 @@ TEST_F(TextTest, FieldsAsText) {
          "sixteen letters!|0|0|0|inf|-32768-1-128|-128-10-1|\n"},
         {Row("x", 0, 0, 0, -Limits::quiet_NaN()), "x|0|0|0|nan|20000101|120000|\n"},
         {Row("x", 0, 0, 0, -Limits::max(), {1, 1, -5}),
-         "x|0|0|0|-340282346638528859811704183484516925440.00|-0050101|120000|\n"},
-    };
-    for (const auto& field : cases) {
-        EXPECT_EQ(LineOf(field.row), field.line);
+         "x|0|0|0|-340282346638528859811704183484516925440.00|-0050101|120000|\n"}};
+    for (const auto& [row, line] : cases) {
+        EXPECT_EQ(LineOf(row), line);
     }
     database_.SetByteOutputFormat(1);
     EXPECT_EQ(LineOf(Row("a", 65), ", "), "a, A, 0, 0, 0.00, 20000101, 120000, \n");
