@@ -6,6 +6,9 @@
 
 namespace {
 
+// What is left to repair: remarks, problems, nothing but counts.
+enum Kind { Sound, Broken, Mended };
+
 // A file of four records of which one is deleted and one locked, whose bytes are damaged, checked and
 // repaired.
 class DamageTest : public testing::Test {
@@ -40,6 +43,38 @@ class DamageTest : public testing::Test {
         return readable;
     }
 
+    // What the check says of these bytes, and what is left of it when the counts are mended.
+    void CheckAndRepair(const std::string& bytes, Kind kind, const std::string& finding) {
+        FileCheck check;
+        ASSERT_EQ(check.Run(path_), 0);
+        EXPECT_EQ(check.IsSound(), kind == Sound);
+        EXPECT_EQ(check.CanRepair(), kind == Mended);
+        std::string said;
+        for (const FILE_FINDING& one : check.Findings()) {
+            said += (one.problem ? "!" : "@") + std::to_string(one.offset) + " ";
+            said += (one.record >= 0 ? "record " + std::to_string(one.record) + " " : "") + one.text + "\n";
+        }
+        const std::string expected = finding.empty() ? "" : (kind == Sound ? "@" : "!") + finding;
+        EXPECT_TRUE(said.find(expected) != said.npos && said.empty() == expected.empty()) << said;
+        EXPECT_EQ(folder_.Read("rows.db"), bytes) << "looking must not change anything";
+        std::string backup;
+        ASSERT_EQ(check.Repair(path_, &backup), 0);
+        EXPECT_EQ(check.IsSound(), kind != Broken);
+        EXPECT_FALSE(check.CanRepair());
+        const std::string mended = folder_.Read("rows.db");
+        if (kind == Mended) {
+            EXPECT_EQ(With(mended, 36, bytes.substr(36, 16)), bytes) << "only counts may change";
+            EXPECT_EQ(backup, path_ + ".before-repair");
+            EXPECT_EQ(folder_.Read("rows.db.before-repair"), bytes);
+            const DATABASE database(path_.c_str());
+            EXPECT_TRUE(database.IsOpen() && !database.IsDamaged());
+            std::filesystem::remove(backup);
+        } else {
+            EXPECT_EQ(mended, bytes);
+            EXPECT_EQ(folder_.Names(), std::vector<std::string>{"rows.db"});
+        }
+    }
+
     TemporaryFolder folder_;
     std::string path_ = folder_.File("rows.db");
     std::string intact_;
@@ -60,44 +95,6 @@ TEST_F(DamageTest, AnyByteOfHeaderAndColumns) {
         for (char other : {'\x00', '\x01', '\x03', '\x7F', '\x80', '\xFF'}) {
             EXPECT_LE(Examine(With(intact_, at, std::string(1, other))), 400) << at;
         }
-    }
-}
-
-// What is left to repair: remarks, problems, nothing but counts.
-enum Kind { Sound, Broken, Mended };
-
-// What the check says of a file's bytes, and what is left of them when the counts are mended.
-void CheckAndRepair(const TemporaryFolder& folder, const std::string& bytes, Kind kind,
-                    const std::string& finding) {
-    const std::string path = folder.File("rows.db");
-    FileCheck check;
-    ASSERT_EQ(check.Run(path), 0);
-    EXPECT_EQ(check.IsSound(), kind == Sound);
-    EXPECT_EQ(check.CanRepair(), kind == Mended);
-    std::string said;
-    for (const FILE_FINDING& one : check.Findings()) {
-        said += (one.problem ? "!" : "@") + std::to_string(one.offset) + " ";
-        said += (one.record >= 0 ? "record " + std::to_string(one.record) + " " : "") + one.text + "\n";
-    }
-    EXPECT_TRUE(finding.empty() ? said.empty()
-                                : said.find((kind == Sound ? "@" : "!") + finding) != said.npos)
-        << said;
-    EXPECT_EQ(folder.Read("rows.db"), bytes) << "looking must not change anything";
-    std::string backup;
-    ASSERT_EQ(check.Repair(path, &backup), 0);
-    EXPECT_EQ(check.IsSound(), kind != Broken);
-    EXPECT_FALSE(check.CanRepair());
-    const std::string mended = folder.Read("rows.db");
-    if (kind == Mended) {
-        EXPECT_EQ(backup, path + ".before-repair");
-        EXPECT_EQ(folder.Read("rows.db.before-repair"), bytes);
-        EXPECT_EQ(With(mended, 36, bytes.substr(36, 16)), bytes) << "only counts may change";
-        const DATABASE database(path.c_str());
-        EXPECT_TRUE(database.IsOpen() && !database.IsDamaged());
-        std::filesystem::remove(backup);
-    } else {
-        EXPECT_EQ(mended, bytes);
-        EXPECT_EQ(folder.Names(), std::vector<std::string>{"rows.db"});
     }
 }
 
@@ -166,7 +163,7 @@ TEST_F(DamageTest, IsReadAsFarAsItGoesAndToldOf) {
         DATABASE_HEADER header{};
         database.GetHeaderInfo(&header);
         EXPECT_LT(std::strlen(header.description), 32U);
-        CheckAndRepair(folder_, damage.bytes, damage.kind, damage.finding);
+        CheckAndRepair(damage.bytes, damage.kind, damage.finding);
     }
 }
 
