@@ -64,6 +64,7 @@ class DamageTest : public testing::Test {
         const std::string mended = folder_.Read("rows.db");
         if (kind == Mended) {
             EXPECT_EQ(With(mended, 36, bytes.substr(36, 16)), bytes) << "only counts may change";
+            EXPECT_EQ(mended.substr(48, 4), std::string(4, '\0')) << "nothing is announced";
             EXPECT_EQ(backup, path_ + ".before-repair");
             EXPECT_EQ(folder_.Read("rows.db.before-repair"), bytes);
             const DATABASE database(path_.c_str());
@@ -123,6 +124,7 @@ TEST_F(DamageTest, IsReadAsFarAsItGoesAndToldOf) {
         {With(intact_, 4, long32), 3, false, Sound, "4 the description"},
         {put(36, {0, 0, 0, 0}), 0, true, Mended, "36 the header counts 0 records, the file has room for 4"},
         {put(36, {1}), 1, true, Mended, "36 the header counts 1 record, the file has room for 4", 0},
+        {With(put(36, {1}), 48, "\2"), 1, true, Mended, "36 the header counts 1 record", 0},
         {put(36, {3}), 2, false, Sound, "465 35 bytes behind the last record"},
         {put(36, {-1, -1, -1, -1}), -1, false, Mended, "36 the header counts -1 records"},
         {put(36, {-1, -1, -1, 127}), 3, true, Mended, "36 the header counts 2147483647"},
