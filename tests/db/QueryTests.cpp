@@ -194,6 +194,7 @@ TEST_F(QueryTest, WalkKeepsWithinTheSetOfTheMoment) {
     ASSERT_EQ(database_.QueryReset(), 5);
     ASSERT_EQ(DATABASE(path_.c_str()).Delete(3), 0);
     EXPECT_EQ(Walked(database_), (std::vector<long>{0, 1, 2, 4})) << "a record deleted elsewhere drops out";
+    EXPECT_EQ(database_.IsQueryActive(), 1);
     EXPECT_EQ(database_.ConvertPhysToLogRecordNumber(4), 3);
     for (auto [start, step] : {std::pair<long, long>{3, 0}, {LONG_MAX, 1}, {-1, LONG_MAX}, {-1, LONG_MIN}}) {
         EXPECT_EQ(database_.QueryGetXXX(start, step, nullptr), nullptr) << start << " " << step;
