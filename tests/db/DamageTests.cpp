@@ -131,6 +131,8 @@ TEST_F(DamageTest, IsReadAsFarAsItGoesAndToldOf) {
         {put(40, {-1, -1, -1, -1}), 3, true, Mended, "40 the header counts -1 deleted"},
         {put(40, {2}), 3, false, Mended, "40 the header counts 2 deleted, the status bytes 1", 2},
         {put(40, {5}), 3, true, Mended, "40 the header counts 5 deleted"},
+        {With(put(40, {5}), 360, "\1"), 2, true, Mended,
+         "40 the header counts 5 deleted, the status bytes 2"},
         {put(44, {-1, -1}), -1, false, Broken, "44 the column count is -1"},
         {put(44, {-1, 127}), -1, false, Broken, "44 header and 32767 columns need"},
         {put(44, {8}), -1, false, Broken, "396 column "},

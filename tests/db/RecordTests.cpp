@@ -191,6 +191,7 @@ TEST_F(RowsTest, CountsAreWrittenAtOnceOrWhenAskedFor) {
     EXPECT_EQ(counts(), std::pair('\3', '\1'));
     EXPECT_EQ(database_.Open("no such file"), -1);
     EXPECT_EQ(database_.Sync(), 0) << "nothing of a file that is closed";
+    EXPECT_EQ(database_.GetNumberOfActiveRecords(), 0);
 }
 
 TEST_F(RowsTest, ErrorsStayUntilAsked) {

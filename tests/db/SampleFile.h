@@ -78,6 +78,7 @@ inline std::string With(std::string bytes, std::size_t at, const std::string& ot
 inline int Code(DATABASE& database, long result) {
     const int code = database.GetLastError(nullptr);
     EXPECT_EQ(result < 0, code != 0) << result << " and code " << code;
+    EXPECT_STRNE(ErrorMessage(code), "Unknown error") << code;
     return code;
 }
 
