@@ -197,6 +197,8 @@ TEST_F(DamageTest, FileThatShrinksWhileOpen) {
     DATABASE database(path_.c_str());
     ASSERT_EQ(database.Query("Name >= a", QueryMode::New), 3);
     database.SetReadCache(256);
+    std::filesystem::resize_file(path_, DataStartOfRows + RowLength * 3 / 2);
+    EXPECT_EQ(Code(database, database.QueryUpdate("Tag = 1")), 2206);
     std::filesystem::resize_file(path_, DataStartOfRows + RowLength / 2);
     ROW row{};
     EXPECT_EQ(Code(database, database.SortBy("Name", 0)), 1709);
@@ -230,11 +232,11 @@ TEST_F(DamageTest, ListsNoMoreThanItsBound) {
     EXPECT_EQ(check.Findings().back().text, "152 more findings are not listed");
 }
 
-TEST_F(DamageTest, WhatCannotBeReadIsNotChecked) {
+TEST_F(DamageTest, WhatCannotBeReadIsRefused) {
     FileCheck check;
     EXPECT_EQ(check.Run(folder_.File("nothing")), ENOENT);
     EXPECT_EQ(check.Run(folder_.Path()), EINVAL);
-    folder_.Write("rows.db", With(intact_, 0, "\xFF")); // which deserves a remark
+    folder_.Write("rows.db", With(With(intact_, 0, "\xFF"), 40, "\5")); // which is told of and counted anew
     bool met = true;
     for (int at = 0; met; ++at) {
         FaultyFiles files;
@@ -244,6 +246,9 @@ TEST_F(DamageTest, WhatCannotBeReadIsNotChecked) {
         met = files.Disarm();
         EXPECT_EQ(error, met ? EIO : 0);
         EXPECT_EQ(broken.Findings().empty(), met);
+        files.Arm(Fault::NoRead, at);
+        const DATABASE database(path_.c_str(), files);
+        EXPECT_EQ(database.IsOpen(), !files.Disarm());
         EXPECT_TRUE(met || at > 10) << "header, columns and records";
     }
 }
