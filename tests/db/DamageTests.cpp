@@ -271,7 +271,7 @@ TEST_F(DamageTest, BackupTakesAFreeNameAndThePermissions) {
     EXPECT_EQ(folder_.Read("home/rows.db.before-repair-3"), miscounted_);
     struct stat status {};
     ASSERT_EQ(stat(backup.c_str(), &status), 0);
-    EXPECT_EQ(status.st_mode & 07777U, 0640U);
+    EXPECT_EQ(status.st_mode & 07777U, 0600U);
 }
 
 // Whatever fails, the file is the old one or the mended one, and it is mended only when the backup is whole.
