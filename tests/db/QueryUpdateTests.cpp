@@ -33,23 +33,46 @@ TEST_F(QueryUpdateTest, RefusesAndChangesNothing) {
 
 // What the column of the first three records is then, as text.
 TEST_F(QueryUpdateTest, ChangesEveryTypeByEveryOperator) {
-    for (const auto& [statement, expected] : Cases(
-             " Tag = 300: 44 44 44; Tag + 100: -56 -28 107; Tag - 1: 99 127 6; Tag * 3: 44 -128 21;"
-             " Tag / 7: 14 -18 1; Tag / -1: -100 -128 -7; Tag / 0: 100 -128 7;"
-             " Small + 40000: 4464 7232 -25529;"
-             " Small * -1: -30000 -32768 -7; Small / -1: -30000 -32768 -7; Count / 3: 3 -715827882 2;"
-             " Count / -1: -10 -2147483648 -7; Count / word: 10 -2147483648 7; Count - 1: 9 2147483647 6;"
-             " Count * 2147483647: -10 -2147483648 2147483641; Count = 4294967297: 1 1 1;"
-             " Price = 0.1: 0.10 0.10 0.10; Price + 1: 2.50 -1.00 8.00; Price - 0.5: 1.00 -2.50 6.50;"
-             " Price * 2: 3.00 -4.00 14.00; Price / 4: 0.38 -0.50 1.75; Price / 0: inf -inf inf;"
-             " Price = 1e99: inf inf inf; Price = -1e999: -inf -inf -inf; Price = -inf: -inf -inf -inf;"
-             " Price = nancy: 0.00 0.00 0.00; Price = infinite: 0.00 0.00 0.00; Price = 0x10: 0.00 0.00 0.00;"
-             // The parts of a packed number; a part that is too much is carried, also when nothing changes.
-             " Day + 1: 20000101 19990616 19990304; Day + 256: 20000131 19990715 19990331;"
-             " Day + -1: 19981130 19980514 19980130; Day - 65536: 19981231 19980615 19980303;"
-             " Day * 2: 19991231 19990615 19990303; At + 90: 110100 000130 100829;"
-             " At + 1: 105931 000001 101116; At - 1: 105929 235959 101114; At / 5: 105930 000000 101115;"
-             " At + 1507328: 095930 230000 091115")) {
+    for (const auto& [statement, expected] :
+         CASES{{"Tag = 300", "44 44 44"},
+               {"Tag + 100", "-56 -28 107"},
+               {"Tag - 1", "99 127 6"},
+               {"Tag * 3", "44 -128 21"},
+               {"Tag / 7", "14 -18 1"},
+               {"Tag / -1", "-100 -128 -7"},
+               {"Tag / 0", "100 -128 7"},
+               {"Small + 40000", "4464 7232 -25529"},
+               {"Small * -1", "-30000 -32768 -7"},
+               {"Small / -1", "-30000 -32768 -7"},
+               {"Count / 3", "3 -715827882 2"},
+               {"Count / -1", "-10 -2147483648 -7"},
+               {"Count / word", "10 -2147483648 7"},
+               {"Count - 1", "9 2147483647 6"},
+               {"Count * 2147483647", "-10 -2147483648 2147483641"},
+               {"Count = 4294967297", "1 1 1"},
+               {"Price = 0.1", "0.10 0.10 0.10"},
+               {"Price + 1", "2.50 -1.00 8.00"},
+               {"Price - 0.5", "1.00 -2.50 6.50"},
+               {"Price * 2", "3.00 -4.00 14.00"},
+               {"Price / 4", "0.38 -0.50 1.75"},
+               {"Price / 0", "inf -inf inf"},
+               {"Price = 1e99", "inf inf inf"},
+               {"Price = -1e999", "-inf -inf -inf"},
+               {"Price = -inf", "-inf -inf -inf"},
+               {"Price = nancy", "0.00 0.00 0.00"},
+               {"Price = infinite", "0.00 0.00 0.00"},
+               {"Price = 0x10", "0.00 0.00 0.00"},
+               // The parts of a packed number; a part that is too much is carried, also when nothing changes.
+               {"Day + 1", "20000101 19990616 19990304"},
+               {"Day + 256", "20000131 19990715 19990331"},
+               {"Day + -1", "19981130 19980514 19980130"},
+               {"Day - 65536", "19981231 19980615 19980303"},
+               {"Day * 2", "19991231 19990615 19990303"},
+               {"At + 90", "110100 000130 100829"},
+               {"At + 1", "105931 000001 101116"},
+               {"At - 1", "105929 235959 101114"},
+               {"At / 5", "105930 000000 101115"},
+               {"At + 1507328", "095930 230000 091115"}}) {
         folder_.Write("rows.db", start_);
         ASSERT_EQ(database_.Open(path_.c_str()), 0);
         EXPECT_EQ(database_.QueryUpdate(statement.c_str()), 3) << statement;

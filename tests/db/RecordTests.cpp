@@ -1,5 +1,6 @@
 #include <functional>
 #include <random>
+#include <sstream>
 
 #include "SampleFile.h"
 

@@ -4,7 +4,6 @@
 
 #include <cstring>
 #include <optional>
-#include <sstream>
 #include <string>
 #include <vector>
 
@@ -90,16 +89,8 @@ inline std::string NameOf(const ROW& row) {
     return {row.name, strnlen(row.name, sizeof(row.name))};
 }
 
-// The rows of a table that is written as text: " what: outcome; what: outcome".
-inline std::vector<std::pair<std::string, std::string>> Cases(const std::string& table) {
-    std::vector<std::pair<std::string, std::string>> cases;
-    std::istringstream rows(table);
-    for (std::string row; std::getline(rows, row, ';');) {
-        const std::size_t colon = row.find(": ");
-        cases.emplace_back(row.substr(1, colon - 1), row.substr(colon + 2));
-    }
-    return cases;
-}
+// What is done, and what comes of it.
+using CASES = std::vector<std::pair<std::string, std::string>>;
 
 // What can be read of a file: the records' bytes, nothing where one is deleted.
 using CONTENT = std::vector<std::optional<std::string>>;
