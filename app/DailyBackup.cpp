@@ -47,7 +47,7 @@ DailyBackup::DailyBackup(const std::string& folder, const std::vector<std::strin
                          FileOperations& operations, Clock clock)
     : operations_(operations), clock_(clock) {
     for (const std::string& name : names) {
-        if (std::string file = FollowLinks(folder + "/" + name); !file.empty())
+        if (std::string file = FollowLinks((std::filesystem::path(folder) / name).string()); !file.empty())
             files_.push_back(std::move(file));
     }
 }

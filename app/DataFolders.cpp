@@ -16,7 +16,7 @@ std::string RealPath(const std::string& path) {
 std::vector<std::string> FoldersOf(const std::string& folder, const std::vector<std::string>& names) {
     std::vector<std::string> folders = {folder};
     for (const std::string& name : names) {
-        const std::string real = FolderOf(RealPath(folder + "/" + name));
+        const std::string real = FolderOf(RealPath((fs::path(folder) / name).string()));
         const auto isReal = [&real](const std::string& each) {
             std::error_code notThere;
             return each == real || fs::equivalent(each, real, notThere);
