@@ -46,8 +46,9 @@ int DataFileTool::CheckText(const std::string& path, const TEXT_FORMAT& format,
     TextCheck check(columns, format, separators);
     if (const int code = check.Run(text, database_.LongestLoadLine()); code != 0)
         return FailWithCode(code, path + ": ");
+    const std::string where = path + ", ";
     for (const std::string& wrong : check.Wrong())
-        Warn(path + ", " + wrong);
+        Warn(where + wrong);
     return check.Wrong().empty() ? 0 : 1;
 }
 
