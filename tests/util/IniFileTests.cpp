@@ -6,6 +6,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include "InChild.h"
 #include "TemporaryFolder.h"
 #include "util/IniFile.h"
 
@@ -20,12 +21,17 @@ class IniFileTest : public testing::Test {
         Settings().ReadString(section, key, "default", value);
         return value;
     }
-    std::string After(const std::string& content, const char* section, const char* key,
-                      const char* value) const {
+    std::string After(const std::string& content, const char* value) const {
         folder_.Write(Name, content);
-        EXPECT_EQ(Settings().WriteString(section, key, value), 0);
+        EXPECT_EQ(Settings().WriteString("G", "K", value), 0);
         EXPECT_FALSE(folder_.Has("ini_file.tmp"));
         return folder_.Read(Name);
+    }
+    // Whether the entry is refused and the file as it was.
+    bool Refuses(const std::string& section, const std::string& key, const std::string& value) const {
+        const std::string before = folder_.Read(Name);
+        return Settings().WriteString(section.c_str(), key.c_str(), value.c_str()) == 1 &&
+               folder_.Read(Name) == before;
     }
     INI_FILEx Settings() const { return INI_FILEx(folder_.File(Name).c_str()); }
 
@@ -33,21 +39,10 @@ class IniFileTest : public testing::Test {
 };
 
 TEST_F(IniFileTest, ReadsTheFirstEntryOfTheSection) {
-    folder_.Write(Name, "Key=before any section\n"
-                        ";[GENERAL]\n"
-                        " [GENERAL]\nKey=blank\n"
-                        "[general]\nKey=small\n"
-                        "[GENERALX]\nKey=longer\n"
-                        "[GENERAL] ; main\n"
-                        ";Key=comment\n"
-                        "\n"
-                        "no entry\n"
-                        "Key = blanks\n"
-                        "Key=  a=b \t  \n"
-                        "Key=second\n"
-                        "[DISPLAY]\nKey=other\r\nWide=120\n"
-                        "[GENERAL]old\n"
-                        "Late=yes  ");
+    folder_.Write(Name,
+                  "Key=before any section\n;[GENERAL]\n [GENERAL]\nKey=blank\n[general]\nKey=small\n"
+                  "[GENERALX]\nKey=longer\n[GENERAL] ; main\n;Key=comment\n\nno entry\nKey = blanks\n"
+                  "Key=  a=b \t  \nKey=second\n[DISPLAY]\nKey=other\r\nWide=120\n[GENERAL]old\nLate=yes  ");
     EXPECT_EQ(Value("GENERAL", "Key"), "  a=b \t");
     EXPECT_EQ(Value("GENERAL", "Late"), "yes");
     EXPECT_EQ(Value("DISPLAY", "Key"), "other\r");
@@ -62,6 +57,8 @@ TEST_F(IniFileTest, ReadsNumbers) {
         {"a", 120}, {"b", 0}, {"c", -7}, {"d", 0}, {"e", 2147483647}, {"f", -2147483647 - 1}, {"none", 50}};
     for (const auto& [key, number] : cases)
         EXPECT_EQ(Settings().ReadInt("D", key, 50), number) << key;
+    EXPECT_EQ(Settings().WriteInt("D", "b", -12), 0);
+    EXPECT_EQ(Settings().ReadInt("D", "b", 0), -12);
 }
 
 TEST_F(IniFileTest, CutsAtTheBufferAndLongLinesIntoSeveral) {
@@ -71,52 +68,45 @@ TEST_F(IniFileTest, CutsAtTheBufferAndLongLinesIntoSeveral) {
     EXPECT_STREQ(small, "12345678901234");
     Settings().ReadString("G", "none", "a default that is too long", small);
     EXPECT_STREQ(small, "a default that ");
-    const std::string longest = "[G]\nKey=" + std::string(123, 'v') + "Other=tail\n";
+    const std::string longest = "[G]\nK=" + std::string(125, 'v') + "Other=tail\n";
     folder_.Write(Name, longest);
-    EXPECT_EQ(Value("G", "Key"), std::string(123, 'v'));
+    EXPECT_EQ(Value("G", "K"), std::string(125, 'v'));
     EXPECT_EQ(Value("G", "Other"), "tail");
-    EXPECT_EQ(After(longest, "G", "Key", "x"), "[G]\nKey=x\nOther=tail\n");
+    EXPECT_EQ(After(longest, "x"), "[G]\nK=x\nOther=tail\n");
 }
 
 TEST_F(IniFileTest, WritesInPlace) {
-    const struct {
-        const char *before, *section, *key, *value, *after;
-    } cases[] = {// the first occurrence of the key in its section, everything else untouched
-                 {"; top\n[G]\n;K=c\n\nK = 1\nK=1  \nK=2\n[D]\nK=3\n", "G", "K", "new",
-                  "; top\n[G]\n;K=c\n\nK = 1\nK=new\nK=2\n[D]\nK=3\n"},
-                 // a new key goes before the next header, behind the blanks and comments that end its section
-                 {"[G]\nA=1\n\n; end\n[D]\n", "G", "K", "v", "[G]\nA=1\n\n; end\nK=v\n[D]\n"},
-                 // or to the end of the file, which may lack its line feed
-                 {"[G]\nA=1\n", "G", "K", "v", "[G]\nA=1\nK=v\n"},
-                 {"[G]\nA=1", "G", "K", "v", "[G]\nA=1\nK=v\n"},
-                 {"[G]\nK=1", "G", "K", "v", "[G]\nK=v\n"},
-                 // a new section goes to the end
-                 {"[D]\nA=1", "G", "K", "v", "[D]\nA=1\n[G]\nK=v\n"},
-                 {"", "G", "K", "", "[G]\nK=\n"},
-                 // a section that comes twice: its first occurrence takes the key
-                 {"[G]\n[D]\n[G]\nK=1\n", "G", "K", "v", "[G]\nK=v\n[D]\n[G]\nK=1\n"},
-                 {"[G]\n[G]x\nK=1\n", "G", "K", "v", "[G]\n[G]x\nK=v\n"}};
-    for (const auto& c : cases)
-        EXPECT_EQ(After(c.before, c.section, c.key, c.value), c.after);
-    EXPECT_EQ(After(std::string("[G]\nA=\0x\r\n", 10), "G", "K", "v"),
-              std::string("[G]\nA=\0x\r\nK=v\n", 14));
-    EXPECT_EQ(Settings().WriteInt("G", "K", -12), 0);
-    EXPECT_EQ(Settings().ReadInt("G", "K", 0), -12);
+    const std::pair<std::string, std::string> cases[] = {
+        // the first occurrence of the key in its section, everything else untouched
+        {"; top\n[G]\n;K=c\n\nK = 1\nK=1  \nK=2\n[D]\nK=3\n",
+         "; top\n[G]\n;K=c\n\nK = 1\nK=v\nK=2\n[D]\nK=3\n"},
+        // a new key goes before the next header, behind the blanks and comments that end its section
+        {"[G]\nA=1\n\n; end\n[D]\n", "[G]\nA=1\n\n; end\nK=v\n[D]\n"},
+        // or to the end of the file, which may lack its line feed
+        {"[G]\nA=1\n", "[G]\nA=1\nK=v\n"},
+        {"[G]\nA=1", "[G]\nA=1\nK=v\n"},
+        {"[G]\nK=1", "[G]\nK=v\n"},
+        // a new section goes to the end
+        {"[D]\nA=1", "[D]\nA=1\n[G]\nK=v\n"},
+        // a section that comes twice: its first occurrence takes the key
+        {"[G]\n[D]\n[G]\nK=1\n", "[G]\nK=v\n[D]\n[G]\nK=1\n"},
+        {"[G]\n[G]x\nK=1\n", "[G]\n[G]x\nK=v\n"},
+        {std::string("[G]\nA=\0x\r\n", 10), std::string("[G]\nA=\0x\r\nK=v\n", 14)}};
+    for (const auto& [before, after] : cases)
+        EXPECT_EQ(After(before, "v"), after);
+    EXPECT_EQ(After("", ""), "[G]\nK=\n");
 }
 
 TEST_F(IniFileTest, RefusesWhatCouldNotBeReadBack) {
-    const std::string content = "[G]\nK=1\n";
-    folder_.Write(Name, content);
+    folder_.Write(Name, "[G]\nK=1\n");
     const std::string longest(124, 'v');
     const std::string cases[][3] = {{"G", "K", longest + "v"}, {"G", "K", "a\nb"},
                                     {"G", "K", "a\r"},         {"G", "K", "\x1B[2J"},
                                     {"G", "K=", "v"},          {"G", ";K", "v"},
                                     {"G", "[K", "v"},          {"G", "", "v"},
                                     {"G\n", "K", "v"},         {std::string(62, 's'), "K", "v"}};
-    for (const auto& [section, key, value] : cases) {
-        EXPECT_EQ(Settings().WriteString(section.c_str(), key.c_str(), value.c_str()), 1) << key << value;
-        EXPECT_EQ(folder_.Read(Name), content);
-    }
+    for (const auto& [section, key, value] : cases)
+        EXPECT_TRUE(Refuses(section, key, value)) << section << key << value;
     EXPECT_EQ(Settings().WriteString("G", "K", longest.c_str()), 0);
     EXPECT_EQ(Value("G", "K"), longest);
 }
@@ -124,32 +114,28 @@ TEST_F(IniFileTest, RefusesWhatCouldNotBeReadBack) {
 TEST_F(IniFileTest, AMissingFileGivesDefaultsAndIsNotCreated) {
     EXPECT_EQ(Value("G", "K"), "default");
     EXPECT_EQ(Settings().WriteString("G", "K", "v"), 1);
-    const INI_FILEx tooLong((folder_.Path() + std::string(128, '/') + Name).c_str());
+    EXPECT_FALSE(folder_.Has(Name));
     folder_.Write(Name, "[G]\nK=1\n");
+    const INI_FILEx tooLong((folder_.Path() + std::string(128, '/') + Name).c_str());
     EXPECT_EQ(tooLong.ReadInt("G", "K", 7), 7);
     EXPECT_EQ(tooLong.WriteString("G", "K", "v"), 1);
-    EXPECT_EQ(folder_.Read(Name), "[G]\nK=1\n");
     std::filesystem::remove(folder_.File(Name));
     ASSERT_EQ(mkfifo(folder_.File(Name).c_str(), 0600), 0);
     EXPECT_EQ(Value("G", "K"), "default"); // and does not wait for a writer
 }
 
 TEST_F(IniFileTest, AFailedWriteKeepsTheOldSettings) {
-    const std::string content = "[G]\nK=1\n" + std::string(5000, ';');
-    folder_.Write(Name, content);
-    std::signal(SIGXFSZ, SIG_IGN);
-    rlimit usual{};
-    getrlimit(RLIMIT_FSIZE, &usual);
-    const rlimit small{4096, usual.rlim_max};
-    ASSERT_EQ(setrlimit(RLIMIT_FSIZE, &small), 0);
-    EXPECT_EQ(Settings().WriteString("G", "K", "v"), 1);
-    ASSERT_EQ(setrlimit(RLIMIT_FSIZE, &usual), 0);
-    EXPECT_EQ(folder_.Read(Name), content);
+    folder_.Write(Name, "[G]\nK=1\n" + std::string(5000, ';'));
+    const auto refusesInLittleRoom = [&] {
+        const rlimit room{4096, 4096};
+        std::signal(SIGXFSZ, SIG_IGN);
+        return setrlimit(RLIMIT_FSIZE, &room) == 0 && Refuses("G", "K", "v") ? 1 : 0;
+    };
+    EXPECT_EQ(ResultInChild(refusesInLittleRoom), 1);
     EXPECT_FALSE(folder_.Has("ini_file.tmp"));
     // The temporary cannot be created.
     std::filesystem::create_directory(folder_.File("ini_file.tmp"));
-    EXPECT_EQ(Settings().WriteString("G", "K", "v"), 1);
-    EXPECT_EQ(folder_.Read(Name), content);
+    EXPECT_TRUE(Refuses("G", "K", "v"));
     std::filesystem::remove(folder_.File("ini_file.tmp"));
     // What a killed program left is no obstacle, and is not written through when it is a link.
     folder_.Write("mine", "mine");
@@ -163,14 +149,16 @@ TEST_F(IniFileTest, KeepsPermissionsAndLinksAndLeaksNothing) {
     std::filesystem::create_directory(folder_.File("elsewhere"));
     folder_.Write("elsewhere/real.ini", "[G]\nK=1\n");
     std::filesystem::create_symlink("elsewhere/real.ini", folder_.File(Name));
-    ASSERT_EQ(chmod(folder_.File(Name).c_str(), 0640), 0);
-    const int before = dup(0);
-    close(before);
-    ASSERT_EQ(Settings().WriteString("G", "K", "v"), 0);
+    std::filesystem::permissions(folder_.File(Name), std::filesystem::perms{0640});
+    const auto nextFile = [] {
+        const int file = dup(0);
+        close(file);
+        return file;
+    };
+    const int before = nextFile();
+    EXPECT_EQ(Settings().WriteString("G", "K", "v"), 0);
     EXPECT_EQ(Value("G", "K"), "v");
-    const int after = dup(0);
-    close(after);
-    EXPECT_EQ(after, before);
+    EXPECT_EQ(nextFile(), before);
     EXPECT_EQ(folder_.Read("elsewhere/real.ini"), "[G]\nK=v\n");
     EXPECT_TRUE(std::filesystem::is_symlink(folder_.File(Name)));
     EXPECT_EQ(std::filesystem::status(folder_.File(Name)).permissions(), std::filesystem::perms{0640});

@@ -2,48 +2,40 @@
 
 #include <cmath>
 #include <cstdlib>
-#include <cstring>
 #include <ctime>
 #include <limits>
 #include <string>
+#include <tuple>
 
 #include "util/Dates.h"
 #include "util/Numbers.h"
 
 namespace {
 
-TEST(Numbers, GroupsThousands) {
-    const float infinity = std::numeric_limits<float>::infinity();
-    const struct {
-        float value;
-        int decimals;
-        const char* text;
-    } cases[] = {{1234567.0F, 2, "1,234,567.00"},
-                 {-1234.0F, 2, "-1,234.00"},
-                 {1234.5F, 2, "1234.50"},
-                 {12345.5F, 2, "12,345.50"},
-                 {-123.0F, 2, "-123.00"},
-                 {-123456792.0F, 0, "-123,456,792"},
-                 {999.999F, 2, "1000.00"},
-                 {-0.001F, 2, "-0.00"},
-                 {0.125F, 2, "0.12"}, // halves go to the even digit
-                 {0.375F, 2, "0.38"},
-                 {1e13F, 1, "9999,999,827,968.0"}, // beyond thirteen digits the first group takes the rest
-                 {1e27F, 2, "999999988484154753,734,934,528.00"},
-                 {1e29F, 2, "1.00e+29"}, // more than 31 characters
-                 {-std::numeric_limits<float>::max(), 2, "-3.40e+38"},
-                 {1.0F, 1000, "1.00000000000000000000e+00"},
-                 {infinity, 2, "inf"},
-                 {-infinity, 2, "-inf"},
-                 {std::nanf(""), 2, "nan"},
-                 {-std::nanf(""), 2, "nan"}};
-    for (const auto& c : cases) {
-        char text[FormatNumberSize + 1];
-        text[FormatNumberSize] = '#';
-        FormatNumber(c.value, text, c.decimals);
-        EXPECT_STREQ(text, c.text);
-        EXPECT_EQ(text[FormatNumberSize], '#');
+// The values as FormatNumber writes them, a blank behind each.
+std::string Grouped(std::initializer_list<float> values, int decimals) {
+    std::string all;
+    for (const float value : values) {
+        std::string text(FormatNumberSize + 1, '#');
+        FormatNumber(value, text.data(), decimals);
+        EXPECT_EQ(text.back(), '#');
+        all.append(text.c_str()).append(" ");
     }
+    return all;
+}
+
+TEST(Numbers, GroupsThousands) {
+    constexpr float infinity = std::numeric_limits<float>::infinity();
+    EXPECT_EQ(Grouped({1234567.0F, -1234.0F, 1234.5F, 12345.5F, -123.0F, 999.999F, -0.001F}, 2),
+              "1,234,567.00 -1,234.00 1234.50 12,345.50 -123.00 1000.00 -0.00 ");
+    EXPECT_EQ(Grouped({0.125F, 0.375F}, 2), "0.12 0.38 "); // halves go to the even digit
+    EXPECT_EQ(Grouped({infinity, -infinity, std::nanf(""), -std::nanf("")}, 2), "inf -inf nan nan ");
+    EXPECT_EQ(Grouped({-123456792.0F}, 0), "-123,456,792 ");
+    // Beyond thirteen digits the first group takes the rest, and more than 31 characters get an exponent.
+    EXPECT_EQ(Grouped({1e13F}, 1), "9999,999,827,968.0 ");
+    EXPECT_EQ(Grouped({1e27F, 1e29F, -std::numeric_limits<float>::max()}, 2),
+              "999999988484154753,734,934,528.00 1.00e+29 -3.40e+38 ");
+    EXPECT_EQ(Grouped({1.0F}, 1000), "1.00000000000000000000e+00 ");
 }
 
 TEST(Numbers, FixedTextIsCutAtTheBuffer) {
@@ -70,49 +62,29 @@ TEST(Numbers, ReadsTheNumberAtTheStart) {
 }
 
 TEST(Dates, KnowsTheCalendar) {
-    const struct {
-        int year, month, day, missing;
-    } cases[] = {{1900, 2, 29, 1}, {2000, 2, 29, 0}, {2004, 2, 29, 0},  {2001, 2, 29, 1},
-                 {2001, 4, 31, 1}, {2001, 4, 30, 0}, {2001, 12, 31, 0}, {2001, 12, 32, 1},
-                 {2001, 13, 1, 1}, {2001, 0, 1, 1},  {2001, 1, 0, 1}};
-    for (const auto& c : cases)
-        EXPECT_EQ(CheckDate(c.year, c.month, c.day), c.missing) << c.year << "-" << c.month << "-" << c.day;
+    const std::tuple<int, int, int, int> cases[] = {{1900, 2, 29, 1},  {2000, 2, 29, 0},  {2004, 2, 29, 0},
+                                                    {2001, 2, 29, 1},  {2001, 4, 31, 1},  {2001, 4, 30, 0},
+                                                    {2001, 12, 31, 0}, {2001, 12, 32, 1}, {2001, 13, 1, 1},
+                                                    {2001, 0, 1, 1},   {2001, 1, 0, 1}};
+    for (const auto& [year, month, day, missing] : cases)
+        EXPECT_EQ(CheckDate(year, month, day), missing) << year << "-" << month << "-" << day;
 }
 
 TEST(Dates, WritesDateTexts) {
-    const struct {
-        const char* date;
-        int style;
-        const char* text;
-    } cases[] = {{"20240305", 0, "Mar 05, 2024"},
-                 {"20240305", 1, "03-05-2024"},
-                 {"20240305", 2, "March 05, 2024"},
-                 {"19991231", 1, "12-31-1999"},
-                 {"", 0, ""},
-                 {"20241305", 0, "13 05, 2024"},
-                 {"20240005", 2, "00 05, 2024"},
-                 {"abc", 1, "00-00-0"},
-                 {"-999-9-9", 1, "-9--9--999"}};
-    for (const auto& c : cases) {
-        char text[FormatDateSize] = "old";
-        EXPECT_EQ(FormatDate(c.date, text, c.style), 0);
-        EXPECT_STREQ(text, c.text);
-    }
     char text[FormatDateSize] = "20240905";
-    EXPECT_EQ(FormatDate(text, text, 5), 0);
-    EXPECT_STREQ(text, "20240905");
-    FormatDate(text, text, 2);
-    EXPECT_STREQ(text, "September 05, 2024");
-}
-
-// A time zone fixed distance away turns the running clock into any time of day.
-void MoveClockTo(int hour) {
-    const std::time_t now = std::time(nullptr);
-    std::tm utc{};
-    gmtime_r(&now, &utc);
-    const int west = ((utc.tm_hour - hour) % 24 + 24) % 24;
-    setenv("TZ", ("TST" + std::to_string(west)).c_str(), 1);
-    tzset();
+    const auto written = [&](const char* date, int style) {
+        EXPECT_EQ(FormatDate(date, text, style), 0);
+        return std::string(text);
+    };
+    EXPECT_EQ(written(text, 5), "20240905");
+    EXPECT_EQ(written(text, 2), "September 05, 2024");
+    EXPECT_EQ(written("20240305", 0), "Mar 05, 2024");
+    EXPECT_EQ(written("19991231", 1), "12-31-1999");
+    EXPECT_EQ(written("", 0), "");
+    EXPECT_EQ(written("20241305", 0), "13 05, 2024");
+    EXPECT_EQ(written("20240005", 2), "00 05, 2024");
+    EXPECT_EQ(written("abc", 1), "00-00-0");
+    EXPECT_EQ(written("-999-9-9", 1), "-9--9--999");
 }
 
 TEST(Dates, TellsTheTimeOnATwelveHourClock) {
@@ -122,12 +94,12 @@ TEST(Dates, TellsTheTimeOnATwelveHourClock) {
         std::time_t before = 0;
         do { // again should the clock strike in between
             before = std::time(nullptr);
-            MoveClockTo(clock);
+            // A time zone that far west turns the running clock into any time of day.
+            setenv("TZ", ("TST" + std::to_string((before / 3600 - clock) % 24)).c_str(), 1);
+            tzset();
             GetTime(&hour, &minute, &second);
         } while (std::time(nullptr) != before);
-        EXPECT_EQ(hour, shown);
-        EXPECT_EQ(minute, before / 60 % 60);
-        EXPECT_EQ(second, before % 60);
+        EXPECT_EQ(std::tuple(hour, minute, second), std::tuple(shown, before / 60 % 60, before % 60));
     }
     int year = 0;
     GetDate(&year, nullptr, nullptr);
