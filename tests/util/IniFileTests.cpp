@@ -80,15 +80,15 @@ TEST_F(IniFileTest, WritesInPlace) {
         // the first occurrence of the key in its section, everything else untouched
         {"; top\n[G]\n;K=c\n\nK = 1\nK=1  \nK=2\n[D]\nK=3\n",
          "; top\n[G]\n;K=c\n\nK = 1\nK=v\nK=2\n[D]\nK=3\n"},
-        // a new key goes before the next header, behind the blanks and comments that end its section
+        // a new key goes before the next header, behind the blanks and comments that end its section, or to
+        // the
+        // end of the file, which may lack its line feed
         {"[G]\nA=1\n\n; end\n[D]\n", "[G]\nA=1\n\n; end\nK=v\n[D]\n"},
-        // or to the end of the file, which may lack its line feed
         {"[G]\nA=1\n", "[G]\nA=1\nK=v\n"},
         {"[G]\nA=1", "[G]\nA=1\nK=v\n"},
         {"[G]\nK=1", "[G]\nK=v\n"},
-        // a new section goes to the end
+        // a new section goes to the end; of one that comes twice the first occurrence takes the key
         {"[D]\nA=1", "[D]\nA=1\n[G]\nK=v\n"},
-        // a section that comes twice: its first occurrence takes the key
         {"[G]\n[D]\n[G]\nK=1\n", "[G]\nK=v\n[D]\n[G]\nK=1\n"},
         {"[G]\n[G]x\nK=1\n", "[G]\n[G]x\nK=v\n"},
         {std::string("[G]\nA=\0x\r\n", 10), std::string("[G]\nA=\0x\r\nK=v\n", 14)}};
@@ -150,15 +150,13 @@ TEST_F(IniFileTest, KeepsPermissionsAndLinksAndLeaksNothing) {
     folder_.Write("elsewhere/real.ini", "[G]\nK=1\n");
     std::filesystem::create_symlink("elsewhere/real.ini", folder_.File(Name));
     std::filesystem::permissions(folder_.File(Name), std::filesystem::perms{0640});
-    const auto nextFile = [] {
-        const int file = dup(0);
-        close(file);
-        return file;
+    const auto openFiles = [] {
+        return std::distance(std::filesystem::directory_iterator("/proc/self/fd"), {});
     };
-    const int before = nextFile();
+    const auto before = openFiles();
     EXPECT_EQ(Settings().WriteString("G", "K", "v"), 0);
     EXPECT_EQ(Value("G", "K"), "v");
-    EXPECT_EQ(nextFile(), before);
+    EXPECT_EQ(openFiles(), before);
     EXPECT_EQ(folder_.Read("elsewhere/real.ini"), "[G]\nK=v\n");
     EXPECT_TRUE(std::filesystem::is_symlink(folder_.File(Name)));
     EXPECT_EQ(std::filesystem::status(folder_.File(Name)).permissions(), std::filesystem::perms{0640});
