@@ -119,6 +119,8 @@ TEST_F(IniFileTest, AMissingFileGivesDefaultsAndIsNotCreated) {
     const INI_FILEx tooLong((folder_.Path() + std::string(128, '/') + Name).c_str());
     EXPECT_EQ(tooLong.ReadInt("G", "K", 7), 7);
     EXPECT_EQ(tooLong.WriteString("G", "K", "v"), 1);
+    folder_.Write(Name, "[G]\nK=1\n" + std::string(4 << 20, ';')); // no settings file is as long
+    EXPECT_EQ(Value("G", "K"), "default");
     std::filesystem::remove(folder_.File(Name));
     ASSERT_EQ(mkfifo(folder_.File(Name).c_str(), 0600), 0);
     EXPECT_EQ(Value("G", "K"), "default"); // and does not wait for a writer
