@@ -10,7 +10,6 @@
 #include <tuple>
 #include <vector>
 
-#include <fcntl.h>
 #include <sys/resource.h>
 
 #include "InChild.h"
@@ -20,6 +19,7 @@
 namespace {
 
 using Outcome = FolderLock::Outcome;
+using std::filesystem::perms;
 
 const std::string Name = FolderLock::FileName;
 
@@ -36,10 +36,6 @@ std::string LockText(const std::string& host, long process) {
 class FolderLockTest : public testing::Test {
   protected:
     Outcome Take() { return lock_.Take(folder_.Path(), "quorvan"); }
-    void Permit(const std::string& path, unsigned mode) const {
-        std::filesystem::permissions(path, std::filesystem::perms{mode});
-    }
-
     Shell folder_;
     FolderLock lock_;
 };
@@ -47,15 +43,13 @@ class FolderLockTest : public testing::Test {
 TEST_F(FolderLockTest, IsHeldByOneAndNamesItUntilReleased) {
     ASSERT_EQ(Take(), Outcome::Taken);
     const std::string text = folder_.Read(Name);
-    EXPECT_EQ(std::filesystem::status(folder_.File(Name)).permissions(), std::filesystem::perms{0600});
+    EXPECT_EQ(std::filesystem::status(folder_.File(Name)).permissions(), perms{0600});
     FolderLock second;
     EXPECT_EQ(second.Take(folder_.Path(), "quorvan-cli", FolderLock::Doubt::PassOver), Outcome::Held);
     EXPECT_FALSE(second.IsTaken());
-    const std::string since = second.Holder().since;
-    EXPECT_EQ(since.size(), 19U);
-    EXPECT_EQ(DescribeHolder(second.Holder()), "quorvan (process " + std::to_string(getpid()) +
-                                                   " on the computer " + OwnHost() + ", since " + since +
-                                                   ")");
+    const FolderHolder& holder = second.Holder();
+    EXPECT_EQ(std::tuple(holder.program, holder.process, holder.host, holder.since.size()),
+              std::tuple("quorvan", getpid(), OwnHost(), 19U));
     second.Release();
     EXPECT_EQ(folder_.Read(Name), text);
     lock_.Release();
@@ -89,8 +83,7 @@ TEST_F(FolderLockTest, DoubtsWhatTheSystemsLockDoesNotTell) {
         {none, "", Outcome::Taken},
         {none, alive, Outcome::Doubtful},
         {none, LockText(OwnHost(), ended.Id()), Outcome::Taken},
-        {none, LockText("elsewhere", ended.Id()), Outcome::Doubtful},
-    };
+        {none, LockText("elsewhere", ended.Id()), Outcome::Doubtful}};
     for (const auto& [call, text, outcome] : cases) {
         SCOPED_TRACE(text.substr(0, 100));
         folder_.Write(Name, text);
@@ -108,6 +101,8 @@ TEST_F(FolderLockTest, DoubtsWhatTheSystemsLockDoesNotTell) {
 
 TEST_F(FolderLockTest, DescribesItsHolderInOneLine) {
     EXPECT_EQ(DescribeHolder({}), "another program");
+    EXPECT_EQ(DescribeHolder({"quorvan", 4711, "desk", "2026-11-22 14:03:07"}),
+              "quorvan (process 4711 on the computer desk, since 2026-11-22 14:03:07)");
     folder_.Write(Name, "program: " + std::string(500, 'x') + "\nhost: a\rb\nprocess: 5\n");
     ASSERT_EQ(Take(), Outcome::Doubtful);
     EXPECT_EQ(DescribeHolder(lock_.Holder()), std::string(100, 'x') + " (process 5 on the computer a?b)");
@@ -132,18 +127,18 @@ TEST_F(FolderLockTest, InAFolderThatMayOnlyBeReadIsSeenAllTheSame) {
         const bool held = lock.Take(folder_.Path(), "quorvan") == Outcome::Held;
         return held && lock.Holder().process == getppid() ? 200 : lock.Error();
     };
-    Permit(folder_.Path(), 0555);
+    std::filesystem::permissions(folder_.Path(), perms{0555});
     EXPECT_EQ(ResultAsOrdinaryUser(take), EACCES);
     EXPECT_EQ(ResultAsOrdinaryUser([&] { return TryWritingIn(folder_.Path()); }), EACCES);
-    Permit(folder_.Path(), 0755);
+    std::filesystem::permissions(folder_.Path(), perms{0755});
     EXPECT_EQ(TryWritingIn(folder_.Path()), 0);
     ASSERT_EQ(Take(), Outcome::Taken);
-    Permit(folder_.File(Name), 0444);
+    std::filesystem::permissions(folder_.File(Name), perms{0444});
     EXPECT_EQ(ResultAsOrdinaryUser(take), 200);
     EXPECT_EQ(folder_.Names(), std::vector{Name});
     lock_.Release();
     folder_.Write(Name, LockText(OwnHost(), getpid()));
-    Permit(folder_.File(Name), 0444);
+    std::filesystem::permissions(folder_.File(Name), perms{0444});
     EXPECT_EQ(ResultAsOrdinaryUser(take), EACCES) << "nobody holds it";
 }
 
@@ -154,19 +149,16 @@ TEST_F(FolderLockTest, LetsOneOfManyInAtATime) {
     const auto work = [&] {
         for (int done = 0; done < 300;) {
             FolderLock lock;
-            if (lock.Take(folder_.Path(), "quorvan") != Outcome::Taken)
-                continue;
-            const int file = open(inside.c_str(), O_CREAT | O_EXCL | O_WRONLY | O_CLOEXEC, 0600);
-            met += file < 0 ? 1 : 0;
-            close(file);
-            unlink(inside.c_str());
-            ++done;
+            if (lock.Take(folder_.Path(), "quorvan") == Outcome::Taken) {
+                std::error_code error;
+                std::filesystem::create_symlink("nowhere", inside, error);
+                met += error ? 1 : 0;
+                std::filesystem::remove(inside, error);
+                ++done;
+            }
         }
     };
-    std::vector<std::jthread> others;
-    for (int i = 0; i < 4; ++i)
-        others.emplace_back(work);
-    others.clear();
+    { const std::jthread first(work), second(work), third(work), fourth(work); }
     EXPECT_EQ(met, 0);
     EXPECT_FALSE(folder_.Has(Name));
 }
