@@ -1,16 +1,16 @@
-// A list in a window of its own, with rows whose columns can be told apart by colour and text.
+// A list for a window, with rows whose columns can be told apart by colour and text.
 #pragma once
 
 #include <functional>
 #include <memory>
+#include <sstream>
 #include <string>
 #include <vector>
 
 #include "ColumnListView/BetterScrollView.h"
 #include "ColumnListView/CLVColumnLabelView.h"
 #include "ColumnListView/ColumnListView.h"
-#include "platform/Application.h"
-#include "platform/Window.h"
+#include "platform/Stage.h"
 
 inline constexpr rgb_color kColumnColors[] = {{255, 0, 0, 255}, {0, 160, 0, 255}, {200, 200, 0, 255}};
 inline constexpr rgb_color kStripColor{0, 160, 160, 255};
@@ -18,34 +18,32 @@ inline constexpr rgb_color kStripColor{0, 160, 160, 255};
 using Order = std::vector<int32>;
 using Mode = CLVSortMode;
 
-// A row that fills each column with the column's colour, or with grey when selected, and notes what it hears.
+// A row with a letter for each column, which fills it with the column's colour and notes what it hears.
 class TextRow : public CLVListItem {
   public:
-    explicit TextRow(std::vector<std::string> t, uint32 level = 0, bool superitem = false,
-                     bool expanded = true)
-        : CLVListItem(level, superitem, expanded, 20), texts(std::move(t)) {}
+    explicit TextRow(const char* t, uint32 level = 0, bool superitem = false, bool expanded = true)
+        : CLVListItem(level, superitem, expanded, 20), texts(t) {}
 
     void DrawItemColumn(BView* owner, BRect rect, int32 column, bool) override {
-        drawn.push_back({column, rect});
+        drawn.push_back(column);
         owner->SetHighColor(column < 0 ? kStripColor : kColumnColors[column]);
         owner->FillRect(rect);
     }
     void ColumnWidthChanged(int32 column, float width, ColumnListView*) override {
-        widths.emplace_back(column, width);
+        heard << column << " has " << width << ". ";
     }
     void FrameChanged(int32 column, BRect frame, ColumnListView*) override {
-        frames.emplace_back(column, frame);
+        heard << column << " is at " << frame.left << ". ";
     }
 
-    std::vector<std::string> texts;
-    std::vector<std::pair<int32, BRect>> drawn;
-    std::vector<std::pair<int32, float>> widths;
-    std::vector<std::pair<int32, BRect>> frames;
+    std::string texts;
+    Order drawn;
+    std::ostringstream heard;
 };
 
 inline int CompareTexts(const CLVListItem* a, const CLVListItem* b, int32 column) {
     const auto index = static_cast<std::size_t>(column);
-    return static_cast<const TextRow*>(a)->texts[index].compare(static_cast<const TextRow*>(b)->texts[index]);
+    return static_cast<const TextRow*>(a)->texts[index] - static_cast<const TextRow*>(b)->texts[index];
 }
 
 // Counts what a program would hear by overriding the list's notices.
@@ -61,30 +59,31 @@ class NoticedList : public ColumnListView {
     int orders = 0;
 };
 
-// The application, and a list that is in no window until ListWindow adds it to one.
-struct ListFixture {
-    explicit ListFixture(bool hierarchical = false, BRect frame = {0, 0, 285, 185}) {
-        list = new NoticedList(frame, &container, "rows", B_FOLLOW_ALL_SIDES,
+// A list beside the stage until ListWindow puts it there.
+struct ListFixture : Stage {
+    explicit ListFixture(bool hierarchical = false) {
+        list = new NoticedList({0, 0, 285, 185}, &container, "rows", B_FOLLOW_ALL_SIDES,
                                B_WILL_DRAW | B_FRAME_EVENTS | B_NAVIGABLE, B_MULTIPLE_SELECTION_LIST,
                                hierarchical, true, true, true, B_NO_BORDER, nullptr);
         list->SetSortFunction(CompareTexts);
         owned.reset(container);
     }
 
-    TextRow* NewRow(std::vector<std::string> texts, uint32 level = 0, bool superitem = false,
-                    bool expanded = true) {
-        rows.push_back(std::make_unique<TextRow>(std::move(texts), level, superitem, expanded));
-        return rows.back().get();
+    TextRow* NewRow(const char* texts, uint32 level = 0, bool superitem = false, bool expanded = true) {
+        return rows.emplace_back(std::make_unique<TextRow>(texts, level, superitem, expanded)).get();
     }
-
+    CLVColumn* NewColumn(const char* label, float width, uint32 flags = 0) const {
+        auto* column = new CLVColumn(label, width, flags, 20);
+        EXPECT_TRUE(list->AddColumn(column));
+        return column;
+    }
     // A status column that stays first, and two sortable ones: 0..20, 21..81, 82..142.
-    void AddPlainColumns() {
-        list->AddColumn(new CLVColumn(nullptr, 20,
-                                      CLVF_FIXED_POSITION | CLVF_FIXED_WIDTH | CLVF_KEEP_FIRST |
-                                          CLVF_JOIN_HEADER | CLVF_PASS_INDENT,
-                                      20));
-        list->AddColumn(new CLVColumn("Name", 60, CLVF_SORTABLE, 20));
-        list->AddColumn(new CLVColumn("Type", 60, CLVF_SORTABLE, 20));
+    void AddPlainColumns() const {
+        NewColumn(nullptr, 20,
+                  CLVF_FIXED_POSITION | CLVF_FIXED_WIDTH | CLVF_KEEP_FIRST | CLVF_JOIN_HEADER |
+                      CLVF_PASS_INDENT);
+        NewColumn("Name", 60, CLVF_SORTABLE);
+        NewColumn("Type", 60, CLVF_SORTABLE);
     }
 
     // The given column's texts of the rows in sight, one after the other.
@@ -102,8 +101,17 @@ struct ListFixture {
         });
         return all;
     }
+    // The columns that the list is sorted by, each with its direction.
+    [[nodiscard]] std::string Keys() const {
+        int32 columns[3] = {};
+        Mode modes[3] = {};
+        list->Sorting(columns, modes);
+        std::string keys;
+        for (int32 i = 0; i < list->Sorting(nullptr, nullptr); i++)
+            keys += std::to_string(columns[i]) + (modes[i] == Mode::Ascending ? "+" : "-");
+        return keys;
+    }
 
-    BApplication application{"application/x-vnd.Test-ColumnList"};
     std::vector<std::unique_ptr<TextRow>> rows;
     BetterScrollView* container = nullptr;
     NoticedList* list = nullptr;

@@ -1,18 +1,13 @@
 #include <gtest/gtest.h>
 
-#include <algorithm>
-#include <cmath>
-#include <cstring>
 #include <limits>
 #include <memory>
+#include <sstream>
 #include <string>
 
 #include "ColumnListView/CLVColumn.h"
-#include "ColumnListView/CLVListItem.h"
-#include "ColumnListView/ColumnGeometry.h"
 #include "ColumnListView/DragGroups.h"
 #include "ColumnListView/LabelText.h"
-#include "ColumnListView/OutlineRows.h"
 #include "ColumnListView/ToUpperStr.h"
 
 namespace {
@@ -39,9 +34,7 @@ TEST(Columns, LimitWidthsAndFlags) {
     column.SetWidth(7);
     EXPECT_EQ(column.Width(), 20);
     EXPECT_STREQ(column.GetLabel(), "Name");
-    EXPECT_EQ(column.SortMode(), CLVSortMode::None);
     EXPECT_FALSE(column.HeaderRect().IsValid());
-    EXPECT_EQ(CLVColumn(nullptr, 20).GetLabel(), nullptr);
 
     const CLVColumn expander("gone", 90, 0xFFF, 70);
     EXPECT_EQ(expander.GetLabel(), nullptr);
@@ -53,16 +46,11 @@ TEST(Columns, LimitWidthsAndFlags) {
 TEST(Geometry, PlacesShownColumnsAndPushesBehindTheExpander) {
     const ColumnLayout layout = LayOutColumns(
         {{20, CLVF_EXPANDER}, {30, CLVF_PASS_INDENT}, {99, CLVF_HIDDEN}, {40, 0}, {50, CLVF_PASS_INDENT}});
-    const struct {
-        std::size_t index;
-        float begin, end;
-        bool pushed;
-    } cases[] = {{0, 0, 20, false}, {1, 21, 51, true}, {3, 52, 92, true}, {4, 93, 143, false}};
-    for (const auto& c : cases) {
-        EXPECT_EQ(layout.places[c.index].begin, c.begin);
-        EXPECT_EQ(layout.places[c.index].end, c.end);
-        EXPECT_EQ(layout.places[c.index].pushed, c.pushed) << c.index;
-    }
+    std::ostringstream places;
+    for (const std::size_t i : {0, 1, 3, 4})
+        places << layout.places[i].begin << (layout.places[i].pushed ? " pushed to " : " to ")
+               << layout.places[i].end << ", ";
+    EXPECT_EQ(places.str(), "0 to 20, 21 pushed to 51, 52 pushed to 92, 93 to 143, ");
     EXPECT_EQ(layout.end, 143);
     EXPECT_EQ(layout.pushEnd, 92);
     EXPECT_EQ(LayOutColumns({{20, CLVF_EXPANDER | CLVF_HIDDEN}, {30, 0}}).pushEnd, -1);
@@ -79,89 +67,86 @@ TEST(Geometry, IndentsFramesUpToTheLastPushedEnd) {
 }
 
 TEST(Geometry, FindsWhatAPressTakesHoldOf) {
-    // 0..20 fixed width, 21..61, 62..66 (the least width), hidden, 67..97
-    const std::vector<ColumnShape> shapes{
-        {20, CLVF_FIXED_WIDTH}, {40, 0}, {4, 0}, {80, CLVF_HIDDEN}, {30, 0}};
-    const ColumnLayout layout = LayOutColumns(shapes);
     const struct {
-        float x;
-        What what;
-        int32 position;
-    } cases[] = {{-1, What::Nothing, -1},  {0, What::Header, 0},   {20, What::Header, 0},
-                 {21, What::Header, 1},    {58, What::Header, 1},  {59, What::Border, 1},
-                 {61.5F, What::Border, 1}, {62, What::Border, 1},  {64, What::Border, 1},
-                 {65, What::Border, 2},    {68, What::Border, 2},  {69, What::Border, 2},
-                 {70, What::Header, 4},    {94, What::Header, 4},  {95, What::Border, 4},
-                 {97, What::Border, 4},    {98, What::Nothing, -1}};
-    for (const auto& c : cases)
-        EXPECT_EQ(HitHeader(shapes, layout, c.x), (HeaderHit{c.what, c.position})) << c.x;
+        std::vector<ColumnShape> shapes;
+        std::vector<std::pair<float, HeaderHit>> hits; // each where it begins or ends
+    } cases[] = {// 0..20 fixed width, 21..61, 62..66 (the least width), hidden, 67..97
+                 {{{20, CLVF_FIXED_WIDTH}, {40, 0}, {4, 0}, {80, CLVF_HIDDEN}, {30, 0}},
+                  {{-1, {}},
+                   {0, {What::Header, 0}},
+                   {20, {What::Header, 0}},
+                   {21, {What::Header, 1}},
+                   {58, {What::Header, 1}},
+                   {59, {What::Border, 1}},
+                   {61.5F, {What::Border, 1}},
+                   {64, {What::Border, 1}},
+                   {65, {What::Border, 2}},
+                   {69, {What::Border, 2}},
+                   {70, {What::Header, 4}},
+                   {94, {What::Header, 4}},
+                   {95, {What::Border, 4}},
+                   {97, {What::Border, 4}},
+                   {98, {}}}},
+                 {{{20, 0}, {40, CLVF_FIXED_WIDTH}},
+                  {{2, {What::Header, 0}},
+                   {18, {What::Border, 0}},
+                   {23, {What::Border, 0}},
+                   {24, {What::Header, 1}},
+                   {61, {What::Header, 1}}}}};
+    for (const auto& [shapes, hits] : cases)
+        for (const auto& [x, hit] : hits)
+            EXPECT_EQ(HitHeader(shapes, LayOutColumns(shapes), x), hit) << x;
 }
 
-struct Groups {
-    explicit Groups(const std::vector<ColumnShape>& s) : shapes(s), layout(LayOutColumns(s)) {
-        groups = BuildDragGroups(shapes, layout);
-    }
-    std::vector<ColumnShape> shapes;
-    ColumnLayout layout;
-    std::vector<DragGroup> groups;
-};
+std::vector<DragGroup> Groups(const std::vector<ColumnShape>& shapes) {
+    return BuildDragGroups(shapes, LayOutColumns(shapes));
+}
 
 TEST(Dragging, JoinsColumnsThatMoveTogether) {
-    const Groups made({{20, CLVF_KEEP_FIRST | CLVF_MOVE_WITH_NEXT},
-                       {30, CLVF_KEEP_FIRST | CLVF_FIXED_POSITION},
-                       {10, CLVF_HIDDEN | CLVF_MOVE_WITH_NEXT},
-                       {40, CLVF_KEEP_LAST | CLVF_SORTABLE},
-                       {50, CLVF_HIDDEN}});
-    ASSERT_EQ(made.groups.size(), 3U);
-    EXPECT_TRUE(made.groups[0].allKeepFirst && made.groups[0].isShown);
-    EXPECT_EQ(made.groups[0].flags, CLVF_KEEP_FIRST | CLVF_FIXED_POSITION);
-    EXPECT_EQ(made.groups[0].end, 51);
-    EXPECT_EQ(made.groups[1].begin, 52);
-    EXPECT_EQ(made.groups[1].lastShown, 3);
-    EXPECT_FALSE(made.groups[1].allKeepLast);
-    EXPECT_EQ(made.groups[1].flags, CLVF_KEEP_LAST);
-    EXPECT_FALSE(made.groups[2].isShown);
-    EXPECT_EQ(GroupAt(made.groups, 3), 1);
-    EXPECT_EQ(GroupAt(made.groups, 5), -1);
-    EXPECT_EQ(MoveGroup(made.groups, 0, 1), (std::vector<int32>{2, 3, 0, 1, 4}));
-    EXPECT_EQ(MoveGroup(made.groups, 2, 0), (std::vector<int32>{4, 0, 1, 2, 3}));
+    const std::vector<DragGroup> groups = Groups({{20, CLVF_KEEP_FIRST | CLVF_MOVE_WITH_NEXT},
+                                                  {30, CLVF_KEEP_FIRST | CLVF_FIXED_POSITION},
+                                                  {10, CLVF_HIDDEN | CLVF_MOVE_WITH_NEXT},
+                                                  {40, CLVF_KEEP_LAST | CLVF_SORTABLE},
+                                                  {50, CLVF_HIDDEN}});
+    ASSERT_EQ(groups.size(), 3U);
+    EXPECT_TRUE(groups[0].allKeepFirst && groups[0].isShown);
+    EXPECT_EQ(groups[0].flags, CLVF_KEEP_FIRST | CLVF_FIXED_POSITION);
+    EXPECT_EQ(groups[0].end, 51);
+    EXPECT_EQ(groups[1].begin, 52);
+    EXPECT_EQ(groups[1].lastShown, 3);
+    EXPECT_EQ(groups[1].flags, CLVF_KEEP_LAST);
+    EXPECT_FALSE(groups[1].allKeepLast || groups[2].isShown);
+    EXPECT_EQ(GroupAt(groups, 3), 1);
+    EXPECT_EQ(GroupAt(groups, 5), -1);
+    EXPECT_EQ(MoveGroup(groups, 0, 1), (std::vector<int32>{2, 3, 0, 1, 4}));
+    EXPECT_EQ(MoveGroup(groups, 2, 0), (std::vector<int32>{4, 0, 1, 2, 3}));
 }
 
 TEST(Dragging, SwapsWhereThePointerHasPassedAndTheFlagsAllow) {
     constexpr uint32 first = CLVF_KEEP_FIRST;
     constexpr uint32 last = CLVF_KEEP_LAST;
+    constexpr uint32 hidden = CLVF_HIDDEN;
     // Three columns 0..100, 101..121 and 122..172; the middle one is dragged.
-    const struct {
-        float x;
-        uint32 flags[3];
-        int32 target;
-    } cases[] = {{111, {0, 0, 0}, -1},
-                 {20, {0, 0, 0}, -1},
-                 {19, {0, 0, 0}, 0},
-                 {-50, {0, 0, 0}, 0},
-                 {152, {0, 0, 0}, -1},
-                 {153, {0, 0, 0}, 2},
-                 {900, {0, 0, 0}, 2},
-                 {5, {first, 0, 0}, -1},
-                 {5, {first, first, 0}, 0},
-                 {5, {0, last, last}, -1},
-                 {5, {last, last, last}, 0},
-                 {160, {0, 0, last}, -1},
-                 {160, {0, last, last}, 2},
-                 {160, {first, first, 0}, -1},
-                 {160, {first, first, first}, 2},
-                 {130, {0, 0, CLVF_HIDDEN}, -1},
-                 {5, {CLVF_HIDDEN, 0, 0}, -1}};
-    for (const auto& c : cases) {
-        const Groups made({{100, c.flags[0]}, {20, c.flags[1]}, {50, c.flags[2]}});
-        EXPECT_EQ(GroupToSwapWith(made.groups, 1, c.x), c.target) << c.x << " " << c.flags[0] << c.flags[1];
-    }
+    const std::vector<std::pair<std::vector<uint32>, std::vector<std::pair<float, int32>>>> cases{
+        {{0, 0, 0}, {{-50, 0}, {19, 0}, {20, -1}, {111, -1}, {152, -1}, {153, 2}, {900, 2}}},
+        {{first, 0, 0}, {{5, -1}}},
+        {{first, first, 0}, {{5, 0}, {160, -1}}},
+        {{first, first, first}, {{160, 2}}},
+        {{0, 0, last}, {{160, -1}}},
+        {{0, last, last}, {{5, -1}, {160, 2}}},
+        {{last, last, last}, {{5, 0}}},
+        {{0, 0, hidden}, {{130, -1}}},
+        {{hidden, 0, 0}, {{5, -1}}}};
+    for (const auto& [flags, swaps] : cases)
+        for (const auto& [x, target] : swaps)
+            EXPECT_EQ(GroupToSwapWith(Groups({{100, flags[0]}, {20, flags[1]}, {50, flags[2]}}), 1, x),
+                      target)
+                << x << " " << flags[0] << flags[1] << flags[2];
     // A wide group passes a narrow neighbour only when the pointer is over it, and does not swing back.
-    const Groups wide({{10, 0}, {5, CLVF_HIDDEN}, {100, 0}});
-    EXPECT_EQ(GroupToSwapWith(wide.groups, 2, 11), -1);
-    EXPECT_EQ(GroupToSwapWith(wide.groups, 2, 10), 0);
-    const Groups after({{100, 0}, {10, 0}});
-    EXPECT_EQ(GroupToSwapWith(after.groups, 0, 10), -1);
+    const std::vector<DragGroup> wide = Groups({{10, 0}, {5, CLVF_HIDDEN}, {100, 0}});
+    EXPECT_EQ(GroupToSwapWith(wide, 2, 11), -1);
+    EXPECT_EQ(GroupToSwapWith(wide, 2, 10), 0);
+    EXPECT_EQ(GroupToSwapWith(Groups({{100, 0}, {10, 0}}), 0, 10), -1);
 }
 
 TEST(Dragging, KeepsSidesAndHoldsTheOutline) {
@@ -196,52 +181,6 @@ TEST(Labels, UpperCaseKnowsAsciiOnly) {
         const std::unique_ptr<char[]> copy(ToUpperStr(text));
         EXPECT_STREQ(copy.get(), upper);
     }
-}
-
-class OutlineRow : public CLVListItem {
-  public:
-    OutlineRow(uint32 level, bool expanded, int k) : CLVListItem(level, false, expanded, 10), key(k) {}
-    void DrawItemColumn(BView*, BRect, int32, bool) override {}
-    int key;
-};
-
-// Rows from lines such as "1-7": level, expanded (+) or not (-), sort key.
-struct Outline {
-    explicit Outline(std::initializer_list<const char*> lines) {
-        for (const char* line : lines) {
-            owned.push_back(std::make_unique<OutlineRow>(line[0] - '0', line[1] == '+', line[2] - '0'));
-            rows.push_back(owned.back().get());
-        }
-    }
-    std::vector<std::unique_ptr<OutlineRow>> owned;
-    OutlineSequence rows;
-};
-
-TEST(OutlineOrder, KnowsWhoStandsUnderWhomAndWhoIsInSight) {
-    const Outline outline({"0+1", "1-2", "2+3", "3+4", "1+5", "0-6", "2+7", "1+8"});
-    const int32 above[] = {-1, 0, 1, 2, 0, -1, 5, 5};
-    const int32 ends[] = {5, 4, 4, 4, 5, 8, 7, 8};
-    for (int32 i = 0; i < 8; i++) {
-        EXPECT_EQ(SuperitemIndex(outline.rows, i), above[i]) << i;
-        EXPECT_EQ(DescendantsEnd(outline.rows, i), ends[i]) << i;
-    }
-    EXPECT_EQ(DescendantsEnd(outline.rows, 3, 5), 5);
-    const std::vector<bool> all{true, true, false, false, true, true, false, false};
-    EXPECT_EQ(RowsInSight(outline.rows, 0, 8), all);
-    for (int32 i = 0; i < 8; i++)
-        EXPECT_EQ(RowsInSight(outline.rows, i, 8), std::vector<bool>(all.begin() + i, all.end())) << i;
-}
-
-TEST(OutlineOrder, SortsEveryLevelUnderItsSuperitem) {
-    const Outline outline({"0+5", "1+3", "2+9", "2+8", "1+1", "0+2", "1+7", "0+2", "1+4"});
-    const OutlineSequence sorted =
-        SortedOutline(outline.rows, [](const CLVListItem* a, const CLVListItem* b) {
-            return static_cast<const OutlineRow*>(a)->key - static_cast<const OutlineRow*>(b)->key;
-        });
-    std::string keys;
-    for (const CLVListItem* row : sorted)
-        keys += std::to_string(static_cast<const OutlineRow*>(row)->key);
-    EXPECT_EQ(keys, "272451389");
 }
 
 } // namespace
