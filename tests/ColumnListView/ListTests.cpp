@@ -87,31 +87,28 @@ TEST_F(List, SortsByItsKeys) {
     AddPlainColumns();
     for (const char* texts : {"-b1", "-a2", "-c1", "-a1", "-b2"})
         EXPECT_TRUE(list->AddItem(NewRow(texts)));
+    const Order columns{1, 0, 1, 9, 2};
     const Mode modes[] = {Mode::Ascending, Mode::Ascending, Mode::None, Mode::Ascending, Mode::Descending};
     const struct {
         std::function<void()> change;
-        const char *names, *types, *keys;
+        const char* shown;
         int sortings;
-    } steps[] = {{[&] { list->SetSortKey(0); }, "bacab", "12112", "", 0}, // not sortable
-                 {[&] { list->SetSortKey(7); }, "bacab", "12112", "", 0},
-                 {[&] { list->SetSortKey(2); }, "bcaab", "11122", "2+", 1},
-                 {[&] { list->AddSortKey(1); }, "abcab", "11122", "2+1+", 2},
-                 {[&] { list->AddSortKey(1); }, "abcab", "11122", "2+1+", 2},
-                 {[&] { list->SetSortMode(1, Mode::Descending); }, "cbaba", "11122", "2+1-", 3},
-                 {[&] { list->SetSortMode(1, Mode::Descending); }, "cbaba", "11122", "2+1-", 3},
-                 {[&] { list->ReverseSortMode(1); }, "cbaba", "11122", "2+", 4}, // none: no key any more
-                 {[&] { list->SetSortMode(1, Mode::Descending); }, "cbaba", "11122", "2+", 5}, // nor one now
-                 {[&] { list->SetSortKey(1); }, "cbbaa", "11212", "1-", 6}, // keeps its mode
-                 {[&] {
-                      list->SetSorting(5, Order{1, 0, 1, 9, 2}.data(), modes);
-                  },
-                  "aabbc", "21211", "1+2-", 7},
-                 {[&] { list->SetSortKey(-1); }, "aabbc", "21211", "", 8}};
-    for (const auto& step : steps) {
-        step.change();
-        EXPECT_EQ(Shown(1) + Shown(2), std::string(step.names) + step.types) << &step - steps;
-        EXPECT_EQ(Keys(), step.keys) << &step - steps;
-        EXPECT_EQ(list->sortings, step.sortings) << &step - steps;
+    } steps[] = {{[&] { list->SetSortKey(0); }, "bacab 12112 ", 0}, // not sortable
+                 {[&] { list->SetSortKey(7); }, "bacab 12112 ", 0},
+                 {[&] { list->SetSortKey(2); }, "bcaab 11122 2+", 1},
+                 {[&] { list->AddSortKey(1); }, "abcab 11122 2+1+", 2},
+                 {[&] { list->AddSortKey(1); }, "abcab 11122 2+1+", 2},
+                 {[&] { list->SetSortMode(1, Mode::Descending); }, "cbaba 11122 2+1-", 3},
+                 {[&] { list->SetSortMode(1, Mode::Descending); }, "cbaba 11122 2+1-", 3},
+                 {[&] { list->ReverseSortMode(1); }, "cbaba 11122 2+", 4}, // none: no key any more
+                 {[&] { list->SetSortMode(1, Mode::Descending); }, "cbaba 11122 2+", 5}, // nor one now
+                 {[&] { list->SetSortKey(1); }, "cbbaa 11212 1-", 6},                    // keeps its mode
+                 {[&] { list->SetSorting(5, columns.data(), modes); }, "aabbc 21211 1+2-", 7},
+                 {[&] { list->SetSortKey(-1); }, "aabbc 21211 ", 8}};
+    for (const auto& [change, shown, sortings] : steps) {
+        change();
+        EXPECT_EQ(Shown(1) + " " + Shown(2) + " " + Keys(), shown);
+        EXPECT_EQ(list->sortings, sortings) << shown;
     }
     EXPECT_EQ(list->PrimarySortKey(), -1);
 }
@@ -182,23 +179,21 @@ TEST_F(Outline, ShowsWhatIsExpanded) {
     TextRow* g = NewRow("g", 1, true, false);
     const struct {
         std::function<void()> change;
-        const char *all, *inSight;
-    } steps[] = {{[] {}, "acdebf", "acdeb"},
-                 {[&] { list->Collapse(c); }, "acdebf", "aceb"},
-                 {[&] { list->Expand(c); }, "acdebf", "acdeb"},
-                 {[&] { list->Collapse(a); }, "acdebf", "ab"},
-                 {[&] { EXPECT_FALSE(list->IsExpanded(0)); }, "acdebf", "ab"},
-                 {[&] { list->Collapse(c); }, "acdebf", "ab"},
-                 {[&] { list->Expand(b); }, "acdebf", "abf"},
-                 {[&] { list->Expand(a); }, "acdebf", "acebf"},
+        const char* all;
+    } steps[] = {{[&] { list->Collapse(c); }, "acdebf aceb"},
+                 {[&] { list->Expand(c); }, "acdebf acdeb"},
+                 {[&] { list->Collapse(a); }, "acdebf ab"},
+                 {[&] { EXPECT_FALSE(list->IsExpanded(0)); }, "acdebf ab"},
+                 {[&] { list->Collapse(c); }, "acdebf ab"},
+                 {[&] { list->Expand(b); }, "acdebf abf"},
+                 {[&] { list->Expand(a); }, "acdebf acebf"},
                  // A row put between takes over the rows behind it, as their levels say.
-                 {[&] { EXPECT_TRUE(list->AddItem(g, 2)); }, "acgdebf", "acgebf"},
-                 {[&] { list->Expand(g); }, "acgdebf", "acgdebf"},
-                 {[&] { EXPECT_TRUE(list->RemoveItem(a)); }, "bf", "bf"}}; // with the rows below it
-    for (const auto& step : steps) {
-        step.change();
-        EXPECT_EQ(FullList(), step.all) << &step - steps;
-        EXPECT_EQ(Shown(0), step.inSight) << &step - steps;
+                 {[&] { EXPECT_TRUE(list->AddItem(g, 2)); }, "acgdebf acgebf"},
+                 {[&] { list->Expand(g); }, "acgdebf acgdebf"},
+                 {[&] { EXPECT_TRUE(list->RemoveItem(a)); }, "bf bf"}}; // with the rows below it
+    for (const auto& [change, all] : steps) {
+        change();
+        EXPECT_EQ(FullList() + " " + Shown(0), all);
     }
     EXPECT_EQ(list->FullListIndexOf(d), -1);
     EXPECT_EQ(list->FullListIndexOf(b), 0);

@@ -1,18 +1,17 @@
 #include <gtest/gtest.h>
 
+#include <cmath>
 #include <limits>
 #include <memory>
-#include <sstream>
 #include <string>
 
 #include "ColumnListView/CLVColumn.h"
 #include "ColumnListView/DragGroups.h"
 #include "ColumnListView/LabelText.h"
+#include "ColumnListView/Runs.h"
 #include "ColumnListView/ToUpperStr.h"
 
 namespace {
-
-using What = HeaderHit::What;
 
 TEST(Columns, LimitWidthsAndFlags) {
     const float nothing = std::numeric_limits<float>::quiet_NaN();
@@ -46,11 +45,11 @@ TEST(Columns, LimitWidthsAndFlags) {
 TEST(Geometry, PlacesShownColumnsAndPushesBehindTheExpander) {
     const ColumnLayout layout = LayOutColumns(
         {{20, CLVF_EXPANDER}, {30, CLVF_PASS_INDENT}, {99, CLVF_HIDDEN}, {40, 0}, {50, CLVF_PASS_INDENT}});
-    std::ostringstream places;
-    for (const std::size_t i : {0, 1, 3, 4})
-        places << layout.places[i].begin << (layout.places[i].pushed ? " pushed to " : " to ")
-               << layout.places[i].end << ", ";
-    EXPECT_EQ(places.str(), "0 to 20, 21 pushed to 51, 52 pushed to 92, 93 to 143, ");
+    std::string places;
+    for (const auto& [begin, end, pushed] : layout.places)
+        places += std::to_string(std::lround(begin)) + (pushed ? " pushed to " : " to ") +
+                  std::to_string(std::lround(end)) + ", ";
+    EXPECT_EQ(places, "0 to 20, 21 pushed to 51, 52 to 52, 52 pushed to 92, 93 to 143, ");
     EXPECT_EQ(layout.end, 143);
     EXPECT_EQ(layout.pushEnd, 92);
     EXPECT_EQ(LayOutColumns({{20, CLVF_EXPANDER | CLVF_HIDDEN}, {30, 0}}).pushEnd, -1);
@@ -67,35 +66,16 @@ TEST(Geometry, IndentsFramesUpToTheLastPushedEnd) {
 }
 
 TEST(Geometry, FindsWhatAPressTakesHoldOf) {
-    const struct {
-        std::vector<ColumnShape> shapes;
-        std::vector<std::pair<float, HeaderHit>> hits; // each where it begins or ends
-    } cases[] = {// 0..20 fixed width, 21..61, 62..66 (the least width), hidden, 67..97
-                 {{{20, CLVF_FIXED_WIDTH}, {40, 0}, {4, 0}, {80, CLVF_HIDDEN}, {30, 0}},
-                  {{-1, {}},
-                   {0, {What::Header, 0}},
-                   {20, {What::Header, 0}},
-                   {21, {What::Header, 1}},
-                   {58, {What::Header, 1}},
-                   {59, {What::Border, 1}},
-                   {61.5F, {What::Border, 1}},
-                   {64, {What::Border, 1}},
-                   {65, {What::Border, 2}},
-                   {69, {What::Border, 2}},
-                   {70, {What::Header, 4}},
-                   {94, {What::Header, 4}},
-                   {95, {What::Border, 4}},
-                   {97, {What::Border, 4}},
-                   {98, {}}}},
-                 {{{20, 0}, {40, CLVF_FIXED_WIDTH}},
-                  {{2, {What::Header, 0}},
-                   {18, {What::Border, 0}},
-                   {23, {What::Border, 0}},
-                   {24, {What::Header, 1}},
-                   {61, {What::Header, 1}}}}};
-    for (const auto& [shapes, hits] : cases)
-        for (const auto& [x, hit] : hits)
-            EXPECT_EQ(HitHeader(shapes, LayOutColumns(shapes), x), hit) << x;
+    const auto hits = [](const std::vector<ColumnShape>& shapes) {
+        return Runs(-1, 100, 0.5F, [&](float x) {
+            const auto [what, position] = HitHeader(shapes, LayOutColumns(shapes), x);
+            return std::string{" |H"[static_cast<int>(what)]} + std::to_string(position);
+        });
+    };
+    // 0..20 fixed width, 21..61, 62..66 (the least width), hidden, 67..97
+    EXPECT_EQ(hits({{20, CLVF_FIXED_WIDTH}, {40, 0}, {4, 0}, {80, CLVF_HIDDEN}, {30, 0}}),
+              "-1 -1 0H0 21H1 59|1 64.5|2 69.5H4 95|4 98 -1 ");
+    EXPECT_EQ(hits({{20, 0}, {40, CLVF_FIXED_WIDTH}}), "-1 -1 0H0 18|0 23.5H1 62 -1 ");
 }
 
 std::vector<DragGroup> Groups(const std::vector<ColumnShape>& shapes) {
@@ -125,23 +105,26 @@ TEST(Dragging, JoinsColumnsThatMoveTogether) {
 TEST(Dragging, SwapsWhereThePointerHasPassedAndTheFlagsAllow) {
     constexpr uint32 first = CLVF_KEEP_FIRST;
     constexpr uint32 last = CLVF_KEEP_LAST;
-    constexpr uint32 hidden = CLVF_HIDDEN;
     // Three columns 0..100, 101..121 and 122..172; the middle one is dragged.
-    const std::vector<std::pair<std::vector<uint32>, std::vector<std::pair<float, int32>>>> cases{
-        {{0, 0, 0}, {{-50, 0}, {19, 0}, {20, -1}, {111, -1}, {152, -1}, {153, 2}, {900, 2}}},
-        {{first, 0, 0}, {{5, -1}}},
-        {{first, first, 0}, {{5, 0}, {160, -1}}},
-        {{first, first, first}, {{160, 2}}},
-        {{0, 0, last}, {{160, -1}}},
-        {{0, last, last}, {{5, -1}, {160, 2}}},
-        {{last, last, last}, {{5, 0}}},
-        {{0, 0, hidden}, {{130, -1}}},
-        {{hidden, 0, 0}, {{5, -1}}}};
-    for (const auto& [flags, swaps] : cases)
-        for (const auto& [x, target] : swaps)
-            EXPECT_EQ(GroupToSwapWith(Groups({{100, flags[0]}, {20, flags[1]}, {50, flags[2]}}), 1, x),
-                      target)
-                << x << " " << flags[0] << flags[1] << flags[2];
+    const struct {
+        uint32 flags[3];
+        const char* targets;
+    } cases[] = {{{0, 0, 0}, "-50>0 20>-1 153>2 "},
+                 {{first, 0, 0}, "-50>-1 153>2 "},
+                 {{first, first, 0}, "-50>0 20>-1 "},
+                 {{first, first, first}, "-50>0 20>-1 153>2 "},
+                 {{0, 0, last}, "-50>0 20>-1 "},
+                 {{0, last, last}, "-50>-1 153>2 "},
+                 {{last, last, last}, "-50>0 20>-1 153>2 "},
+                 {{0, 0, CLVF_HIDDEN}, "-50>0 20>-1 "},
+                 {{CLVF_HIDDEN, 0, 0}, "-50>-1 52>2 "}};
+    for (const auto& [flags, targets] : cases) {
+        const auto groups = Groups({{100, flags[0]}, {20, flags[1]}, {50, flags[2]}});
+        EXPECT_EQ(
+            Runs(-50, 900, 1, [&](float x) { return ">" + std::to_string(GroupToSwapWith(groups, 1, x)); }),
+            targets)
+            << flags[0] << flags[1] << flags[2];
+    }
     // A wide group passes a narrow neighbour only when the pointer is over it, and does not swing back.
     const std::vector<DragGroup> wide = Groups({{10, 0}, {5, CLVF_HIDDEN}, {100, 0}});
     EXPECT_EQ(GroupToSwapWith(wide, 2, 11), -1);

@@ -1,6 +1,7 @@
 #include <algorithm>
 #include <filesystem>
 #include <fstream>
+#include <map>
 #include <thread>
 #include <unistd.h>
 
@@ -9,25 +10,28 @@
 #include <QScrollBar>
 
 #include "ColumnListView/ListFixture.h"
+#include "ColumnListView/Runs.h"
 #include "StepDriver.h"
 
 namespace {
 
-constexpr QRgb kLight = 0xFFFFFFFF;
-constexpr QRgb kShadow = 0xFF989898;
-constexpr QRgb kNeutral = 0xFFD8D8D8;
-constexpr QRgb kBlue = 0xFF0000E5;
-constexpr QRgb kBlack = 0xFF000000;
-
-// What the rows show of a column; of none behind the last one.
-QRgb Filled(int column) {
-    const rgb_color color = column < 0 ? kStripColor : kColumnColors[column];
-    return qRgb(color.red, color.green, color.blue);
-}
-
-void ExpectPixels(const QImage& picture, std::initializer_list<std::pair<QPoint, QRgb>> pixels) {
-    for (const auto& [place, color] : pixels)
-        EXPECT_EQ(picture.pixel(place), color) << place.x() << ", " << place.y();
+// The colours along a line of a picture: of the header Light, Shadow, Neutral, Blue and blacK, of the rows a,
+// b and c in the columns and - behind them.
+std::string Colors(const QImage& picture, int y) {
+    const auto rgb = [](rgb_color color) { return qRgb(color.red, color.green, color.blue); };
+    const std::map<QRgb, std::string> names{{0xFFFFFFFF, "L"},
+                                            {0xFF989898, "S"},
+                                            {0xFFD8D8D8, "N"},
+                                            {0xFF0000E5, "B"},
+                                            {0xFF000000, "K"},
+                                            {rgb(kStripColor), "-"},
+                                            {rgb(kColumnColors[0]), "a"},
+                                            {rgb(kColumnColors[1]), "b"},
+                                            {rgb(kColumnColors[2]), "c"}};
+    return Runs(0, static_cast<float>(picture.width()), 1, [&](float x) {
+        const auto name = names.find(picture.pixel(static_cast<int>(x), y));
+        return name == names.end() ? "?" : name->second;
+    });
 }
 
 // How many threads this process has, save those that the toolkit makes for itself.
@@ -101,22 +105,11 @@ struct ListWindow : ListFixture {
     void Click(int x, Qt::KeyboardModifiers keys = {}) { Drag(x, x, keys); }
 
     [[nodiscard]] QImage HeaderPicture() const { return header->grab().toImage(); }
-    [[nodiscard]] QImage RowsPicture() const { return view->grab(view->viewport()->geometry()).toImage(); }
-    // In a line that no label reaches.
-    [[nodiscard]] QRgb HeaderAt(int x) const { return HeaderPicture().pixel(x, 5); }
-    [[nodiscard]] QRgb RowsAt(int x) const { return RowsPicture().pixel(x, 5); }
-    // How many pixels of the header have something of this colour.
-    template <class Condition>
-    [[nodiscard]] int Count(QRect area, Condition condition) const {
-        const QImage picture = HeaderPicture();
-        int count = 0;
-        for (int y = area.top(); y <= area.bottom(); y++)
-            for (int x = area.left(); x <= area.right(); x++)
-                count += condition(picture.pixel(x, y));
-        return count;
-    }
-    [[nodiscard]] bool ShowsOutline() const {
-        return Count(header->rect(), [](QRgb color) { return color == kBlue; }) > 0;
+    // In a line above all labels.
+    [[nodiscard]] std::string HeaderColors() const { return Colors(HeaderPicture(), 2); }
+    [[nodiscard]] bool ShowsOutline() const { return HeaderColors().find('B') != std::string::npos; }
+    [[nodiscard]] std::string RowColors(int y = 25) const {
+        return Colors(view->grab(view->viewport()->geometry()).toImage(), y);
     }
 
     int threads = 0; // without watchers
@@ -145,14 +138,14 @@ TEST_F(Header, ResizesByDraggedBorders) {
     Press(83); // 1 right of the border: still the column left of it
     Move(103);
     ASSERT_TRUE(AwaitWidth(80));
-    EXPECT_EQ(HeaderAt(101), kBlue);
-    ExpectPixels(RowsPicture(), {{{101, 5}, Filled(1)}, {{102, 5}, Filled(2)}});
+    EXPECT_EQ(HeaderColors(), "0L 1N 101B 102L 103N 162S 163L 164N ");
+    EXPECT_EQ(RowColors(), "0a 21b 102c 163- ");
     Move(-40);
     ASSERT_TRUE(AwaitWidth(20));
     Release(93); // back and up before the next look
     ASSERT_TRUE(Settle());
     EXPECT_EQ(Width(1), 70);
-    EXPECT_EQ(HeaderAt(91), kShadow);
+    EXPECT_EQ(HeaderColors(), "0L 1N 91S 92L 93N 152S 153L 154N ");
     Drag(19, 60); // the status column's own border
     EXPECT_EQ(Width(0), 20);
     EXPECT_EQ(list->PrimarySortKey(), -1);
@@ -163,13 +156,13 @@ TEST_F(Header, ReordersByDraggedCells) {
     Move(30);
     ASSERT_TRUE(QTest::qWaitFor([&] { return list->DisplayOrder() == Order{0, 2, 1}; }));
     Move(-200); // nothing may pass the column that keeps first, and the outline stops at the end
-    ASSERT_TRUE(QTest::qWaitFor([&] { return HeaderAt(0) == kBlue; }));
-    EXPECT_EQ(HeaderAt(60), kBlue);
+    const char* held = "0B 1N 60B 61N 81S 82L 83N 142S 143L 144N ";
+    ASSERT_TRUE(QTest::qWaitFor([&] { return HeaderColors() == held; })) << HeaderColors();
     Release(-200);
     ASSERT_TRUE(Settle());
     EXPECT_EQ(list->DisplayOrder(), (Order{0, 2, 1}));
     EXPECT_EQ(list->orders, 1);
-    EXPECT_EQ(RowsAt(30), Filled(2));
+    EXPECT_EQ(RowColors(), "0a 21c 82b 143- ");
     EXPECT_FALSE(ShowsOutline());
     Drag(10, 130); // fixed position
     EXPECT_EQ(list->DisplayOrder(), (Order{0, 2, 1}));
@@ -181,20 +174,14 @@ TEST_F(Header, ReordersByDraggedCells) {
 TEST_F(Header, SortsByClicks) {
     const struct {
         int x;
-        Qt::KeyboardModifiers with;
-        const char *shown, *keys;
-    } clicks[] = {{50, {}, "abc", "1+"},
-                  {50, {}, "cba", "1-"},
-                  {50, {}, "cba", ""},
-                  {50, {}, "abc", "1+"},
-                  {110, {}, "cab", "2+"},
-                  {52, Qt::ShiftModifier, "cab", "2+1+"},
-                  {48, Qt::ShiftModifier, "cba", "2+1-"},
-                  {10, {}, "cba", "2+1-"}, // not sortable
-                  {200, {}, "cba", "2+1-"}};
-    for (const auto& click : clicks) {
-        Click(click.x, click.with);
-        EXPECT_EQ(Shown() + Keys(), std::string(click.shown) + click.keys) << &click - clicks;
+        bool shift;
+        const char* shown;
+    } clicks[] = {{50, false, "abc 1+"},  {50, false, "cba 1-"},   {50, false, "cba "},
+                  {50, false, "abc 1+"},  {110, false, "cab 2+"},  {52, true, "cab 2+1+"},
+                  {48, true, "cba 2+1-"}, {10, false, "cba 2+1-"}, {200, false, "cba 2+1-"}};
+    for (const auto& [x, shift, shown] : clicks) {
+        Click(x, shift ? Qt::ShiftModifier : Qt::NoModifier);
+        EXPECT_EQ(Shown() + " " + Keys(), shown) << x;
     }
     EXPECT_EQ(header->accessibleDescription(), "Columns: Name (sorted descending), Type (sorted ascending)");
 }
@@ -203,7 +190,8 @@ TEST_F(Header, IsWorkedByKeys) {
     list->MakeFocus();
     StepDriver::Key(Qt::Key_Tab);
     ASSERT_EQ(QApplication::focusWidget(), header);
-    EXPECT_EQ(HeaderAt(23), kBlue); // the status column has nothing to be worked
+    EXPECT_EQ(HeaderColors(),
+              "0L 1N 23B 80N 81S 82L 83N 142S 143L 144N "); // the status column has nothing to be worked
     EXPECT_EQ(header->accessibleDescription(), "Name. Columns: Name, Type");
     StepDriver::Key(Qt::Key_Right);
     StepDriver::Key(Qt::Key_Right); // there is no further one
@@ -266,25 +254,28 @@ TEST_F(Header, DrawsRaisedCells) {
     font_height height;
     be_plain_font->GetHeight(&height);
     const int line = 1 + static_cast<int>(std::round(height.ascent)) + 2;
-    ExpectPixels(HeaderPicture(), {{{82, 5}, kLight},
-                                   {{100, 0}, kLight},
-                                   {{81, 5}, kShadow},
-                                   {{100, bottom}, kShadow},
-                                   {{20, 5}, kNeutral},
-                                   {{21, 5}, kNeutral},    // joined
-                                   {{200, 5}, kNeutral}}); // beside all columns
-    const QRect label(22, 1, 59, bottom - 1);
-    const int neutral = Count(label, [](QRgb color) { return color == kNeutral; });
-    EXPECT_TRUE(neutral > 400 && neutral < label.width() * label.height()) << neutral;
+    const QImage picture = HeaderPicture();
+    EXPECT_EQ(HeaderColors(), "0L 1N 81S 82L 83N 142S 143L 144N "); // the first two are joined
+    EXPECT_EQ(Colors(picture, 0), "0L 81S 82L 142S 143L ");
+    EXPECT_EQ(Colors(picture, bottom), "0S ");
+    const auto count = [&](auto condition) {
+        const QImage label =
+            HeaderPicture().copy(22, 1, 59, bottom - 1).convertToFormat(QImage::Format_RGB32);
+        const auto* pixels = reinterpret_cast<const QRgb*>(label.constBits());
+        return std::count_if(pixels, pixels + label.width() * label.height(), condition);
+    };
+    const auto neutral = count([](QRgb color) { return color == 0xFFD8D8D8; });
+    EXPECT_TRUE(neutral > 400 && neutral < 59 * (bottom - 1)) << neutral;
 
     Press(50);
     // Letters are smooth, so that few of their pixels have the pen's own colour.
     const auto bluish = [](QRgb color) { return qBlue(color) > qRed(color) + 60; };
-    ASSERT_TRUE(QTest::qWaitFor([&] { return Count(label, bluish) > 5; }));
+    ASSERT_TRUE(QTest::qWaitFor([&] { return count(bluish) > 5; }));
     Release(50);
     ASSERT_TRUE(Settle());
     // Underlined from 1 before the label.
-    ExpectPixels(HeaderPicture(), {{{28, line}, kBlack}, {{27, line}, kNeutral}, {{89, line}, kNeutral}});
+    const std::string colors = Colors(HeaderPicture(), line);
+    EXPECT_EQ(colors.substr(0, colors.rfind('K')), "0L 1N 28");
 }
 
 TEST_F(Header, ForgetsThePressWhenItsWindowGoes) {
@@ -306,15 +297,7 @@ TEST_F(Header, ForgetsThePressWhenItsWindowGoes) {
 }
 
 TEST_F(Rows, DrawTheColumnsThatShow) {
-    const QImage picture = RowsPicture();
-    ExpectPixels(picture, {{{0, 30}, Filled(0)},
-                           {{20, 30}, Filled(0)},
-                           {{21, 30}, Filled(1)},
-                           {{81, 30}, Filled(1)},
-                           {{82, 30}, Filled(2)},
-                           {{142, 30}, Filled(2)},
-                           {{143, 30}, Filled(-1)},
-                           {{picture.width() - 1, 30}, Filled(-1)}});
+    EXPECT_EQ(RowColors(30), "0a 21b 82c 143- ");
 
     // Only what overlaps the part in sight is drawn; rows out of sight are not drawn at all.
     Locked([&] {
@@ -333,11 +316,9 @@ TEST_F(Rows, ScrollSidewaysWithTheHeader) {
     QScrollBar* bar = view->horizontalScrollBar();
     ASSERT_TRUE(QTest::qWaitFor([&] { return bar->maximum() > 100; }));
     bar->setValue(bar->maximum());
-    const int border = 421 - bar->value(); // the last pixel of "Name"
-    ExpectPixels(HeaderPicture(), {{{border, 5}, kShadow}, {{border + 1, 5}, kLight}});
-    ExpectPixels(RowsPicture(), {{{border, 5}, Filled(1)}, {{border + 1, 5}, Filled(2)}});
-    EXPECT_EQ(border + 61, RowsPicture().width() - 1); // "Type" is whole, and nothing behind it
-    Drag(border, border - 20);
+    EXPECT_EQ(HeaderColors(), "0N 238S 239L 240N 299S ");
+    EXPECT_EQ(RowColors(), "0b 239c "); // "Type" is whole, and nothing behind it
+    Drag(238, 218);
     EXPECT_EQ(Width(1), 380);
     EXPECT_EQ(list->Header()->Bounds().left, list->Bounds().left);
 }
@@ -351,9 +332,9 @@ TEST(OutlineArrows, OpenAndCloseTheRowsBelow) {
     for (TextRow* row : {top, middle, w.NewRow("e", 2), w.NewRow("n", 1)})
         w.list->AddItem(row);
     w.ShowList();
-    // Pointing down, and right.
-    ExpectPixels(w.RowsPicture(),
-                 {{{12, 9}, kBlack}, {{9, 8}, kBlack}, {{31, 26}, kBlack}, {{36, 26}, Filled(0)}});
+    // Pointing down in the row that has the keyboard's frame, and right.
+    EXPECT_EQ(w.RowColors(8), "0L 1a 9K 17a 21b 82- 299L ");
+    EXPECT_EQ(w.RowColors(26), "0L 20a 31K 32a 41b 82- ");
     EXPECT_EQ(top->ExpanderArrowRect(), BRect(8, 5, 17, 14));
     EXPECT_EQ(middle->ExpanderArrowRect(), BRect(28, 25, 37, 34));
     EXPECT_EQ(middle->ExpanderColumnRect(), BRect(20, 20, 40, 39));
@@ -364,7 +345,7 @@ TEST(OutlineArrows, OpenAndCloseTheRowsBelow) {
     } clicks[] = {{{32, 30}, "tmen", -1}, {{60, 30}, "tmen", 1}, {{12, 9}, "t", -1}, {{12, 9}, "tmen", -1}};
     for (const auto& [place, shown, selected] : clicks) {
         QTest::mouseClick(w.view->viewport(), Qt::LeftButton, {}, place);
-        static_cast<void>(w.RowsPicture()); // draws what the click has brought
+        static_cast<void>(w.RowColors()); // draws what the click has brought
         EXPECT_EQ(w.Shown(0), shown) << place.x();
         EXPECT_EQ(w.list->CurrentSelection(), selected) << place.x();
     }
