@@ -41,11 +41,6 @@ class TextRow : public CLVListItem {
     std::ostringstream heard;
 };
 
-inline int CompareTexts(const CLVListItem* a, const CLVListItem* b, int32 column) {
-    const auto index = static_cast<std::size_t>(column);
-    return static_cast<const TextRow*>(a)->texts[index] - static_cast<const TextRow*>(b)->texts[index];
-}
-
 // Counts what a program would hear by overriding the list's notices.
 class NoticedList : public ColumnListView {
   public:
@@ -65,7 +60,10 @@ struct ListFixture : Stage {
         list = new NoticedList({0, 0, 285, 185}, &container, "rows", B_FOLLOW_ALL_SIDES,
                                B_WILL_DRAW | B_FRAME_EVENTS | B_NAVIGABLE, B_MULTIPLE_SELECTION_LIST,
                                hierarchical, true, true, true, B_NO_BORDER, nullptr);
-        list->SetSortFunction(CompareTexts);
+        list->SetSortFunction([](const CLVListItem* a, const CLVListItem* b, int32 column) {
+            return static_cast<const TextRow*>(a)->texts[static_cast<std::size_t>(column)] -
+                   static_cast<const TextRow*>(b)->texts[static_cast<std::size_t>(column)];
+        });
         owned.reset(container);
     }
 
@@ -95,10 +93,8 @@ struct ListFixture : Stage {
     }
     [[nodiscard]] std::string FullList() const {
         std::string all;
-        list->FullListDoForEach([&](CLVListItem* row) {
-            all += static_cast<TextRow*>(row)->texts[0];
-            return false;
-        });
+        list->FullListDoForEach(
+            [&](auto* row) { return all += static_cast<TextRow*>(row)->texts[0], false; });
         return all;
     }
     // The columns that the list is sorted by, each with its direction.

@@ -1,7 +1,6 @@
 #include <algorithm>
 #include <filesystem>
 #include <fstream>
-#include <map>
 #include <thread>
 #include <unistd.h>
 
@@ -18,19 +17,11 @@ namespace {
 // The colours along a line of a picture: of the header Light, Shadow, Neutral, Blue and blacK, of the rows a,
 // b and c in the columns and - behind them.
 std::string Colors(const QImage& picture, int y) {
-    const auto rgb = [](rgb_color color) { return qRgb(color.red, color.green, color.blue); };
-    const std::map<QRgb, std::string> names{{0xFFFFFFFF, "L"},
-                                            {0xFF989898, "S"},
-                                            {0xFFD8D8D8, "N"},
-                                            {0xFF0000E5, "B"},
-                                            {0xFF000000, "K"},
-                                            {rgb(kStripColor), "-"},
-                                            {rgb(kColumnColors[0]), "a"},
-                                            {rgb(kColumnColors[1]), "b"},
-                                            {rgb(kColumnColors[2]), "c"}};
+    constexpr QRgb known[] = {0xFFFFFFFF, 0xFF989898, 0xFFD8D8D8, 0xFF0000E5, 0xFF000000,
+                              0xFFFF0000, 0xFF00A000, 0xFFC8C800, 0xFF00A0A0};
     return Runs(0, static_cast<float>(picture.width()), 1, [&](float x) {
-        const auto name = names.find(picture.pixel(static_cast<int>(x), y));
-        return name == names.end() ? "?" : name->second;
+        const auto* at = std::find(std::begin(known), std::end(known), picture.pixel(static_cast<int>(x), y));
+        return std::string{"LSNBKabc-?"[at - known]};
     });
 }
 
@@ -127,21 +118,16 @@ class Header : public testing::Test, protected ListWindow {
         ShowList();
     }
     [[nodiscard]] float Width(int32 column) const { return list->ColumnAt(column)->Width(); }
-    [[nodiscard]] bool AwaitWidth(float width) const {
-        return QTest::qWaitFor([&] { return Width(1) == width; });
-    }
 };
-
-class Rows : public Header {};
 
 TEST_F(Header, ResizesByDraggedBorders) {
     Press(83); // 1 right of the border: still the column left of it
     Move(103);
-    ASSERT_TRUE(AwaitWidth(80));
+    ASSERT_TRUE(QTest::qWaitFor([&] { return Width(1) == 80; }));
     EXPECT_EQ(HeaderColors(), "0L 1N 101B 102L 103N 162S 163L 164N ");
     EXPECT_EQ(RowColors(), "0a 21b 102c 163- ");
     Move(-40);
-    ASSERT_TRUE(AwaitWidth(20));
+    ASSERT_TRUE(QTest::qWaitFor([&] { return Width(1) == 20; }));
     Release(93); // back and up before the next look
     ASSERT_TRUE(Settle());
     EXPECT_EQ(Width(1), 70);
@@ -157,7 +143,7 @@ TEST_F(Header, ReordersByDraggedCells) {
     ASSERT_TRUE(QTest::qWaitFor([&] { return list->DisplayOrder() == Order{0, 2, 1}; }));
     Move(-200); // nothing may pass the column that keeps first, and the outline stops at the end
     const char* held = "0B 1N 60B 61N 81S 82L 83N 142S 143L 144N ";
-    ASSERT_TRUE(QTest::qWaitFor([&] { return HeaderColors() == held; })) << HeaderColors();
+    ASSERT_TRUE(QTest::qWaitFor([&] { return HeaderColors() == held; }));
     Release(-200);
     ASSERT_TRUE(Settle());
     EXPECT_EQ(list->DisplayOrder(), (Order{0, 2, 1}));
@@ -190,12 +176,11 @@ TEST_F(Header, IsWorkedByKeys) {
     list->MakeFocus();
     StepDriver::Key(Qt::Key_Tab);
     ASSERT_EQ(QApplication::focusWidget(), header);
-    EXPECT_EQ(HeaderColors(),
-              "0L 1N 23B 80N 81S 82L 83N 142S 143L 144N "); // the status column has nothing to be worked
+    // The status column has nothing to be worked.
+    EXPECT_EQ(HeaderColors(), "0L 1N 23B 80N 81S 82L 83N 142S 143L 144N ");
     EXPECT_EQ(header->accessibleDescription(), "Name. Columns: Name, Type");
-    StepDriver::Key(Qt::Key_Right);
-    StepDriver::Key(Qt::Key_Right); // there is no further one
-    StepDriver::Key(Qt::Key_Space);
+    for (const Qt::Key key : {Qt::Key_Right, Qt::Key_Right, Qt::Key_Space}) // there is no further one
+        StepDriver::Key(key);
     EXPECT_EQ(Shown() + Keys(), "cba2+");
     StepDriver::Key(Qt::Key_Home);
     StepDriver::Key(Qt::Key_Return, Qt::ShiftModifier); // a second key
@@ -296,7 +281,7 @@ TEST_F(Header, ForgetsThePressWhenItsWindowGoes) {
     EXPECT_TRUE(QTest::qWaitFor([&] { return CountThreads() == threads; }));
 }
 
-TEST_F(Rows, DrawTheColumnsThatShow) {
+TEST_F(Header, IsOverRowsThatDrawWhatShows) {
     EXPECT_EQ(RowColors(30), "0a 21b 82c 143- ");
 
     // Only what overlaps the part in sight is drawn; rows out of sight are not drawn at all.
@@ -311,7 +296,7 @@ TEST_F(Rows, DrawTheColumnsThatShow) {
     EXPECT_TRUE(rows.back()->drawn.empty());
 }
 
-TEST_F(Rows, ScrollSidewaysWithTheHeader) {
+TEST_F(Header, ScrollsSidewaysWithTheRows) {
     Locked([&] { list->ColumnAt(1)->SetWidth(400); });
     QScrollBar* bar = view->horizontalScrollBar();
     ASSERT_TRUE(QTest::qWaitFor([&] { return bar->maximum() > 100; }));
@@ -327,15 +312,13 @@ TEST(OutlineArrows, OpenAndCloseTheRowsBelow) {
     ListWindow w(true);
     w.NewColumn(nullptr, 20, CLVF_EXPANDER);
     w.NewColumn("Name", 60);
-    TextRow* top = w.NewRow("t", 0, true);
     TextRow* middle = w.NewRow("m", 1, true, false);
-    for (TextRow* row : {top, middle, w.NewRow("e", 2), w.NewRow("n", 1)})
+    for (TextRow* row : {w.NewRow("t", 0, true), middle, w.NewRow("e", 2), w.NewRow("n", 1)})
         w.list->AddItem(row);
     w.ShowList();
     // Pointing down in the row that has the keyboard's frame, and right.
     EXPECT_EQ(w.RowColors(8), "0L 1a 9K 17a 21b 82- 299L ");
     EXPECT_EQ(w.RowColors(26), "0L 20a 31K 32a 41b 82- ");
-    EXPECT_EQ(top->ExpanderArrowRect(), BRect(8, 5, 17, 14));
     EXPECT_EQ(middle->ExpanderArrowRect(), BRect(28, 25, 37, 34));
     EXPECT_EQ(middle->ExpanderColumnRect(), BRect(20, 20, 40, 39));
     const struct {
@@ -352,7 +335,7 @@ TEST(OutlineArrows, OpenAndCloseTheRowsBelow) {
 }
 
 #ifndef NDEBUG
-TEST_F(Rows, WantTheLockForEveryChange) {
+TEST_F(Header, WantsTheLockForEveryChange) {
     EXPECT_DEATH(list->SetSortKey(1), "The looper must be locked.");
     EXPECT_DEATH(list->ColumnAt(1)->SetWidth(90), "The looper must be locked.");
     EXPECT_DEATH(list->RemoveItem(0), "The looper must be locked.");
