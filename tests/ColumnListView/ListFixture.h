@@ -93,8 +93,10 @@ struct ListFixture : Stage {
     }
     [[nodiscard]] std::string FullList() const {
         std::string all;
-        list->FullListDoForEach(
-            [&](auto* row) { return all += static_cast<TextRow*>(row)->texts[0], false; });
+        list->FullListDoForEach([&](CLVListItem* row) {
+            all += static_cast<TextRow*>(row)->texts[0];
+            return false;
+        });
         return all;
     }
     // The columns that the list is sorted by, each with its direction.

@@ -105,10 +105,14 @@ TEST(Dragging, JoinsColumnsThatMoveTogether) {
 TEST(Dragging, SwapsWhereThePointerHasPassedAndTheFlagsAllow) {
     constexpr uint32 first = CLVF_KEEP_FIRST;
     constexpr uint32 last = CLVF_KEEP_LAST;
+    const auto targets = [](const std::vector<DragGroup>& groups, int32 dragged) {
+        return Runs(-50, 900, 1,
+                    [&](float x) { return ">" + std::to_string(GroupToSwapWith(groups, dragged, x)); });
+    };
     // Three columns 0..100, 101..121 and 122..172; the middle one is dragged.
     const struct {
         uint32 flags[3];
-        const char* targets;
+        const char* expected;
     } cases[] = {{{0, 0, 0}, "-50>0 20>-1 153>2 "},
                  {{first, 0, 0}, "-50>-1 153>2 "},
                  {{first, first, 0}, "-50>0 20>-1 "},
@@ -118,18 +122,12 @@ TEST(Dragging, SwapsWhereThePointerHasPassedAndTheFlagsAllow) {
                  {{last, last, last}, "-50>0 20>-1 153>2 "},
                  {{0, 0, CLVF_HIDDEN}, "-50>0 20>-1 "},
                  {{CLVF_HIDDEN, 0, 0}, "-50>-1 52>2 "}};
-    for (const auto& [flags, targets] : cases) {
-        const auto groups = Groups({{100, flags[0]}, {20, flags[1]}, {50, flags[2]}});
-        EXPECT_EQ(
-            Runs(-50, 900, 1, [&](float x) { return ">" + std::to_string(GroupToSwapWith(groups, 1, x)); }),
-            targets)
+    for (const auto& [flags, expected] : cases)
+        EXPECT_EQ(targets(Groups({{100, flags[0]}, {20, flags[1]}, {50, flags[2]}}), 1), expected)
             << flags[0] << flags[1] << flags[2];
-    }
     // A wide group passes a narrow neighbour only when the pointer is over it, and does not swing back.
-    const std::vector<DragGroup> wide = Groups({{10, 0}, {5, CLVF_HIDDEN}, {100, 0}});
-    EXPECT_EQ(GroupToSwapWith(wide, 2, 11), -1);
-    EXPECT_EQ(GroupToSwapWith(wide, 2, 10), 0);
-    EXPECT_EQ(GroupToSwapWith(Groups({{100, 0}, {10, 0}}), 0, 10), -1);
+    EXPECT_EQ(targets(Groups({{10, 0}, {5, CLVF_HIDDEN}, {100, 0}}), 2), "-50>0 11>-1 ");
+    EXPECT_EQ(targets(Groups({{100, 0}, {10, 0}}), 0), "-50>-1 101>1 ");
 }
 
 TEST(Dragging, KeepsSidesAndHoldsTheOutline) {

@@ -62,18 +62,14 @@ struct ListWindow : ListFixture {
         window->Unlock();
     }
 
-    void Press(int x, Qt::KeyboardModifiers keys = {}) {
-        QTest::mousePress(header, Qt::LeftButton, keys, {x, 8});
-    }
+    void Press(int x) { QTest::mousePress(header, Qt::LeftButton, {}, {x, 8}); }
     // With the left button held, alone or when another one goes down.
     void Move(int x, QEvent::Type type = QEvent::MouseMove, Qt::MouseButton button = Qt::NoButton) {
         QMouseEvent event(type, QPointF(x, 8), header->mapToGlobal(QPointF(x, 8)), button,
                           Qt::LeftButton | button, {});
         QApplication::sendEvent(header, &event);
     }
-    void Release(int x, Qt::KeyboardModifiers keys = {}) {
-        QTest::mouseRelease(header, Qt::LeftButton, keys, {x, 8});
-    }
+    void Release(int x) { QTest::mouseRelease(header, Qt::LeftButton, {}, {x, 8}); }
     // Waits until all presses and releases so far have reached the header.
     [[nodiscard]] bool Handled() {
         constexpr uint32 mark = 1;
@@ -86,14 +82,16 @@ struct ListWindow : ListFixture {
     [[nodiscard]] bool Settle() {
         return Handled() && QTest::qWaitFor([&] { return CountThreads() == threads; }) && Handled();
     }
-    void Drag(int from, int to, Qt::KeyboardModifiers keys = {}) {
-        Press(from, keys);
-        if (to != from)
-            Move(to);
-        Release(to, keys);
+    void Drag(int from, int to) {
+        Press(from);
+        Move(to);
+        Release(to);
         ASSERT_TRUE(Settle());
     }
-    void Click(int x, Qt::KeyboardModifiers keys = {}) { Drag(x, x, keys); }
+    void Click(int x, Qt::KeyboardModifiers keys = {}) {
+        QTest::mouseClick(header, Qt::LeftButton, keys, {x, 8});
+        ASSERT_TRUE(Settle());
+    }
 
     [[nodiscard]] QImage HeaderPicture() const { return header->grab().toImage(); }
     // In a line above all labels.
