@@ -45,9 +45,22 @@ class ReportTest : public testing::Test {
         folder_.Write("page.pdf", DrawPicture(&view, PictureFormat::Pdf));
         picture_.loadFromData(QByteArray::fromStdString(DrawPicture(&view, PictureFormat::Png, 2)));
         words_ = PdfWords(folder_.File("page.pdf"));
+        SortByLines();
         text_.clear();
         for (const PdfWord& word : words_)
             text_ += word.text + ' ';
+    }
+    // A table's words follow each other by columns for the reader, depending on the font.
+    void SortByLines() {
+        const auto middle = [](const PdfWord& word) { return (word.top + word.bottom) / 2; };
+        std::ranges::sort(words_, {}, middle);
+        for (auto first = words_.begin(); first != words_.end();) {
+            const float line = middle(*first) + 3 * Near;
+            const auto last =
+                std::find_if(first, words_.end(), [&](const auto& word) { return middle(word) > line; });
+            std::ranges::sort(first, last, {}, &PdfWord::left);
+            first = last;
+        }
     }
     [[nodiscard]] PdfWord Word(const std::string& text) const { return FindWord(words_, text); }
     [[nodiscard]] float Height(const std::string& text) const { return Word(text).bottom - Word(text).top; }
