@@ -58,9 +58,9 @@ void CLVColumn::SetShown(bool shown) {
 
 void CLVColumn::Truncate(const BFont& font) {
     if (hasLabel_ && (flags_ & CLVF_TRUNCATE_HEADER) != 0)
-        truncatedLabel_ = TruncatedLabel(label_, width_ - 2 * kLabelInset, [&](const std::string& text) {
-            return font.StringWidth(text.c_str());
-        });
+        truncatedLabel_ = TruncatedLabel(
+            label_, width_ - 2 * kLabelInset,
+            [&](const std::string& text) { return font.StringWidth(text.c_str()); });
 }
 
 void CLVColumn::DrawColumnHeader(BView* view, BRect rect, bool sortKey, bool pressed, float fontAscent) {

@@ -640,8 +640,9 @@ void ColumnListView::SetExpanded(CLVListItem* item, bool expanded) {
 
 void ColumnListView::BringInSight(int32 fullBegin, int32 fullEnd) {
     const auto begin = fullList_.begin() + fullBegin;
-    const auto before = std::find_if(std::make_reverse_iterator(begin), fullList_.rend(),
-                                     [](const CLVListItem* row) { return row->inSight_; });
+    const auto before = std::find_if(
+        std::make_reverse_iterator(begin), fullList_.rend(),
+        [](const CLVListItem* row) { return row->inSight_; });
     VisibleRun run([this](BList* rows, int32 at) { BListView::AddList(rows, at); },
                    [this](int32 at, int32 count) { BListView::RemoveItems(at, count); },
                    before == fullList_.rend() ? 0 : IndexOf(*before) + 1);

@@ -46,10 +46,9 @@ std::vector<std::string> DailyBackup::FilesKeptWith(const std::string& name) {
 DailyBackup::DailyBackup(const std::string& folder, const std::vector<std::string>& names,
                          FileOperations& operations, Clock clock)
     : operations_(operations), clock_(clock) {
-    for (const std::string& name : names) {
+    for (const std::string& name : names)
         if (std::string file = FollowLinks((std::filesystem::path(folder) / name).string()); !file.empty())
             files_.push_back(std::move(file));
-    }
 }
 
 DailyBackup::~DailyBackup() {
@@ -100,10 +99,9 @@ void DailyBackup::Prepare() {
                      [this](const std::string& file) { return IsWanted(file); });
     }
     const auto copy = [this, wanted] {
-        for (const std::string& file : wanted) {
+        for (const std::string& file : wanted)
             if (!stop_ && CopyToPart(file) == 0)
                 prepared_.push_back(file);
-        }
     };
     try {
         if (!wanted.empty())
@@ -131,10 +129,9 @@ int DailyBackup::KeepAll() {
         const int failure = IsWanted(file) ? KeepFile(file) : 0;
         error = error == 0 ? failure : error;
     }
-    for (const std::string& file : files_) {
+    for (const std::string& file : files_)
         if (error == 0)
             RemoveOldOf(file);
-    }
     return error;
 }
 

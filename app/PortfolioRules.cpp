@@ -42,7 +42,8 @@ long Select(DATABASE& database, const char* column, const char* name) {
 
 // The numbers of the result set's `selected` records; false when they could not all be read.
 bool CollectNumbers(DATABASE& database, long selected, std::vector<long>* numbers) {
-    return ForEachSelected(database, selected, [&](const void*, long number) { numbers->push_back(number); });
+    return ForEachSelected(
+        database, selected, [&](const void*, long number) { numbers->push_back(number); });
 }
 
 bool DeleteAll(DATABASE& database, const std::vector<long>& numbers) {
@@ -54,13 +55,15 @@ bool DeleteAll(DATABASE& database, const std::vector<long>& numbers) {
 
 // Appends the text that every record begins with, in the order of the file.
 bool CollectNames(DATABASE& database, std::vector<std::string>* names) {
-    return ForEachSelected(database, database.Query(nullptr, QueryMode::New), [&](const void* data, long) {
-        char name[NameSize];
-        std::memcpy(name, data, sizeof name);
-        // Most often the next investment is of the same portfolio.
-        if (names->empty() || names->back() != FieldText(name))
-            names->emplace_back(FieldText(name));
-    });
+    return ForEachSelected(
+        database, database.Query(nullptr, QueryMode::New),
+        [&](const void* data, long) {
+            char name[NameSize];
+            std::memcpy(name, data, sizeof name);
+            // Most often the next investment is of the same portfolio.
+            if (names->empty() || names->back() != FieldText(name))
+                names->emplace_back(FieldText(name));
+        });
 }
 
 // A name as queries compare it.
@@ -124,10 +127,9 @@ std::vector<std::string> RestorePortfolios(DATABASE& portfolios, DATABASE& inves
     for (const std::string& name : names)
         listed.insert(Lowered(name));
     std::vector<std::string> restored;
-    for (const std::string& holder : holders) {
+    for (const std::string& holder : holders)
         if (listed.insert(Lowered(holder)).second && AddPortfolio(portfolios, holder.c_str()))
             restored.push_back(holder);
-    }
     return restored;
 }
 

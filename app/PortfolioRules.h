@@ -75,11 +75,13 @@ template <class Visit>
 // they could not all be read.
 template <class Visit>
 [[nodiscard]] bool ForEachCategoryEntry(DATABASE& categories, const char* category, Visit visit) {
-    return ForEachSelected(categories, SelectCategory(categories, category), [&](const void* data, long) {
-        CATEGORY_DATA record;
-        std::memcpy(&record, data, sizeof record);
-        visit(std::string(FieldText(record.Entry)).c_str());
-    });
+    return ForEachSelected(
+        categories, SelectCategory(categories, category),
+        [&](const void* data, long) {
+            CATEGORY_DATA record;
+            std::memcpy(&record, data, sizeof record);
+            visit(std::string(FieldText(record.Entry)).c_str());
+        });
 }
 
 // Whether a record and a query can hold the name: 1 to 31 bytes without a tab or line end.

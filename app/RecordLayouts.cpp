@@ -90,10 +90,9 @@ constexpr Place Places[] = {
 };
 
 constexpr bool AllInPlace() {
-    for (const Place& place : Places) {
+    for (const Place& place : Places)
         if (place.inRecord != place.expected || OffsetOf(InvestmentColumns, place.name) != place.expected)
             return false;
-    }
     return true;
 }
 static_assert(AllInPlace());

@@ -70,16 +70,14 @@ inline bool MakeEmptyFile(DATABASE& database, const std::string& path) {
 
 inline bool MakeFile(const std::string& path, long records) {
     DATABASE database(nullptr);
-    if (!MakeEmptyFile(database, path)) {
+    if (!MakeEmptyFile(database, path))
         return false;
-    }
     database.SetImmediateHeaderWrite(0);
     char data[DataSize];
     for (long i = 0; i < records; ++i) {
         FillInvestment(i, data);
-        if (database.Append(data) != i) {
+        if (database.Append(data) != i)
             return false;
-        }
     }
     return database.SetImmediateHeaderWrite(1) == 0;
 }
@@ -98,9 +96,8 @@ class Peer {
     explicit Peer(const std::string& path, int cacheKilobytes = 0, Journal journal = Journal::Off) {
         good_ = sqlite3_open(path.c_str(), &connection_) == SQLITE_OK;
         Run("PRAGMA synchronous = OFF");
-        if (cacheKilobytes > 0) {
+        if (cacheKilobytes > 0)
             Run(("PRAGMA cache_size = -" + std::to_string(cacheKilobytes)).c_str());
-        }
         Run(journal == Journal::Off ? "PRAGMA journal_mode = OFF" : "PRAGMA journal_mode = DELETE");
     }
     Peer(const Peer&) = delete;
@@ -148,11 +145,9 @@ class Peer {
         sqlite3_stmt* select = nullptr;
         good_ &= sqlite3_prepare_v2(connection_, query, -1, &select, nullptr) == SQLITE_OK;
         long rows = 0;
-        for (; sqlite3_step(select) == SQLITE_ROW; ++rows) {
-            for (int i = 0; i < sqlite3_column_count(select); ++i) {
+        for (; sqlite3_step(select) == SQLITE_ROW; ++rows)
+            for (int i = 0; i < sqlite3_column_count(select); ++i)
                 sqlite3_column_value(select, i);
-            }
-        }
         sqlite3_finalize(select);
         return rows;
     }

@@ -23,17 +23,16 @@ struct OPTIONS {
 inline bool ReadOptions(int argc, char** argv, OPTIONS* options) {
     for (int i = 1; i + 1 < argc; i += 2) {
         const std::string_view name = argv[i];
-        if (name == "--records") {
+        if (name == "--records")
             options->records = std::max(std::atol(argv[i + 1]), 1L);
-        } else if (name == "--rounds") {
+        else if (name == "--rounds")
             options->rounds = std::max(std::atoi(argv[i + 1]), 1);
-        } else if (name == "--peer-cache") {
+        else if (name == "--peer-cache")
             options->peerCache = std::max(std::atoi(argv[i + 1]), 0);
-        } else if (name == "--folder") {
+        else if (name == "--folder")
             options->folder = argv[i + 1];
-        } else {
+        else
             return false;
-        }
     }
     return argc % 2 == 1;
 }
@@ -68,10 +67,8 @@ struct TIMED {
 // meets all of them.
 inline std::vector<double> ShortestInTurn(int rounds, const std::vector<TIMED>& all) {
     std::vector<double> shortest(all.size(), 1e9);
-    for (int round = 0; round < rounds; ++round) {
-        for (std::size_t i = 0; i < all.size(); ++i) {
+    for (int round = 0; round < rounds; ++round)
+        for (std::size_t i = 0; i < all.size(); ++i)
             shortest[i] = std::min(shortest[i], Shortest(1, all[i].prepare, all[i].work));
-        }
-    }
     return shortest;
 }

@@ -22,11 +22,9 @@ void BareRead(const std::string& path, const char* copy = nullptr) {
     const int file = open(path.c_str(), O_RDONLY | O_CLOEXEC);
     const int target = copy != nullptr ? open(copy, O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600) : -1;
     ssize_t got = 0;
-    while ((got = read(file, buffer.data(), buffer.size())) > 0) {
-        if (target >= 0 && write(target, buffer.data(), static_cast<std::size_t>(got)) != got) {
+    while ((got = read(file, buffer.data(), buffer.size())) > 0)
+        if (target >= 0 && write(target, buffer.data(), static_cast<std::size_t>(got)) != got)
             break;
-        }
-    }
     close(file);
     close(target);
 }
@@ -41,9 +39,8 @@ struct LINE {
 
 void PrintRatio(double ours, double other, double wanted) {
     char bracket[16] = "";
-    if (wanted > 0) {
+    if (wanted > 0)
         std::snprintf(bracket, sizeof(bracket), "(%.2f)", wanted);
-    }
     std::printf(" %10.2f %8.3f %-7s", other * 1e3, ours / other, bracket);
 }
 
@@ -75,9 +72,8 @@ const WORK Works[] = {
      [](DATABASE& database) {
          database.QueryReset();
          long walked = 0;
-         for (void* data = database.QueryGetFirst(nullptr); data != nullptr; ++walked) {
+         for (void* data = database.QueryGetFirst(nullptr); data != nullptr; ++walked)
              data = database.QueryGetNext(nullptr);
-         }
          return walked;
      },
      [](Peer& peer) { return peer.Step("SELECT * FROM t"); }},
@@ -123,9 +119,8 @@ class Bench {
     bool Run() {
         std::printf("%ld records; wanted at most in brackets\n%-36s %10s %10s %16s %10s %16s\n", records_,
                     "work", "ms", "SQLite ms", "ratio", "limit ms", "ratio");
-        if (!MakeFile(path_, records_)) {
+        if (!MakeFile(path_, records_))
             return false;
-        }
         {
             Peer peer(peerPath_, peerCache_);
             peer.Make(records_);
@@ -145,9 +140,8 @@ class Bench {
         const double ours = line.seconds[0];
         std::printf("%-36s %10.2f", line.work, ours * 1e3);
         PrintRatio(ours, line.seconds[1], line.wantedOfTheirs);
-        if (line.seconds.size() > 2) {
+        if (line.seconds.size() > 2)
             PrintRatio(ours, line.seconds[2], line.wantedOfLimit);
-        }
         std::printf("\n");
         std::fflush(stdout);
     }
@@ -191,17 +185,15 @@ class Bench {
     void MeasureAppend() {
         const long count = std::min(records_, AppendedAtMost);
         std::vector<char> data(static_cast<std::size_t>(count) * DataSize);
-        for (long i = 0; i < count; ++i) {
+        for (long i = 0; i < count; ++i)
             FillInvestment(i, &data[static_cast<std::size_t>(i) * DataSize]);
-        }
         DATABASE database(nullptr);
         Peer peer(folder_ + "/append.sqlite", peerCache_);
         peer.Make(0);
         bool good = true;
         const auto append = [&] {
-            for (long i = 0; i < count; ++i) {
+            for (long i = 0; i < count; ++i)
                 good &= database.Append(&data[static_cast<std::size_t>(i) * DataSize]) == i;
-            }
         };
         const auto times = ShortestInTurn(
             rounds_, {{append, [&] { good &= MakeEmptyFile(database, folder_ + "/append.db"); }},
@@ -243,9 +235,8 @@ class Bench {
         good &= exported == records_ && loaded == records_;
         good &= Peer(peerCopyPath).Step("SELECT rowid FROM t") == records_;
         Check(good, "text");
-        for (const std::string& path : {text, csv, copyPath, peerCopyPath}) {
+        for (const std::string& path : {text, csv, copyPath, peerCopyPath})
             std::filesystem::remove(path); // makes room for what follows
-        }
     }
 
     static bool Shell(const std::string& path, const std::string& arguments) {
@@ -286,9 +277,8 @@ class Bench {
         DATABASE database(path_.c_str());
         database.SetImmediateHeaderWrite(0);
         bool good = true;
-        for (long i = 1; i < records_; i += 2) {
+        for (long i = 1; i < records_; i += 2)
             good &= database.Delete(i) == 0;
-        }
         Peer peer(peerPath_);
         peer.Run("DELETE FROM t WHERE rowid % 2 = 0");
         return database.SetImmediateHeaderWrite(1) == 0 && good && peer.IsGood();

@@ -83,10 +83,9 @@ double Seconds(Work work) {
 ColumnListView* FindList(BView* view) {
     if (auto* list = dynamic_cast<ColumnListView*>(view))
         return list;
-    for (int32 i = 0; i < view->CountChildren(); ++i) {
+    for (int32 i = 0; i < view->CountChildren(); ++i)
         if (ColumnListView* list = FindList(view->ChildAt(i)))
             return list;
-    }
     return nullptr;
 }
 

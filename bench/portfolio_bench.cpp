@@ -54,8 +54,8 @@ bool MeasurePaste(const OPTIONS& options, DATABASE& investments, Peer& peer) {
     for (long i = 0; i < count; ++i)
         FillInvestment(i, reinterpret_cast<char*>(&clipboard[static_cast<std::size_t>(i)]));
     bool good = true;
-    const double ours =
-        Shortest(options.rounds, [&] { good &= AppendCopies(investments, clipboard, "Another portfolio"); });
+    const double ours = Shortest(
+        options.rounds, [&] { good &= AppendCopies(investments, clipboard, "Another portfolio"); });
     const double theirs = Shortest(options.rounds, [&] { peer.Insert(0, count); });
     Print("paste investments", ours, theirs);
     return good;

@@ -60,10 +60,12 @@ int MeasureIn(const std::string& folder, const OPTIONS& options) {
     double bare = 1e9;
     // In turns, since the machine's speed drifts.
     for (int round = 0; round < options.rounds; ++round) {
-        ours = std::min(ours, Shortest(1, [&] {
-                            for (long i = 0; i < options.records; ++i)
-                                right = GetPriceQuote("ABC", context) == 45.375F && right;
-                        }));
+        ours = std::min(ours, Shortest(
+                                  1,
+                                  [&] {
+                                      for (long i = 0; i < options.records; ++i)
+                                          right = GetPriceQuote("ABC", context) == 45.375F && right;
+                                  }));
         bare = std::min(bare, Shortest(1, [&] {
                             for (long i = 0; i < options.records; ++i)
                                 right = AskBarely(server.Port()) && right;

@@ -174,7 +174,8 @@ class UpdateRuns : public StepDriver {
             start_ = Clock::now();
             GetAppWindow(be_app, "Quorvan")->PostMessage(MessagePortfolioUpdate);
         });
-        When("the progress window", WindowShown(ProgressTitle), [] {});
+        When(
+            "the progress window", WindowShown(ProgressTitle), [] {});
         When(
             "the end", [] { return Window(ProgressTitle) == nullptr; }, after);
     }

@@ -81,10 +81,9 @@ int ChartDataSets::AccumulateDataSet(int index, const INVESTMENT_DATA& record) {
     AddKeyed(sets_[ByType], types_, type, record.Value);
     sets_[ByCategory].values[CategoryOf(type)] += record.Value;
     const std::string risk(FieldText(record.Risk));
-    for (std::size_t i = 0; i < std::size(Risks); ++i) {
+    for (std::size_t i = 0; i < std::size(Risks); ++i)
         if (strcmpi(risk.c_str(), Risks[i]) == 0)
             sets_[ByRisk].values[i] += record.Value;
-    }
     sets_[ByRetirement].values[record.Retire ? 0 : 1] += record.Value;
     AddKeyed(sets_[SharesByInvestment], names_, name, record.Shares);
     return 0;

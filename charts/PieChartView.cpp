@@ -173,9 +173,8 @@ std::string PieChartView::AccessibleDescription() const {
         return title_ + ": Nothing to Chart!";
     constexpr int mostLines = 1000;
     std::string description = title_;
-    for (int i = 0; i < std::min(count_, mostLines); ++i) {
+    for (int i = 0; i < std::min(count_, mostLines); ++i)
         if (const std::string line = LegendText(i); !line.empty())
             description += "\n" + line;
-    }
     return description;
 }

@@ -53,6 +53,8 @@ function(quorvan_test)
     target_link_libraries(${target} PRIVATE quorvan_${used})
   endforeach()
   target_link_libraries(${target} PRIVATE quorvan_flags ${TEST_ALSO})
+  # GoogleTest's checks hold an else of their own, which belongs to no if around them.
+  target_compile_options(${target} PRIVATE -Wno-dangling-else)
   set(environment
     "TSAN_OPTIONS=halt_on_error=1:suppressions=${PROJECT_SOURCE_DIR}/tests/tsan.supp"
     "LSAN_OPTIONS=suppressions=${PROJECT_SOURCE_DIR}/tests/lsan.supp"

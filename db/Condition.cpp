@@ -16,9 +16,8 @@ constexpr int CaseBit = 'a' - 'A';
 // Lowered bytes by table: one load instead of two comparisons for each byte of a million fields.
 constexpr auto LoweredBytes = [] {
     std::array<unsigned char, 256> table{};
-    for (std::size_t i = 0; i < table.size(); ++i) {
+    for (std::size_t i = 0; i < table.size(); ++i)
         table[i] = LoweredByte(static_cast<std::uint8_t>(i));
-    }
     return table;
 }();
 
@@ -31,9 +30,8 @@ int Order(unsigned char a, unsigned char b) {
 int CompareExact(const std::uint8_t* field, std::size_t width, const char* value, std::size_t from = 0) {
     for (std::size_t i = from; i < width; ++i) {
         const auto v = static_cast<unsigned char>(value[i]);
-        if (field[i] != v || v == 0) {
+        if (field[i] != v || v == 0)
             return Order(field[i], v);
-        }
     }
     return Order(0, static_cast<unsigned char>(value[width]));
 }
@@ -42,23 +40,20 @@ int CompareExact(const std::uint8_t* field, std::size_t width, const char* value
 // or above, from where on case counts, at the same place.
 int CompareLowered(const std::uint8_t* field, std::size_t width, const char* value) {
     for (std::size_t i = 0; i < width; ++i) {
-        if (field[i] >= FirstNonAscii) {
+        if (field[i] >= FirstNonAscii)
             return CompareExact(field, width, value, i);
-        }
         const unsigned char f = LoweredBytes[field[i]];
         const auto v = static_cast<unsigned char>(value[i]);
-        if (f != v || v == 0) {
+        if (f != v || v == 0)
             return Order(f, v);
-        }
     }
     return Order(0, static_cast<unsigned char>(value[width]));
 }
 
 std::size_t AsciiLength(std::string_view text) {
     std::size_t length = 0;
-    while (length < text.size() && static_cast<unsigned char>(text[length]) < FirstNonAscii) {
+    while (length < text.size() && static_cast<unsigned char>(text[length]) < FirstNonAscii)
         ++length;
-    }
     return length;
 }
 
@@ -72,12 +67,10 @@ bool ContainsLowered(std::string_view field, std::string_view value) {
     };
     for (std::size_t at = 0; at + value.size() <= field.size(); ++at) {
         std::size_t i = 0;
-        while (i < value.size() && lowered(field, fieldAscii, at + i) == lowered(value, valueAscii, i)) {
+        while (i < value.size() && lowered(field, fieldAscii, at + i) == lowered(value, valueAscii, i))
             ++i;
-        }
-        if (i == value.size()) {
+        if (i == value.size())
             return true;
-        }
     }
     return false;
 }
@@ -135,17 +128,15 @@ struct Matchers {
                         std::size_t count, std::uint8_t* matches) {
         const decltype(Field::Load(field, 0)) value = Value(self, Field{});
         const std::size_t width = self.width_;
-        for (std::size_t i = 0; i < count; ++i, field += stride) {
+        for (std::size_t i = 0; i < count; ++i, field += stride)
             matches[i] = Compare{}(Field::Load(field, width), value);
-        }
     }
 
     template <class Compare>
     static void LoweredTexts(const Condition& self, const std::uint8_t* field, std::size_t stride,
                              std::size_t count, std::uint8_t* matches) {
-        for (std::size_t i = 0; i < count; ++i, field += stride) {
+        for (std::size_t i = 0; i < count; ++i, field += stride)
             matches[i] = Compare{}(CompareLowered(field, self.width_, self.text_), 0);
-        }
     }
 
     // Two letters that differ in case only differ in one bit: a field equals the value when the bits that
@@ -169,17 +160,15 @@ struct Matchers {
     template <class Compare>
     static void ExactTexts(const Condition& self, const std::uint8_t* field, std::size_t stride,
                            std::size_t count, std::uint8_t* matches) {
-        for (std::size_t i = 0; i < count; ++i, field += stride) {
+        for (std::size_t i = 0; i < count; ++i, field += stride)
             matches[i] = Compare{}(CompareExact(field, self.width_, self.text_), 0);
-        }
     }
 
     // Whether a place agrees with the value in the bits that count.
     static bool AgreesAt(const Condition& self, const std::uint8_t* place) {
         std::uint8_t difference = 0;
-        for (std::size_t i = 0; i < self.length_; ++i) {
+        for (std::size_t i = 0; i < self.length_; ++i)
             difference |= static_cast<std::uint8_t>((place[i] ^ self.text_[i]) & self.bits_[i]);
-        }
         return difference == 0;
     }
 
@@ -196,13 +185,11 @@ struct Matchers {
             agree[i] = static_cast<std::uint8_t>(((places[i] & firstBits) == firstByte) &
                                                  ((places[i + last] & lastBits) == lastByte));
         }
-        if ((LoadWord<std::uint64_t>(agree) | LoadWord<std::uint64_t>(agree + 8)) == 0) {
+        if ((LoadWord<std::uint64_t>(agree) | LoadWord<std::uint64_t>(agree + 8)) == 0)
             return PlacesAtOnce;
-        }
         std::size_t i = 0;
-        while (i < PlacesAtOnce && !(agree[i] != 0 && AgreesAt(self, places + i))) {
+        while (i < PlacesAtOnce && !(agree[i] != 0 && AgreesAt(self, places + i)))
             ++i;
-        }
         return i;
     }
 
@@ -211,18 +198,16 @@ struct Matchers {
     static std::size_t FirstPlace(const Condition& self, const std::uint8_t* field, std::size_t places) {
         std::size_t at = 0;
         if (places < PlacesAtOnce) {
-            while (at < places && !AgreesAt(self, field + at)) {
+            while (at < places && !AgreesAt(self, field + at))
                 ++at;
-            }
             return at;
         }
         while (at < places) {
             at = std::min(at, places - PlacesAtOnce); // the last block begins in the one before
             const std::size_t found = FirstOfBlock(self, field + at);
             at += found;
-            if (found < PlacesAtOnce) {
+            if (found < PlacesAtOnce)
                 break;
-            }
         }
         return at;
     }
@@ -242,9 +227,8 @@ struct Matchers {
     template <bool Exact>
     static bool IsInText(const Condition& self, const std::uint8_t* field, std::size_t end) {
         const std::string_view before = TextOf(field, end);
-        if (!Exact && before.size() == end && AsciiLength(before) < end) {
+        if (!Exact && before.size() == end && AsciiLength(before) < end)
             return ContainsLowered(TextOf(field, self.width_), {self.text_, self.length_});
-        }
         return before.size() == end;
     }
 
@@ -352,19 +336,16 @@ void Condition::PrepareText(const char* value, bool exact) {
     if (!exact) {
         strlwr(text_);
         const std::size_t ascii = AsciiLength({text_, length_});
-        for (std::size_t i = 0; i < ascii; ++i) {
+        for (std::size_t i = 0; i < ascii; ++i)
             bits_[i] = static_cast<char>(text_[i] >= 'a' && text_[i] <= 'z' ? ~CaseBit : ~0);
-        }
     }
 }
 
 int CompareOperatorOf(const char* token) {
     constexpr std::array<const char*, 7> spellings = {"=", "!=", "<", "<=", ">", ">=", "contains"};
-    for (std::size_t op = 0; op < spellings.size(); ++op) {
-        if (strcmpi(token, spellings[op]) == 0) {
+    for (std::size_t op = 0; op < spellings.size(); ++op)
+        if (strcmpi(token, spellings[op]) == 0)
             return static_cast<int>(op);
-        }
-    }
     return -1;
 }
 

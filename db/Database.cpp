@@ -26,9 +26,8 @@ COLUMN_ENTRY ColumnFor(const COLUMN_ENTRY& wanted) {
     CopyTextZeroed(column.name, FieldText(wanted.name));
     column.type = wanted.type;
     column.size = wanted.size;
-    if (wanted.type == ColumnType::Float) {
+    if (wanted.type == ColumnType::Float)
         column.format = (wanted.format & DecimalsMask) != 0 ? wanted.format : DefaultDecimals;
-    }
     return column;
 }
 
@@ -41,9 +40,8 @@ bool IsWidthAllowed(const COLUMN_ENTRY& column) {
 DATABASE::DATABASE(const char* path, FileOperations& operations)
     : operations_(operations), file_(operations) {
     SetReadCache(DefaultCacheKilobytes);
-    if (path != nullptr) {
+    if (path != nullptr)
         Open(path);
-    }
 }
 
 DATABASE::~DATABASE() = default;
@@ -55,35 +53,28 @@ int DATABASE::Fail(int code) {
 
 int DATABASE::Create(const char* path, const char* description, int columnCount,
                      const COLUMN_ENTRY* columns) {
-    if (!IsUsablePath(path)) {
+    if (!IsUsablePath(path))
         return Fail(DatabaseError::CreateFailed);
-    }
-    if (FileExists(path)) {
+    if (FileExists(path))
         return Fail(DatabaseError::CreateFileExists);
-    }
     if (columnCount < 0 || columnCount > std::numeric_limits<std::int16_t>::max() ||
-        (columnCount > 0 && columns == nullptr)) {
+        (columnCount > 0 && columns == nullptr))
         return Fail(DatabaseError::CreateInvalidColumns);
-    }
     auto table = TryAllocate<COLUMN_ENTRY>(static_cast<std::size_t>(columnCount));
-    if (!table) {
+    if (!table)
         return Fail(DatabaseError::CreateNoMemoryForColumns);
-    }
     DATABASE_HEADER header{};
     header.version = 1.0F;
     CopyTextZeroed(header.description, description != nullptr ? description : "");
     header.columnCount = static_cast<std::int16_t>(columnCount);
-    if (!LayOutColumns(columns, &header, table.get())) {
+    if (!LayOutColumns(columns, &header, table.get()))
         return Fail(DatabaseError::CreateInvalidColumns);
-    }
     auto recordBuffer = TryAllocate<std::uint8_t>(static_cast<std::size_t>(header.recordLength));
-    if (!recordBuffer) {
+    if (!recordBuffer)
         return Fail(DatabaseError::CreateNoMemoryForRecord);
-    }
     File file(operations_);
-    if (int error = file.Open(path, FileMode::CreateNew); error != 0) {
+    if (int error = file.Open(path, FileMode::CreateNew); error != 0)
         return Fail(error == EEXIST ? DatabaseError::CreateFileExists : DatabaseError::CreateFailed);
-    }
     if (WriteLayout(file, header, table.get()) != 0) {
         static_cast<void>(RemoveFile(operations_, path)); // nothing more can be done about half a file
         return Fail(DatabaseError::CreateFailed);
@@ -99,13 +90,11 @@ bool DATABASE::LayOutColumns(const COLUMN_ENTRY* wanted, DATABASE_HEADER* header
         columns[i] = ColumnFor(wanted[i]);
         columns[i].offset = static_cast<std::int16_t>(offset);
         AdjustColumnSize(&columns[i]);
-        if (!IsWidthAllowed(columns[i])) {
+        if (!IsWidthAllowed(columns[i]))
             return false;
-        }
         offset += columns[i].size;
-        if (offset >= std::numeric_limits<std::int16_t>::max()) {
+        if (offset >= std::numeric_limits<std::int16_t>::max())
             return false;
-        }
     }
     header->recordLength = static_cast<std::int16_t>(offset + 1);
     return true;
@@ -117,28 +106,23 @@ int DATABASE::Open(const char* path) {
 }
 
 int DATABASE::OpenFile(const char* path) {
-    if (!IsUsablePath(path)) {
+    if (!IsUsablePath(path))
         return Fail(DatabaseError::OpenFailed);
-    }
     File file(operations_);
     int error = file.Open(path, FileMode::ReadWrite);
     const bool readOnly = MayOnlyBeRead(error);
-    if (readOnly) {
+    if (readOnly)
         error = file.Open(path, FileMode::ReadOnly);
-    }
     std::int64_t length = 0;
-    if (error != 0 || file.Length(&length) != 0) {
+    if (error != 0 || file.Length(&length) != 0)
         return Fail(DatabaseError::OpenFailed);
-    }
     DATABASE_HEADER header{};
     std::unique_ptr<COLUMN_ENTRY[]> columns;
-    if (int code = ReadLayout(file, length, &header, &columns); code != DatabaseError::None) {
+    if (int code = ReadLayout(file, length, &header, &columns); code != DatabaseError::None)
         return Fail(code);
-    }
     auto recordBuffer = TryAllocate<std::uint8_t>(static_cast<std::size_t>(header.recordLength));
-    if (!recordBuffer) {
+    if (!recordBuffer)
         return Fail(DatabaseError::OpenNoMemoryForRecord);
-    }
     const FileCounts counts = CheckRecordCount(&header, length);
     Adopt(std::move(file), path, header, std::move(columns), std::move(recordBuffer));
     fileCounts_ = counts;
@@ -155,27 +139,22 @@ int DATABASE::OpenFile(const char* path) {
 int DATABASE::ReadLayout(const File& file, std::int64_t length, DATABASE_HEADER* header,
                          std::unique_ptr<COLUMN_ENTRY[]>* columns) {
     std::uint8_t bytes[HeaderSize];
-    if (file.ReadAt(0, bytes, HeaderSize) != 0) {
+    if (file.ReadAt(0, bytes, HeaderSize) != 0)
         return DatabaseError::OpenFailed;
-    }
     *header = DecodeHeader(bytes);
-    if (!HeaderMakesSense(*header, length)) {
+    if (!HeaderMakesSense(*header, length))
         return DatabaseError::OpenFailed;
-    }
     *columns = TryAllocate<COLUMN_ENTRY>(static_cast<std::size_t>(header->columnCount));
-    if (!*columns) {
+    if (!*columns)
         return DatabaseError::OpenNoMemoryForColumns;
-    }
     std::int64_t offset = HeaderSize;
     for (int i = 0; i < header->columnCount; ++i, offset += ColumnEntrySize) {
         std::uint8_t entry[ColumnEntrySize];
-        if (file.ReadAt(offset, entry, ColumnEntrySize) != 0) {
+        if (file.ReadAt(offset, entry, ColumnEntrySize) != 0)
             return DatabaseError::OpenFailed;
-        }
         (*columns)[i] = DecodeColumn(entry);
-        if (!ColumnFits((*columns)[i], header->recordLength)) {
+        if (!ColumnFits((*columns)[i], header->recordLength))
             return DatabaseError::OpenFailed;
-        }
     }
     return DatabaseError::None;
 }
@@ -209,15 +188,13 @@ void DATABASE::CloseFile() {
 bool DATABASE::RecountDeleted() {
     ReadCache own;
     ReadCache* reader = ScanCache(&own);
-    if (reader == nullptr) {
+    if (reader == nullptr)
         return false;
-    }
     std::int32_t deleted = 0;
     for (std::int32_t i = 0; i < header_.recordCount; ++i) {
         const std::uint8_t* record = reader->Scan(file_, Area(), i);
-        if (record == nullptr) {
+        if (record == nullptr)
             return false;
-        }
         deleted += *record == RecordStatus::Deleted ? 1 : 0;
     }
     header_.deletedCount = deleted;

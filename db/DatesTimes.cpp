@@ -73,9 +73,8 @@ void DATABASE::MakeTimeValid(dbTIME* time) const {
 }
 
 void DATABASE::GetFormattedDateString(const dbDATE* date, char* out, int style) const {
-    if (style < 1 || style > 3) {
+    if (style < 1 || style > 3)
         return;
-    }
     if (date->month < 1 || date->day < 1 || (style != 3 && date->month > MonthsPerYear)) {
         std::snprintf(out, FormattedDateSize, "Invalid date");
     } else if (style == 3) {
@@ -89,9 +88,8 @@ void DATABASE::GetFormattedDateString(const dbDATE* date, char* out, int style) 
 
 void DATABASE::GetFormattedTimeString(const dbTIME* time, char* out, int style) const {
     dbTIME shown = *time;
-    if (style != 2) {
+    if (style != 2)
         ConvertTo12HourTime(time, &shown);
-    }
     std::snprintf(out, FormattedTimeSize, "%.2d:%.2d:%.2d", shown.hour, shown.minute, shown.second);
 }
 
@@ -121,9 +119,8 @@ int DATABASE::CompareTimes(const dbTIME* a, const dbTIME* b) const {
 
 void DATABASE::ConvertTo12HourTime(const dbTIME* in, dbTIME* out) const {
     *out = *in;
-    if (in->hour > 12 && in->hour < HoursPerDay) {
+    if (in->hour > 12 && in->hour < HoursPerDay)
         out->hour = static_cast<std::int8_t>(in->hour - 12);
-    } else if (in->hour == 0) {
+    else if (in->hour == 0)
         out->hour = 12;
-    }
 }

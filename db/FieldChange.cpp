@@ -24,9 +24,8 @@ void ChangeInteger(int op, std::uint8_t* field, std::size_t width, std::int64_t 
 // One part of a date or time: `packed` shifted right has the value's part in its lowest bits.
 template <class T>
 void ChangePart(int op, T* part, std::int32_t packed, int shift) {
-    if (op == SetOperator::Assign || op == SetOperator::Add || op == SetOperator::Subtract) {
+    if (op == SetOperator::Assign || op == SetOperator::Add || op == SetOperator::Subtract)
         ChangeNumber(op, part, static_cast<T>(packed >> shift));
-    }
 }
 
 } // namespace
@@ -62,9 +61,8 @@ bool FieldChange::Prepare(const COLUMN_ENTRY& column, int op, const char* value)
         whole_ = WholeNumber(value);
     } else if (width_ > 0) {
         text_ = TryAllocate<std::uint8_t>(width_);
-        if (!text_) {
+        if (!text_)
             return false;
-        }
         std::memset(text_.get(), 0, width_);
         CopyText(reinterpret_cast<char*>(text_.get()), width_, value);
     }

@@ -42,11 +42,10 @@ constexpr void ChangeNumber(int op, T* field, T value) {
             *field = wrapped(a * b);
             break;
         case SetOperator::Divide:
-            if (value == -1) {
+            if (value == -1)
                 *field = wrapped(0 - a); // the quotient of the smallest number does not fit
-            } else if (value != 0) {
+            else if (value != 0)
                 *field = wrapped(*field / value);
-            }
             break;
         default:
             break;

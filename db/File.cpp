@@ -14,9 +14,8 @@ namespace {
 template <class Call>
 auto Retry(Call call) {
     auto result = call();
-    while (result < 0 && errno == EINTR) {
+    while (result < 0 && errno == EINTR)
         result = call();
-    }
     return result;
 }
 
@@ -116,18 +115,15 @@ int File::Open(const std::string& path, FileMode mode) {
     Close();
     const mode_t permissions = mode == FileMode::CreateNew ? 0600 : 0666; // less the user's mask
     int opened = Retry([&] { return operations_->Open(path.c_str(), FlagsOf(mode), permissions); });
-    if (opened < 0) {
+    if (opened < 0)
         return errno;
-    }
     descriptor_ = opened;
     struct stat status {};
     int error = ErrorOf(operations_->Status(descriptor_, &status));
-    if (error == 0 && !S_ISREG(status.st_mode)) {
+    if (error == 0 && !S_ISREG(status.st_mode))
         error = EINVAL;
-    }
-    if (error != 0) {
+    if (error != 0)
         Close();
-    }
     return error;
 }
 
@@ -146,12 +142,10 @@ int File::ReadUpTo(std::int64_t offset, void* data, std::size_t size, std::size_
         ssize_t count = Retry([&] {
             return operations_->ReadAt(descriptor_, target, size - *got, offset + static_cast<off_t>(*got));
         });
-        if (count < 0) {
+        if (count < 0)
             return errno;
-        }
-        if (count == 0) {
+        if (count == 0)
             break;
-        }
         *got += static_cast<std::size_t>(count);
     }
     return 0;
@@ -171,12 +165,10 @@ int File::WriteAt(std::int64_t offset, const void* data, std::size_t size) {
         ssize_t count = Retry([&] {
             return operations_->WriteAt(descriptor_, source, size - done, offset + static_cast<off_t>(done));
         });
-        if (count < 0) {
+        if (count < 0)
             return errno;
-        }
-        if (count == 0) {
+        if (count == 0)
             return EIO;
-        }
         done += static_cast<std::size_t>(count);
     }
     return 0;
@@ -214,13 +206,11 @@ int File::TakeOwnerForCopy(const File& other) {
 
 int File::TakeOwner(const struct stat& theirs, mode_t mode) {
     struct stat ours {};
-    if (operations_->Status(descriptor_, &ours) < 0) {
+    if (operations_->Status(descriptor_, &ours) < 0)
         return errno;
-    }
     if (ours.st_uid != theirs.st_uid || ours.st_gid != theirs.st_gid) {
-        if (operations_->SetOwner(descriptor_, theirs.st_uid, theirs.st_gid) < 0) {
+        if (operations_->SetOwner(descriptor_, theirs.st_uid, theirs.st_gid) < 0)
             mode &= 0777; // another's file: what runs in the owner's name must not move to us
-        }
     }
     return ErrorOf(Retry([&] { return operations_->SetMode(descriptor_, mode); }));
 }
@@ -250,9 +240,8 @@ int SyncFolderOf(FileOperations& operations, const std::string& path) {
     const std::string folder = FolderOf(path);
     int descriptor =
         Retry([&] { return operations.Open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC, 0); });
-    if (descriptor < 0) {
+    if (descriptor < 0)
         return errno == EACCES ? 0 : errno;
-    }
     const int error = ErrorOf(Retry([&] { return operations.Sync(descriptor); }));
     operations.Close(descriptor);
     return error == EINVAL ? 0 : error;
@@ -275,17 +264,14 @@ std::string FollowLinks(const std::string& path) {
     fs::path current(path);
     for (int links = 0; links <= mostLinks; ++links) {
         fs::path folder = fs::canonical(FolderOf(current.string()), error);
-        if (error) {
+        if (error)
             return {};
-        }
         current = folder / current.filename();
-        if (!fs::is_symlink(fs::symlink_status(current, error))) {
+        if (!fs::is_symlink(fs::symlink_status(current, error)))
             return current.string();
-        }
         fs::path target = fs::read_symlink(current, error);
-        if (error) {
+        if (error)
             return {};
-        }
         current = folder / target; // an absolute target replaces the folder
     }
     return {};

@@ -39,11 +39,10 @@ FileCheck::FileCheck(FileOperations& operations) : operations_(operations) {}
 void FileCheck::Add(FILE_FINDING finding) {
     problem_ = problem_ || finding.problem;
     mendable_ = mendable_ || finding.mendable;
-    if (findings_.size() + 1 < MostFindings) {
+    if (findings_.size() + 1 < MostFindings)
         findings_.push_back(std::move(finding));
-    } else {
+    else
         ++omitted_;
-    }
 }
 
 void FileCheck::Problem(std::int64_t offset, std::string text) {
@@ -104,16 +103,13 @@ int FileCheck::ExamineHeader(const File& file) {
         return 0;
     }
     std::uint8_t bytes[HeaderSize];
-    if (const int error = file.ReadAt(0, bytes, HeaderSize); error != 0) {
+    if (const int error = file.ReadAt(0, bytes, HeaderSize); error != 0)
         return error;
-    }
     header_ = DecodeHeader(bytes);
-    if (header_.version != 1.0F) {
+    if (header_.version != 1.0F)
         Remark(0, "the version is not 1.0");
-    }
-    if (!HasTerminator(bytes + HeaderOffset::Description)) {
+    if (!HasTerminator(bytes + HeaderOffset::Description))
         Remark(HeaderOffset::Description, "the description has no end within its 32 bytes");
-    }
     if (header_.columnCount < 0) {
         Problem(HeaderOffset::ColumnCount, "the column count is " + Text(header_.columnCount));
     } else if (DataStart(header_.columnCount) > length_) {
@@ -121,9 +117,8 @@ int FileCheck::ExamineHeader(const File& file) {
                                                " need " + Text(DataStart(header_.columnCount)) +
                                                " bytes, the file has " + Text(length_));
     }
-    if (header_.recordLength < 1) {
+    if (header_.recordLength < 1)
         Problem(HeaderOffset::RecordLength, "the record length is " + Text(header_.recordLength));
-    }
     laidOut_ = !problem_;
     return 0;
 }
@@ -134,23 +129,20 @@ int FileCheck::ExamineColumns(const File& file) {
     for (int i = 0; i < header_.columnCount; ++i) {
         const std::int64_t at = DataStart(i);
         std::uint8_t bytes[ColumnEntrySize];
-        if (const int error = file.ReadAt(at, bytes, ColumnEntrySize); error != 0) {
+        if (const int error = file.ReadAt(at, bytes, ColumnEntrySize); error != 0)
             return error;
-        }
         const COLUMN_ENTRY column = DecodeColumn(bytes);
         const std::string name = "column " + std::string(column.name);
         ExamineColumn(column, HasTerminator(bytes), at);
-        if (!names.insert(column.name).second) {
+        if (!names.insert(column.name).second)
             Remark(at, name + " has the name of an earlier one, which statements mean");
-        }
         if (column.offset != end) {
             const std::string sentence = name + " begins at byte " + Text(column.offset) +
                                          " of the data, the columns before it end at " + Text(end);
-            if (column.offset < end) {
+            if (column.offset < end)
                 Misplaced(at + ColumnOffset::Offset, sentence);
-            } else {
+            else
                 Remark(at + ColumnOffset::Offset, sentence);
-            }
         }
         end = std::max(end, column.offset + column.size);
     }
@@ -164,12 +156,10 @@ int FileCheck::ExamineColumns(const File& file) {
 
 void FileCheck::ExamineColumn(const COLUMN_ENTRY& column, bool nameEnds, std::int64_t at) {
     const std::string name = "column " + std::string(column.name);
-    if (!nameEnds) {
+    if (!nameEnds)
         Problem(at, name + " has a name without an end within its 32 bytes");
-    }
-    if (column.type < ColumnType::String || column.type > ColumnType::Time) {
+    if (column.type < ColumnType::String || column.type > ColumnType::Time)
         Problem(at + ColumnOffset::Type, name + " is of the unknown type " + Text(column.type));
-    }
     if (!ColumnFits(column, header_.recordLength)) {
         Misplaced(at + ColumnOffset::Offset,
                   name + " has " + Text(column.size) + " bytes at " + Text(column.offset) + ", outside the " +
@@ -219,15 +209,13 @@ int FileCheck::ExamineRecords(const File& file) {
         const std::int32_t count = std::min(perBlock, header_.recordCount - first);
         const std::int64_t at = start + static_cast<std::int64_t>(first) * header_.recordLength;
         const std::size_t bytes = static_cast<std::size_t>(count) * length;
-        if (const int error = file.ReadAt(at, block.data(), bytes); error != 0) {
+        if (const int error = file.ReadAt(at, block.data(), bytes); error != 0)
             return error;
-        }
         for (std::int32_t i = 0; i < count; ++i) {
             const std::uint8_t status = block[static_cast<std::size_t>(i) * length];
             deleted += status == RecordStatus::Deleted ? 1 : 0;
-            if (IsStatus(status)) {
+            if (IsStatus(status))
                 continue;
-            }
             if (odd.size() == MostFindings) {
                 ++more;
                 continue;
@@ -257,9 +245,8 @@ int FileCheck::Repair(const std::string& path, std::string* backup) {
     File file(operations_);
     int error = file.Open(path, FileMode::ReadWrite);
     error = error != 0 ? error : Examine(file);
-    if (error != 0 || !CanRepair()) {
+    if (error != 0 || !CanRepair())
         return error;
-    }
     error = WriteBackup(file, path, backup);
     error = error != 0 ? error : WriteCounts(file);
     return error != 0 ? error : Examine(file);
@@ -279,9 +266,8 @@ int FileCheck::WriteBackup(const File& file, const std::string& path, std::strin
         }
         error = copy.Open(name, FileMode::CreateNew);
     }
-    if (error != 0) {
+    if (error != 0)
         return error;
-    }
     error = CopyTo(copy, file);
     error = error != 0 ? error : copy.TakeOwnerForCopy(file);
     error = error != 0 ? error : copy.Sync();
@@ -309,9 +295,8 @@ int FileCheck::CopyTo(File& copy, const File& file) const {
 int FileCheck::WriteCounts(File& file) const {
     std::uint8_t mended[HeaderSize];
     std::uint8_t before[HeaderSize];
-    if (const int error = file.ReadAt(0, before, HeaderSize); error != 0) {
+    if (const int error = file.ReadAt(0, before, HeaderSize); error != 0)
         return error;
-    }
     EncodeHeader(header_, mended);
     constexpr std::size_t size = HeaderSize - HeaderOffset::RecordCount;
     if (const int error = file.WriteAt(HeaderOffset::RecordCount, mended + HeaderOffset::RecordCount, size);

@@ -43,9 +43,8 @@ int DATABASE::SetImmediateHeaderWrite(int on) {
 int DATABASE::WriteHeaderBytes() {
     std::uint8_t bytes[HeaderSize];
     EncodeHeader(header_, bytes);
-    if (!IsOpen() || file_.WriteAt(0, bytes, HeaderSize) != 0) {
+    if (!IsOpen() || file_.WriteAt(0, bytes, HeaderSize) != 0)
         return Fail(DatabaseError::HeaderFailed);
-    }
     return 0;
 }
 
@@ -67,9 +66,8 @@ int DATABASE::WriteLayout(File& file, const DATABASE_HEADER& header, const COLUM
 
 int DATABASE::AdjustColumnSize(COLUMN_ENTRY* column) const {
     const std::int16_t own = WidthsOf(column->type).record;
-    if (column->size < 0 && own > 0) {
+    if (column->size < 0 && own > 0)
         column->size = own;
-    }
     return 0;
 }
 
@@ -83,9 +81,8 @@ int DATABASE::CalculateIOBufferSize() const {
 }
 
 int DATABASE::GetColumnInfo(int index, COLUMN_ENTRY* out) {
-    if (index < 0 || index >= header_.columnCount) {
+    if (index < 0 || index >= header_.columnCount)
         return Fail(DatabaseError::InvalidColumnIndex);
-    }
     *out = columns_[index];
     return 0;
 }
@@ -96,10 +93,8 @@ int DATABASE::GetHeaderInfo(DATABASE_HEADER* out) const {
 }
 
 const COLUMN_ENTRY* DATABASE::FindColumn(const char* name) const {
-    for (int i = 0; i < header_.columnCount; ++i) {
-        if (std::strcmp(columns_[i].name, name) == 0) {
+    for (int i = 0; i < header_.columnCount; ++i)
+        if (std::strcmp(columns_[i].name, name) == 0)
             return &columns_[i];
-        }
-    }
     return nullptr;
 }

@@ -19,16 +19,14 @@ template <class T>
             return value;
         }
     }
-    for (std::size_t i = 0; i < std::min(size, sizeof(T)); ++i) {
+    for (std::size_t i = 0; i < std::min(size, sizeof(T)); ++i)
         value = static_cast<T>(value | static_cast<T>(static_cast<T>(bytes[i]) << (8 * i)));
-    }
     return value;
 }
 
 /// Writes the first min(`size`, sizeof(T)) bytes of an unsigned number.
 template <class T>
 inline void StoreLittleEndian(std::uint8_t* bytes, T value, std::size_t size = sizeof(T)) {
-    for (std::size_t i = 0; i < std::min(size, sizeof(T)); ++i) {
+    for (std::size_t i = 0; i < std::min(size, sizeof(T)); ++i)
         bytes[i] = static_cast<std::uint8_t>(value >> (8 * i));
-    }
 }

@@ -16,31 +16,24 @@ constexpr int ScanKilobytes = 64;
 } // namespace
 
 long DATABASE::Query(const char* statement, int mode) {
-    if (mode != QueryMode::New && mode != QueryMode::And && mode != QueryMode::Or) {
+    if (mode != QueryMode::New && mode != QueryMode::And && mode != QueryMode::Or)
         return Fail(DatabaseError::QueryInvalidStatement);
-    }
-    if (mode != QueryMode::New && sorted_) {
+    if (mode != QueryMode::New && sorted_)
         return Fail(DatabaseError::QueryAfterSort);
-    }
-    if (mode != QueryMode::New && !slots_) {
+    if (mode != QueryMode::New && !slots_)
         return Fail(DatabaseError::QueryNoSet);
-    }
-    if (statement == nullptr || *statement == '\0') {
+    if (statement == nullptr || *statement == '\0')
         return QueryReset();
-    }
     Condition condition;
-    if (int code = PrepareCondition(statement, &condition); code != DatabaseError::None) {
+    if (int code = PrepareCondition(statement, &condition); code != DatabaseError::None)
         return Fail(code);
-    }
     ReadCache own;
     ReadCache* reader = ScanCache(&own);
-    if (reader == nullptr) {
+    if (reader == nullptr)
         return Fail(DatabaseError::QueryNoMemoryForRecord);
-    }
     if (mode == QueryMode::New) {
-        if (!NewSlots()) {
+        if (!NewSlots())
             return Fail(DatabaseError::QueryNoMemoryForSlots);
-        }
         std::fill_n(slots_.get(), slotCount_, NotInSet);
         resultCount_ = 0;
         sorted_ = false;
@@ -50,28 +43,23 @@ long DATABASE::Query(const char* statement, int mode) {
         return Fail(code);
     }
     walkPosition_ = 0;
-    if (statement != lastStatement_) {
+    if (statement != lastStatement_)
         std::strcpy(lastStatement_, statement);
-    }
     return resultCount_;
 }
 
 int DATABASE::PrepareCondition(const char* statement, Condition* condition) const {
     STATEMENT parts{};
-    if (!SplitStatement(statement, &parts)) {
+    if (!SplitStatement(statement, &parts))
         return DatabaseError::QueryInvalidStatement;
-    }
     const COLUMN_ENTRY* column = FindColumn(parts.column);
-    if (column == nullptr) {
+    if (column == nullptr)
         return DatabaseError::QueryInvalidColumn;
-    }
     const int op = CompareOperatorOf(parts.op);
-    if (op < 0) {
+    if (op < 0)
         return DatabaseError::QueryInvalidOperator;
-    }
-    if (op == CompareOperator::Contains && column->type != ColumnType::String) {
+    if (op == CompareOperator::Contains && column->type != ColumnType::String)
         return DatabaseError::QueryContainsNeedsString;
-    }
     condition->Prepare(*column, op, parts.value, caseSensitive_);
     return DatabaseError::None;
 }
@@ -80,9 +68,8 @@ bool DATABASE::NewSlots() {
     slots_.reset(); // first, so that two sets are never held at once
     slotCount_ = 0;
     slots_ = TryAllocate<std::int32_t>(static_cast<std::size_t>(header_.recordCount));
-    if (slots_) {
+    if (slots_)
         slotCount_ = header_.recordCount;
-    }
     return slots_ != nullptr;
 }
 
@@ -106,12 +93,10 @@ int DATABASE::RunQuery(const Condition& condition, int mode, ReadCache& reader) 
             i = static_cast<std::int32_t>(std::find_if(&slots_[i], &slots_[slotCount_], canChange) -
                                           &slots_[0]);
         }
-        if (i >= slotCount_) {
+        if (i >= slotCount_)
             return DatabaseError::None;
-        }
-        if (!reader.Holds(i) && reader.FillFrom(file_, Area(), i) != 0) {
+        if (!reader.Holds(i) && reader.FillFrom(file_, Area(), i) != 0)
             return DatabaseError::QueryFailed;
-        }
         const std::int32_t count = std::min({reader.Last() + 1 - i, slotCount_ - i, BlockSize});
         MergeMatches(condition, mode, i, count, reader.Record(i));
         i += count;
@@ -129,9 +114,8 @@ void DATABASE::MergeMatches(const Condition& condition, int mode, std::int32_t f
     for (std::int32_t i = 0; i < count; ++i) {
         // Only a record that leaves (AND) or enters (NEW, OR) the set is looked at closer.
         if ((matches[i] != 0) == narrow || (slots[i] == NotInSet) == narrow ||
-            records[static_cast<std::size_t>(i) * length] == RecordStatus::Deleted) {
+            records[static_cast<std::size_t>(i) * length] == RecordStatus::Deleted)
             continue;
-        }
         slots[i] = narrow ? NotInSet : first + i;
         resultCount_ += narrow ? -1 : 1;
     }
@@ -139,9 +123,8 @@ void DATABASE::MergeMatches(const Condition& condition, int mode, std::int32_t f
 
 int DATABASE::ParseQueryStatement(const char* statement, char* column, char* op, char* value) const {
     STATEMENT parts{};
-    if (!SplitStatement(statement, &parts)) {
+    if (!SplitStatement(statement, &parts))
         return 1;
-    }
     std::memcpy(column, parts.column, TokenSize);
     std::memcpy(op, parts.op, TokenSize);
     std::memcpy(value, parts.value, TokenSize);
@@ -167,14 +150,12 @@ long DATABASE::QueryReset() {
 int DATABASE::TakeOutDeleted() {
     ReadCache own;
     ReadCache* reader = ScanCache(&own);
-    if (reader == nullptr) {
+    if (reader == nullptr)
         return DatabaseError::ResetNoMemoryForRecord;
-    }
     for (std::int32_t i = 0; i < slotCount_; ++i) {
         const std::uint8_t* record = reader->Scan(file_, Area(), i);
-        if (record == nullptr) {
+        if (record == nullptr)
             return DatabaseError::QueryFailed;
-        }
         if (*record == RecordStatus::Deleted) {
             slots_[i] = NotInSet;
             --resultCount_;
@@ -185,9 +166,8 @@ int DATABASE::TakeOutDeleted() {
 
 // The cache to read all records through: the object's, or `own` when that has none; null without memory.
 ReadCache* DATABASE::ScanCache(ReadCache* own) {
-    if (cache_.HasBuffer()) {
+    if (cache_.HasBuffer())
         return &cache_;
-    }
     return own->Resize(ScanKilobytes) ? own : nullptr;
 }
 

@@ -11,12 +11,10 @@ constexpr int MostGapBytes = 4096;            // between two changed records of 
 
 long DATABASE::QueryUpdate(const char* statement) {
     FieldChange change;
-    if (int code = PrepareChange(statement, &change); code != DatabaseError::None) {
+    if (int code = PrepareChange(statement, &change); code != DatabaseError::None)
         return Fail(code);
-    }
-    if ((lastStatement_[0] == '\0' || !slots_) && QueryReset() < 0) {
+    if ((lastStatement_[0] == '\0' || !slots_) && QueryReset() < 0)
         return -1;
-    }
     long changed = 0;
     const int code = ChangeRecords(change, &changed);
     return code == DatabaseError::None ? changed : Fail(code);
@@ -24,23 +22,18 @@ long DATABASE::QueryUpdate(const char* statement) {
 
 int DATABASE::PrepareChange(const char* statement, FieldChange* change) const {
     STATEMENT parts{};
-    if (statement == nullptr || *statement == '\0') {
+    if (statement == nullptr || *statement == '\0')
         return DatabaseError::SetInvalidOperator;
-    }
-    if (!SplitStatement(statement, &parts)) {
+    if (!SplitStatement(statement, &parts))
         return DatabaseError::SetInvalidStatement;
-    }
     const int op = SetOperatorOf(parts.op);
-    if (op < 0) {
+    if (op < 0)
         return DatabaseError::SetInvalidOperator;
-    }
     const COLUMN_ENTRY* column = FindColumn(parts.column);
-    if (column == nullptr) {
+    if (column == nullptr)
         return DatabaseError::SetInvalidColumn;
-    }
-    if (column->type == ColumnType::String && op != SetOperator::Assign) {
+    if (column->type == ColumnType::String && op != SetOperator::Assign)
         return DatabaseError::SetStringsOnly;
-    }
     return change->Prepare(*column, op, parts.value) ? DatabaseError::None : DatabaseError::SetNoMemory;
 }
 
@@ -51,9 +44,8 @@ int DATABASE::ChangeRecords(const FieldChange& change, long* changed) {
     ReadCache* reader = ScanCache(&own);
     const auto before = TryAllocate<std::uint8_t>(SpanBytes + DataSize() + 1);
     const auto sorted = TryAllocate<std::int32_t>(sorted_ ? static_cast<std::size_t>(slotCount_) : 0);
-    if (reader == nullptr || !before || !sorted) {
+    if (reader == nullptr || !before || !sorted)
         return DatabaseError::SetNoMemory;
-    }
     const std::int32_t* next = slots_.get();
     const std::int32_t* end = next + slotCount_;
     if (sorted_) {
@@ -63,18 +55,15 @@ int DATABASE::ChangeRecords(const FieldChange& change, long* changed) {
     }
     for (;;) {
         const std::span<const std::int32_t> numbers = TakeSpan(*reader, &next, end);
-        if (numbers.empty()) {
+        if (numbers.empty())
             return DatabaseError::None;
-        }
         // Always read anew: what lies between the records is written back as well.
         const std::int32_t first = numbers.front();
-        if (reader->FillSpan(file_, Area(), first, numbers.back() - first + 1) != 0) {
+        if (reader->FillSpan(file_, Area(), first, numbers.back() - first + 1) != 0)
             return DatabaseError::SetReadFailed;
-        }
         const int count = ChangeSpan(change, *reader, numbers, before.get());
-        if (count < 0) {
+        if (count < 0)
             return DatabaseError::WriteFailed;
-        }
         *changed += count;
     }
 }
@@ -107,9 +96,8 @@ int DATABASE::ChangeSpan(const FieldChange& change, ReadCache& reader, std::span
     std::int32_t last = NotInSet;
     int count = 0;
     for (const std::int32_t number : numbers) {
-        if (number == NotInSet || *reader.Record(number) == RecordStatus::Deleted) {
+        if (number == NotInSet || *reader.Record(number) == RecordStatus::Deleted)
             continue;
-        }
         std::uint8_t* record = reader.Record(number);
         std::memcpy(before + static_cast<std::size_t>(count) * length, record, length);
         *record = RecordStatus::Active;
@@ -129,9 +117,8 @@ int DATABASE::ChangeSpan(const FieldChange& change, ReadCache& reader, std::span
             before += length;
         }
     }
-    if (file_.WriteAt(Area().OffsetOf(first), reader.Record(first), bytes) != 0) {
+    if (file_.WriteAt(Area().OffsetOf(first), reader.Record(first), bytes) != 0)
         reader.Reset(); // nobody knows what the file holds there
-    }
     return -1;
 }
 

@@ -14,12 +14,10 @@ bool ReadCache::Resize(int kilobytes) {
     buffer_.reset();
     size_ = 0;
     Reset();
-    if (kilobytes == 0) {
+    if (kilobytes == 0)
         return true;
-    }
-    if (kilobytes < 0 || kilobytes > MaximumKilobytes) {
+    if (kilobytes < 0 || kilobytes > MaximumKilobytes)
         return false;
-    }
     std::int64_t size = std::max(std::int64_t{kilobytes} * 1024, std::int64_t{LongestRecord});
     buffer_ = TryAllocate<std::uint8_t>(static_cast<std::size_t>(size));
     size_ = buffer_ ? std::int64_t{kilobytes} * 1024 : 0;
@@ -53,11 +51,10 @@ int ReadCache::Fill(const File& file, const RECORD_AREA& area, std::int32_t n) {
     const std::int32_t scattered = std::clamp(ScatteredBytes / area.recordLength, 1, capacity);
     const bool downwards = n == first_ - 1;
     const bool goesOn = downwards || (n > last_ && n - last_ <= scattered);
-    if (window_ == 0 || (goesOn && window_ > capacity / 2)) {
+    if (window_ == 0 || (goesOn && window_ > capacity / 2))
         window_ = capacity;
-    } else {
+    else
         window_ = goesOn ? std::max(window_ * 2, scattered) : scattered;
-    }
     if (downwards) {
         const std::int32_t first = std::max(n - window_ + 1, 0);
         const int error = ReadRange(file, area, first, n - first + 1);
@@ -81,9 +78,8 @@ int ReadCache::ReadRange(const File& file, const RECORD_AREA& area, std::int32_t
     int error =
         file.ReadUpTo(area.OffsetOf(first), buffer_.get(), static_cast<std::size_t>(count) * length, &got);
     const auto whole = static_cast<std::int32_t>(got / length);
-    if (error == 0 && whole == 0) {
+    if (error == 0 && whole == 0)
         error = ENODATA;
-    }
     first_ = error == 0 ? first : -1;
     last_ = error == 0 ? first + whole - 1 : -1;
     recordLength_ = area.recordLength;

@@ -89,9 +89,8 @@ std::uint32_t Number(const std::uint8_t* field, std::size_t width) {
 }
 
 std::uint8_t ByteIn(std::string_view text, bool character) {
-    if (character) {
+    if (character)
         return static_cast<std::uint8_t>(text.empty() ? 0 : text.front());
-    }
     return static_cast<std::uint8_t>(WholeNumber(text.data()));
 }
 
@@ -135,9 +134,8 @@ void StoreField(const COLUMN_ENTRY& column, std::string_view text, bool byteChar
 } // namespace
 
 FieldSplitter::FieldSplitter(const char* separators) {
-    for (; separators != nullptr && *separators != '\0'; ++separators) {
+    for (; separators != nullptr && *separators != '\0'; ++separators)
         separators_[static_cast<unsigned char>(*separators)] = true;
-    }
 }
 
 bool FieldSplitter::IsBlank(std::string_view line) const {
@@ -165,17 +163,15 @@ std::string_view FieldSplitter::Next() {
 
 int FieldSplitter::Count() {
     int count = 0;
-    while (!Next().empty()) {
+    while (!Next().empty())
         ++count;
-    }
     return count;
 }
 
 std::size_t RecordText::LongestLine(std::size_t separatorSize) const {
     std::size_t longest = 1 + columns_.size() * separatorSize;
-    for (const COLUMN_ENTRY& column : columns_) {
+    for (const COLUMN_ENTRY& column : columns_)
         longest += std::max(LongestField(column), NameOf(column).size());
-    }
     return longest;
 }
 
@@ -225,7 +221,6 @@ char* RecordText::FormatField(const COLUMN_ENTRY& column, const std::uint8_t* fi
 }
 
 void RecordText::Parse(FieldSplitter& fields, std::uint8_t* data) const {
-    for (const COLUMN_ENTRY& column : columns_) {
+    for (const COLUMN_ENTRY& column : columns_)
         StoreField(column, fields.Next(), byteCharacters_, data + column.offset);
-    }
 }

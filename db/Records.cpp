@@ -6,43 +6,35 @@
 #include "db/Database.h"
 
 int DATABASE::PrepareAppend(std::int32_t count) {
-    if (!IsOpen()) {
+    if (!IsOpen())
         return DatabaseError::AppendNoFile;
-    }
-    if (fileCounts_ == FileCounts::TooMany) {
+    if (fileCounts_ == FileCounts::TooMany)
         return DatabaseError::AppendDamaged;
-    }
-    if (count > std::numeric_limits<std::int32_t>::max() - header_.recordCount) {
+    if (count > std::numeric_limits<std::int32_t>::max() - header_.recordCount)
         return DatabaseError::AppendFull;
-    }
     // What an AppendAll that was killed left behind the counted records is cut off while the header tells of
     // it.
     if (header_.reserved != 0) {
-        if (file_.Truncate(Area().OffsetOf(header_.recordCount)) != 0) {
+        if (file_.Truncate(Area().OffsetOf(header_.recordCount)) != 0)
             return DatabaseError::AppendFailed;
-        }
         header_.reserved = 0;
     }
     return DatabaseError::None;
 }
 
 long DATABASE::AppendAll(const void* data, std::size_t stride, std::int32_t count) {
-    if (const int code = PrepareAppend(count); code != DatabaseError::None) {
+    if (const int code = PrepareAppend(count); code != DatabaseError::None)
         return Fail(code);
-    }
     const std::int32_t number = header_.recordCount;
-    if (count <= 0) {
+    if (count <= 0)
         return number;
-    }
     header_.reserved = count;
     int code = WriteDbHeader() == 0 ? DatabaseError::None : DatabaseError::HeaderFailed;
     if (code == DatabaseError::None &&
-        WriteNewRecords(static_cast<const std::uint8_t*>(data), stride, count) != 0) {
+        WriteNewRecords(static_cast<const std::uint8_t*>(data), stride, count) != 0)
         code = DatabaseError::AppendFailed;
-    }
-    if (code == DatabaseError::None) {
+    if (code == DatabaseError::None)
         code = CountNewRecords(count);
-    }
     if (code != DatabaseError::None) {
         // While the header still announces them. What cannot be cut off now stays announced, for the next
         // append to cut it.
@@ -60,9 +52,8 @@ int DATABASE::CountNewRecords(std::int32_t count) {
     const DATABASE_HEADER before = header_;
     header_.recordCount += count;
     header_.reserved = 0;
-    if (WriteDbHeader() == 0) {
+    if (WriteDbHeader() == 0)
         return DatabaseError::None;
-    }
     header_ = before;
     static_cast<void>(WriteHeaderBytes()); // part of the new header may have been written
     return DatabaseError::HeaderFailed;
@@ -74,9 +65,8 @@ int DATABASE::WriteNewRecords(const std::uint8_t* data, std::size_t stride, std:
     const auto perBlock = static_cast<std::int32_t>(std::max<std::size_t>(blockSize / length, 1));
     const auto block =
         TryAllocate<std::uint8_t>(length * static_cast<std::size_t>(std::min(perBlock, count)));
-    if (!block) {
+    if (!block)
         return -1;
-    }
     for (std::int32_t first = 0; first < count; first += perBlock) {
         const std::int32_t records = std::min(perBlock, count - first);
         std::uint8_t* end = block.get();
@@ -85,17 +75,15 @@ int DATABASE::WriteNewRecords(const std::uint8_t* data, std::size_t stride, std:
             std::memcpy(end + 1, data, DataSize());
         }
         if (file_.WriteAt(Area().OffsetOf(header_.recordCount + first), block.get(),
-                          static_cast<std::size_t>(end - block.get())) != 0) {
+                          static_cast<std::size_t>(end - block.get())) != 0)
             return -1;
-        }
     }
     return 0;
 }
 
 long DATABASE::Append(const void* data) {
-    if (const int code = PrepareAppend(1); code != DatabaseError::None) {
+    if (const int code = PrepareAppend(1); code != DatabaseError::None)
         return Fail(code);
-    }
     const std::int32_t number = header_.recordCount;
     std::uint8_t record[LongestRecord];
     record[0] = RecordStatus::Active;
@@ -105,9 +93,8 @@ long DATABASE::Append(const void* data) {
         static_cast<void>(file_.Truncate(end)); // bytes behind the last record do no harm if this fails too
         return Fail(DatabaseError::AppendFailed);
     }
-    if (ChangeCounts(number + 1, header_.deletedCount) != 0) {
+    if (ChangeCounts(number + 1, header_.deletedCount) != 0)
         return Fail(DatabaseError::HeaderFailed);
-    }
     currentRecord_ = number;
     return number;
 }
@@ -123,22 +110,19 @@ int DATABASE::UnBufferedRead(long n, void* data) {
 }
 
 int DATABASE::FetchRecord(long n, void* data, bool cached) {
-    if (!IsRecordNumber(n)) {
+    if (!IsRecordNumber(n))
         return DatabaseError::ReadInvalidRecord;
-    }
     std::uint8_t bytes[LongestRecord];
     const std::uint8_t* record = bytes;
     if (cached) {
-        if (!cache_.Holds(n) && cache_.Fill(file_, Area(), static_cast<std::int32_t>(n)) != 0) {
+        if (!cache_.Holds(n) && cache_.Fill(file_, Area(), static_cast<std::int32_t>(n)) != 0)
             return DatabaseError::ReadFailed;
-        }
         record = cache_.Record(n);
     } else if (file_.ReadAt(Area().OffsetOf(n), bytes, DataSize() + 1) != 0) {
         return DatabaseError::ReadFailed;
     }
-    if (*record == RecordStatus::Deleted) {
+    if (*record == RecordStatus::Deleted)
         return DatabaseError::ReadDeleted;
-    }
     std::memcpy(data, record + 1, DataSize());
     currentRecord_ = static_cast<std::int32_t>(n);
     return DatabaseError::None;
@@ -149,18 +133,15 @@ int DATABASE::Update(const void* data) {
 }
 
 int DATABASE::Write(long n, const void* data) {
-    if (!IsRecordNumber(n)) {
+    if (!IsRecordNumber(n))
         return Fail(DatabaseError::WriteInvalidRecord);
-    }
     const std::int64_t offset = Area().OffsetOf(n);
     const std::size_t length = DataSize() + 1;
     std::uint8_t before[LongestRecord];
-    if (file_.ReadAt(offset, before, length) != 0) {
+    if (file_.ReadAt(offset, before, length) != 0)
         return Fail(DatabaseError::WriteFailed);
-    }
-    if (before[0] == RecordStatus::Deleted) {
+    if (before[0] == RecordStatus::Deleted)
         return Fail(DatabaseError::WriteDeleted);
-    }
     std::uint8_t after[LongestRecord];
     after[0] = RecordStatus::Active;
     std::memcpy(after + 1, data, length - 1);
@@ -176,9 +157,8 @@ int DATABASE::Write(long n, const void* data) {
 
 // Reads the status byte of record n. On failure the pending error is one of the two given.
 int DATABASE::LookUpStatus(long n, int invalidRecord, int readFailed, std::uint8_t* status) {
-    if (!IsRecordNumber(n)) {
+    if (!IsRecordNumber(n))
         return Fail(invalidRecord);
-    }
     return file_.ReadAt(Area().OffsetOf(n), status, 1) == 0 ? 0 : Fail(readFailed);
 }
 
@@ -191,9 +171,8 @@ int DATABASE::ChangeCounts(std::int32_t recordCount, std::int32_t deletedCount) 
     const DATABASE_HEADER before = header_;
     header_.recordCount = recordCount;
     header_.deletedCount = deletedCount;
-    if (WriteDbHeader() == 0) {
+    if (WriteDbHeader() == 0)
         return 0;
-    }
     header_ = before;
     static_cast<void>(WriteHeaderBytes()); // part of the new header may have been written
     return -1;
@@ -201,15 +180,12 @@ int DATABASE::ChangeCounts(std::int32_t recordCount, std::int32_t deletedCount) 
 
 int DATABASE::Delete(long n) {
     std::uint8_t status = 0;
-    if (LookUpStatus(n, DatabaseError::DeleteInvalidRecord, DatabaseError::DeleteFailed, &status) != 0) {
+    if (LookUpStatus(n, DatabaseError::DeleteInvalidRecord, DatabaseError::DeleteFailed, &status) != 0)
         return -1;
-    }
-    if (status == RecordStatus::Deleted) {
+    if (status == RecordStatus::Deleted)
         return Fail(DatabaseError::DeleteDeleted);
-    }
-    if (int code = ChangeStatus(n, status, RecordStatus::Deleted, DatabaseError::DeleteFailed); code != 0) {
+    if (int code = ChangeStatus(n, status, RecordStatus::Deleted, DatabaseError::DeleteFailed); code != 0)
         return Fail(code);
-    }
     currentRecord_ = -1;
     RemoveFromResultSet(n);
     return 0;
@@ -217,15 +193,12 @@ int DATABASE::Delete(long n) {
 
 int DATABASE::UnDelete(long n) {
     std::uint8_t status = 0;
-    if (LookUpStatus(n, DatabaseError::UnDeleteInvalidRecord, DatabaseError::UnDeleteFailed, &status) != 0) {
+    if (LookUpStatus(n, DatabaseError::UnDeleteInvalidRecord, DatabaseError::UnDeleteFailed, &status) != 0)
         return -1;
-    }
-    if (status != RecordStatus::Deleted) {
+    if (status != RecordStatus::Deleted)
         return Fail(DatabaseError::UnDeleteNotDeleted);
-    }
-    if (int code = ChangeStatus(n, status, RecordStatus::Active, DatabaseError::UnDeleteFailed); code != 0) {
+    if (int code = ChangeStatus(n, status, RecordStatus::Active, DatabaseError::UnDeleteFailed); code != 0)
         return Fail(code);
-    }
     currentRecord_ = static_cast<std::int32_t>(n);
     return 0;
 }
@@ -233,9 +206,8 @@ int DATABASE::UnDelete(long n) {
 // Takes a record into or out of the deleted ones, the counts with it. Returns an error code; after a failure
 // the record is what it was.
 int DATABASE::ChangeStatus(long n, std::uint8_t from, std::uint8_t to, int failure) {
-    if (WriteStatus(n, to) != 0) {
+    if (WriteStatus(n, to) != 0)
         return failure;
-    }
     cache_.Clear();
     // A count that an interrupted run left too low stays in its range.
     const std::int32_t deleted = to == RecordStatus::Deleted
@@ -263,47 +235,37 @@ void DATABASE::RemoveFromResultSet(long n) {
 
 int DATABASE::Lock(long n) {
     std::uint8_t status = 0;
-    if (LookUpStatus(n, DatabaseError::LockInvalidRecord, DatabaseError::LockFailed, &status) != 0) {
+    if (LookUpStatus(n, DatabaseError::LockInvalidRecord, DatabaseError::LockFailed, &status) != 0)
         return -1;
-    }
-    if (status == RecordStatus::Deleted) {
+    if (status == RecordStatus::Deleted)
         return Fail(DatabaseError::LockDeleted);
-    }
-    if (status == RecordStatus::Locked) {
+    if (status == RecordStatus::Locked)
         return Fail(DatabaseError::LockLocked);
-    }
-    if (WriteStatus(n, RecordStatus::Locked) != 0) {
+    if (WriteStatus(n, RecordStatus::Locked) != 0)
         return Fail(DatabaseError::LockFailed);
-    }
     currentRecord_ = static_cast<std::int32_t>(n);
     return 0;
 }
 
 int DATABASE::IsLocked(long n) {
     std::uint8_t status = 0;
-    if (LookUpStatus(n, DatabaseError::IsLockedInvalidRecord, DatabaseError::IsLockedFailed, &status) != 0) {
+    if (LookUpStatus(n, DatabaseError::IsLockedInvalidRecord, DatabaseError::IsLockedFailed, &status) != 0)
         return -1;
-    }
-    if (status == RecordStatus::Deleted) {
+    if (status == RecordStatus::Deleted)
         return Fail(DatabaseError::IsLockedDeleted);
-    }
     return status == RecordStatus::Locked ? 1 : 0;
 }
 
 int DATABASE::UnLock(long n) {
     std::uint8_t status = 0;
-    if (LookUpStatus(n, DatabaseError::UnLockInvalidRecord, DatabaseError::UnLockFailed, &status) != 0) {
+    if (LookUpStatus(n, DatabaseError::UnLockInvalidRecord, DatabaseError::UnLockFailed, &status) != 0)
         return -1;
-    }
-    if (status == RecordStatus::Deleted) {
+    if (status == RecordStatus::Deleted)
         return Fail(DatabaseError::UnLockDeleted);
-    }
-    if (status != RecordStatus::Locked) {
+    if (status != RecordStatus::Locked)
         return Fail(DatabaseError::UnLockNotLocked);
-    }
-    if (WriteStatus(n, RecordStatus::Active) != 0) {
+    if (WriteStatus(n, RecordStatus::Active) != 0)
         return Fail(DatabaseError::UnLockFailed);
-    }
     currentRecord_ = static_cast<std::int32_t>(n);
     return 0;
 }
@@ -318,9 +280,8 @@ long DATABASE::GetNumberOfActiveRecords() const {
 
 int DATABASE::GetLastError(char* message) {
     const int code = lastError_;
-    if (message != nullptr) {
+    if (message != nullptr)
         std::strcpy(message, ErrorMessage(code));
-    }
     lastError_ = DatabaseError::None;
     return code;
 }

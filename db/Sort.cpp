@@ -5,22 +5,17 @@
 
 int DATABASE::SortBy(const char* column, int /*ignored*/) {
     const COLUMN_ENTRY* by = column != nullptr ? FindColumn(column) : nullptr;
-    if (by == nullptr) {
+    if (by == nullptr)
         return Fail(DatabaseError::SortInvalidColumn);
-    }
-    if (!slots_ && QueryReset() < 0) {
+    if (!slots_ && QueryReset() < 0)
         return -1;
-    }
-    if (resultCount_ < 2) {
+    if (resultCount_ < 2)
         return 0;
-    }
     SortKeys keys;
-    if (!keys.Prepare(*by, resultCount_)) {
+    if (!keys.Prepare(*by, resultCount_))
         return Fail(DatabaseError::SortNoMemoryForKeys);
-    }
-    if (const int code = ReadSortKeys(&keys); code != DatabaseError::None) {
+    if (const int code = ReadSortKeys(&keys); code != DatabaseError::None)
         return Fail(code);
-    }
     keys.Sort();
     TakeSortOrder(keys);
     return 0;
@@ -30,28 +25,22 @@ int DATABASE::SortBy(const char* column, int /*ignored*/) {
 int DATABASE::ReadSortKeys(SortKeys* keys) {
     ReadCache own;
     ReadCache* reader = ScanCache(&own);
-    if (reader == nullptr) {
+    if (reader == nullptr)
         return DatabaseError::SortNoMemoryForFirstRecord;
-    }
-    for (std::int32_t i = 0; i < slotCount_; ++i) {
-        if (slots_[i] != NotInSet) {
+    for (std::int32_t i = 0; i < slotCount_; ++i)
+        if (slots_[i] != NotInSet)
             keys->Add(i, slots_[i]);
-        }
-    }
-    if (sorted_) {
+    if (sorted_)
         keys->OrderByRecord();
-    }
     for (SortKeys::ENTRY& entry : keys->Entries()) {
         const std::int32_t number = slots_[entry.slot];
-        if (!reader->Holds(number) && reader->Fill(file_, Area(), number) != 0) {
+        if (!reader->Holds(number) && reader->Fill(file_, Area(), number) != 0)
             return DatabaseError::SortReadFailed;
-        }
         const std::uint8_t* record = reader->Record(number);
-        if (*record == RecordStatus::Deleted) {
+        if (*record == RecordStatus::Deleted)
             SortKeys::SetGone(&entry);
-        } else {
+        else
             keys->SetKey(&entry, record + 1);
-        }
     }
     return DatabaseError::None;
 }
@@ -64,15 +53,12 @@ void DATABASE::TakeSortOrder(const SortKeys& keys) {
         --resultCount_;
     }
     const std::span<SortKeys::ENTRY> sorted = keys.Sorted();
-    for (SortKeys::ENTRY& entry : sorted) {
+    for (SortKeys::ENTRY& entry : sorted)
         entry.word = static_cast<std::uint32_t>(slots_[entry.slot]); // the record, before its slot is taken
-    }
     auto entry = sorted.begin();
-    for (std::int32_t i = 0; i < slotCount_; ++i) {
-        if (slots_[i] != NotInSet) {
+    for (std::int32_t i = 0; i < slotCount_; ++i)
+        if (slots_[i] != NotInSet)
             slots_[i] = static_cast<std::int32_t>((entry++)->word);
-        }
-    }
     sorted_ = true;
 }
 
@@ -80,9 +66,8 @@ void DATABASE::GetNextSortSlots(long* first, long* second) const {
     const auto next = [this](long slot) {
         for (slot = std::max(slot, -1L); slot < header_.recordCount;) {
             ++slot;
-            if (slot < slotCount_ && slots_[slot] != NotInSet) {
+            if (slot < slotCount_ && slots_[slot] != NotInSet)
                 return slot;
-            }
         }
         return static_cast<long>(header_.recordCount);
     };

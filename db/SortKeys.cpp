@@ -23,9 +23,8 @@ std::uint64_t OrderedWhole(std::int64_t value) {
 }
 
 std::uint64_t OrderedFloat(float value) {
-    if (std::isnan(value)) {
+    if (std::isnan(value))
         return NotANumber;
-    }
     constexpr std::uint32_t sign = std::uint32_t{1} << 31;
     const auto bits = std::bit_cast<std::uint32_t>(value == 0 ? 0.0F : value); // -0 and 0 are equal
     return (bits & sign) != 0 ? ~bits : bits | sign;
@@ -67,11 +66,9 @@ std::size_t ByteOf(std::uint64_t word, int byte) {
 using COUNTS = std::array<std::array<std::uint32_t, ByteValues>, ByteCount>;
 
 void CountBytes(std::span<const SortKeys::ENTRY> entries, COUNTS* counts) {
-    for (const SortKeys::ENTRY& entry : entries) {
-        for (int byte = 0; byte < ByteCount; ++byte) {
+    for (const SortKeys::ENTRY& entry : entries)
+        for (int byte = 0; byte < ByteCount; ++byte)
             ++(*counts)[static_cast<std::size_t>(byte)][ByteOf(entry.word, byte)];
-        }
-    }
 }
 
 // Sorts by bytes; `scratch` has room for as many entries.
@@ -82,18 +79,15 @@ void SortByBytes(std::span<SortKeys::ENTRY> entries, SortKeys::ENTRY* scratch) {
     SortKeys::ENTRY* to = scratch;
     for (int byte = 0; byte < ByteCount; ++byte) {
         auto& places = counts[static_cast<std::size_t>(byte)];
-        if (places[ByteOf(entries.front().word, byte)] == entries.size()) {
+        if (places[ByteOf(entries.front().word, byte)] == entries.size())
             continue; // the same in all
-        }
         std::exclusive_scan(places.begin(), places.end(), places.begin(), 0U);
-        for (const SortKeys::ENTRY* entry = from; entry != from + entries.size(); ++entry) {
+        for (const SortKeys::ENTRY* entry = from; entry != from + entries.size(); ++entry)
             to[places[ByteOf(entry->word, byte)]++] = *entry;
-        }
         std::swap(from, to);
     }
-    if (from != entries.data()) {
+    if (from != entries.data())
         std::copy_n(from, entries.size(), entries.data());
-    }
 }
 
 } // namespace
@@ -122,11 +116,10 @@ void SortKeys::OrderByRecord() {
 
 void SortKeys::SetKey(ENTRY* entry, const std::uint8_t* data) {
     const std::uint8_t* field = data + column_.offset;
-    if (column_.type == ColumnType::String) {
+    if (column_.type == ColumnType::String)
         StoreText(field, entry->index);
-    } else {
+    else
         entry->word = OrderedNumber(column_.type, field, static_cast<std::size_t>(column_.size));
-    }
 }
 
 // Texts are kept as numbers of which the first byte is the highest, so that comparing numbers compares texts.
@@ -139,27 +132,24 @@ void SortKeys::StoreText(const std::uint8_t* field, std::int32_t index) {
     std::memset(bytes + length, 0, words_ * sizeof(std::uint64_t) - length);
     for (std::size_t i = 0; i < words_; ++i, bytes += sizeof(std::uint64_t)) {
         std::uint64_t word = 0;
-        for (std::size_t at = 0; at < sizeof(std::uint64_t); ++at) {
+        for (std::size_t at = 0; at < sizeof(std::uint64_t); ++at)
             word = word << 8 | bytes[at];
-        }
         text[i] = word;
     }
 }
 
 void SortKeys::Sort() {
     RestoreOrder();
-    if (words_ > 0) {
+    if (words_ > 0)
         SortTexts(Sorted(), 0);
-    } else {
+    else
         SortNumbers();
-    }
 }
 
 // Puts the entries that have a key back into the order in which they were added, the others behind them.
 void SortKeys::RestoreOrder() {
-    for (const ENTRY& entry : Entries()) {
+    for (const ENTRY& entry : Entries())
         scratch_[entry.index] = entry;
-    }
     keys_ = 0;
     ENTRY* gone = entries_.get() + count_;
     for (std::int32_t i = 0; i < count_; ++i) {
@@ -185,20 +175,17 @@ void SortKeys::SortNumbers() {
 
 // Sorts entries that agree in `depth` words and stand in the order in which they were added.
 void SortKeys::SortTexts(std::span<ENTRY> entries, std::size_t depth) {
-    for (ENTRY& entry : entries) {
+    for (ENTRY& entry : entries)
         entry.word = texts_[static_cast<std::size_t>(entry.index) * words_ + depth];
-    }
     SortByWord(entries);
-    if (depth + 1 == words_) {
+    if (depth + 1 == words_)
         return;
-    }
     for (auto group = entries.begin(); group != entries.end();) {
         const std::uint64_t word = group->word;
         const auto end =
             std::find_if(group, entries.end(), [word](const ENTRY& entry) { return entry.word != word; });
-        if (end - group > 1 && !IsLastWord(word)) {
+        if (end - group > 1 && !IsLastWord(word))
             SortTexts({group, end}, depth + 1);
-        }
         group = end;
     }
 }
@@ -206,13 +193,14 @@ void SortKeys::SortTexts(std::span<ENTRY> entries, std::size_t depth) {
 // Sorts by word; entries with the same one keep their order.
 void SortKeys::SortByWord(std::span<ENTRY> entries) {
     const auto less = [](const ENTRY& a, const ENTRY& b) { return a.word < b.word; };
-    if (std::is_sorted(entries.begin(), entries.end(), less)) {
+    if (std::is_sorted(entries.begin(), entries.end(), less))
         return; // as when all are the same
-    }
     if (entries.size() < FewEntries) {
-        std::sort(entries.begin(), entries.end(), [](const ENTRY& a, const ENTRY& b) {
-            return a.word != b.word ? a.word < b.word : a.index < b.index;
-        });
+        std::sort(
+            entries.begin(), entries.end(),
+            [](const ENTRY& a, const ENTRY& b) {
+                return a.word != b.word ? a.word < b.word : a.index < b.index;
+            });
     } else {
         SortByBytes(entries, scratch_.get());
     }

@@ -18,14 +18,12 @@ constexpr const char* ValueDelimiters = "\t\n\r";
 // Takes the next token off `rest`, the delimiter that ended it included.
 bool TakeToken(std::string_view* rest, const char* delimiters, char (&token)[TokenSize]) {
     std::size_t begin = rest->find_first_not_of(delimiters);
-    if (begin == std::string_view::npos) {
+    if (begin == std::string_view::npos)
         return false;
-    }
     std::size_t end = rest->find_first_of(delimiters, begin);
     std::string_view text = rest->substr(begin, end == std::string_view::npos ? end : end - begin);
-    if (text.size() >= TokenSize) {
+    if (text.size() >= TokenSize)
         return false;
-    }
     text.copy(token, text.size());
     token[text.size()] = '\0';
     *rest = end == std::string_view::npos ? std::string_view() : rest->substr(end + 1);
@@ -36,20 +34,17 @@ bool TakeToken(std::string_view* rest, const char* delimiters, char (&token)[Tok
 std::array<std::int32_t, 3> DigitGroups(const char* digits, std::array<int, 3> widths) {
     std::array<std::int32_t, 3> numbers{};
     digits += std::strspn(digits, " ");
-    for (std::size_t group = 0; group < widths.size(); ++group) {
-        for (int i = 0; i < widths[group] && *digits >= '0' && *digits <= '9'; ++i, ++digits) {
+    for (std::size_t group = 0; group < widths.size(); ++group)
+        for (int i = 0; i < widths[group] && *digits >= '0' && *digits <= '9'; ++i, ++digits)
             numbers[group] = numbers[group] * 10 + (*digits - '0');
-        }
-    }
     return numbers;
 }
 
 } // namespace
 
 bool SplitStatement(const char* statement, STATEMENT* result) {
-    if (statement == nullptr) {
+    if (statement == nullptr)
         return false;
-    }
     std::string_view rest(statement, strnlen(statement, LongestStatement + 1));
     return rest.size() <= LongestStatement && TakeToken(&rest, Delimiters, result->column) &&
            TakeToken(&rest, Delimiters, result->op) && TakeToken(&rest, ValueDelimiters, result->value);
@@ -64,14 +59,12 @@ float SingleNumber(const char* text) {
     constexpr double roundsToInfinity = 0x1.ffffffp127; // half a unit beyond the largest
     constexpr float infinity = std::numeric_limits<float>::infinity();
     const std::string_view word(text);
-    if (word == "nan") {
+    if (word == "nan")
         return std::numeric_limits<float>::quiet_NaN();
-    }
     double number = 0;
     if (word == "inf" || word == "-inf" || !ReadDecimal(text, &number) ||
-        std::abs(number) >= roundsToInfinity) {
+        std::abs(number) >= roundsToInfinity)
         return word.find_first_not_of(" \t\n\v\f\r") == word.find('-') ? -infinity : infinity;
-    }
     return static_cast<float>(std::clamp<double>(number, -largest, largest));
 }
 

@@ -25,9 +25,8 @@ struct DATABASE::EXPORT {
     // Both are false when the text file could not be written.
     [[nodiscard]] bool WriteHeading() {
         char* line = writer.Room();
-        if (line != nullptr) {
+        if (line != nullptr)
             writer.Take(text.FormatHeading(separator, line));
-        }
         return line != nullptr;
     }
     [[nodiscard]] bool Write(const std::uint8_t* data) {
@@ -63,30 +62,24 @@ void DATABASE::FormatRecordData(std::string* line, const void* record, const cha
 }
 
 long DATABASE::Export(const char* path, int all, const char* separator) {
-    if (!IsOpen()) {
+    if (!IsOpen())
         return Fail(DatabaseError::ExportNoFile);
-    }
     const RecordText text = Text(byteOutputFormat_);
     File file(operations_);
     TextWriter writer(file);
     EXPORT work{text, writer, TextOrNone(separator)};
-    if (!writer.Prepare(text.LongestLine(work.separator.size()))) {
+    if (!writer.Prepare(text.LongestLine(work.separator.size())))
         return Fail(DatabaseError::ExportNoMemoryForLine);
-    }
     // The file's old text goes when nothing but reading and writing can fail any more.
-    if (all == 0 && !slots_ && QueryReset() < 0) {
+    if (all == 0 && !slots_ && QueryReset() < 0)
         return -1;
-    }
-    if (!OpenForExport(path, &file)) {
+    if (!OpenForExport(path, &file))
         return Fail(DatabaseError::ExportOpenFailed);
-    }
     int code = DatabaseError::ExportWriteFailed;
-    if (!headingLine_ || work.WriteHeading()) {
+    if (!headingLine_ || work.WriteHeading())
         code = all != 0 ? ExportAll(work) : ExportResultSet(work);
-    }
-    if (code == DatabaseError::None && writer.Flush() != 0) {
+    if (code == DatabaseError::None && writer.Flush() != 0)
         code = DatabaseError::ExportWriteFailed;
-    }
     return code == DatabaseError::None ? work.lines : Fail(code);
 }
 
@@ -99,17 +92,14 @@ bool DATABASE::OpenForExport(const char* path, File* file) const {
 int DATABASE::ExportAll(EXPORT& work) {
     ReadCache own;
     ReadCache* reader = ScanCache(&own);
-    if (reader == nullptr) {
+    if (reader == nullptr)
         return DatabaseError::ExportNoMemoryForRecord;
-    }
     for (std::int32_t i = 0; i < header_.recordCount; ++i) {
         const std::uint8_t* record = reader->Scan(file_, Area(), i);
-        if (record == nullptr) {
+        if (record == nullptr)
             return DatabaseError::ExportReadFailed;
-        }
-        if (*record != RecordStatus::Deleted && !work.Write(record + 1)) {
+        if (*record != RecordStatus::Deleted && !work.Write(record + 1))
             return DatabaseError::ExportWriteFailed;
-        }
     }
     return DatabaseError::None;
 }
@@ -117,15 +107,12 @@ int DATABASE::ExportAll(EXPORT& work) {
 int DATABASE::ExportResultSet(EXPORT& work) {
     bool found = false;
     for (long start = 0;; start = -1) {
-        if (MoveWalk(start, 1, &found) != DatabaseError::None) {
+        if (MoveWalk(start, 1, &found) != DatabaseError::None)
             return DatabaseError::ExportReadFailed;
-        }
-        if (!found) {
+        if (!found)
             return DatabaseError::None;
-        }
-        if (!work.Write(recordBuffer_.get())) {
+        if (!work.Write(recordBuffer_.get()))
             return DatabaseError::ExportWriteFailed;
-        }
     }
 }
 
@@ -137,34 +124,28 @@ std::size_t DATABASE::LongestLoadLine() const {
 
 long DATABASE::Load(const char* path, const char* separators) {
     constexpr std::int32_t batchBytes = 256 * 1024;
-    if (!IsOpen()) {
+    if (!IsOpen())
         return Fail(DatabaseError::LoadNoFile);
-    }
     File file(operations_);
     // The data file would grow while it is read.
-    if (path == nullptr || file_.IsAt(path) || file.Open(path, FileMode::ReadOnly) != 0) {
+    if (path == nullptr || file_.IsAt(path) || file.Open(path, FileMode::ReadOnly) != 0)
         return Fail(DatabaseError::LoadOpenFailed);
-    }
     const RecordText text = Text(byteInputFormat_);
     LineReader reader(file);
-    if (!reader.Prepare(LongestLoadLine())) {
+    if (!reader.Prepare(LongestLoadLine()))
         return Fail(DatabaseError::LoadNoMemoryForLine);
-    }
-    if (byteOrderMark_ && reader.PassByteOrderMark() != 0) {
+    if (byteOrderMark_ && reader.PassByteOrderMark() != 0)
         return Fail(DatabaseError::LoadReadFailed);
-    }
     const std::int32_t batchRecords = std::max(batchBytes / header_.recordLength, 1);
     const auto batch = TryAllocate<std::uint8_t>(static_cast<std::size_t>(batchRecords) * DataSize());
-    if (!batch) {
+    if (!batch)
         return Fail(DatabaseError::LoadNoMemoryForRecord);
-    }
     std::fill_n(batch.get(), static_cast<std::size_t>(batchRecords) * DataSize(), std::uint8_t{0});
     FieldSplitter fields(separators);
     LOAD work{text, reader, fields, batch.get(), batchRecords};
     int code = CheckFirstLine(work);
-    if (code == DatabaseError::None) {
+    if (code == DatabaseError::None)
         code = LoadLines(work);
-    }
     return code == DatabaseError::None ? work.records : Fail(code);
 }
 
@@ -177,17 +158,14 @@ bool DATABASE::BeginLines(LOAD& work) const {
 
 // The first line that is not blank must have as many fields as there are columns.
 int DATABASE::CheckFirstLine(LOAD& work) const {
-    if (!BeginLines(work)) {
+    if (!BeginLines(work))
         return DatabaseError::LoadReadFailed;
-    }
     for (;;) {
         std::span<char> line;
-        if (work.reader.Next(&line) != 0) {
+        if (work.reader.Next(&line) != 0)
             return DatabaseError::LoadReadFailed;
-        }
-        if (line.empty()) {
+        if (line.empty())
             return DatabaseError::None;
-        }
         if (!work.fields.IsBlank({line.data(), line.size()})) {
             work.fields.Begin(line);
             return work.fields.Count() == header_.columnCount ? DatabaseError::None
@@ -197,9 +175,8 @@ int DATABASE::CheckFirstLine(LOAD& work) const {
 }
 
 int DATABASE::LoadLines(LOAD& work) {
-    if (!BeginLines(work)) {
+    if (!BeginLines(work))
         return DatabaseError::LoadReadFailed;
-    }
     std::int32_t waiting = 0; // records in the batch
     for (;;) {
         std::span<char> line;
@@ -211,14 +188,12 @@ int DATABASE::LoadLines(LOAD& work) {
             ++waiting;
         }
         if (waiting == work.batchRecords || over) {
-            if (AppendAll(work.batch, DataSize(), waiting) < 0) {
+            if (AppendAll(work.batch, DataSize(), waiting) < 0)
                 return lastError_;
-            }
             work.records += waiting;
             waiting = 0;
         }
-        if (over) {
+        if (over)
             return error == 0 ? DatabaseError::None : DatabaseError::LoadReadFailed;
-        }
     }
 }

@@ -23,20 +23,17 @@ int LineReader::Next(std::span<char>* line) {
     while (newline == nullptr && length < longest_) {
         if (next_ == end_) {
             next_ = 0;
-            if (const int error = file_.ReadUpTo(offset_, block_.get(), BlockSize, &end_); error != 0) {
+            if (const int error = file_.ReadUpTo(offset_, block_.get(), BlockSize, &end_); error != 0)
                 return error;
-            }
             offset_ += static_cast<std::int64_t>(end_);
-            if (end_ == 0) {
+            if (end_ == 0)
                 break;
-            }
         }
         const char* begin = block_.get() + next_;
         std::size_t count = std::min(end_ - next_, longest_ - length);
         newline = std::memchr(begin, '\n', count);
-        if (newline != nullptr) {
+        if (newline != nullptr)
             count = static_cast<std::size_t>(static_cast<const char*>(newline) - begin) + 1;
-        }
         std::memcpy(line_.get() + length, begin, count);
         length += count;
         next_ += count;
@@ -56,9 +53,8 @@ int LineReader::PassByteOrderMark() {
     char beginning[mark.size()];
     std::size_t length = 0;
     const int error = file_.ReadUpTo(0, beginning, sizeof(beginning), &length);
-    if (error == 0 && std::string_view(beginning, length) == mark) {
+    if (error == 0 && std::string_view(beginning, length) == mark)
         start_ = mark.size();
-    }
     Rewind();
     return error;
 }
@@ -71,9 +67,8 @@ bool TextWriter::Prepare(std::size_t longest) {
 }
 
 char* TextWriter::Room() {
-    if (size_ - used_ < longest_ && Flush() != 0) {
+    if (size_ - used_ < longest_ && Flush() != 0)
         return nullptr;
-    }
     return block_.get() + used_;
 }
 

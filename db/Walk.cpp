@@ -7,9 +7,8 @@ namespace {
 // A position outside the numbers' range stays at its end: still outside the set.
 long Moved(long position, long step) {
     long moved = 0;
-    if (!__builtin_add_overflow(position, step, &moved)) {
+    if (!__builtin_add_overflow(position, step, &moved))
         return moved;
-    }
     return step < 0 ? std::numeric_limits<long>::min() : std::numeric_limits<long>::max();
 }
 
@@ -32,16 +31,13 @@ void* DATABASE::QueryGetPrev(long* record) {
 }
 
 void* DATABASE::QueryGetXXX(long start, long step, long* record) {
-    if (!slots_ && QueryReset() < 0) {
+    if (!slots_ && QueryReset() < 0)
         return nullptr;
-    }
     bool found = false;
-    if (const int code = MoveWalk(start, step, &found); code != DatabaseError::None) {
+    if (const int code = MoveWalk(start, step, &found); code != DatabaseError::None)
         lastError_ = code;
-    }
-    if (found && record != nullptr) {
+    if (found && record != nullptr)
         *record = slots_[walkPosition_];
-    }
     return found ? recordBuffer_.get() : nullptr;
 }
 
@@ -49,9 +45,8 @@ void* DATABASE::QueryGetXXX(long start, long step, long* record) {
 // code; neither that nor a record at the walk's end.
 int DATABASE::MoveWalk(long start, long step, bool* found) {
     *found = false;
-    if (resultCount_ == 0) {
+    if (resultCount_ == 0)
         return DatabaseError::None;
-    }
     // Records appended since the query have no slot: a walk may begin or stand among them, but finds none
     // there.
     const auto inFile = [this](long position) { return position >= 0 && position < header_.recordCount; };
@@ -61,15 +56,13 @@ int DATABASE::MoveWalk(long start, long step, bool* found) {
         if (number != NotInSet) {
             const int code = FetchRecord(number, recordBuffer_.get(), cache_.HasBuffer());
             *found = code == DatabaseError::None;
-            if (*found || code == DatabaseError::ReadFailed) {
+            if (*found || code == DatabaseError::ReadFailed)
                 return code;
-            }
             slots_[walkPosition_] = NotInSet; // deleted since the query
             --resultCount_;
         }
-        if (step == 0) {
+        if (step == 0)
             break;
-        }
         walkPosition_ = Moved(walkPosition_, step);
     }
     return DatabaseError::None;
@@ -78,9 +71,8 @@ int DATABASE::MoveWalk(long start, long step, bool* found) {
 long DATABASE::ConvertPhysToLogRecordNumber(long n) const {
     long before = 0;
     for (std::int32_t i = 0; i < slotCount_; ++i) {
-        if (slots_[i] == n && n >= 0) {
+        if (slots_[i] == n && n >= 0)
             return before;
-        }
         before += slots_[i] != NotInSet ? 1 : 0;
     }
     return -1;

@@ -68,10 +68,9 @@ InvestmentCheck FillInvestment(const InvestmentInput& input, INVESTMENT_DATA* re
          {ReadAmount(input.shares, ShownShares(*record), &shares, InvestmentCheck::SharesNotPlain,
                      InvestmentCheck::SharesTooLarge),
           ReadAmount(input.price, ShownPrice(*record), &price, InvestmentCheck::PriceNotPlain,
-                     InvestmentCheck::PriceTooLarge)}) {
+                     InvestmentCheck::PriceTooLarge)})
         if (check != InvestmentCheck::Accepted)
             return check;
-    }
     if (!std::isfinite(shares * price))
         return InvestmentCheck::ValueTooLarge;
     CopyTextZeroed(record->Name, input.name);

@@ -26,11 +26,9 @@ struct LOOK {
 std::vector<std::string> Statements(DATABASE& database) {
     std::vector<std::string> statements = {""};
     COLUMN_ENTRY column{};
-    for (int i = 0; i < MostColumns && database.GetColumnInfo(i, &column) == 0; ++i) {
-        for (const char* rest : {" contains a", " = 1", " > 19990101", " != x"}) {
+    for (int i = 0; i < MostColumns && database.GetColumnInfo(i, &column) == 0; ++i)
+        for (const char* rest : {" contains a", " = 1", " > 19990101", " != x"})
             statements.push_back(column.name + std::string(rest));
-        }
-    }
     return statements;
 }
 
@@ -55,9 +53,8 @@ LOOK Look(bool sound) {
     DATABASE database(Path().c_str());
     DATABASE_HEADER header{};
     database.GetHeaderInfo(&header);
-    if (!database.IsOpen()) {
+    if (!database.IsOpen())
         return {false, false};
-    }
     ReadAll(database, header);
     database.SetReadCache(1);
     int mode = QueryMode::New;
@@ -65,9 +62,8 @@ LOOK Look(bool sound) {
         const long count = database.Query(statement.c_str(), mode);
         long walked = 0;
         for (void* data = database.QueryGetFirst(nullptr); data != nullptr;
-             data = database.QueryGetNext(nullptr)) {
+             data = database.QueryGetNext(nullptr))
             ++walked;
-        }
         Require(count < 0 || walked == count || !sound, "the walk misses records");
         mode = (mode + 1) % 3;
     }

@@ -45,9 +45,8 @@ void ExportAndLoad(DATABASE& database, int byteFormat, long records, const std::
     for (long n = 0; n < records; ++n) {
         ROW row = RecordOf(database, n);
         ROW again = RecordOf(other, n);
-        if (row.name[0] == '\0') {
+        if (row.name[0] == '\0')
             std::strcpy(row.name, " ");
-        }
         Require(std::strcmp(row.name, again.name) == 0, "a text has changed");
         row.price = again.price;
         Require(std::memcmp(&row.tag, &again.tag, sizeof(row) - sizeof(row.name)) == 0,
@@ -61,9 +60,8 @@ void ExportAndLoad(DATABASE& database, int byteFormat, long records, const std::
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
     static const std::string path = FuzzFolder() + "/load.db";
     static const std::string text = FuzzFolder() + "/load.txt";
-    if (size == 0) {
+    if (size == 0)
         return 0;
-    }
     WriteBytes(text, BytesOf(data + 1, size - 1));
     DATABASE database(nullptr);
     CreateSample(database, path);
@@ -72,19 +70,16 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     const long loaded = database.Load(text.c_str(), Separators[data[0] % std::size(Separators)]);
     DATABASE_HEADER header{};
     database.GetHeaderInfo(&header);
-    if (loaded < 0) {
+    if (loaded < 0)
         Require(database.GetLastError(nullptr) != 0, "a failed load without a code");
-    } else {
+    else
         Require(header.recordCount == loaded, "not as many records are there as were loaded");
-    }
     bool loadsAgain = loaded > 0;
-    for (long n = 0; n < header.recordCount; ++n) {
+    for (long n = 0; n < header.recordCount; ++n)
         loadsAgain = LoadsAgain(RecordOf(database, n), byteFormat) && loadsAgain;
-    }
     FileCheck check;
     Require(check.Run(path) == 0 && check.IsSound() && check.Findings().empty(), "the file is not sound");
-    if (loadsAgain) {
+    if (loadsAgain)
         ExportAndLoad(database, byteFormat, loaded, text);
-    }
     return 0;
 }

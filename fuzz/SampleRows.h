@@ -40,9 +40,8 @@ inline std::string MakeSample(const std::string& path) {
         std::string data(SampleRecordSize, '\0');
         const std::string name = (i % 2 == 0 ? "Fund " : "\xC3\xA4pfel ") + std::to_string(i);
         data.replace(0, name.size(), name);
-        for (std::size_t at = 12; at < data.size(); ++at) {
+        for (std::size_t at = 12; at < data.size(); ++at)
             data[at] = static_cast<char>(at * static_cast<std::size_t>(i * i + 1));
-        }
         Require(database.Append(data.data()) == i, "no sample record");
     }
     Require(database.Delete(3) == 0 && database.Lock(5) == 0, "no sample marks");

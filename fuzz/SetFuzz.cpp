@@ -14,11 +14,9 @@ COLUMN_ENTRY ColumnOf(DATABASE& database, const std::string& statement) {
     char value[32];
     COLUMN_ENTRY column{};
     Require(database.ParseQueryStatement(statement.c_str(), name, op, value) == 0, "a set without a column");
-    for (int i = 0; database.GetColumnInfo(i, &column) == 0; ++i) {
-        if (std::string(column.name) == name) {
+    for (int i = 0; database.GetColumnInfo(i, &column) == 0; ++i)
+        if (std::string(column.name) == name)
             return column;
-        }
-    }
     Require(false, "a set of no column");
     return {};
 }
@@ -27,9 +25,8 @@ COLUMN_ENTRY ColumnOf(DATABASE& database, const std::string& statement) {
 std::string Blanked(std::string bytes, const COLUMN_ENTRY& column) {
     const auto start = static_cast<std::size_t>(DataStart(7));
     for (std::size_t at = start; at < bytes.size(); at += SampleRecordSize + 1) {
-        if (bytes[at] == 1) {
+        if (bytes[at] == 1)
             continue;
-        }
         bytes[at] = 0;
         bytes.replace(at + 1 + static_cast<std::size_t>(column.offset), static_cast<std::size_t>(column.size),
                       static_cast<std::size_t>(column.size), '.');

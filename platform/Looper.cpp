@@ -68,7 +68,8 @@ bool LooperCore::IsAlive() const {
 }
 
 void LooperCore::RetrySoon(void (LooperCore::*step)()) {
-    QTimer::singleShot(kRetryMilliseconds, [self = shared_from_this(), step] { (*self.*step)(); });
+    QTimer::singleShot(
+        kRetryMilliseconds, [self = shared_from_this(), step] { (*self.*step)(); });
 }
 
 void LooperCore::ServeNext() {

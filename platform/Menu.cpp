@@ -8,8 +8,8 @@
 #include "platform/private/Mnemonics.h"
 
 BMenu::BMenu(const char* title, menu_layout layout) : BMenu(title, layout, std::make_unique<MenuPeer>()) {
-    QObject::connect(peer_->menu.get(), &QMenu::aboutToShow, peer_->menu.get(),
-                     [this] { MenuAccess::Opening(*this); });
+    QObject::connect(
+        peer_->menu.get(), &QMenu::aboutToShow, peer_->menu.get(), [this] { MenuAccess::Opening(*this); });
 }
 
 BMenu::BMenu(const char* title, menu_layout, std::unique_ptr<MenuPeer> peer)

@@ -54,7 +54,8 @@ class TextControlFilter : public QValidator {
   public:
     explicit TextControlFilter(QLineEdit* line) : QValidator(line), line_(line) {
         line->setValidator(this);
-        QObject::connect(line, &QLineEdit::inputRejected, this, [this] { TellTooLong(); });
+        QObject::connect(
+            line, &QLineEdit::inputRejected, this, [this] { TellTooLong(); });
         QObject::connect(line, &QLineEdit::textEdited, this, [] { QToolTip::hideText(); });
     }
 
@@ -114,7 +115,8 @@ BTextControl::BTextControl(BRect frame, const char* name, const char* label, con
     ResizeTo(frame.Width(), height);
     SetDivider(std::floor(frame.Width() / 2));
     SetText(text);
-    QObject::connect(Line(this), &QLineEdit::returnPressed, Line(this), [this] { Send(); });
+    QObject::connect(
+        Line(this), &QLineEdit::returnPressed, Line(this), [this] { Send(); });
     QObject::connect(Line(this), &QLineEdit::editingFinished, Line(this), [this] {
         if (sent_ != Text())
             Send();

@@ -76,10 +76,9 @@ void PRINT_TABLE::DrawHeader() {
     // The line at the bottom is the first row's, whose letters would touch it.
     view_->FillRect({heading.left, heading.top, heading.right, heading.bottom - LineWidth});
     view_->SetHighColor(colors::white);
-    for (int i = 0; i < columnCount_; ++i) {
+    for (int i = 0; i < columnCount_; ++i)
         if (columns_[i].label[0] != '\0' && GetColumnXCoords(i, &heading) == 0)
             ::DrawText(view_, &heading, columns_[i].label, DrawTextCenter | DrawTextMiddle);
-    }
     view_->SetHighColor(colors::black);
     rowPosition_ = top_ + headingHeight_;
 }

@@ -31,10 +31,9 @@ constexpr bigtime_t LockPatience = 20'000; // microseconds between looks at the 
 std::vector<int32> RecordNumbers(const ColumnListView* list) {
     const bool all = list->CurrentSelection() < 0;
     std::vector<int32> numbers;
-    for (int32 i = 0; i < list->CountItems(); ++i) {
+    for (int32 i = 0; i < list->CountItems(); ++i)
         if (all || list->IsItemSelected(i))
             numbers.push_back(static_cast<const NorvelItem*>(list->ItemAt(i))->RecordNumber());
-    }
     return numbers;
 }
 
@@ -128,10 +127,9 @@ int32 UpdateWindow::updateThread(void* window) {
 void UpdateWindow::UpdateAll() {
     // Whatever is wrong with the file, GetPriceQuote tells.
     static_cast<void>(ReadWholeFile(app_state->quoteSourcePath, sources_, MaxSources));
-    for (const int32 recordNumber : recordNumbers_) {
+    for (const int32 recordNumber : recordNumbers_)
         if (thread_stop_requested() || !UpdateOne(recordNumber))
             break;
-    }
     lastConnection_.Close();
     log_.Write();
     isOnDisk_ = database_->Sync() == 0;
@@ -204,10 +202,9 @@ void UpdateWindow::ShowProgress() {
 }
 
 bool UpdateWindow::LockUnlessStopped() {
-    while (!thread_stop_requested()) {
+    while (!thread_stop_requested())
         if (LockWithTimeout(LockPatience) == B_OK)
             return true;
-    }
     return false;
 }
 

@@ -43,10 +43,9 @@ inline std::vector<PdfWord> PdfWords(const std::string& file, int page = 1) {
 
 // The first such word; one at -1 when there is none.
 inline PdfWord FindWord(const std::vector<PdfWord>& words, const std::string& text) {
-    for (const PdfWord& word : words) {
+    for (const PdfWord& word : words)
         if (word.text == text)
             return word;
-    }
     return {};
 }
 

@@ -42,7 +42,8 @@ class StepDriver : public QObject {
 
     // Waits until it is so.
     StepDriver& Await(std::string what, Condition condition) {
-        return When(std::move(what), std::move(condition), [] {});
+        return When(
+            std::move(what), std::move(condition), [] {});
     }
 
     // Waits for an alert with this text and presses one of its buttons.
@@ -57,10 +58,9 @@ class StepDriver : public QObject {
     static QMessageBox* Alert() { return qobject_cast<QMessageBox*>(QApplication::activeModalWidget()); }
     // The visible window with this title; null when there is none.
     static QWidget* Window(const char* title) {
-        for (QWidget* window : QApplication::topLevelWidgets()) {
+        for (QWidget* window : QApplication::topLevelWidgets())
             if (window->isVisible() && window->windowTitle() == QString::fromUtf8(title))
                 return window;
-        }
         return nullptr;
     }
     static Condition WindowShown(const char* title) {

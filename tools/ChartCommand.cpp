@@ -35,10 +35,9 @@ struct ChartOptions {
 
 // By code or by title in any letter case; null for neither.
 const ChartInfo* FindChart(const std::string& wanted) {
-    for (const ChartInfo& chart : Charts) {
+    for (const ChartInfo& chart : Charts)
         if (wanted == std::to_string(chart.code) || strcmpi(wanted.c_str(), chart.title) == 0)
             return &chart;
-    }
     return nullptr;
 }
 

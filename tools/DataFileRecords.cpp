@@ -81,10 +81,9 @@ int DataFileTool::Set(const std::string& statement, const SELECTION& selection) 
         return 1;
     STATEMENT parts{};
     if (SplitStatement(statement.c_str(), &parts) && std::strcmp(parts.op, "=") == 0) {
-        for (const COLUMN_ENTRY& column : AllColumns()) {
+        for (const COLUMN_ENTRY& column : AllColumns())
             if (std::string_view(column.name) == parts.column)
                 return SetValue(column, parts.value, selection);
-        }
     }
     if (!Select(selection))
         return FailAsEngine();
@@ -123,10 +122,9 @@ int DataFileTool::Append(const std::vector<std::string>& values) {
     const std::vector<COLUMN_ENTRY> columns = AllColumns();
     std::vector<std::uint8_t> data = EmptyData();
     std::vector<bool> given(columns.size(), false);
-    for (const std::string& value : values) {
+    for (const std::string& value : values)
         if (const std::string wrong = StoreValue(columns, value, given, data.data()); !wrong.empty())
             return Fail(wrong);
-    }
     const long number = database_.Append(data.data());
     if (number < 0)
         return FailAsEngine();

@@ -88,10 +88,9 @@ int DataFileTool::Create(const std::string& description, const std::vector<std::
         COLUMN_ENTRY column{};
         if (const std::string wrong = ParseColumn(text, &column); !wrong.empty())
             return Fail(wrong);
-        for (const COLUMN_ENTRY& other : entries) {
+        for (const COLUMN_ENTRY& other : entries)
             if (std::string_view(other.name) == column.name)
                 return Fail(std::string("the column ") + column.name + " is given twice");
-        }
         entries.push_back(column);
     }
     if (description.size() >= NameSize)

@@ -133,9 +133,11 @@ void DbCommand::AddSelection(CLI::App* command, CLI::Option* where) {
 }
 
 void DbCommand::AddReadingCommands() {
-    Add("info", "Show what the header says",
+    Add(
+        "info", "Show what the header says",
         [](DataFileTool& tool, const DB_OPTIONS&) { return tool.Info(); });
-    Add("columns", "List the columns", [](DataFileTool& tool, const DB_OPTIONS&) { return tool.Columns(); });
+    Add(
+        "columns", "List the columns", [](DataFileTool& tool, const DB_OPTIONS&) { return tool.Columns(); });
     CLI::App* query = Add("query", "Show records", [](DataFileTool& tool, const DB_OPTIONS& options) {
         return tool.Query(options.selection);
     });
@@ -164,9 +166,9 @@ void DbCommand::AddChangingCommands() {
     CLI::Option* where = AddWhere(set, "Which records");
     set->add_flag("--all", options_->all, "All records")->excludes(where);
     AddSelection(set, where);
-    CLI::App* append = Add("append", "Add a record", [](DataFileTool& tool, const DB_OPTIONS& options) {
-        return tool.Append(options.values);
-    });
+    CLI::App* append = Add(
+        "append", "Add a record",
+        [](DataFileTool& tool, const DB_OPTIONS& options) { return tool.Append(options.values); });
     append->add_option("NAME=VALUE", options_->values, "A column's value; without one it is zero or empty")
         ->check(CLI::Validator(
             [](const std::string& value) {

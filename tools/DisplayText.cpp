@@ -82,8 +82,9 @@ constexpr RANGE Wide[] = {{0x1100, 0x115F},   {0x2E80, 0x303E},   {0x3041, 0xA4C
 
 template <std::size_t Count>
 bool IsIn(const RANGE (&ranges)[Count], char32_t code) {
-    return std::any_of(std::begin(ranges), std::end(ranges),
-                       [code](const RANGE& range) { return code >= range.first && code <= range.last; });
+    return std::any_of(
+        std::begin(ranges), std::end(ranges),
+        [code](const RANGE& range) { return code >= range.first && code <= range.last; });
 }
 
 bool IsPlain(char c) {

@@ -243,10 +243,9 @@ void FolderSetup::MakeDataFiles() {
     };
     MakeTogether(sample ? sampled : empty);
     MakeTogether(pickLists);
-    for (const std::string& name : {PathOf(FileOf("invest")), folder_}) {
+    for (const std::string& name : {PathOf(FileOf("invest")), folder_})
         if (const int error = SyncFolderOf(SystemFiles(), name); error != 0)
             Fail("The name of " + name + " cannot be brought to the disk: " + Reason(error) + ".");
-    }
     if (options_.sample && !sample)
         output_ << "no sample is added: it goes into new data files only\n";
 }
@@ -270,22 +269,21 @@ void FolderSetup::InstallProgram(const std::string& name, const std::string& fro
     const bool there = Exists(PathOf(name));
     std::string content;
     std::string present;
-    if (from.empty()) {
+    if (from.empty())
         if (there)
             Kept(name, "");
         else
             Fail("The program " + name + " was not found beside quorvan-cli; name it with --program FILE.");
-    } else if (!ReadWholeFile(from, content, MaxProgramSize)) {
+    else if (!ReadWholeFile(from, content, MaxProgramSize))
         Fail("The program " + from + " cannot be read: " + Reason(errno) + ".");
-    } else if (!there) {
+    else if (!there)
         CopyProgram(name, from, content, ExistingFile::Keep);
-    } else if (ReadWholeFile(PathOf(name), present, MaxProgramSize) && present == content) {
+    else if (ReadWholeFile(PathOf(name), present, MaxProgramSize) && present == content)
         Kept(name, "");
-    } else if (options_.updateProgram) {
+    else if (options_.updateProgram)
         CopyProgram(name, from, content, ExistingFile::Replace);
-    } else {
+    else
         Kept(name, "it differs from " + from + "; --update-program replaces it");
-    }
 }
 
 bool FolderSetup::HasDataFolder() {

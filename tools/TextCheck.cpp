@@ -101,10 +101,9 @@ std::string TextCheck::WrongName() const {
 
 std::string TextCheck::WrongValue() {
     std::fill(data_.begin(), data_.end(), std::uint8_t{0});
-    for (std::size_t i = 0; i < columns_.size(); ++i) {
+    for (std::size_t i = 0; i < columns_.size(); ++i)
         if (const std::string wrong = Store(columns_[i], fields_[i]); !wrong.empty())
             return std::string(columns_[i].name) + ": " + Quoted(fields_[i]) + " " + wrong;
-    }
     return {};
 }
 

@@ -9,10 +9,9 @@ namespace {
 
 bool IsPlain(const QImage& image) {
     for (int y = 0; y < image.height(); ++y) {
-        for (int x = 0; x < image.width(); ++x) {
+        for (int x = 0; x < image.width(); ++x)
             if (image.pixel(x, y) != image.pixel(0, 0))
                 return false;
-        }
     }
     return true;
 }

@@ -37,10 +37,9 @@ constexpr ChartStop Charts[] = {
 };
 
 QWidget* MainWindow() {
-    for (QWidget* window : QApplication::topLevelWidgets()) {
+    for (QWidget* window : QApplication::topLevelWidgets())
         if (window->isVisible() && window->findChild<QMenuBar*>())
             return window;
-    }
     return nullptr;
 }
 
@@ -105,7 +104,8 @@ void Tour::Then(const std::string& what, Action action) {
 }
 
 void Tour::Until(const std::string& what, const Condition& condition) {
-    Await(what, [condition] { return MainWindowIsFree() && condition(); });
+    Await(
+        what, [condition] { return MainWindowIsFree() && condition(); });
 }
 
 void Tour::Shoot(const std::string& picture) {
@@ -125,7 +125,8 @@ void Tour::InDialog(const char* title, const std::string& picture, Action action
 }
 
 void Tour::Choose(const char* menu, const char* item) {
-    Then(std::string("menu ") + menu, [menu] { ClickTitle(MainWindow(), menu); });
+    Then(
+        std::string("menu ") + menu, [menu] { ClickTitle(MainWindow(), menu); });
     When(std::string(menu) + " > " + item, OpenMenu, [item] { ClickItem(item); });
 }
 
@@ -159,15 +160,24 @@ void Tour::LookAtDialogs() {
 
 void Tour::AddAnInvestment() {
     Choose("Portfolio", "Add");
-    InDialog("Add a Portfolio", "portfolio-add", [] { TypeOver(NewPortfolio, Qt::Key_Return); });
-    Until("the new portfolio is empty", [] { return RowsShown() == 0; });
-    Then("the Add button", [] { Press(MainWindow(), "add button"); });
-    When("the investment form", Field, [] { TypeInto({"Hornbeam Mills", "HORN", "Stock", "25", "41.5"}); });
+    InDialog(
+        "Add a Portfolio", "portfolio-add", [] { TypeOver(NewPortfolio, Qt::Key_Return); });
+    Until(
+        "the new portfolio is empty", [] { return RowsShown() == 0; });
+    Then(
+        "the Add button", [] { Press(MainWindow(), "add button"); });
+    When(
+        "the investment form", Field,
+        [] {
+            TypeInto({"Hornbeam Mills", "HORN", "Stock", "25", "41.5"});
+        });
     InDialog("Add an Investment", "investment-add", [] { Key(Qt::Key_Return); });
-    Until("what was added is shown and in its file", [this] {
-        DATABASE file((folder_ + "/invest.db").c_str());
-        return RowsShown() == 1 && SelectInvestments(file, NewPortfolio) == 1;
-    });
+    Until(
+        "what was added is shown and in its file",
+        [this] {
+            DATABASE file((folder_ + "/invest.db").c_str());
+            return RowsShown() == 1 && SelectInvestments(file, NewPortfolio) == 1;
+        });
     Then("the selector", [] { ClickMenuField(MainWindow()); });
     Await("the selector's menu", OpenMenu);
     Shoot("portfolio-selector");
@@ -205,7 +215,8 @@ void Tour::LookAtCharts() {
         return QApplication::activeModalWidget() && !QApplication::activePopupWidget();
     };
     for (const ChartStop& chart : Charts) {
-        When("the chart menu", shown, [] { ClickMenuField(QApplication::activeModalWidget()); });
+        When(
+            "the chart menu", shown, [] { ClickMenuField(QApplication::activeModalWidget()); });
         When(std::string("choose ") + chart.title, OpenMenu, [&chart] { ClickItem(chart.title); });
         Await(std::string("chart ") + chart.title, shown);
         Shoot(chart.picture);
@@ -228,10 +239,9 @@ void Tour::PrintReport() {
     Shoot("page-setup");
     When("page set-up", shown("page setup dialog"), accept);
     When("print set-up", shown("print dialog"), [file] {
-        for (auto* field : QApplication::activeModalWidget()->findChildren<QLineEdit*>()) {
+        for (auto* field : QApplication::activeModalWidget()->findChildren<QLineEdit*>())
             if (field->text().endsWith(".pdf"))
                 field->setText(QString::fromStdString(file));
-        }
     });
     Shoot("print");
     When("print set-up", shown("print dialog"), accept);

@@ -46,10 +46,9 @@ std::string LocalTime() {
 // Anybody may have written the file: what is shown of it is short and in one line.
 std::string Shown(std::string_view field) {
     std::string text(CutToBytes(field, MostField));
-    for (char& letter : text) {
+    for (char& letter : text)
         if (static_cast<unsigned char>(letter) < ' ' || letter == '\x7f')
             letter = '?';
-    }
     return text;
 }
 
@@ -117,10 +116,9 @@ std::string DescribeHolder(const FolderHolder& holder) {
 
 int FolderLock::LockBySystem(int file) {
     struct flock region = LockRegion();
-    while (fcntl(file, F_OFD_SETLK, &region) != 0) {
+    while (fcntl(file, F_OFD_SETLK, &region) != 0)
         if (errno != EINTR)
             return errno == EACCES ? EAGAIN : errno;
-    }
     return 0;
 }
 
@@ -152,10 +150,9 @@ FolderLock::Outcome FolderLock::Take(const std::string& folder, const std::strin
     error_ = 0;
     path_ = folder + "/" + FileName;
     constexpr int mostTries = 100; // each means that somebody else took and released it in between
-    for (int i = 0; i < mostTries; ++i) {
+    for (int i = 0; i < mostTries; ++i)
         if (const std::optional<Outcome> outcome = TryToTake(program, doubt))
             return *outcome;
-    }
     return Outcome::Held;
 }
 

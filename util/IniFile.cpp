@@ -39,10 +39,12 @@ std::string HeaderOf(std::string_view section) {
 }
 
 bool HasControlCharacter(std::string_view text) {
-    return std::any_of(text.begin(), text.end(), [](char c) {
-        const auto byte = static_cast<unsigned char>(c);
-        return (byte < 0x20U && c != '\t') || byte == 0x7FU;
-    });
+    return std::any_of(
+        text.begin(), text.end(),
+        [](char c) {
+            const auto byte = static_cast<unsigned char>(c);
+            return (byte < 0x20U && c != '\t') || byte == 0x7FU;
+        });
 }
 
 // Whether the entry, once written, would be read back as it is.

@@ -24,9 +24,8 @@ inline void CopyLowered(const std::uint8_t* text, std::size_t size, std::uint8_t
     }
     if (seen >= FirstNonAscii) {
         std::size_t first = 0;
-        while (text[first] < FirstNonAscii) {
+        while (text[first] < FirstNonAscii)
             ++first;
-        }
         std::memcpy(lowered + first, text + first, size - first);
     }
 }

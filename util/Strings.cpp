@@ -22,10 +22,9 @@ char Raised(char c) {
 
 void ReplaceCharacter(char* text, char from, char to) {
     // A NUL is the text's end, not one of its characters.
-    for (; *text != '\0'; ++text) {
+    for (; *text != '\0'; ++text)
         if (*text == from)
             *text = to;
-    }
 }
 
 void Trim(char* text) {

@@ -20,7 +20,8 @@ void FieldButton::SetMenu(QMenu* menu) {
     // One column that scrolls: the toolkit would go on in further columns, beyond the screen's edge.
     menu->setStyleSheet(QStringLiteral("QMenu { menu-scrollable: 1; }"));
     disconnect(this, &QPushButton::pressed, this, nullptr);
-    connect(this, &QPushButton::pressed, this, [this] { Open(); });
+    connect(
+        this, &QPushButton::pressed, this, [this] { Open(); });
     connect(menu, &QMenu::aboutToHide, this, [this] { setDown(false); });
 }
 

@@ -79,12 +79,11 @@ void AssignMnemonics(QWidget* window) {
     for (const QMenuBar* bar : window->findChildren<QMenuBar*>())
         for (QAction* title : bar->actions())
             Assign(title, taken);
-    for (QWidget* widget : window->findChildren<QWidget*>()) {
+    for (QWidget* widget : window->findChildren<QWidget*>())
         if (auto* button = qobject_cast<QAbstractButton*>(widget))
             Assign(button, taken);
         else if (auto* line = qobject_cast<QLabel*>(widget); line && line->buddy())
             Assign(line, taken);
-    }
 }
 
 void AssignMnemonics(QMenu* menu) {

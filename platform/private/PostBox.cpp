@@ -5,7 +5,8 @@
 
 PostBox::PostBox()
     : wakeFd_(eventfd(0, EFD_CLOEXEC | EFD_NONBLOCK)), notifier_(wakeFd_, QSocketNotifier::Read) {
-    QObject::connect(&notifier_, &QSocketNotifier::activated, &notifier_, [this] { DoOne(); });
+    QObject::connect(
+        &notifier_, &QSocketNotifier::activated, &notifier_, [this] { DoOne(); });
 }
 
 PostBox::~PostBox() {

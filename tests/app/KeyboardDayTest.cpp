@@ -22,7 +22,8 @@ class KeyboardDay : public testing::Test, protected Program {
     using Program::Run;
 
     void Press(Qt::Key key, Qt::KeyboardModifiers with = {}) {
-        When("the main window's keys", MainHasKeys, [key, with] { Key(key, with); });
+        When(
+            "the main window's keys", MainHasKeys, [key, with] { Key(key, with); });
     }
     // In the menu that is opened next.
     void PressInMenu(std::vector<Qt::Key> keys) {
@@ -64,7 +65,8 @@ class KeyboardDay : public testing::Test, protected Program {
             Key(Qt::Key_Down);
         });
         PressInMenu({Qt::Key_Down, Qt::Key_Return});
-        In("Add an Investment", [] { Key(Qt::Key_E, Qt::AltModifier); }); // Retirement
+        In(
+            "Add an Investment", [] { Key(Qt::Key_E, Qt::AltModifier); }); // Retirement
         When(
             "the check mark",
             [] {
@@ -75,17 +77,22 @@ class KeyboardDay : public testing::Test, protected Program {
             [] { Key(Qt::Key_Return); });
     }
     void Showing(const char* portfolio) {
-        Await(std::string("portfolio ") + portfolio, [portfolio] {
-            const BMenuItem* marked = Selector()->FindMarked();
-            return marked && marked->Label() == std::string(portfolio) && !QApplication::activeModalWidget();
-        });
+        Await(
+            std::string("portfolio ") + portfolio,
+            [portfolio] {
+                const BMenuItem* marked = Selector()->FindMarked();
+                return marked && marked->Label() == std::string(portfolio) &&
+                       !QApplication::activeModalWidget();
+            });
     }
     void ToTheList() {
-        When("to the list", MainHasKeys, [] {
-            for (int steps = 0; steps < 10 && QApplication::focusWidget() != RowsWidget(); ++steps)
-                Key(Qt::Key_Tab);
-            EXPECT_EQ(QApplication::focusWidget(), RowsWidget());
-        });
+        When(
+            "to the list", MainHasKeys,
+            [] {
+                for (int steps = 0; steps < 10 && QApplication::focusWidget() != RowsWidget(); ++steps)
+                    Key(Qt::Key_Tab);
+                EXPECT_EQ(QApplication::focusWidget(), RowsWidget());
+            });
     }
 };
 
@@ -114,7 +121,8 @@ TEST_F(KeyboardDay, NeedsNoMouse) {
     In("Edit this Investment", [] { Type("not kept", Qt::Key_Escape); });
     Expect({"Acme", "Birch", "Cedar"});
     Press(Qt::Key_Return);
-    In("Edit this Investment", [] { Type("Cypress", Qt::Key_Return); });
+    In(
+        "Edit this Investment", [] { Type("Cypress", Qt::Key_Return); });
     Expect({"Acme", "Birch", "Cypress"}).Then("the row that was edited", [] {
         EXPECT_EQ(RowsWidget()->currentIndex().row(), 2);
     });

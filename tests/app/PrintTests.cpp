@@ -70,7 +70,8 @@ TEST(Print, AsksOnceAndNothingAfterACancel) {
     program.Send(MessagePortfolioPrint);
     Answer(program, "page setup dialog", true);
     Answer(program, "print dialog", false, file);
-    program.Then("nothing printed", [=] { EXPECT_FALSE(std::filesystem::exists(file)); });
+    program.Then(
+        "nothing printed", [=] { EXPECT_FALSE(std::filesystem::exists(file)); });
     program.Then("button", [] { Driver::Press(Program::Main(), "print button"); });
     Answer(program, "page setup dialog", true);
     Answer(program, "print dialog", true, file);
@@ -84,7 +85,8 @@ TEST(Print, AsksOnceAndNothingAfterACancel) {
     program.Answer(replaceFirst.c_str(), "No");
     Answer(program, "print dialog", true, other);
     ExpectPrinted(program, other, "Empty one");
-    program.Then("kept", [&] { EXPECT_EQ(prints.Read("report.pdf"), "kept"); });
+    program.Then(
+        "kept", [&] { EXPECT_EQ(prints.Read("report.pdf"), "kept"); });
     program.Then("in the way again", [&] { prints.Write("other.pdf", "replaced"); })
         .Send(MessagePortfolioPrint);
     const std::string replaceOther = "The file " + other + " exists. Replace it by this report?";

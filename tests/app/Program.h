@@ -134,10 +134,9 @@ class Program : public DataFolder, public Driver {
     static View* FindBelow(BView* view) {
         if (auto* found = dynamic_cast<View*>(view))
             return found;
-        for (int32 i = 0; view && i < view->CountChildren(); ++i) {
+        for (int32 i = 0; view && i < view->CountChildren(); ++i)
             if (View* found = FindBelow<View>(view->ChildAt(i)))
                 return found;
-        }
         return nullptr;
     }
 };

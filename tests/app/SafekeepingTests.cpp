@@ -41,8 +41,8 @@ class BackupTest : public testing::Test {
             invest.Append(&record);
     }
     [[nodiscard]] std::unique_ptr<DailyBackup> MakeBackup(FileOperations& files = SystemFiles()) const {
-        return std::make_unique<DailyBackup>(folder_.Path(), Names{"portfol.db", "invest.db"}, files,
-                                             [] { return now_; });
+        return std::make_unique<DailyBackup>(
+            folder_.Path(), Names{"portfol.db", "invest.db"}, files, [] { return now_; });
     }
     [[nodiscard]] Names Kept() const {
         Names names;

@@ -27,10 +27,12 @@ class FilledProgram : public Program {
     }
     // A step that closes an alert with a button and keeps what it says.
     void AnswerAlert(const char* button) {
-        When("alert", Alert, [this, button] {
-            said_ = Alert()->text().toStdString();
-            Press(Alert(), button);
-        });
+        When(
+            "alert", Alert,
+            [this, button] {
+                said_ = Alert()->text().toStdString();
+                Press(Alert(), button);
+            });
     }
     [[nodiscard]] const std::string& Said() const { return said_; }
 

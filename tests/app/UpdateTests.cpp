@@ -59,11 +59,13 @@ class PriceUpdate : public testing::Test, protected Program {
     using Program::Run;
 
     void Update() {
-        Then("update", [] { Press(Main(), "Update button"); });
+        Then(
+            "update", [] { Press(Main(), "Update button"); });
     }
     // The main window can be worked again and shows the prices of the file.
     void UntilDone() {
-        Await("the progress window goes", [] { return Main() && !Driver::Window(Title); });
+        Await(
+            "the progress window goes", [] { return Main() && !Driver::Window(Title); });
     }
     // Once so many requests have come; the last one's ticker is one that the server is held at.
     void WhenAsked(std::size_t times, Action action) {
@@ -170,7 +172,8 @@ TEST_F(PriceUpdate, FromThePressToTheEndThereIsNoOtherCommand) {
     };
     Mark({0});
     Then("press", press);
-    When("wait", WindowShown(waiting), [] { Press(Driver::Window(waiting), "cancel button"); });
+    When(
+        "wait", WindowShown(waiting), [] { Press(Driver::Window(waiting), "cancel button"); });
     Await("cancelled", [this] { return Read("Quorvan.log") == "Checked 'slow.example', cancelled\n"; });
     Then("press again", press);
     When("wait again", WindowShown(waiting), [] { slowHostIsFound.release(2); });
@@ -216,7 +219,8 @@ TEST_F(PriceUpdate, WhenClosedItGoesOnceItsChangesAreOnTheDisk) {
     });
     held_ = "FALL";
     Update();
-    WhenAsked(2, [] { Driver::Window(Title)->close(); });
+    WhenAsked(
+        2, [] { Driver::Window(Title)->close(); });
     When(
         "the worker waits for the disk", [&] { return syncing.load(); },
         [&] {

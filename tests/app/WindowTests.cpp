@@ -126,7 +126,9 @@ TEST_F(MainWindow, AListLoadedAnewKeepsItsPlaceAndAnotherBegins) {
     for (const char* name : {"Other", "P"})
         AddPortfolioOf(name, Texts(30, name));
     for (const auto& [name, current] : {std::pair{"P", 20}, {"Other", -1}}) {
-        Then("scroll", [] { ClickRow(20); }).Select(name);
+        Then(
+            "scroll", [] { ClickRow(20); })
+            .Select(name);
         Await(name, [name = name] { return Names()[0] == name && CountSelectedItems(List()) == 0; });
         Then("loaded", [current = current] {
             EXPECT_EQ(List()->CurrentRow(), current);
@@ -309,11 +311,16 @@ TEST_F(MainWindow, WhatACommandChangesIsOnTheDiskWhenItEnds) {
     WatchedFiles portfolios;
     WatchedFiles investments;
     AddPortfolioOf("P", {"a", "b", "c"});
-    Then("watch the files", [&] {
-        portfolios.Watch(app_state->portfolios, File("portfol.db"));
-        investments.Watch(app_state->investments, File("invest.db"));
-    });
-    const auto done = [&](WatchedFiles& files) { Await("on the disk", [&] { return files.HaveSynced(); }); };
+    Then(
+        "watch the files",
+        [&] {
+            portfolios.Watch(app_state->portfolios, File("portfol.db"));
+            investments.Watch(app_state->investments, File("invest.db"));
+        });
+    const auto done = [&](WatchedFiles& files) {
+        Await(
+            "on the disk", [&] { return files.HaveSynced(); });
+    };
     const auto fill = [&](uint32 command, const char* title, const char* name) {
         Send(command).When(
             title, [title] { return Field() && WindowShown(title)(); },
@@ -354,7 +361,8 @@ TEST_F(MainWindow, WhatACommandChangesIsOnTheDiskWhenItEnds) {
 TEST_F(MainWindow, ADiskThatFailsIsToldOnce) {
     WatchedFiles investments;
     AddPortfolioOf("P", {"a", "b"});
-    Then("watch the file", [&] { investments.Watch(app_state->investments, File("invest.db")); });
+    Then(
+        "watch the file", [&] { investments.Watch(app_state->investments, File("invest.db")); });
     const auto fails = [&](uint32 command) {
         Then("the disk fails", [&] { investments.failing = true; });
         Send(command).Answer("The change could not be saved! Is the disk full, or the file protected?", "Ok");
@@ -363,7 +371,9 @@ TEST_F(MainWindow, ADiskThatFailsIsToldOnce) {
     Mark({0});
     fails(MessageInvestmentCut);
     fails(MessageInvestmentPaste);
-    Expect({"b", "a"}).Then("kept", [&] { EXPECT_TRUE(Has("cut.db")); });
+    Expect({"b", "a"})
+        .Then(
+            "kept", [&] { EXPECT_TRUE(Has("cut.db")); });
     Mark({0}).Send(MessageInvestmentDelete).Expect({"a"}).Await("on the disk", [&] {
         return investments.HaveSynced();
     });

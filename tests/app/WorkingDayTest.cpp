@@ -69,10 +69,12 @@ class WorkingDay : public testing::Test, protected Program {
 
     // Opens a menu by the mouse and clicks one of its items.
     void Choose(const char* title, const char* label) {
-        Then(std::string(title) + " > " + label, [title, label] {
-            ClickTitle(Main(), title);
-            ClickItem(label);
-        });
+        Then(
+            std::string(title) + " > " + label,
+            [title, label] {
+                ClickTitle(Main(), title);
+                ClickItem(label);
+            });
     }
     void Fill(const char* title, Action action) {
         When(
@@ -86,18 +88,21 @@ class WorkingDay : public testing::Test, protected Program {
     // Gives the current or a new portfolio a name.
     void Name(const char* command, const char* title, const char* name) {
         Choose("Portfolio", command);
-        Fill(title, [name] { TypeOver(name, Qt::Key_Return); });
+        Fill(
+            title, [name] { TypeOver(name, Qt::Key_Return); });
         Await(std::string("portfolio ") + name, [name] {
             return Selector()->FindMarked() && Selector()->FindMarked()->Label() == std::string(name);
         });
     }
     // Opens the selector by the mouse and picks a portfolio.
     void Pick(const char* name) {
-        Then(std::string("pick ") + name, [] {
-            for (QPushButton* button : Main()->findChildren<QPushButton*>())
-                if (button->menu())
-                    QTest::mouseClick(button, Qt::LeftButton);
-        });
+        Then(
+            std::string("pick ") + name,
+            [] {
+                for (QPushButton* button : Main()->findChildren<QPushButton*>())
+                    if (button->menu())
+                        QTest::mouseClick(button, Qt::LeftButton);
+            });
         When("the selector's menu", OpenMenu, [name] { ClickItem(name); });
     }
     // Every record of invest.db, compared with what it must be.
@@ -121,7 +126,8 @@ TEST_F(WorkingDay, EveryRecordIsAsItShouldBe) {
     for (const char* name : {"Old hand", "Short lived", "My first one"})
         Name("Add", "Add a Portfolio", name);
     for (const Typed& typed : Day) {
-        Then("Add button", [] { Press(Main(), "add button"); });
+        Then(
+            "Add button", [] { Press(Main(), "add button"); });
         Fill("Add an Investment", [&typed] { FillForm(typed); });
     }
     Expect({"Acme", "Birch & Sons", CedarName, "Dogwood", "Elm", "Fir", "Grove",
@@ -144,11 +150,13 @@ TEST_F(WorkingDay, EveryRecordIsAsItShouldBe) {
         ClickRow(2);
         QTest::mouseDClick(RowsWidget()->viewport(), Qt::LeftButton, {}, PlaceOfRow(2));
     });
-    Fill("Edit this Investment", [] {
-        TypeOver("Elm again", Qt::Key_Tab);
-        Driver::Window("Edit this Investment")->findChild<QLineEdit*>("price control")->setFocus();
-        TypeOver("41.5", Qt::Key_Return);
-    });
+    Fill(
+        "Edit this Investment",
+        [] {
+            TypeOver("Elm again", Qt::Key_Tab);
+            Driver::Window("Edit this Investment")->findChild<QLineEdit*>("price control")->setFocus();
+            TypeOver("41.5", Qt::Key_Return);
+        });
     When(
         "the edited row", [] { return Names().at(2) == "Elm again"; },
         [] { EXPECT_STREQ(Row(2)->Text(5), "41 1/2"); });

@@ -236,9 +236,9 @@ TEST(ChartWindow, TheMenuAndTheCheckBoxChooseWhatIsShown) {
     state.investments = std::make_unique<DATABASE>(folder.File("invest.db").c_str());
     app_state = &state;
     const auto choose = [&](const char* title) {
-        driver.When("menu", Driver::WindowShown("Quorvan"), [] {
-            QTest::mouseClick(Driver::Window("Quorvan")->findChild<QPushButton*>(), Qt::LeftButton);
-        });
+        driver.When(
+            "menu", Driver::WindowShown("Quorvan"),
+            [] { QTest::mouseClick(Driver::Window("Quorvan")->findChild<QPushButton*>(), Qt::LeftButton); });
         driver.When(
             title, [] { return Driver::OpenMenu() != nullptr; }, [title] { Driver::ClickItem(title); });
     };

@@ -84,9 +84,8 @@ TEST_F(CompactionTest, OutcomesOfFailingSteps) {
         SCOPED_TRACE("call " + std::to_string(failure.call) + " error " + std::to_string(failure.error));
         folder_.Clear();
         MakeRows(path_, 3);
-        if (failure.call == 22) {
+        if (failure.call == 22)
             folder_.Write("rows.bak", "left over");
-        }
         DATABASE database(path_.c_str(), files_);
         files_.Arm(Fault::Error, failure.call, failure.error);
         EXPECT_EQ(Code(database, database.Compress(0)), failure.code);

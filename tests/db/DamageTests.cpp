@@ -26,19 +26,17 @@ class DamageTest : public testing::Test {
         folder_.Write("rows.db", bytes);
         DATABASE database(path_.c_str());
         long readable = 0;
-        for (const auto& record : ContentOf(database)) {
+        for (const auto& record : ContentOf(database))
             readable += record ? 1 : 0;
-        }
         for (const char* statement : {"Name contains o", "Tag = 1", "Small > 0", "Count < 9", "Price != 1",
                                       "Day > 19990101", "At < 120000", ""}) {
             database.Query(statement, QueryMode::New);
             Walked(database);
         }
-        if (!database.IsOpen()) {
+        if (!database.IsOpen())
             readable = -1;
-        } else if (database.IsDamaged()) {
+        else if (database.IsDamaged())
             EXPECT_EQ(Code(database, database.Compress(0)), 2708);
-        }
         EXPECT_EQ(folder_.Read("rows.db"), bytes) << "looking at a file must not change it";
         return readable;
     }
@@ -92,11 +90,9 @@ TEST_F(DamageTest, TruncatedAnywhere) {
 }
 
 TEST_F(DamageTest, AnyByteOfHeaderAndColumns) {
-    for (std::size_t at = 0; at < DataStartOfRows; ++at) {
-        for (char other : {'\x00', '\x01', '\x03', '\x7F', '\x80', '\xFF'}) {
+    for (std::size_t at = 0; at < DataStartOfRows; ++at)
+        for (char other : {'\x00', '\x01', '\x03', '\x7F', '\x80', '\xFF'})
             EXPECT_LE(Examine(With(intact_, at, std::string(1, other))), 400) << at;
-        }
-    }
 }
 
 TEST_F(DamageTest, IsReadAsFarAsItGoesAndToldOf) {
@@ -185,9 +181,8 @@ TEST_F(DamageTest, CountsThatAreTooLowLoseNothing) {
 
 TEST_F(DamageTest, NarrowColumnsAreNotReadPastTheirEnd) {
     std::string bytes = With(intact_, FirstColumn + 44 * 3 + 34, "\x02"); // Count keeps 2 of its 4 bytes
-    for (std::size_t i = 0; i < 4; ++i) {
+    for (std::size_t i = 0; i < 4; ++i)
         bytes = With(bytes, DataStartOfRows + i * RowLength + 1 + 19, "\x05\x01\x09\x09");
-    }
     folder_.Write("rows.db", bytes);
     DATABASE database(path_.c_str());
     EXPECT_EQ(database.Query("Count = 261", QueryMode::New), 3);
@@ -202,9 +197,8 @@ TEST_F(DamageTest, FileThatShrinksWhileOpen) {
     std::filesystem::resize_file(path_, DataStartOfRows + RowLength / 2);
     ROW row{};
     EXPECT_EQ(Code(database, database.SortBy("Name", 0)), 1709);
-    for (int all : {0, 1}) {
+    for (int all : {0, 1})
         EXPECT_EQ(Code(database, database.Export(folder_.File("rows.txt").c_str(), all, "\t")), 1907);
-    }
     EXPECT_EQ(Code(database, database.Read(3, &row)), 1209);
     EXPECT_EQ(Code(database, database.Write(3, &row)), 1309);
     EXPECT_EQ(Code(database, database.Query("Tag = 1", QueryMode::New)), 1609);
@@ -292,9 +286,8 @@ TEST_F(DamageTest, FailedRepairLosesNothing) {
             const std::string found = folder_.Read("rows.db");
             EXPECT_TRUE(found == miscounted_ || found == intact_ || fault == Fault::Broken);
             EXPECT_TRUE(error != 0 || found == intact_);
-            if (found != miscounted_) {
+            if (found != miscounted_)
                 EXPECT_EQ(folder_.Read("rows.db.before-repair"), miscounted_);
-            }
             EXPECT_TRUE(fault == Fault::Broken || backup.empty() == (folder_.Names().size() == 1))
                 << "no half copy is left";
             if (!met) {

@@ -57,11 +57,9 @@ TEST(DatesAndTimes, AreFormatted) {
                  {{5, 13, 1999}, {invalid, invalid, "13-05-1999"}},
                  {{127, 9, -32768}, {"Sep 127, -32768", "September 127, -32768", "09-127--32768"}},
                  {{127, 127, -32768}, {invalid, invalid, "127-127--32768"}}};
-    for (const auto& [date, texts] : dates) {
-        for (int style = 0; style <= 4; ++style) {
+    for (const auto& [date, texts] : dates)
+        for (int style = 0; style <= 4; ++style)
             EXPECT_EQ(Formatted(date, style), style % 4 == 0 ? "untouched" : texts[style - 1]);
-        }
-    }
     const struct {
         dbTIME time;
         std::string clock12, clock24;

@@ -32,9 +32,8 @@ const TemporaryFolder& TextFolder() {
 // Loads so many lines that they are appended in more than one batch.
 long LoadText(DATABASE& database) {
     std::string text;
-    for (int i = 0; i < 8000; ++i) {
+    for (int i = 0; i < 8000; ++i)
         text += "loaded\t1\t2\t" + std::to_string(i) + "\t4\t20000101\t120000\n";
-    }
     TextFolder().Write("load.txt", text);
     return database.Load(TextFolder().File("load.txt").c_str(), "\t\n");
 }
@@ -75,13 +74,11 @@ const OPERATION Operations[] = {
 // between.
 bool IsUnfinished(const CONTENT& found, const CONTENT& old, const CONTENT& changed,
                   const OPERATION& operation) {
-    if (!operation.byRecord) {
+    if (!operation.byRecord)
         return found == old;
-    }
     bool whole = found.size() >= old.size() && found.size() <= changed.size();
-    for (std::size_t i = 0; whole && i < found.size(); ++i) {
+    for (std::size_t i = 0; whole && i < found.size(); ++i)
         whole = (i < old.size() && found[i] == old[i]) || found[i] == changed[i];
-    }
     return whole;
 }
 
@@ -169,9 +166,8 @@ TEST_F(FaultTest, FailedOrKilledLeavesTheOldContentOrTheNew) {
                 EXPECT_TRUE(passes ? code == 0 : !coded || code == operation.codes[at]) << code;
                 // Whoever opens it next, and what is compacted but could not be opened again.
                 const bool reopened = kills || !database->IsOpen();
-                if (reopened) {
+                if (reopened)
                     ASSERT_GE(RestoreCompactionBackup(path_.c_str()) + database->Open(path_.c_str()), 0);
-                }
                 const CONTENT found = ContentOf(*database);
                 // A disk that takes nothing any more cannot be given back the old bytes, but never is
                 // anything shown that it does not hold.
@@ -216,9 +212,8 @@ TEST_F(FaultTest, FileThatMayOnlyBeReadIsRead) {
         files_.RefuseWriting(0);
         ASSERT_TRUE(database.IsReadOnly());
         EXPECT_EQ(database.Query("Name contains row", QueryMode::New), 149);
-        for (const OPERATION& operation : Operations) {
+        for (const OPERATION& operation : Operations)
             EXPECT_EQ(Code(database, operation.run(database)) != 0, operation.changesFile) << operation.name;
-        }
         EXPECT_EQ(ContentOf(database), content);
         EXPECT_EQ(Reopened(), content);
     }

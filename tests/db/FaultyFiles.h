@@ -52,9 +52,8 @@ class FaultyFiles : public FileOperations {
     void RefuseWriting(int error) { refused_ = error; }
 
     int Open(const char* path, int flags, mode_t mode) override {
-        if ((flags & O_ACCMODE) == O_RDWR && refused_ != 0) {
+        if ((flags & O_ACCMODE) == O_RDWR && refused_ != 0)
             return Failed(refused_);
-        }
         firstMode_ = (flags & O_CREAT) != 0 ? mode : firstMode_;
         const auto call = [&] { return System::Open(path, flags, mode); };
         const int file = (flags & O_CREAT) != 0 ? Meet(call) : call();
@@ -71,9 +70,8 @@ class FaultyFiles : public FileOperations {
     }
     ssize_t WriteAt(int file, const void* data, std::size_t size, off_t offset) override {
         order_ += 'w';
-        if (calls_ != at_ || size < 2 || fault_ < Fault::HalfThenError || fault_ > Fault::Broken) {
+        if (calls_ != at_ || size < 2 || fault_ < Fault::HalfThenError || fault_ > Fault::Broken)
             return Meet([&] { return System::WriteAt(file, data, size, offset); });
-        }
         const ssize_t half = System::WriteAt(file, data, size / 2, offset);
         return Meet([half] { return half; });
     }
@@ -106,15 +104,12 @@ class FaultyFiles : public FileOperations {
         order_ += letter == 0 ? "" : std::string(1, letter);
         const int after = fault_ == Fault::NoRead ? -1 : calls_++ - at_;
         const int met = fault_ == Fault::Broken ? INT_MAX : fault_ == Fault::Twice ? 1 : 0;
-        if (at_ < 0 || after < 0 || after > met) {
+        if (at_ < 0 || after < 0 || after > met)
             return call();
-        }
-        if (fault_ == Fault::KilledAfter) {
+        if (fault_ == Fault::KilledAfter)
             call();
-        }
-        if (fault_ >= Fault::KilledBefore) {
+        if (fault_ >= Fault::KilledBefore)
             std::raise(SIGKILL);
-        }
         return fault_ == Fault::ShortWrite ? call() : Failed(fault_ == Fault::Interrupted ? EINTR : error_);
     }
 

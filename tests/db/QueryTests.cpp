@@ -21,9 +21,8 @@ class QueryTest : public RowsTest {
         const std::vector<long> walked = Walked(database_);
         EXPECT_EQ(count, static_cast<long>(walked.size())) << statement;
         std::string found;
-        for (const long number : walked) {
+        for (const long number : walked)
             found += std::to_string(number);
-        }
         return found;
     }
 
@@ -52,9 +51,8 @@ TEST_F(QueryTest, FindsByEveryOperatorInEveryColumn) {
                                : database_.CompareVals(op, KeyOf(row, column), KeyOf(value, column));
         };
         std::string expected;
-        for (const ROW& row : rows_) {
+        for (const ROW& row : rows_)
             expected += holds(row) == 1 ? std::to_string(&row - rows_.data()) : "";
-        }
         const std::string name = RowColumns()[static_cast<std::size_t>(column)].name;
         EXPECT_EQ(Find(name + " " + Operators[op] + " " + field), expected) << name << Operators[op] << field;
     }
@@ -80,9 +78,8 @@ TEST_F(QueryTest, TakesValuesAsTheyAreWritten) {
                                                 {"Day = x", "3"},
                                                 {"Day > 2000", "24"},
                                                 {"At = 23:15", ""},
-                                                {"At > 23", "2"}}) {
+                                                {"At > 23", "2"}})
         EXPECT_EQ(Find(statement), found) << statement;
-    }
 }
 
 TEST_F(QueryTest, RefusesAndKeepsTheSet) {
@@ -101,9 +98,8 @@ TEST_F(QueryTest, RefusesAndKeepsTheSet) {
                                                {token31 + "v = x", "1608"},
                                                {"Name = " + token31 + "v", "1608"},
                                                {"Name = x" + std::string(120, '\t'), "1608"}}) {
-        for (int mode : {New, And, Or}) {
+        for (int mode : {New, And, Or})
             EXPECT_EQ(std::to_string(CodeOf(database_.Query(statement.c_str(), mode))), code) << statement;
-        }
         EXPECT_EQ(Walked(database_), (std::vector<long>{1, 2})) << statement;
     }
     EXPECT_EQ(Find("Name = " + token31), "");
@@ -200,11 +196,9 @@ TEST_F(QueryTest, SetsFromStepToStep) {
         const long result = operations.at(step.substr(0, blank))(argument.c_str());
         const long code = CodeOf(result);
         std::string set(8, ' ');
-        for (long n = -1; n < 8; ++n) {
-            if (const long place = database_.ConvertPhysToLogRecordNumber(n); place >= 0) {
+        for (long n = -1; n < 8; ++n)
+            if (const long place = database_.ConvertPhysToLogRecordNumber(n); place >= 0)
                 set.at(static_cast<std::size_t>(place)) = static_cast<char>('0' + n);
-            }
-        }
         set = set.substr(0, set.find(' ')) + (database_.IsQueryActive() != 0 ? "*" : "");
         EXPECT_EQ(std::to_string(code != 0 ? code : result) + " " + set, outcome) << step;
     }
@@ -242,9 +236,8 @@ TEST_F(QueryTest, WalkKeepsWithinTheSetOfTheMoment) {
     EXPECT_EQ(Walked(database_), (std::vector<long>{0, 1, 2, 4})) << "a record deleted elsewhere drops out";
     EXPECT_EQ(database_.IsQueryActive(), 1);
     EXPECT_EQ(database_.ConvertPhysToLogRecordNumber(4), 3);
-    for (auto [start, step] : {std::pair<long, long>{3, 0}, {LONG_MAX, 1}, {-1, LONG_MAX}, {-1, LONG_MIN}}) {
+    for (auto [start, step] : {std::pair<long, long>{3, 0}, {LONG_MAX, 1}, {-1, LONG_MAX}, {-1, LONG_MIN}})
         EXPECT_EQ(database_.QueryGetXXX(start, step, nullptr), nullptr) << start << " " << step;
-    }
 }
 
 // Every way to compare texts agrees with the comparison of two plain strings, whatever the column's width and
@@ -253,9 +246,8 @@ TEST_F(RowsTest, TextQueriesAgreeWithPlainComparison) {
     std::mt19937 random(20260101);
     const auto text = [&](std::size_t longest) {
         std::string result;
-        for (std::size_t length = random() % (longest + 1); result.size() < length;) {
+        for (std::size_t length = random() % (longest + 1); result.size() < length;)
             result += "aAbBzZ@[`{\xC3\xA9"[random() % 12];
-        }
         return result;
     };
     for (std::size_t width : {1, 3, 8, 16, 24, 31, 40}) {
@@ -293,9 +285,8 @@ TEST(Comparisons, TakeTheirOperatorsAlone) {
                                                                     {6, "x\xC3\xA9Z", "z", 0},
                                                                     {6, "x", "", 1},
                                                                     {7, "x", "x", 0}};
-    for (const auto& [op, field, value, expected] : texts) {
+    for (const auto& [op, field, value, expected] : texts)
         EXPECT_EQ(database.CompareStringVals(op, field, value), expected) << field << op << value;
-    }
     EXPECT_EQ(database.CompareVals(4, 2.5F, 2.0F), 1);
     EXPECT_EQ(database.CompareVals(6, 1, 1), 0);
     EXPECT_EQ(database.CompareVals(-1, 1L, 1L), 0);

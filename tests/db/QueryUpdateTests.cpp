@@ -25,9 +25,8 @@ TEST_F(QueryUpdateTest, RefusesAndChangesNothing) {
         {nullptr, 2201},    {"", 2201},          {"Name", 2205},     {"Name =", 2205},
         {"Name ~ x", 2201}, {"Name == x", 2201}, {"name = x", 2202}, {"Nothing ~ x", 2201},
         {"Name + x", 2203}, {"Name * 2", 2203}};
-    for (const auto& [statement, code] : cases) {
+    for (const auto& [statement, code] : cases)
         EXPECT_EQ(CodeOf(database_.QueryUpdate(statement)), code) << statement;
-    }
     EXPECT_EQ(folder_.Read("rows.db"), start_);
 }
 
@@ -86,9 +85,8 @@ TEST_F(QueryUpdateTest, ChangesEveryTypeByEveryOperator) {
 // Whatever the set, its order and the cache: each of its records, and not a byte of another.
 TEST_F(QueryUpdateTest, ChangesTheSetAndNothingElse) {
     std::vector<ROW> rows;
-    for (int i = 0; i < 400; ++i) {
+    for (int i = 0; i < 400; ++i)
         rows.push_back(Row(std::to_string(i), i % 7, i % 150, i));
-    }
     Append(rows);
     ASSERT_EQ(database_.Delete(10) + database_.Lock(20), 0);
     const std::string start = folder_.Read("rows.db");

@@ -12,14 +12,12 @@ std::string DocumentedBytes() {
     std::string bytes;
     for (std::string line; std::getline(document, line);) {
         if (line.size() < 10 || line.compare(8, 2, "  ") != 0 ||
-            !std::isxdigit(static_cast<unsigned char>(line[0]))) {
+            !std::isxdigit(static_cast<unsigned char>(line[0])))
             continue;
-        }
         EXPECT_EQ(std::stoul(line.substr(0, 8), nullptr, 16), bytes.size()) << line;
         std::istringstream dump(line.substr(8, line.find('|') - 8));
-        for (std::string byte; dump >> byte;) {
+        for (std::string byte; dump >> byte;)
             bytes += static_cast<char>(std::stoi(byte, nullptr, 16));
-        }
     }
     return bytes;
 }
@@ -31,9 +29,8 @@ TEST_F(RowsTest, FileIsAsDocumented) {
     folder_.Write("text", "Acorn|12.25|19990105|091530\nBirch|12.25|19990105|091530\n");
     ASSERT_EQ(database_.Load(folder_.File("text").c_str(), "|\n"), 2);
     ASSERT_EQ(database_.Delete(0) + database_.Lock(1), 0);
-    for (const char* statement : {"Price = 12.25", "Bought = 19990105", "Sold = 091530"}) {
+    for (const char* statement : {"Price = 12.25", "Bought = 19990105", "Sold = 091530"})
         EXPECT_EQ(database_.Query(statement, QueryMode::New), 1) << statement;
-    }
     EXPECT_EQ(folder_.Read("a.db"), DocumentedBytes());
 }
 
@@ -134,9 +131,8 @@ TEST_F(RowsTest, OperationsByStatus) {
             EXPECT_EQ(folder_.Read("rows.db"), expected);
             const char current = answer < 1000 ? operation.after[3] : '=';
             EXPECT_EQ(CodeOf(database_.Update(&mark)), current == '-' ? 2101 : 0);
-            if (current != '-') {
+            if (current != '-')
                 expected.replace(record(current == '#' ? n : 3), RowLength, '\0' + BytesOf(mark));
-            }
             EXPECT_EQ(folder_.Read("rows.db"), expected);
         }
     }
@@ -152,9 +148,8 @@ TEST_F(RowsTest, ReadsThroughAnyCacheWhatTheFileHolds) {
     std::size_t n = 0;
     std::size_t step = 1;
     for (int i = 0; i < 20'000; ++i) {
-        if (i % 5000 == 0) {
+        if (i % 5000 == 0)
             ASSERT_EQ(database_.SetReadCache(kilobytes[i / 5000]), 0);
-        }
         step = random() % 50 == 0 ? random() % 9 + rows.size() - 4 : step;
         n = (random() % 50 == 0 ? random() : n + step) % rows.size();
         const long number = static_cast<long>(n);

@@ -102,9 +102,8 @@ inline CONTENT ContentOf(DATABASE& database) {
     for (long i = 0; i < header.recordCount; ++i) {
         std::string data(static_cast<std::size_t>(header.recordLength) - 1, '\0');
         content.emplace_back();
-        if (database.Read(i, data.data()) == 1) {
+        if (database.Read(i, data.data()) == 1)
             content.back() = data;
-        }
     }
     database.GetLastError(nullptr);
     return content;
@@ -115,9 +114,8 @@ inline std::string FieldOf(const DATABASE& database, const ROW& row, int column)
     std::string text;
     database.FormatRecordData(&text, &row, "\n");
     std::istringstream fields(text);
-    for (int i = 0; i <= column; ++i) {
+    for (int i = 0; i <= column; ++i)
         std::getline(fields, text);
-    }
     return text;
 }
 
@@ -125,10 +123,8 @@ inline std::string FieldOf(const DATABASE& database, const ROW& row, int column)
 inline std::vector<long> Walked(DATABASE& database) {
     std::vector<long> numbers;
     long number = -1;
-    for (void* data = database.QueryGetFirst(&number); data != nullptr;
-         data = database.QueryGetNext(&number)) {
+    for (void* data = database.QueryGetFirst(&number); data != nullptr; data = database.QueryGetNext(&number))
         numbers.push_back(number);
-    }
     return numbers;
 }
 

@@ -24,9 +24,8 @@ ROW RandomRow(std::mt19937& random) {
     const auto any = [&random](const auto& values) { return values[random() % std::size(values)]; };
     ROW row = Row(any(names), any(bytes), any(shorts), any(longs), any(floats),
                   {any(bytes), any(bytes), any(shorts)}, {any(bytes), any(bytes), any(bytes)});
-    if (random() % 4 == 0) {
+    if (random() % 4 == 0)
         std::memcpy(row.name, "ab\0garbage\xFF", 12); // what follows a text's end means nothing
-    }
     return row;
 }
 
@@ -61,9 +60,8 @@ TEST_F(SortTest, OrderIsThatOfABubbleSort) {
         for (int i = 0; i < count; ++i) {
             rows.push_back(RandomRow(random));
             rows.back().count /= static_cast<std::int32_t>(count < 100 ? 1 : random() % 1000 + 1);
-            if (rows.back().small != 1) {
+            if (rows.back().small != 1)
                 order.push_back(i);
-            }
         }
         Append(rows);
         ASSERT_EQ(database_.Query("Small != 1", QueryMode::New), static_cast<long>(order.size()));

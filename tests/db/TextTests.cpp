@@ -36,9 +36,8 @@ TEST_F(TextTest, FieldsAsText) {
         {Row("x", 0, 0, 0, -Limits::quiet_NaN()), "x|0|0|0|nan|20000101|120000|\n"},
         {Row("x", 0, 0, 0, -Limits::max(), {1, 1, -5}),
          "x|0|0|0|-340282346638528859811704183484516925440.00|-0050101|120000|\n"}};
-    for (const auto& [row, line] : cases) {
+    for (const auto& [row, line] : cases)
         EXPECT_EQ(LineOf(row), line);
-    }
     database_.SetByteOutputFormat(1);
     EXPECT_EQ(LineOf(Row("a", 65), ", "), "a, A, 0, 0, 0.00, 20000101, 120000, \n");
     database_.SetByteOutputFormat(3);

@@ -118,15 +118,17 @@ TEST(BDialog, TheRepeatsOfAHeldKeyPressNothing) {
         QApplication::sendEvent(QApplication::focusWidget(), &event);
     };
     Driver driver;
-    driver.When("dialog", FieldHasFocus, [&] {
-        send(QEvent::KeyPress, 10, true);
-        // Not always does the toolkit see that it is a repeat.
-        send(QEvent::KeyRelease, 20, false);
-        send(QEvent::KeyPress, 20, false);
-        send(QEvent::KeyRelease, 25, false, Qt::Key_C);
-        qt_sendShortcutOverrideEvent(QApplication::focusWidget(), 25, Qt::Key_C, Qt::AltModifier);
-        EXPECT_FALSE(Shown()->findChild<QPushButton*>("cancel button")->isDown());
-    });
+    driver.When(
+        "dialog", FieldHasFocus,
+        [&] {
+            send(QEvent::KeyPress, 10, true);
+            // Not always does the toolkit see that it is a repeat.
+            send(QEvent::KeyRelease, 20, false);
+            send(QEvent::KeyPress, 20, false);
+            send(QEvent::KeyRelease, 25, false, Qt::Key_C);
+            qt_sendShortcutOverrideEvent(QApplication::focusWidget(), 25, Qt::Key_C, Qt::AltModifier);
+            EXPECT_FALSE(Shown()->findChild<QPushButton*>("cancel button")->isDown());
+        });
     driver.When(
         "nothing", [] { return FieldHasFocus(); },
         [&] {
@@ -173,11 +175,13 @@ TEST(BDialog, TheCallersWindowWaitsButPaints) {
     stage.window->PostMessage(1);
     int before = 0;
     Driver driver;
-    driver.When("dialog", FieldHasFocus, [&] {
-        before = view->paints;
-        view->Invalidate();
-        stage.window->PostMessage(2);
-    });
+    driver.When(
+        "dialog", FieldHasFocus,
+        [&] {
+            before = view->paints;
+            view->Invalidate();
+            stage.window->PostMessage(2);
+        });
     driver.When(
         "a paint pass", [&] { return view->paints > before; }, [] { Driver::Key(Qt::Key_Return); });
     EXPECT_EQ(stage.Received(2), (Codes{1, 2}));
@@ -194,12 +198,14 @@ TEST(BDialog, AWorkerCanRunOneAndItsStopEndsIt) {
             result = dialog->DoModal();
             return 0;
         });
-        driver.When("dialog", FieldHasFocus, [&] {
-            if (stopped)
-                kill_thread(worker.Id());
-            else
-                Driver::Key(Qt::Key_Return);
-        });
+        driver.When(
+            "dialog", FieldHasFocus,
+            [&] {
+                if (stopped)
+                    kill_thread(worker.Id());
+                else
+                    Driver::Key(Qt::Key_Return);
+            });
         EXPECT_TRUE(QTest::qWaitFor([&] { return result != 0; }));
         EXPECT_EQ(result, stopped ? DialogCancel : DialogOk);
         ExpectGone();

@@ -143,21 +143,23 @@ TEST_F(FormTest, TheFormShowsTheRecordAndPickListsFillTheirFields) {
     const char* title = "Edit this Investment";
     std::vector<std::string> shown;
     const auto field = [title](const char* name) { return Window(title)->findChild<QLineEdit*>(name); };
-    In(title, [&] {
-        for (const char* name : {"name control", "ticker control", "type control", "shares control",
-                                 "price control", "agent control"})
-            shown.push_back(field(name)->text().toStdString());
-        QAction* fund = nullptr;
-        for (const QPushButton* button : Window(title)->findChildren<QPushButton*>())
-            for (QAction* action : button->menu() ? button->menu()->actions() : QList<QAction*>()) {
-                if (action->isChecked())
-                    shown.push_back(action->objectName().toStdString());
-                if (action->objectName() == "Fund")
-                    fund = action;
-            }
-        ASSERT_TRUE(fund);
-        fund->trigger();
-    });
+    In(
+        title,
+        [&] {
+            for (const char* name : {"name control", "ticker control", "type control", "shares control",
+                                     "price control", "agent control"})
+                shown.push_back(field(name)->text().toStdString());
+            QAction* fund = nullptr;
+            for (const QPushButton* button : Window(title)->findChildren<QPushButton*>())
+                for (QAction* action : button->menu() ? button->menu()->actions() : QList<QAction*>()) {
+                    if (action->isChecked())
+                        shown.push_back(action->objectName().toStdString());
+                    if (action->objectName() == "Fund")
+                        fund = action;
+                }
+            ASSERT_TRUE(fund);
+            fund->trigger();
+        });
     When(
         "the picked type", [&] { return Window(title) && field("type control")->text() == "Fund"; },
         [] { Key(Qt::Key_Return); });

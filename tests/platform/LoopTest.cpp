@@ -73,7 +73,8 @@ TEST_F(Loopers, AWaitingHandlerHoldsBackItsOwnMessagesOnly) {
     second_->inside = [&](uint32) { delete_sem(sem); };
     first_->PostMessage(1);
     first_->PostMessage(2);
-    QTimer::singleShot(20, [&] { second_->PostMessage(7); });
+    QTimer::singleShot(
+        20, [&] { second_->PostMessage(7); });
     ASSERT_TRUE(QTest::qWaitFor([&] { return log_.size() == 2; }));
     EXPECT_EQ(waited, B_BAD_SEM_ID);
     EXPECT_EQ(seenWhileWaiting, Log{1}) << "the second message must wait for the first handler's return";

@@ -221,7 +221,8 @@ TEST_F(Alerts, BlockTheirCallerAloneAndEndWithItsStop) {
     const auto ask = [] { return (new BAlert("", "From a worker", "Yes", "No"))->Go(); };
     const auto shown = [] { return Driver::Alert() != nullptr; };
     Driver driver;
-    driver.When("alert", shown, [&] { window->PostMessage(5); });
+    driver.When(
+        "alert", shown, [&] { window->PostMessage(5); });
     driver.When(
         "message", [&] { return !window->received.empty(); }, [] { Driver::Press(Driver::Alert(), "Yes"); });
     const Worker answered(ask);
@@ -231,6 +232,7 @@ TEST_F(Alerts, BlockTheirCallerAloneAndEndWithItsStop) {
     EXPECT_EQ(Received(1), Codes{5});
     const Worker stopped(ask);
     bool ended = false;
-    driver.When("alert", shown, [&] { ended = kill_thread(stopped.Id()) == B_OK; });
+    driver.When(
+        "alert", shown, [&] { ended = kill_thread(stopped.Id()) == B_OK; });
     EXPECT_TRUE(QTest::qWaitFor([&] { return ended && !shown(); }));
 }

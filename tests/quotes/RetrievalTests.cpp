@@ -245,7 +245,8 @@ TEST_F(Retrieval, StopsAtOnceWhereverItIs) {
         EXPECT_TRUE(server.WaitFor(1, 1));
         if (reply.end == End::Endless)
             continue; // behind TLS a page has its end
-        TlsServer tls(identity_, [&](const std::string&) { return reply; });
+        TlsServer tls(
+            identity_, [&](const std::string&) { return reply; });
         ExpectCancelled(tls.Host(), [&] { EXPECT_TRUE(tls.WaitFor(1)); });
         EXPECT_TRUE(tls.WaitFor(1, 1));
     }
@@ -254,7 +255,8 @@ TEST_F(Retrieval, StopsAtOnceWhereverItIs) {
     listen(deaf.Fd(), 0);
     EXPECT_EQ(WaitUnlessStopped(deaf.Fd(), POLLIN, context_.stopFd, 0), Waited::NotYet);
     pollfd connection{deaf.Fd(), POLLIN, 0};
-    ExpectCancelled("https://" + deaf.Host(), [&] { EXPECT_EQ(poll(&connection, 1, 10'000), 1); });
+    ExpectCancelled(
+        "https://" + deaf.Host(), [&] { EXPECT_EQ(poll(&connection, 1, 10'000), 1); });
     const auto connects = [&] {
         for (int i = 0; i < 10'000 && !folder_.Read("log").ends_with(Created); ++i)
             poll(nullptr, 0, 1);

@@ -19,10 +19,9 @@ class Scanner : public QuoteTest {
     float Scan(const std::vector<std::string>& pieces, int skip) {
         QuoteReport report(&log_, nullptr);
         QuoteScanner scanner("Last", skip, report);
-        for (const std::string& piece : pieces) {
+        for (const std::string& piece : pieces)
             if (scanner.Scan(piece))
                 break;
-        }
         return scanner.Price();
     }
 };
@@ -93,10 +92,9 @@ TEST(Fraction, IsReadInBothForms) {
          {"support", "sup>3", "sup>3</sup><sub>", "sup>3</sup><sub 8", "sup>3</sup><sub>0</sub>",
           "sub>3</sub><sup>8</sup>"}},
     };
-    for (const auto& [fraction, texts] : cases) {
+    for (const auto& [fraction, texts] : cases)
         for (std::string text : texts)
             EXPECT_EQ(LookForFraction(text.data()), fraction) << text;
-    }
 }
 
 std::string Described(QuoteSourceReader& reader) {
