@@ -11,6 +11,9 @@ echo "Checking the format"
 git ls-files -z '*.h' '*.cpp' | xargs -0 clang-format --dry-run --Werror ||
     fail "the files named above are not formatted; run: git ls-files -z '*.h' '*.cpp' | xargs -0 clang-format -i"
 
+echo "Checking the order of the rooms"
+scripts/rooms.sh
+
 for preset in dev asan tsan; do
     echo "Building $preset"
     quietly "the build of $preset could not be prepared" cmake --preset "$preset"

@@ -11,7 +11,7 @@
 #include "platform/StringView.h"
 #include "quotes/QuoteRetrieval.h"
 #include "util/CharacterBuffer.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

@@ -8,11 +8,11 @@
 #include <malloc.h>
 
 #include "ColumnListView/PrefilledBitmap.h"
-#include "app/CutFile.h"
-#include "app/DataFileOpening.h"
-#include "app/DataFolders.h"
 #include "app/NorvelWindow.h"
-#include "app/PortfolioRules.h"
+#include "app/model/CutFile.h"
+#include "app/model/DataFileOpening.h"
+#include "app/model/DataFolders.h"
+#include "app/model/PortfolioRules.h"
 #include "db/Database.h"
 #include "dialogs/PasswordDialog.h"
 #include "resources/DesktopFiles.h"
@@ -20,8 +20,8 @@
 #include "util/CharacterBuffer.h"
 #include "util/FolderProbe.h"
 #include "util/IniFile.h"
-#include "util/InterfaceHelpers.h"
 #include "util/Strings.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

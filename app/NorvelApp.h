@@ -6,10 +6,10 @@
 #include <optional>
 #include <string>
 
-#include "app/AppState.h"
-#include "app/BackedUpFiles.h"
-#include "app/DailyBackup.h"
-#include "app/ReadOnlyFiles.h"
+#include "app/model/BackedUpFiles.h"
+#include "app/model/DailyBackup.h"
+#include "app/model/ReadOnlyFiles.h"
+#include "app/state/AppState.h"
 #include "platform/Application.h"
 #include "platform/Bitmap.h"
 #include "util/FolderLock.h"

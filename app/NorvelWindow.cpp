@@ -6,16 +6,16 @@
 #include "ColumnListView/BetterScrollView.h"
 #include "ColumnListView/CLVColumn.h"
 #include "ColumnListView/ColumnListView.h"
-#include "app/AppState.h"
-#include "app/MessageCodes.h"
-#include "app/NorvelItem.h"
+#include "app/rows/NorvelItem.h"
+#include "app/state/AppState.h"
+#include "app/state/MessageCodes.h"
 #include "platform/Application.h"
 #include "platform/Button.h"
 #include "platform/MenuBar.h"
 #include "platform/MenuField.h"
 #include "platform/StringView.h"
 #include "util/CharacterBuffer.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

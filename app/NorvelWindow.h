@@ -3,7 +3,7 @@
 #include <memory>
 #include <optional>
 
-#include "app/RecordLayouts.h"
+#include "app/model/RecordLayouts.h"
 #include "platform/Window.h"
 #include "util/IniFile.h"
 

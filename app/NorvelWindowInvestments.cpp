@@ -5,17 +5,17 @@
 #include <vector>
 
 #include "ColumnListView/ColumnListView.h"
-#include "app/AppState.h"
-#include "app/CutFile.h"
-#include "app/FailureAlerts.h"
-#include "app/NorvelItem.h"
-#include "app/PortfolioRules.h"
+#include "app/model/CutFile.h"
+#include "app/model/PortfolioRules.h"
+#include "app/rows/NorvelItem.h"
+#include "app/state/AppState.h"
 #include "dialogs/InvestmentDialog.h"
 #include "platform/MenuField.h"
 #include "platform/StringView.h"
 #include "util/CharacterBuffer.h"
-#include "util/InterfaceHelpers.h"
 #include "util/Numbers.h"
+#include "util/interface/FailureAlerts.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

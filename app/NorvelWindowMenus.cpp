@@ -5,15 +5,15 @@
 #include <span>
 
 #include "ColumnListView/ColumnListView.h"
-#include "app/AppState.h"
-#include "app/FailureAlerts.h"
-#include "app/MessageCodes.h"
+#include "app/state/AppState.h"
+#include "app/state/MessageCodes.h"
 #include "db/Database.h"
 #include "dialogs/SettingsDialog.h"
 #include "platform/Application.h"
 #include "platform/MenuBar.h"
 #include "platform/Roster.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/FailureAlerts.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

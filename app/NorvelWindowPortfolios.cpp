@@ -3,20 +3,20 @@
 #include <cstring>
 #include <string>
 
-#include "app/AppState.h"
 #include "app/ConnectionCheck.h"
-#include "app/FailureAlerts.h"
-#include "app/MessageCodes.h"
-#include "app/PortfolioRules.h"
+#include "app/model/PortfolioRules.h"
+#include "app/state/AppState.h"
+#include "app/state/MessageCodes.h"
 #include "charts/ChartWindow.h"
 #include "dialogs/PortfolioAddDialog.h"
 #include "dialogs/PortfolioEditDialog.h"
 #include "platform/MenuField.h"
 #include "print/Report.h"
-#include "quotes/UpdateWindow.h"
+#include "quotes/update/UpdateWindow.h"
 #include "util/CharacterBuffer.h"
 #include "util/DebugLog.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/FailureAlerts.h"
+#include "util/interface/InterfaceHelpers.h"
 
 void NorvelWindow::LoadPortfolioList() {
     DATABASE& portfolios = *app_state->portfolios;

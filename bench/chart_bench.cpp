@@ -10,8 +10,8 @@
 #include <vector>
 
 #include "BenchOptions.h"
-#include "app/PortfolioRules.h"
-#include "app/RecordLayouts.h"
+#include "app/model/PortfolioRules.h"
+#include "app/model/RecordLayouts.h"
 #include "charts/ChartWindow.h"
 #include "charts/PieChartView.h"
 #include "db/Database.h"

@@ -18,14 +18,14 @@
 
 #include "BenchOptions.h"
 #include "ColumnListView/ColumnListView.h"
-#include "app/AppState.h"
-#include "app/MessageCodes.h"
 #include "app/NorvelApp.h"
-#include "app/NorvelItem.h"
 #include "app/NorvelWindow.h"
-#include "app/PortfolioRules.h"
+#include "app/model/PortfolioRules.h"
+#include "app/rows/NorvelItem.h"
+#include "app/state/AppState.h"
+#include "app/state/MessageCodes.h"
 #include "util/CharacterBuffer.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

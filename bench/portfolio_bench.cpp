@@ -7,7 +7,7 @@
 #include <unistd.h>
 
 #include "BenchData.h"
-#include "app/PortfolioRules.h"
+#include "app/model/PortfolioRules.h"
 
 namespace {
 

@@ -24,14 +24,14 @@
 
 #include "BenchOptions.h"
 #include "StepDriver.h"
-#include "app/MessageCodes.h"
 #include "app/NorvelApp.h"
 #include "app/NorvelWindow.h"
-#include "app/RecordLayouts.h"
+#include "app/model/RecordLayouts.h"
+#include "app/state/MessageCodes.h"
 #include "db/Database.h"
 #include "quotes/LoopbackServer.h"
 #include "util/CharacterBuffer.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

@@ -5,7 +5,7 @@
 #include <string_view>
 #include <vector>
 
-#include "app/RecordLayouts.h"
+#include "app/model/RecordLayouts.h"
 
 // A slice's label: at most 31 bytes, then NULs.
 using ChartLabel = std::array<char, NameSize>;

@@ -3,14 +3,14 @@
 #include <algorithm>
 #include <cmath>
 
-#include "app/AppState.h"
-#include "app/FailureAlerts.h"
-#include "app/PortfolioRules.h"
+#include "app/model/PortfolioRules.h"
+#include "app/state/AppState.h"
 #include "charts/PieChartView.h"
 #include "charts/ValueChartView.h"
 #include "platform/MenuField.h"
 #include "platform/MenuItem.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/FailureAlerts.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

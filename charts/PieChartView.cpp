@@ -5,7 +5,7 @@
 #include <new>
 
 #include "util/CharacterBuffer.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

@@ -5,8 +5,8 @@
 
 #include "platform/CheckBox.h"
 #include "util/Dates.h"
-#include "util/InterfaceHelpers.h"
 #include "util/Numbers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

@@ -7,7 +7,7 @@
 #include "platform/Application.h"
 #include "platform/Button.h"
 #include "platform/Kernel.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

@@ -2,14 +2,14 @@
 
 #include <string>
 
-#include "app/AppState.h"
-#include "app/FailureAlerts.h"
-#include "app/PortfolioRules.h"
+#include "app/model/PortfolioRules.h"
+#include "app/state/AppState.h"
 #include "platform/Alert.h"
 #include "platform/CheckBox.h"
 #include "platform/MenuField.h"
 #include "platform/TextControl.h"
 #include "util/CharacterBuffer.h"
+#include "util/interface/FailureAlerts.h"
 
 namespace {
 

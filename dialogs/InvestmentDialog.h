@@ -1,6 +1,6 @@
 #pragma once
 
-#include "app/RecordLayouts.h"
+#include "app/model/RecordLayouts.h"
 #include "dialogs/BDialog.h"
 #include "dialogs/InvestmentInput.h"
 

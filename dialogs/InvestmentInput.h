@@ -2,7 +2,7 @@
 
 #include <string>
 
-#include "app/RecordLayouts.h"
+#include "app/model/RecordLayouts.h"
 
 // What a person typed and chose in the investment form, as it stands in its fields (UTF-8).
 struct InvestmentInput {

@@ -1,10 +1,10 @@
 #include "dialogs/PortfolioDialog.h"
 
-#include "app/PortfolioRules.h"
+#include "app/model/PortfolioRules.h"
 #include "platform/TextControl.h"
 #include "util/CharacterBuffer.h"
-#include "util/InterfaceHelpers.h"
 #include "util/Strings.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

@@ -1,6 +1,6 @@
 #include "dialogs/SettingsDialog.h"
 
-#include "app/AppState.h"
+#include "app/state/AppState.h"
 #include "util/CharacterBuffer.h"
 #include "util/Strings.h"
 

@@ -1,7 +1,7 @@
 #include "print/Banner.h"
 
 #include "platform/View.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

@@ -5,7 +5,7 @@
 #include <string_view>
 
 #include "platform/View.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

@@ -4,12 +4,12 @@
 #include <array>
 #include <cstring>
 
-#include "app/PortfolioRules.h"
+#include "app/model/PortfolioRules.h"
 #include "print/Banner.h"
 #include "print/PrintTable.h"
 #include "print/ReportTexts.h"
 #include "util/Dates.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

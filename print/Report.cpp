@@ -5,11 +5,11 @@
 #include <string>
 #include <utility>
 
-#include "app/PortfolioRules.h"
+#include "app/model/PortfolioRules.h"
 #include "platform/PrintJob.h"
 #include "platform/Window.h"
 #include "print/PrinterView.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

@@ -2,7 +2,7 @@
 
 #include <cstddef>
 
-#include "app/RecordLayouts.h"
+#include "app/model/RecordLayouts.h"
 
 // What stands on the printed report. Pure functions.
 

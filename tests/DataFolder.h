@@ -5,7 +5,7 @@
 #include <vector>
 
 #include "TemporaryFolder.h"
-#include "app/RecordLayouts.h"
+#include "app/model/RecordLayouts.h"
 #include "db/Database.h"
 #include "util/CharacterBuffer.h"
 

@@ -7,8 +7,8 @@
 #include <ostream>
 #include <system_error>
 
-#include "app/DailyBackup.h"
-#include "app/DataFolders.h"
+#include "app/model/DailyBackup.h"
+#include "app/model/DataFolders.h"
 #include "db/Compaction.h"
 #include "db/FileCheck.h"
 #include "tools/RecordFields.h"

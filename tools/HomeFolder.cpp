@@ -7,7 +7,7 @@
 #include <pwd.h>
 #include <unistd.h>
 
-#include "app/PortfolioRules.h"
+#include "app/model/PortfolioRules.h"
 #include "db/Database.h"
 
 namespace {

@@ -2,7 +2,7 @@
 
 #include <string_view>
 
-#include "app/RecordLayouts.h"
+#include "app/model/RecordLayouts.h"
 #include "db/Database.h"
 #include "util/CharacterBuffer.h"
 

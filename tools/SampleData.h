@@ -3,8 +3,8 @@
 class DATABASE;
 
 // What a new folder's data files begin with. Each function appends its records to an open data file that has
-// the columns of app/RecordLayouts.h, and is false when the engine refused one; GetLastError of the file then
-// says why.
+// the columns of app/model/RecordLayouts.h, and is false when the engine refused one; GetLastError of the
+// file then says why.
 
 // The entries of the Type and Agent pick lists, which every folder gets.
 [[nodiscard]] bool AppendPickLists(DATABASE& categories);

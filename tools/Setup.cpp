@@ -11,7 +11,7 @@
 #include <unistd.h>
 #include <utility>
 
-#include "app/RecordLayouts.h"
+#include "app/model/RecordLayouts.h"
 #include "db/Compaction.h"
 #include "db/Database.h"
 #include "tools/DesktopFiles.h"

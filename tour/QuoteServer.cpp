@@ -3,7 +3,7 @@
 #include <cmath>
 #include <cstdlib>
 
-#include "app/RecordLayouts.h"
+#include "app/model/RecordLayouts.h"
 #include "db/Database.h"
 #include "util/CharacterBuffer.h"
 

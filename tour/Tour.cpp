@@ -17,8 +17,8 @@
 #include <QPushButton>
 
 #include "app/NorvelApp.h"
-#include "app/NorvelItem.h"
-#include "app/PortfolioRules.h"
+#include "app/model/PortfolioRules.h"
+#include "app/rows/NorvelItem.h"
 
 namespace {
 

@@ -2,7 +2,7 @@
 #include <gtest/gtest.h>
 
 #include "Program.h"
-#include "app/PortfolioRules.h"
+#include "app/model/PortfolioRules.h"
 
 namespace {
 

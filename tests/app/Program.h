@@ -10,15 +10,15 @@
 #include "ColumnListView/ColumnListView.h"
 #include "DataFolder.h"
 #include "Driver.h"
-#include "app/AppState.h"
-#include "app/MessageCodes.h"
 #include "app/NorvelApp.h"
-#include "app/NorvelItem.h"
 #include "app/NorvelWindow.h"
+#include "app/rows/NorvelItem.h"
+#include "app/state/AppState.h"
+#include "app/state/MessageCodes.h"
 #include "platform/MenuBar.h"
 #include "platform/MenuField.h"
 #include "platform/StringView.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 using Texts = std::vector<std::string>;
 

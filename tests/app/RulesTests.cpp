@@ -8,9 +8,9 @@
 #include "DataFolder.h"
 #include "InChild.h"
 #include "WatchedFiles.h"
-#include "app/CutFile.h"
-#include "app/InvestmentTexts.h"
-#include "app/PortfolioRules.h"
+#include "app/model/CutFile.h"
+#include "app/model/InvestmentTexts.h"
+#include "app/model/PortfolioRules.h"
 #include "db/FaultyFiles.h"
 
 namespace {

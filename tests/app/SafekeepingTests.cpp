@@ -6,10 +6,10 @@
 
 #include "DataFolder.h"
 #include "InChild.h"
-#include "app/BackedUpFiles.h"
-#include "app/DailyBackup.h"
-#include "app/DataFileOpening.h"
-#include "app/ReadOnlyFiles.h"
+#include "app/model/BackedUpFiles.h"
+#include "app/model/DailyBackup.h"
+#include "app/model/DataFileOpening.h"
+#include "app/model/ReadOnlyFiles.h"
 #include "db/FaultyFiles.h"
 
 namespace {

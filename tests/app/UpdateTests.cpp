@@ -13,9 +13,9 @@
 #include "WatchedFiles.h"
 #include "platform/StatusBar.h"
 #include "quotes/LoopbackServer.h"
-#include "quotes/PriceUpdate.h"
 #include "quotes/QuoteRetrieval.h"
 #include "quotes/TlsServer.h"
+#include "quotes/run/PriceUpdate.h"
 
 namespace {
 

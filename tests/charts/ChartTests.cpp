@@ -9,7 +9,7 @@
 #include <QImage>
 #include <QPushButton>
 
-#include "app/AppState.h"
+#include "app/state/AppState.h"
 #include "charts/ChartDataSets.h"
 #include "charts/ChartGeometry.h"
 #include "charts/ChartWindow.h"
@@ -17,7 +17,7 @@
 #include "charts/ValueChartView.h"
 #include "platform/ViewPicture.h"
 #include "util/Dates.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

@@ -11,7 +11,7 @@
 #include "platform/Font.h"
 #include "platform/Stage.h"
 #include "platform/TextControl.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

@@ -4,12 +4,12 @@
 #include <filesystem>
 
 #include "TemporaryFolder.h"
-#include "app/AppState.h"
+#include "app/state/AppState.h"
 #include "dialogs/PasswordDialog.h"
 #include "dialogs/SettingsDialog.h"
 #include "platform/Font.h"
 #include "util/CharacterBuffer.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

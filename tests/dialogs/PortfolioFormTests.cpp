@@ -9,8 +9,8 @@
 #include <QPushButton>
 
 #include "DataFolder.h"
-#include "app/AppState.h"
-#include "app/PortfolioRules.h"
+#include "app/model/PortfolioRules.h"
+#include "app/state/AppState.h"
 #include "dialogs/InvestmentDialog.h"
 #include "dialogs/InvestmentInput.h"
 #include "dialogs/PortfolioAddDialog.h"

@@ -10,7 +10,7 @@
 #include "platform/Application.h"
 #include "platform/View.h"
 #include "platform/Window.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

@@ -18,7 +18,7 @@
 #include "print/Report.h"
 #include "print/ReportTexts.h"
 #include "util/Dates.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

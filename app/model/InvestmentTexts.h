@@ -1,6 +1,6 @@
 #pragma once
 
-#include "app/RecordLayouts.h"
+#include "app/model/RecordLayouts.h"
 #include "util/Numbers.h"
 
 // How an investment's figures are written in a row of the list and in a report, and how its price moved. Pure

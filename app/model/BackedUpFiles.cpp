@@ -1,9 +1,9 @@
-#include "app/BackedUpFiles.h"
+#include "app/model/BackedUpFiles.h"
 
 #include <algorithm>
 #include <fcntl.h>
 
-#include "app/DailyBackup.h"
+#include "app/model/DailyBackup.h"
 
 int BackedUpFiles::Open(const char* path, int flags, mode_t mode) {
     const int descriptor = FileOperations::Open(path, flags, mode);

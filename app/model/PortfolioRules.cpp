@@ -1,4 +1,4 @@
-#include "app/PortfolioRules.h"
+#include "app/model/PortfolioRules.h"
 
 #include <cstddef>
 #include <cstdint>

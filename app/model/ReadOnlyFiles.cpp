@@ -1,4 +1,4 @@
-#include "app/ReadOnlyFiles.h"
+#include "app/model/ReadOnlyFiles.h"
 
 #include <cerrno>
 #include <fcntl.h>

@@ -4,8 +4,8 @@
 #include <memory>
 
 #include "ColumnListView/CLVListItem.h"
-#include "app/InvestmentTexts.h"
-#include "app/RecordLayouts.h"
+#include "app/model/InvestmentTexts.h"
+#include "app/model/RecordLayouts.h"
 
 // The columns of the investment list, in the order in which they are added.
 enum class InvestmentColumn : int32 {

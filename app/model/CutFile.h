@@ -3,7 +3,7 @@
 #include <span>
 #include <string>
 
-#include "app/RecordLayouts.h"
+#include "app/model/RecordLayouts.h"
 #include "db/File.h"
 
 class DATABASE;

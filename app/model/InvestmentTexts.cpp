@@ -1,4 +1,4 @@
-#include "app/InvestmentTexts.h"
+#include "app/model/InvestmentTexts.h"
 
 #include <cmath>
 #include <cstring>

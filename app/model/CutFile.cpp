@@ -1,11 +1,11 @@
-#include "app/CutFile.h"
+#include "app/model/CutFile.h"
 
 #include <algorithm>
 #include <cstring>
 #include <filesystem>
 #include <vector>
 
-#include "app/PortfolioRules.h"
+#include "app/model/PortfolioRules.h"
 #include "db/Database.h"
 
 namespace {

@@ -1,4 +1,4 @@
-#include "app/RecordLayouts.h"
+#include "app/model/RecordLayouts.h"
 
 #include <bit>
 #include <string_view>

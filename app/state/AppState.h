@@ -3,7 +3,7 @@
 #include <cstdlib>
 #include <memory>
 
-#include "app/RecordLayouts.h"
+#include "app/model/RecordLayouts.h"
 #include "platform/Types.h"
 #include "util/Paths.h"
 

@@ -1,4 +1,4 @@
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 #include <algorithm>
 #include <cmath>

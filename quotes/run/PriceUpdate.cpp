@@ -1,4 +1,4 @@
-#include "quotes/PriceUpdate.h"
+#include "quotes/run/PriceUpdate.h"
 
 #include <cmath>
 

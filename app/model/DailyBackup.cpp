@@ -1,4 +1,4 @@
-#include "app/DailyBackup.h"
+#include "app/model/DailyBackup.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -9,7 +9,7 @@
 #include <string_view>
 #include <system_error>
 
-#include "app/DataFolders.h"
+#include "app/model/DataFolders.h"
 #include "util/Dates.h"
 
 namespace {

@@ -7,7 +7,7 @@
 #include <string>
 #include <vector>
 
-#include "app/RecordLayouts.h"
+#include "app/model/RecordLayouts.h"
 #include "db/Database.h"
 #include "util/CharacterBuffer.h"
 

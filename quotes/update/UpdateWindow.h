@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "app/RecordLayouts.h"
+#include "app/model/RecordLayouts.h"
 #include "platform/Kernel.h"
 #include "platform/Message.h"
 #include "platform/Window.h"

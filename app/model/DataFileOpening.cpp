@@ -1,4 +1,4 @@
-#include "app/DataFileOpening.h"
+#include "app/model/DataFileOpening.h"
 
 #include <cerrno>
 #include <system_error>

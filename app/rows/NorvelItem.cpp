@@ -1,4 +1,4 @@
-#include "app/NorvelItem.h"
+#include "app/rows/NorvelItem.h"
 
 #include <algorithm>
 #include <array>
@@ -6,9 +6,9 @@
 #include <cstring>
 #include <string_view>
 
-#include "app/AppState.h"
+#include "app/state/AppState.h"
 #include "platform/View.h"
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

@@ -1,8 +1,8 @@
-#include "app/FailureAlerts.h"
+#include "util/interface/FailureAlerts.h"
 
 #include <string>
 
-#include "util/InterfaceHelpers.h"
+#include "util/interface/InterfaceHelpers.h"
 
 void TellNotSaved() {
     MessageBox("The change could not be saved! Is the disk full, or the file protected?", B_STOP_ALERT);

@@ -1,4 +1,4 @@
-#include "app/DataFolders.h"
+#include "app/model/DataFolders.h"
 
 #include <algorithm>
 #include <filesystem>

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "app/RecordLayouts.h"
+#include "app/model/RecordLayouts.h"
 
 // What an answer to the question for an investment's price leads to.
 enum class QuoteOutcome {

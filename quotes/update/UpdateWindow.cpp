@@ -1,23 +1,23 @@
-#include "quotes/UpdateWindow.h"
+#include "quotes/update/UpdateWindow.h"
 
 #include <utility>
 
 #include "ColumnListView/ColumnListView.h"
-#include "app/AppState.h"
-#include "app/FailureAlerts.h"
-#include "app/MessageCodes.h"
-#include "app/NorvelItem.h"
-#include "app/PortfolioRules.h"
+#include "app/model/PortfolioRules.h"
+#include "app/rows/NorvelItem.h"
+#include "app/state/AppState.h"
+#include "app/state/MessageCodes.h"
 #include "platform/Application.h"
 #include "platform/StatusBar.h"
-#include "quotes/PriceUpdate.h"
 #include "quotes/QuoteObserver.h"
 #include "quotes/QuoteRetrieval.h"
+#include "quotes/run/PriceUpdate.h"
 #include "util/CharacterBuffer.h"
-#include "util/InterfaceHelpers.h"
 #include "util/Numbers.h"
 #include "util/Strings.h"
 #include "util/WholeFile.h"
+#include "util/interface/FailureAlerts.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 
