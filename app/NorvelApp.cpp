@@ -14,7 +14,7 @@
 #include "app/model/DataFolders.h"
 #include "app/model/PortfolioRules.h"
 #include "db/Database.h"
-#include "dialogs/PasswordDialog.h"
+#include "dialogs/PasswordDialogs.h"
 #include "resources/DesktopFiles.h"
 #include "resources/StatusImages.h"
 #include "util/CharacterBuffer.h"

@@ -14,7 +14,6 @@
 #include "platform/StringView.h"
 #include "util/CharacterBuffer.h"
 #include "util/Numbers.h"
-#include "util/interface/FailureAlerts.h"
 #include "util/interface/InterfaceHelpers.h"
 
 namespace {

@@ -8,11 +8,10 @@
 #include "app/state/AppState.h"
 #include "app/state/MessageCodes.h"
 #include "db/Database.h"
-#include "dialogs/SettingsDialog.h"
+#include "dialogs/PasswordDialogs.h"
 #include "platform/Application.h"
 #include "platform/MenuBar.h"
 #include "platform/Roster.h"
-#include "util/interface/FailureAlerts.h"
 #include "util/interface/InterfaceHelpers.h"
 
 namespace {

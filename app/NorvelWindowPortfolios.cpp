@@ -8,14 +8,12 @@
 #include "app/state/AppState.h"
 #include "app/state/MessageCodes.h"
 #include "charts/ChartWindow.h"
-#include "dialogs/PortfolioAddDialog.h"
-#include "dialogs/PortfolioEditDialog.h"
+#include "dialogs/PortfolioDialog.h"
 #include "platform/MenuField.h"
 #include "print/Report.h"
 #include "quotes/update/UpdateWindow.h"
 #include "util/CharacterBuffer.h"
 #include "util/DebugLog.h"
-#include "util/interface/FailureAlerts.h"
 #include "util/interface/InterfaceHelpers.h"
 
 void NorvelWindow::LoadPortfolioList() {

@@ -9,7 +9,6 @@
 #include "charts/ValueChartView.h"
 #include "platform/MenuField.h"
 #include "platform/MenuItem.h"
-#include "util/interface/FailureAlerts.h"
 #include "util/interface/InterfaceHelpers.h"
 
 namespace {

@@ -9,7 +9,7 @@
 #include "platform/MenuField.h"
 #include "platform/TextControl.h"
 #include "util/CharacterBuffer.h"
-#include "util/interface/FailureAlerts.h"
+#include "util/interface/InterfaceHelpers.h"
 
 namespace {
 

@@ -1,9 +1,8 @@
 #pragma once
 
 #include "app/model/RecordLayouts.h"
-#include "dialogs/BDialog.h"
+#include "dialogs/FieldForm.h"
 
-class BTextControl;
 class DATABASE;
 
 // What a portfolio's name may turn out to be.
@@ -16,21 +15,28 @@ enum class PortfolioNameCheck { Accepted, Invalid, Taken };
 
 // Asks for a portfolio's name: one field, which cannot grow beyond what a record holds. It writes nothing to
 // the database; the caller adds or renames when the dialog has ended with DialogOk.
-class PortfolioDialog : public BDialog {
+class PortfolioDialog : public FieldForm {
   public:
-    int OnOK() override = 0;
-
-  protected:
     // The left top is in screen coordinates. name holds the first text and receives the accepted one; it and
     // the database must last until DoModal returns.
-    PortfolioDialog(float x, float y, const char* title, char (&name)[NameSize], DATABASE* portfolios,
-                    uint16 flags);
+    PortfolioDialog(float x, float y, const char* title, char (&name)[NameSize], DATABASE* portfolios);
 
     // Hands the typed name to the caller and returns 1, or tells the person why not and returns 0.
-    int AcceptName();
+    int OnOK() override;
 
   private:
     DATABASE* portfolios_;
     char (&name_)[NameSize];
-    BTextControl* nameControl_;
+};
+
+// Asks for the name of a new portfolio.
+class PortfolioAddDialog : public PortfolioDialog {
+  public:
+    using PortfolioDialog::PortfolioDialog;
+};
+
+// Asks for a new name for a portfolio. The present name counts as taken: who wants to keep it cancels.
+class PortfolioEditDialog : public PortfolioDialog {
+  public:
+    using PortfolioDialog::PortfolioDialog;
 };

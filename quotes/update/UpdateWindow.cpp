@@ -16,7 +16,6 @@
 #include "util/Numbers.h"
 #include "util/Strings.h"
 #include "util/WholeFile.h"
-#include "util/interface/FailureAlerts.h"
 #include "util/interface/InterfaceHelpers.h"
 
 namespace {

@@ -5,8 +5,7 @@
 
 #include "TemporaryFolder.h"
 #include "app/state/AppState.h"
-#include "dialogs/PasswordDialog.h"
-#include "dialogs/SettingsDialog.h"
+#include "dialogs/PasswordDialogs.h"
 #include "platform/Font.h"
 #include "util/CharacterBuffer.h"
 #include "util/interface/InterfaceHelpers.h"

@@ -13,8 +13,7 @@
 #include "app/state/AppState.h"
 #include "dialogs/InvestmentDialog.h"
 #include "dialogs/InvestmentInput.h"
-#include "dialogs/PortfolioAddDialog.h"
-#include "dialogs/PortfolioEditDialog.h"
+#include "dialogs/PortfolioDialog.h"
 #include "platform/TextControl.h"
 #include "util/Dates.h"
 

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cmath>
 #include <cstring>
+#include <string>
 
 #include "platform/Application.h"
 #include "platform/Font.h"
@@ -27,6 +28,28 @@ void MessageBox(const char* text, alert_type type) {
 bool YesNoBox(const char* text) {
     constexpr int32 no = 1;
     return (new BAlert("", text, "Yes", "No", nullptr, B_WIDTH_AS_USUAL, B_WARNING_ALERT))->Go() == no;
+}
+
+void TellNotSaved() {
+    MessageBox("The change could not be saved! Is the disk full, or the file protected?", B_STOP_ALERT);
+}
+
+void TellNotRead(const char* what) {
+    MessageBox((std::string(what) + " could not be read from its file!").c_str(), B_STOP_ALERT);
+}
+
+void TellNotConnected() {
+    MessageBox("No Internet connection found!\nPlease establish your connection and try again.",
+               B_STOP_ALERT);
+}
+
+void TellNotTrusted(const char* host) {
+    MessageBox(
+        (std::string("The server ") + host +
+         " could not be trusted: its certificate was refused, and it was not asked for a price.\nIs the "
+         "name in Quorvan.cfg right, and the date of this computer?")
+            .c_str(),
+        B_STOP_ALERT);
 }
 
 bool GetHomeDir(char (&out)[PathBufferSize]) {

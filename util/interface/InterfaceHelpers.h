@@ -44,6 +44,18 @@ void MessageBox(const char* text, alert_type type);
 // closing the question: callers go ahead only on false. Any thread.
 [[nodiscard]] bool YesNoBox(const char* text);
 
+// What the person is told when a data file or the network lets a command down. Each shows an alert and waits
+// until it is closed. Any thread.
+
+// A change could not be written to its file.
+void TellNotSaved();
+// A record could not be read: an investment, unless `what` says otherwise.
+void TellNotRead(const char* what = "An investment");
+// The network cannot be reached.
+void TellNotConnected();
+// A quote server's certificate was refused.
+void TellNotTrusted(const char* host);
+
 // Stores the folder that holds the program's executable, without a trailing "/". A path that does not fit
 // gives the empty string and false: a cut one would be another folder. (For a program in the root folder the
 // empty string is the answer, with true.) Any thread.
