@@ -1,11 +1,13 @@
 #include "app/NorvelWindow.h"
 
+#include <cmath>
 #include <cstdlib>
 #include <string>
 #include <vector>
 
 #include "ColumnListView/ColumnListView.h"
 #include "app/model/CutFile.h"
+#include "app/model/InvestmentTexts.h"
 #include "app/model/PortfolioRules.h"
 #include "app/rows/NorvelItem.h"
 #include "app/state/AppState.h"
@@ -13,7 +15,6 @@
 #include "platform/MenuField.h"
 #include "platform/StringView.h"
 #include "util/CharacterBuffer.h"
-#include "util/Numbers.h"
 #include "util/interface/InterfaceHelpers.h"
 
 namespace {
@@ -116,10 +117,7 @@ void NorvelWindow::ClearInvestmentList() {
 
 void NorvelWindow::DisplayTotalValue(float total) {
     const std::optional<float> known = total >= 0 ? total : PortfolioTotalValue();
-    char number[FormatNumberSize] = "";
-    if (known)
-        FormatNumber(*known, number, 2);
-    totalValueView_->SetText(known ? (std::string("Total Value: $") + number).c_str() : UnknownTotal);
+    totalValueView_->SetText(known ? TotalValueText(*known).c_str() : UnknownTotal);
 }
 
 std::optional<float> NorvelWindow::PortfolioTotalValue() {
@@ -140,9 +138,15 @@ bool NorvelWindow::IsValuePresent() {
     if (!IsInvestmentPresent())
         return false;
     const std::optional<float> total = PortfolioTotalValue();
-    if (!total || *total > 0)
-        return total.has_value();
-    MessageBox("Unable to chart. Total value of portfolio equals zero!", B_INFO_ALERT);
+    if (!total)
+        return false;
+    if (!std::isfinite(*total))
+        MessageBox("Unable to chart. A value in the portfolio is not a number, or too large for one!",
+                   B_INFO_ALERT);
+    else if (*total > 0)
+        return true;
+    else
+        MessageBox("Unable to chart. Total value of portfolio equals zero!", B_INFO_ALERT);
     return false;
 }
 

@@ -179,7 +179,11 @@ void BView::DrawString(const char* text, BPoint point) {
     if (QPainter* painter = ViewAccess::Painter(this)) {
         painter->setFont(FontAccess::ToQt(font_));
         painter->setPen(ToQt(highColor_));
-        painter->drawText(ToQt(point), QString::fromUtf8(text));
+        const QTransform whole = painter->transform();
+        painter->translate(ToQt(point));
+        painter->scale(FontAccess::Scale(font_), FontAccess::Scale(font_));
+        painter->drawText(QPointF(), QString::fromUtf8(text));
+        painter->setTransform(whole);
     }
 }
 

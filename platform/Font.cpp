@@ -12,14 +12,17 @@
 
 // A font as the toolkit knows it, with its measures taken once: rows ask for them by the thousand.
 struct FontFace {
-    explicit FontFace(const QFont& f) : font(f), metrics(f) {
-        height.ascent = static_cast<float>(metrics.ascent());
-        height.descent = static_cast<float>(metrics.descent());
-        height.leading = static_cast<float>(metrics.leading());
+    FontFace(const QFont& f, float wanted)
+        : font(f), metrics(f), size(wanted), scale(wanted / static_cast<float>(f.pixelSize())) {
+        height.ascent = static_cast<float>(metrics.ascent()) * scale;
+        height.descent = static_cast<float>(metrics.descent()) * scale;
+        height.leading = static_cast<float>(metrics.leading()) * scale;
     }
 
     QFont font;
     QFontMetricsF metrics;
+    float size;
+    float scale; // what the toolkit's font, whose pixels are whole, is drawn with
     font_height height;
 };
 
@@ -31,14 +34,19 @@ namespace {
 
 // Sizes are pixels throughout, so that a printed page can be drawn by scaling the painter.
 std::shared_ptr<const FontFace> MakeFace(QFont font, float size) {
-    font.setPixelSize(std::max(1, static_cast<int>(std::lround(size))));
-    return std::make_shared<const FontFace>(font);
+    size = std::max(size, 1.0F);
+    font.setPixelSize(static_cast<int>(std::lround(size)));
+    return std::make_shared<const FontFace>(font, size);
 }
 
 } // namespace
 
 QFont FontAccess::ToQt(const BFont& font) {
     return font.face_->font;
+}
+
+float FontAccess::Scale(const BFont& font) {
+    return font.face_->scale;
 }
 
 void FontAccess::MakeSystemFonts() {
@@ -61,7 +69,7 @@ void FontAccess::DeleteSystemFonts() {
 BFont::BFont() : face_(be_plain_font->face_) {}
 
 float BFont::Size() const {
-    return static_cast<float>(face_->font.pixelSize());
+    return face_->size;
 }
 
 void BFont::SetSize(float size) {
@@ -73,5 +81,5 @@ void BFont::GetHeight(font_height* height) const {
 }
 
 float BFont::StringWidth(const char* text) const {
-    return static_cast<float>(face_->metrics.horizontalAdvance(QString::fromUtf8(text)));
+    return static_cast<float>(face_->metrics.horizontalAdvance(QString::fromUtf8(text))) * face_->scale;
 }

@@ -78,12 +78,17 @@ QPageLayout LayoutOf(const BMessage& settings, QPageLayout layout) {
 // The toolkit puts a file that is named without its folder into the home folder, wherever it offered one.
 class PrintDialog : public QPrintDialog {
   public:
-    explicit PrintDialog(QPrinter* printer) : QPrintDialog(printer) {}
+    // proposed is empty when a file was chosen before.
+    PrintDialog(QPrinter* printer, const QString& proposed) : QPrintDialog(printer), proposed_(proposed) {}
 
     void setVisible(bool visible) override {
         QPrintDialog::setVisible(visible);
-        if (const QLineEdit* file = FileField(); visible && file)
-            offered_ = QFileInfo(file->text()).absoluteDir();
+        QLineEdit* file = FileField();
+        if (!visible || !file)
+            return;
+        offered_ = QFileInfo(file->text()).absoluteDir();
+        if (!proposed_.isEmpty())
+            file->setText(offered_.absoluteFilePath(proposed_));
     }
     void accept() override {
         QLineEdit* file = FileField();
@@ -95,6 +100,7 @@ class PrintDialog : public QPrintDialog {
   private:
     [[nodiscard]] QLineEdit* FileField() const { return findChild<QLineEdit*>(QStringLiteral("filename")); }
 
+    QString proposed_;
     QDir offered_; // the folder of the file that the dialog proposed
 };
 
@@ -116,6 +122,7 @@ struct PrintJobPeer {
     bool pageWanted = false;  // the next drawing begins a new page
     bool printerGone = false; // the one that was set up is not there; another will not do
     OutputFile file;
+    QString proposedFile;
     QString wantedFile; // what the job writes to in the end; empty for a printer
 
     [[nodiscard]] bool IsUsable() const {
@@ -152,6 +159,10 @@ BPrintJob::~BPrintJob() {
     CancelJob();
 }
 
+void BPrintJob::ProposeFile(const char* name) {
+    peer_->proposedFile = QString::fromUtf8(name).replace('/', '-') + QStringLiteral(".pdf");
+}
+
 status_t BPrintJob::ConfigPage() {
     const std::unique_ptr<QPageSetupDialog> dialog = PageSetupDialogFor(peer_->printer);
     dialog->setObjectName(QStringLiteral("page setup dialog"));
@@ -159,7 +170,8 @@ status_t BPrintJob::ConfigPage() {
 }
 
 status_t BPrintJob::ConfigJob() {
-    PrintDialog dialog(&peer_->printer);
+    const bool named = !peer_->printer.outputFileName().isEmpty();
+    PrintDialog dialog(&peer_->printer, named ? QString() : peer_->proposedFile);
     dialog.setObjectName(QStringLiteral("print dialog"));
     dialog.setOptions(QAbstractPrintDialog::PrintToFile | QAbstractPrintDialog::PrintShowPageSize);
     if (RunDialog(dialog) != QDialog::Accepted)

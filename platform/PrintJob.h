@@ -23,6 +23,9 @@ class BPrintJob {
     BPrintJob(const BPrintJob&) = delete;
     BPrintJob& operator=(const BPrintJob&) = delete;
 
+    // What the job dialog calls a file, without folder and extension, while the person has named none.
+    void ProposeFile(const char* name);
+
     // Each shows its dialog and waits: B_OK, or B_ERROR when the person cancels.
     status_t ConfigPage();
     status_t ConfigJob();

@@ -13,9 +13,17 @@ constexpr float HeadingLines = 1.25F;
 constexpr float CellInset = 5; // from the column's line
 constexpr float LineWidth = 1;
 constexpr float RowGap = 5;
-constexpr float LeastNumberSize = 1; // points
-constexpr float LeastTextSize = 7;   // smaller than this, a text is better cut than unreadable
-constexpr float RightSlack = 2;      // what placed text leaves at the right
+constexpr float LeastTextSize = 7; // smaller than this, a text is better cut than unreadable
+constexpr float LeastFigureSize = 1;
+constexpr float SizeStep = 0.05F;
+constexpr float RightSlack = 2; // what placed text leaves at the right
+
+// The text of cell i, which ends with its stride at the latest.
+std::string Cell(const char* cells, int cellStride, int i) {
+    const auto stride = static_cast<std::size_t>(std::max(cellStride, 0));
+    const std::string_view whole(cells + static_cast<std::size_t>(i) * stride, stride);
+    return std::string(whole.substr(0, whole.find('\0')));
+}
 
 float FontHeightOf(const BView* view) {
     BFont font;
@@ -25,6 +33,15 @@ float FontHeightOf(const BView* view) {
 
 } // namespace
 
+BFont FittingFont(BFont font, const std::string& text, float width, float leastSize) {
+    const float wanted = font.StringWidth(text.c_str());
+    if (wanted > width)
+        font.SetSize(std::max(font.Size() * width / wanted, leastSize));
+    while (font.StringWidth(text.c_str()) > width && font.Size() > leastSize) // not quite in proportion
+        font.SetSize(std::max(font.Size() - SizeStep, leastSize));
+    return font;
+}
+
 PRINT_TABLE::PRINT_TABLE(BView* view, float left, float top, int columnCount, TABLE_COLUMN_ENTRY* columns,
                          float tableWidth)
     : view_(view),
@@ -33,6 +50,7 @@ PRINT_TABLE::PRINT_TABLE(BView* view, float left, float top, int columnCount, TA
       rowPosition_(top),
       columns_(columns),
       columnCount_(columns ? std::max(columnCount, 0) : 0),
+      widestFigures_(static_cast<std::size_t>(columnCount_)),
       headingHeight_(FontHeightOf(view) * HeadingLines),
       characterWidth_(view->StringWidth("m")),
       fontHeight_(FontHeightOf(view)) {
@@ -54,6 +72,12 @@ void PRINT_TABLE::LayOut(float tableWidth) {
         before += characters;
     }
     tableWidth_ = tableWidth > 0 ? tableWidth : total * unit;
+}
+
+long PRINT_TABLE::RowsWithin(float height, const BFont& font) {
+    const float row = GetFontHeight(&font);
+    const float below = height - row * HeadingLines;
+    return below < row ? 0 : 1 + static_cast<long>((below - row) / (row + RowGap));
 }
 
 float PRINT_TABLE::GetColumnXCoord(int column) const {
@@ -83,35 +107,40 @@ void PRINT_TABLE::DrawHeader() {
     rowPosition_ = top_ + headingHeight_;
 }
 
-void PRINT_TABLE::DrawText(const char* cells, int cellStride) {
-    const auto stride = static_cast<std::size_t>(std::max(cellStride, 0));
-    BRect cell(0, rowPosition_, 0, rowPosition_ + fontHeight_);
-    for (int i = 0; GetColumnXCoords(i, &cell) == 0; ++i) {
-        const std::string_view whole(cells + static_cast<std::size_t>(i) * stride, stride);
-        const std::string text(whole.substr(0, whole.find('\0')));
-        if (columns_[i].alignment & DrawTextRight) {
-            cell.left += LineWidth + RightSlack; // a number that just fits stands free of the line
-            cell.right -= CellInset;
-            DrawFitting(cell, text.c_str(), columns_[i].alignment, LeastNumberSize);
-        } else {
-            cell.left += CellInset;
-            cell.right -= LineWidth; // the edge itself is the line's
-            DrawFitting(cell, text.c_str(), columns_[i].alignment, LeastTextSize);
-        }
+void PRINT_TABLE::Measure(const char* cells, int cellStride) {
+    for (int i = 0; i < columnCount_; ++i) {
+        std::string& widest = widestFigures_[static_cast<std::size_t>(i)];
+        std::string text = Cell(cells, cellStride, i);
+        if (view_->StringWidth(text.c_str()) > view_->StringWidth(widest.c_str()))
+            widest = std::move(text);
     }
-    rowPosition_ += fontHeight_ + RowGap;
 }
 
-void PRINT_TABLE::DrawFitting(const BRect& cell, const char* text, std::uint32_t alignment,
-                              float leastSize) const {
+BRect PRINT_TABLE::TextFrame(int column) const {
+    BRect frame(0, rowPosition_, 0, rowPosition_ + fontHeight_);
+    static_cast<void>(GetColumnXCoords(column, &frame));
+    const bool right = (columns_[column].alignment & DrawTextRight) != 0;
+    frame.left += right ? LineWidth : CellInset;
+    frame.right -= right ? CellInset : LineWidth + RightSlack;
+    return frame;
+}
+
+void PRINT_TABLE::DrawText(const char* cells, int cellStride) {
+    Measure(cells, cellStride); // a row that was not foretold fits all the same
     BFont usual;
     view_->GetFont(&usual);
-    BFont font = usual;
-    while (font.StringWidth(text) > cell.Width() - RightSlack && font.Size() > leastSize)
-        font.SetSize(font.Size() - 1);
-    view_->SetFont(&font);
-    ::DrawText(view_, &cell, text, static_cast<uint8>(alignment | DrawTextMiddle));
+    for (int i = 0; i < columnCount_; ++i) {
+        const std::string text = Cell(cells, cellStride, i);
+        const bool right = (columns_[i].alignment & DrawTextRight) != 0;
+        const std::string& widest = right ? widestFigures_[static_cast<std::size_t>(i)] : text;
+        BRect frame = TextFrame(i);
+        const BFont font = FittingFont(usual, widest, frame.Width(), right ? LeastFigureSize : LeastTextSize);
+        view_->SetFont(&font);
+        frame.right += RightSlack;
+        ::DrawText(view_, &frame, text.c_str(), static_cast<uint8>(columns_[i].alignment | DrawTextMiddle));
+    }
     view_->SetFont(&usual);
+    rowPosition_ += fontHeight_ + RowGap;
 }
 
 void PRINT_TABLE::DrawGridLines() {

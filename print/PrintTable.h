@@ -1,9 +1,13 @@
 #pragma once
 
 #include <cstdint>
+#include <string>
+#include <vector>
+
+#include "platform/Font.h"
+#include "platform/Rect.h"
 
 class BView;
-struct BRect;
 
 // One column of a printed table.
 struct TABLE_COLUMN_ENTRY {
@@ -13,6 +17,10 @@ struct TABLE_COLUMN_ENTRY {
     float x = 0;             // left edge, from the table's; filled in by PRINT_TABLE
     float width = 0;         // in points; filled in by PRINT_TABLE
 };
+
+// The font, or where the text is wider in it than that, the largest in which it is not, down to the least
+// size.
+[[nodiscard]] BFont FittingFont(BFont font, const std::string& text, float width, float leastSize);
 
 // A table on a printed page: lays out columns in a view's font, and draws the heading, then row after row
 // downwards, then the lines. It knows nothing of what the cells mean, of pages or of their ends: the caller
@@ -26,12 +34,19 @@ class PRINT_TABLE {
     PRINT_TABLE(BView* view, float left, float top, int columnCount, TABLE_COLUMN_ENTRY* columns,
                 float tableWidth);
 
+    // How many rows below a heading have room in a table so high, in that font.
+    [[nodiscard]] static long RowsWithin(float height, const BFont& font);
+
+    // Takes the row's cells for those that are to be drawn: the right-aligned ones of a column, being
+    // figures, get one size in which the widest of them fits. To be called for every row before the first is
+    // drawn.
+    void Measure(const char* cells, int cellStride);
     // Draws the heading row, 1.25 lines high: labels in white on black.
     void DrawHeader();
     // Draws one row; cell i is the NUL-terminated text at cells + i * cellStride, and at most cellStride
-    // bytes of it. What is too wide for its column is drawn smaller; a text that would be too small to read
-    // is cut at the column's edge, a right-aligned cell, being a number, never: without its last digits it
-    // would be another number.
+    // bytes of it. A right-aligned cell ends 5 points before the column's edge and is never cut: without its
+    // last digits it would be another number. Any other that is too wide is drawn smaller, and cut at the
+    // edge when it would be too small to read.
     void DrawText(const char* cells, int cellStride);
     // Draws the line at each column's edge and the one below the last row.
     void DrawGridLines();
@@ -44,14 +59,13 @@ class PRINT_TABLE {
     // Moves the table's top edge, but not the next row.
     void SetTableYPos(float top) { top_ = top; }
 
-    // The top of the next row, and the bottom of its text.
+    // The top of the next row.
     [[nodiscard]] float RowPosition() const { return rowPosition_; }
-    [[nodiscard]] float RowEnd() const { return rowPosition_ + fontHeight_; }
 
   private:
     void LayOut(float tableWidth);
-    // Smaller than usual when it is too wide, down to that size.
-    void DrawFitting(const BRect& cell, const char* text, std::uint32_t alignment, float leastSize) const;
+    // Where the text of a cell may stand in its column.
+    [[nodiscard]] BRect TextFrame(int column) const;
 
     BView* view_;
     float left_;
@@ -59,6 +73,7 @@ class PRINT_TABLE {
     float rowPosition_;
     TABLE_COLUMN_ENTRY* columns_;
     int columnCount_;
+    std::vector<std::string> widestFigures_; // of each column
     float tableWidth_ = 0;
     float headingHeight_;
     float characterWidth_;

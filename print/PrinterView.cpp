@@ -2,12 +2,11 @@
 
 #include <algorithm>
 #include <array>
-#include <cstring>
 
+#include "app/model/InvestmentTexts.h"
 #include "app/model/PortfolioRules.h"
 #include "print/Banner.h"
 #include "print/PrintTable.h"
-#include "print/ReportTexts.h"
 #include "util/Dates.h"
 #include "util/interface/InterfaceHelpers.h"
 
@@ -15,7 +14,11 @@ namespace {
 
 constexpr float BarHeight = 18;
 constexpr float TableTop = 90;
-constexpr float LargestTableFont = 12;
+constexpr float LargestFont = 12;
+constexpr float LeastTableFont = 8; // before rows are left out
+constexpr float LeastBarFont = 5;   // before the middle text is left out
+constexpr float SizeStep = 0.25F;
+constexpr float Gap = 6; // between two texts of a bar
 
 constexpr std::array<TABLE_COLUMN_ENTRY, ReportColumnCount> ReportColumns = {{
     {24, "Name", DrawTextLeft},
@@ -27,10 +30,10 @@ constexpr std::array<TABLE_COLUMN_ENTRY, ReportColumnCount> ReportColumns = {{
     {7, "Risk", DrawTextLeft},
 }};
 
-constexpr float TableCharacters() {
-    float all = 0;
+constexpr std::size_t TableCharacters() {
+    std::size_t all = 0;
     for (const TABLE_COLUMN_ENTRY& column : ReportColumns)
-        all += static_cast<float>(column.characters);
+        all += static_cast<std::size_t>(column.characters);
     return all;
 }
 
@@ -45,62 +48,85 @@ PrinterView::PrinterView(BRect frame, const char* portfolio, float totalValue, D
 }
 
 void PrinterView::Draw(BRect page) {
-    SetFont(be_plain_font);
-    DrawTitles({page.left, page.top, page.right, page.top + BarHeight});
-    const Rows rows = DrawInvestments(page);
-    DrawFooter({page.left, page.bottom - BarHeight, page.right, page.bottom}, rows);
+    const BRect place(page.left, page.top + TableTop, page.right, page.bottom - BarHeight);
+    BFont least(*be_fixed_font);
+    least.SetSize(std::min(least.Size(), LeastTableFont));
+    std::vector<Row> rows;
+    const long all = ReadRows(PRINT_TABLE::RowsWithin(place.Height(), least), rows);
+    DrawTable(place, rows);
+
+    ReportText count, date;
+    FormatReportCount(static_cast<long>(rows.size()), all, count);
+    int year = 0, month = 0, day = 0;
+    GetDate(&year, &month, &day);
+    FormatReportDate(year, month, day, date);
+    const Bar bars[] = {{"", "Quorvan Personal Portfolio Manager", "Page 1  "},
+                        {"", portfolio_, ""},
+                        {TotalValueText(totalValue_), "", ""},
+                        {"  Quorvan, version 1.0", count, date}};
+    SetBarFont(page.Width(), bars);
+    const float tops[] = {page.top, page.top + 2 * BarHeight, page.top + 3 * BarHeight, place.bottom};
+    for (std::size_t i = 0; i < std::size(bars); ++i)
+        DrawBar({page.left, tops[i], page.right, tops[i] + BarHeight}, bars[i]);
 }
 
-void PrinterView::DrawTitles(BRect bar) {
-    Banner(this, "Quorvan Personal Portfolio Manager", &bar, BannerInverse | BannerCenter);
-    DrawText(this, &bar, "Page 1  ", DrawTextRight | DrawTextMiddle);
-    bar.OffsetBy(0, 2 * BarHeight);
-    Banner(this, portfolio_, &bar, BannerInverse | BannerCenter);
-    bar.OffsetBy(0, BarHeight);
-    ReportText total;
-    FormatReportTotal(totalValue_, total);
-    SetHighColor(colors::black);
-    DrawText(this, &bar, total, DrawTextLeft | DrawTextMiddle);
+long PrinterView::ReadRows(long wanted, std::vector<Row>& rows) {
+    long all = 0;
+    hasAll_ = ForEachInvestment(*database_, portfolio_, [&](const INVESTMENT_DATA& record, long) {
+        if (all++ < wanted)
+            FillReportRow(record, rows.emplace_back().cells);
+    });
+    return all;
 }
 
-void PrinterView::SetTableFont(float pageWidth) {
+void PrinterView::SetTableFont(BRect place, long rowCount) {
     BFont font(*be_fixed_font);
-    font.SetSize(std::min(font.Size(), LargestTableFont));
-    while (font.StringWidth("m") * TableCharacters() > pageWidth && font.Size() > 1)
-        font.SetSize(font.Size() - 1);
+    font.SetSize(std::min(font.Size(), LargestFont));
+    font = FittingFont(font, std::string(TableCharacters(), 'm'), place.Width(), 1);
+    while (PRINT_TABLE::RowsWithin(place.Height(), font) < rowCount && font.Size() > LeastTableFont)
+        font.SetSize(std::max(font.Size() - SizeStep, LeastTableFont));
     SetFont(&font);
 }
 
-PrinterView::Rows PrinterView::DrawInvestments(BRect page) {
-    SetTableFont(page.Width());
+void PrinterView::DrawTable(BRect place, const std::vector<Row>& rows) {
+    SetTableFont(place, static_cast<long>(rows.size()));
     auto columns = ReportColumns;
-    PRINT_TABLE table(this, page.left, page.top + TableTop, ReportColumnCount, columns.data(), 0);
+    PRINT_TABLE table(this, place.left, place.top, ReportColumnCount, columns.data(), 0);
     table.DrawHeader();
-    const float footerTop = page.bottom - BarHeight;
-    Rows rows;
-    hasAll_ = ForEachInvestment(*database_, portfolio_, [&](const INVESTMENT_DATA& record, long) {
-        ++rows.all;
-        rows.shown += table.RowEnd() <= footerTop;
-        if (table.RowPosition() > footerTop) // unseen, and a hundred thousand would only make the file large
-            return;
-        ReportRow row;
-        FillReportRow(record, row);
-        table.DrawText(row[0], ReportCellSize);
-    });
+    for (const Row& row : rows)
+        table.Measure(row.cells[0], ReportCellSize);
+    for (const Row& row : rows)
+        table.DrawText(row.cells[0], ReportCellSize);
     SetFont(be_plain_font);
     table.DrawGridLines();
-    return rows;
 }
 
-void PrinterView::DrawFooter(BRect bar, Rows rows) {
-    ReportText text;
-    FormatReportCount(rows.shown, rows.all, text);
-    Banner(this, text, &bar, BannerInverse | BannerCenter);
-    DrawText(this, &bar, "  Quorvan, version 1.0", DrawTextLeft | DrawTextMiddle);
-    int year = 0;
-    int month = 0;
-    int day = 0;
-    GetDate(&year, &month, &day);
-    FormatReportDate(year, month, day, text);
-    DrawText(this, &bar, text, DrawTextRight | DrawTextMiddle);
+bool PrinterView::Fits(const Bar& bar, float width) const {
+    const float left = StringWidth(bar.left.c_str());
+    const float middle = StringWidth(bar.middle.c_str());
+    const float right = StringWidth(bar.right.c_str());
+    return middle / 2 + Gap + std::max(left, right) <= width / 2 && left + Gap + right <= width;
+}
+
+void PrinterView::SetBarFont(float width, std::span<const Bar> bars) {
+    BFont font(*be_plain_font);
+    font.SetSize(std::min(font.Size(), LargestFont));
+    SetFont(&font);
+    while (font.Size() > LeastBarFont &&
+           std::any_of(bars.begin(), bars.end(), [&](const Bar& bar) { return !Fits(bar, width); })) {
+        font.SetSize(font.Size() - SizeStep);
+        SetFont(&font);
+    }
+}
+
+void PrinterView::DrawBar(BRect frame, const Bar& bar) {
+    const bool hasSides = !bar.left.empty() || !bar.right.empty();
+    const bool black = !bar.middle.empty();
+    if (black)
+        Banner(this, hasSides && !Fits(bar, frame.Width()) ? "" : bar.middle.c_str(), &frame,
+               BannerInverse | BannerCenter);
+    else
+        SetHighColor(colors::black);
+    DrawText(this, &frame, bar.left.c_str(), DrawTextLeft | DrawTextMiddle);
+    DrawText(this, &frame, bar.right.c_str(), DrawTextRight | DrawTextMiddle);
 }

@@ -1,13 +1,19 @@
 #pragma once
 
+#include <span>
+#include <string>
+#include <vector>
+
 #include "platform/View.h"
+#include "print/ReportTexts.h"
 
 class DATABASE;
 
 // The report's page: title, the portfolio's name and total value, the table of its investments, and the
 // footer with version, count and date. It lives, hidden, for one print job only, and draws all of the page
-// wherever the job draws it; it neither selects a printer nor begins pages. Rows that the page has no room
-// for are lost, and the footer tells so. Interface thread.
+// wherever the job draws it; it neither selects a printer nor begins pages. Its fonts are the person's, as
+// far as the page has room. Rows that it has no room for even in small letters are left out, and the footer
+// tells so. Interface thread.
 class PrinterView : public BView {
   public:
     // portfolio and database, the investment file, are borrowed.
@@ -19,16 +25,23 @@ class PrinterView : public BView {
     [[nodiscard]] bool HasAll() const { return hasAll_; }
 
   private:
-    struct Rows {
-        long shown = 0; // above the footer, whole
-        long all = 0;
+    // A bar's texts at its left end, in its middle and at its right end; any may be empty.
+    struct Bar {
+        std::string left, middle, right;
+    };
+    struct Row {
+        ReportRow cells;
     };
 
-    void DrawTitles(BRect bar);
-    Rows DrawInvestments(BRect page);
-    void DrawFooter(BRect bar, Rows rows);
-    // Sets the fixed-width font, at most as large as the table still fits the page in its width.
-    void SetTableFont(float pageWidth);
+    // Reads the first rows of the portfolio, as many as may be wanted. Returns how many it has in all.
+    [[nodiscard]] long ReadRows(long wanted, std::vector<Row>& rows);
+    // Sets the largest font in which the table fits the place in its width, and that many rows its height.
+    void SetTableFont(BRect place, long rowCount);
+    void DrawTable(BRect place, const std::vector<Row>& rows);
+    // Sets the largest font in which the texts of all these bars, so wide, fit side by side.
+    void SetBarFont(float width, std::span<const Bar> bars);
+    [[nodiscard]] bool Fits(const Bar& bar, float width) const;
+    void DrawBar(BRect frame, const Bar& bar);
 
     DATABASE* database_;
     const char* portfolio_;

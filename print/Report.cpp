@@ -48,17 +48,34 @@ bool MayWrite(const BMessage& settings) {
     return !no;
 }
 
+// Whether the settings were chosen in both dialogs, and printed with as far as is known.
+constexpr const char* SettledField = "settled";
+
+void KeepSettings(const BPrintJob& job, bool settled, std::unique_ptr<BMessage>& settings) {
+    settings.reset(job.Settings());
+    settings->AddBool(SettledField, settled);
+}
+
+bool IsSettled(const BMessage& settings) {
+    bool settled = false;
+    return settings.FindBool(SettledField, &settled) == B_OK && settled;
+}
+
 bool ConfigureJob(BPrintJob& job, std::unique_ptr<BMessage>& settings) {
-    if (settings) {
-        job.SetSettings(settings.get());
+    if (!settings)
+        settings = std::make_unique<BMessage>(FirstPrintSettings());
+    job.SetSettings(settings.get());
+    if (IsSettled(*settings)) {
         if (MayWrite(*settings))
             return true;
-    } else if (job.ConfigPage() != B_OK) {
-        return false;
+    } else {
+        if (job.ConfigPage() != B_OK)
+            return false;
+        KeepSettings(job, false, settings);
     }
     if (job.ConfigJob() != B_OK)
         return false;
-    settings.reset(job.Settings());
+    KeepSettings(job, true, settings);
     return true;
 }
 
@@ -84,13 +101,22 @@ ReportResult PrintReport(BPrintJob& job, BWindow* window, const char* portfolio,
     return job.CommitJob() ? ReportResult::Printed : ReportResult::NotPrinted;
 }
 
+BMessage FirstPrintSettings() {
+    constexpr float halfInch = 36;
+    BMessage settings;
+    for (const char* name : {"left margin", "top margin", "right margin", "bottom margin"})
+        settings.AddFloat(name, halfInch);
+    return settings;
+}
+
 ReportResult RunReportJob(BWindow* window, const char* portfolio, DATABASE& investments,
                           std::unique_ptr<BMessage>& settings) {
     BPrintJob job(JobName);
+    job.ProposeFile(portfolio);
     if (!ConfigureJob(job, settings))
         return ReportResult::Cancelled;
     const ReportResult result = PrintReport(job, window, portfolio, investments);
     if (result == ReportResult::NotPrinted)
-        settings.reset();
+        KeepSettings(job, false, settings);
     return result;
 }

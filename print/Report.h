@@ -2,7 +2,8 @@
 
 #include <memory>
 
-class BMessage;
+#include "platform/Message.h"
+
 class BPrintJob;
 class BWindow;
 class DATABASE;
@@ -22,9 +23,12 @@ enum class ReportResult {
 [[nodiscard]] ReportResult PrintReport(BPrintJob& job, BWindow* window, const char* portfolio,
                                        DATABASE& investments);
 
+// What a job starts from: margins of half an inch, within which any printer prints.
+[[nodiscard]] BMessage FirstPrintSettings();
+
 // Makes the whole job for a window, which must be locked. Without kept settings it shows the page dialog and
-// the job dialog, and keeps what was chosen there; otherwise it only asks before it replaces a file, and
-// shows the job dialog for another one. Settings that could not be printed with are dropped, so that the next
-// job asks again.
+// the job dialog, which proposes the portfolio's name for a file, and keeps what was chosen there; otherwise
+// it only asks before it replaces a file, and shows the job dialog for another one. With settings that were
+// cancelled halfway or could not be printed with, the next job's dialogs are shown again and start from these.
 [[nodiscard]] ReportResult RunReportJob(BWindow* window, const char* portfolio, DATABASE& investments,
                                         std::unique_ptr<BMessage>& settings);

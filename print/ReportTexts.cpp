@@ -25,12 +25,6 @@ void FillReportRow(const INVESTMENT_DATA& record, ReportRow& row) {
     CopyText(row[6], FieldText(record.Risk));
 }
 
-void FormatReportTotal(float total, ReportText& out) {
-    char number[FormatNumberSize];
-    FormatNumber(total, number, 2);
-    FormatInto(out, sizeof out, "Total Value: $%s", number);
-}
-
 void FormatReportDate(int year, int month, int day, ReportText& out) {
     char date[FormatDateSize];
     FormatInto(date, sizeof date, "%.4d%.2d%.2d", year, month, day);

@@ -17,9 +17,6 @@ using ReportText = char[ReportTextSize];
 // Text is cut to a cell's 31 bytes; a number that would be is "#####".
 void FillReportRow(const INVESTMENT_DATA& record, ReportRow& row);
 
-// "Total Value: $1,234.50".
-void FormatReportTotal(float total, ReportText& out);
-
 // The month's name, the two-digit day, the year and two spaces: "March 05, 1999  ".
 void FormatReportDate(int year, int month, int day, ReportText& out);
 

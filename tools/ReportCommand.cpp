@@ -5,6 +5,8 @@
 #include <cstring>
 #include <iostream>
 #include <memory>
+#include <string>
+#include <vector>
 
 #include "db/Database.h"
 #include "platform/PrintJob.h"
@@ -14,21 +16,21 @@
 
 namespace {
 
-constexpr float Margin = 36; // half an inch, which any printer can print within
-
 struct ReportOptions {
     std::string home;
     std::string portfolio;
     std::string output;
+    std::string page = "A4";
+    bool landscape = false;
 };
 
 // Returns what came of it, and in `error` the errno number of a file that cannot be written.
 ReportResult WriteReport(const ReportOptions& options, DATABASE& investments, int& error) {
     const OffscreenApplication application;
-    BMessage settings;
+    BMessage settings = FirstPrintSettings();
     settings.AddString("output file", options.output.c_str());
-    for (const char* name : {"left margin", "top margin", "right margin", "bottom margin"})
-        settings.AddFloat(name, Margin);
+    settings.AddString("page size", options.page.c_str());
+    settings.AddBool("landscape", options.landscape);
     BPrintJob job("Quorvan");
     job.SetSettings(&settings);
     const ReportResult result = PrintReport(job, nullptr, options.portfolio.c_str(), investments);
@@ -62,6 +64,12 @@ void AddReportCommand(CLI::App& application, int& status) {
     command->add_option("-o,--output", options->output, "The PDF file; replaced where it exists")
         ->required()
         ->type_name("FILE");
+    const std::vector<std::string> pages = {"A3", "A4",     "A5",    "A6",        "B4",
+                                            "B5", "Letter", "Legal", "Executive", "Tabloid"};
+    command->add_option("--page", options->page, "The paper's size (default: A4)")
+        ->transform(CLI::IsMember(pages, CLI::ignore_case))
+        ->type_name("NAME");
+    command->add_flag("--landscape", options->landscape, "The paper lies on its long side");
     command
         ->add_option("--home", options->home,
                      "Quorvan's folder (default: that of quorvan-cli when it holds an "

@@ -51,6 +51,17 @@ void FormatValue(float value, FigureText& out) {
     FormatNumber(value, out, 2);
 }
 
+std::string TotalValueText(float total) {
+    const std::string title = "Total Value: ";
+    if (std::isnan(total))
+        return title + "not a number";
+    if (std::isinf(total))
+        return title + "too large for a number";
+    FigureText number;
+    FormatValue(total, number);
+    return title + "$" + number;
+}
+
 void FormatDay(const dbDATE& date, FigureText& out) {
     FormatInto(out, sizeof out, "%.2d-%.2d-%.4d", date.month, date.day, date.year);
 }

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <string>
+
 #include "app/model/RecordLayouts.h"
 #include "util/Numbers.h"
 
@@ -18,6 +20,9 @@ void FormatPrice(float price, const char* type, FigureText& out);
 
 // With two decimals and thousands separators.
 void FormatValue(float value, FigureText& out);
+
+// "Total Value: $1,234.50"; in words for a sum that is no number or beyond all of them.
+[[nodiscard]] std::string TotalValueText(float total);
 
 // Month, day and year: "12-25-1999".
 void FormatDay(const dbDATE& date, FigureText& out);

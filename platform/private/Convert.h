@@ -30,7 +30,9 @@ inline QColor ToQt(rgb_color color) {
 }
 
 struct FontAccess {
+    // In the nearest whole size; Scale tells by how much it differs from the font's own.
     static QFont ToQt(const BFont& font);
+    static float Scale(const BFont& font);
     // The application object makes the three system fonts and deletes them at its end.
     static void MakeSystemFonts();
     static void DeleteSystemFonts();
