@@ -9,9 +9,8 @@ run_packages=(fonts-dejavu-core ca-certificates)
 display_packages=(xvfb xauth xdotool x11-utils imagemagick poppler-utils)
 # To build and run the tests and the benchmarks.
 test_packages=(libgtest-dev libgmock-dev libbenchmark-dev libsqlite3-dev libssl-dev poppler-utils clang-format)
-# To check what desktops and man read, and what assistive technology hears.
-test_packages+=(desktop-file-utils appstream librsvg2-bin libxml2-utils libglib2.0-bin)
-test_packages+=(at-spi2-core dbus-daemon man-db groff-base)
+# To check what desktops and man read.
+test_packages+=(desktop-file-utils appstream librsvg2-bin libxml2-utils libglib2.0-bin man-db groff-base)
 # For scripts/tidy.sh.
 tidy_packages=(clang-tidy clang-tools)
 # For scripts/coverage.sh.

@@ -47,10 +47,9 @@ class StepDriver : public QObject {
     }
 
     // Waits for an alert with this text and presses one of its buttons.
-    StepDriver& Answer(const char* text, const char* button) {
+    StepDriver& Answer(const std::string& text, const char* button) {
         return When(
-            std::string("alert: ") + text,
-            [text] { return Alert() && Alert()->text() == QString::fromUtf8(text); },
+            "alert: " + text, [text] { return Alert() && Alert()->text() == QString::fromStdString(text); },
             [button] { Press(Alert(), button); });
     }
 

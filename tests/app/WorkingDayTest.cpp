@@ -1,198 +1,195 @@
-// A person's whole working day: everything is done by mouse and keys on the real window, and in the end every
-// record is looked at byte by byte.
+// A person's whole working day without a mouse: every command is reached by menu letters, Tab, arrows, Space,
+// Enter and Escape. In the end every record is looked at byte by byte.
 #include "Program.h"
-
-#include <QPushButton>
 
 namespace {
 
 // With letters of more than one byte.
-constexpr const char* CedarName = "C\xC3\xA9"
-                                  "dar";
+constexpr const char* Cedar = "C\xC3\xA9"
+                              "dar";
 constexpr const char* Reserve = "R\xC3\xBC"
                                 "ckhalt";
 
-struct Typed {
-    const char* name;
-    const char* ticker;
-    const char* type;
-    const char* shares;
-    const char* price;
-    const char* agent;
-};
-constexpr Typed Day[] = {
-    {"Acme", "ACM", "Stock", "100", "12.375", "Bank"},
-    {"Birch & Sons", "BRCH", "Stock", "10.5", "3", ""},
-    {CedarName, "", "Fund", "1e3", "0.25", "Broker"},
-    {"Dogwood", "DGWD", "Bond Fund", "", "9", "Broker"},
-    {"Elm", "ELM", "stock", "7", "abc", "Bank"},
-    {"Fir", "FIR", "Other", "-2", "5", "Bank"},
-    {"Grove", "GRV", "Fund", "333.333", "1.01", ""},
-    {"Hazel, long in name but not too", "HAZELNUTS", "Fund", "1", "1", "Self"},
-    {"Ironwood", "IRN", "Stock", "12345.678", "98.7654", "Bank"},
-    {"Juniper", "JNP", "Stock", "2", "2", "Bank"},
-};
-
-// The record that the form must make of what was typed.
-INVESTMENT_DATA Expected(const char* portfolio, const Typed& typed, dbDATE today) {
-    INVESTMENT_DATA record{};
-    CopyText(record.Portfolio, portfolio);
-    CopyText(record.Name, typed.name);
-    CopyText(record.Ticker, typed.ticker);
-    CopyText(record.Type, typed.type);
-    CopyText(record.Agent, typed.agent);
-    CopyText(record.Risk, "Med");
-    record.Shares = std::strtof(typed.shares, nullptr);
-    record.Price = std::strtof(typed.price, nullptr);
-    record.Value = record.Shares * record.Price;
-    record.PrevPrice = NoPreviousPrice;
-    record.Date = today;
-    return record;
-}
-
-// Fills the investment form from top to bottom, going on with Tab over the pick lists, and confirms it with
-// Enter.
-void FillForm(const Typed& typed) {
-    const std::pair<const char*, int> fields[] = {
-        {typed.name, 1}, {typed.ticker, 1}, {typed.type, 2}, {typed.shares, 1}, {typed.price, 2}};
-    for (const auto& [text, tabs] : fields) {
-        Driver::TypeOver(text);
-        for (int i = 0; i < tabs; ++i)
-            Driver::Key(Qt::Key_Tab);
-    }
-    Driver::TypeOver(typed.agent, Qt::Key_Return);
+// Whether keys reach the window. There is no window manager here to pass them on when another window goes.
+bool HasKeys(QWidget* window) {
+    if (!window || QApplication::activePopupWidget())
+        return false;
+    if (!window->isActiveWindow())
+        window->activateWindow();
+    return window->isActiveWindow() && QApplication::focusWidget();
 }
 
 class WorkingDay : public testing::Test, protected Program {
   protected:
     using Program::Run;
 
-    // Opens a menu by the mouse and clicks one of its items.
-    void Choose(const char* title, const char* label) {
-        Then(
-            std::string(title) + " > " + label,
-            [title, label] {
-                ClickTitle(Main(), title);
-                ClickItem(label);
+    void InMain(Action action) {
+        When(
+            "the main window's keys", [] { return !QApplication::activeModalWidget() && HasKeys(Main()); },
+            std::move(action));
+    }
+    void Press(Qt::Key key, Qt::KeyboardModifiers with = {}) {
+        InMain([key, with] { Key(key, with); });
+    }
+    // In the menu that is opened next.
+    void PressInMenu(std::vector<Qt::Key> keys) {
+        When(
+            "a menu", [] { return OpenMenu() && OpenMenu()->activeAction(); },
+            [keys = std::move(keys)] {
+                for (const Qt::Key key : keys)
+                    Key(key);
             });
     }
-    void Fill(const char* title, Action action) {
+    // Opens a menu by its letter and takes the item with the letter.
+    void Choose(Qt::Key menu, Qt::Key item) {
+        Press(menu, Qt::AltModifier);
+        PressInMenu({item});
+    }
+    // As soon as the keyboard is in a dialog or an alert with this title or text.
+    void In(const char* title, Action action) {
         When(
-            std::string("form: ") + title,
+            std::string("dialog: ") + title,
             [title] {
-                return Driver::Window(title) && QApplication::activeModalWidget() == Driver::Window(title) &&
-                       Field();
+                QWidget* dialog = QApplication::activeModalWidget();
+                return dialog && (Alert() ? Alert()->text() : dialog->windowTitle()) == title &&
+                       HasKeys(dialog);
             },
             std::move(action));
     }
     // Gives the current or a new portfolio a name.
-    void Name(const char* command, const char* title, const char* name) {
-        Choose("Portfolio", command);
-        Fill(
-            title, [name] { TypeOver(name, Qt::Key_Return); });
-        Await(std::string("portfolio ") + name, [name] {
-            return Selector()->FindMarked() && Selector()->FindMarked()->Label() == std::string(name);
+    void Name(Qt::Key command, const char* title, const char* name) {
+        Choose(Qt::Key_P, command);
+        In(title, [name] { TypeOver(name, Qt::Key_Return); });
+        Showing(name);
+    }
+    // Fills the form from top to bottom with what makes the record: over the pick list of types to Shares by
+    // its letter, and in Risk to High, which is below the marked Med. Risk and agent are left out otherwise.
+    void Add(const INVESTMENT_DATA& record, const char* shares, const char* price) {
+        Choose(Qt::Key_I, Qt::Key_A);
+        const char* title = "Add an Investment";
+        In(title, [&record, shares, price] {
+            Type(record.Name, Qt::Key_Tab);
+            Type(record.Ticker, Qt::Key_Tab);
+            Type(record.Type);
+            Key(Qt::Key_S, Qt::AltModifier);
+            TypeOver(shares, Qt::Key_Tab);
+            TypeOver(price, Qt::Key_Tab);
+            Key(Qt::Key_Down);
+        });
+        PressInMenu({Qt::Key_Down, Qt::Key_Return});
+        In(
+            title,
+            [&record] {
+                Key(Qt::Key_Tab);
+                Type(record.Agent);
+                Key(Qt::Key_E, Qt::AltModifier); // Retirement
+            });
+        When(
+            "the check mark",
+            [title] {
+                return Driver::Window(title)->findChild<QAbstractButton*>("retirement check")->isChecked();
+            },
+            [] { Key(Qt::Key_Return); });
+    }
+    void Showing(const char* portfolio) {
+        Await(
+            std::string("portfolio ") + portfolio,
+            [portfolio] {
+                const BMenuItem* marked = Selector()->FindMarked();
+                return marked && marked->Label() == std::string(portfolio) &&
+                       !QApplication::activeModalWidget();
+            });
+    }
+    void ToTheList() {
+        InMain([] {
+            for (int steps = 0; steps < 10 && QApplication::focusWidget() != RowsWidget(); ++steps)
+                Key(Qt::Key_Tab);
+            EXPECT_EQ(QApplication::focusWidget(), RowsWidget());
         });
     }
-    // Opens the selector by the mouse and picks a portfolio.
-    void Pick(const char* name) {
-        Then(
-            std::string("pick ") + name,
-            [] {
-                for (QPushButton* button : Main()->findChildren<QPushButton*>())
-                    if (button->menu())
-                        QTest::mouseClick(button, Qt::LeftButton);
-            });
-        When("the selector's menu", OpenMenu, [name] { ClickItem(name); });
-    }
-    // Every record of invest.db, compared with what it must be.
-    void ExpectInvestments(const std::vector<INVESTMENT_DATA>& expected) const {
+    // Every record of invest.db, without the unused bytes at its end.
+    void ExpectRecords(const std::vector<INVESTMENT_DATA>& expected) const {
         DATABASE file(File("invest.db").c_str());
-        DATABASE_HEADER header{};
-        file.GetHeaderInfo(&header);
-        ASSERT_EQ(header.recordCount, static_cast<std::int32_t>(expected.size()));
-        EXPECT_EQ(header.deletedCount, 0);
-        for (std::size_t i = 0; i < expected.size(); ++i) {
+        ASSERT_EQ(RecordSlots("invest.db"), std::ssize(expected));
+        for (long i = 0; i < std::ssize(expected); ++i) {
             INVESTMENT_DATA record{};
-            ASSERT_EQ(file.Read(static_cast<long>(i), &record), 1);
+            ASSERT_EQ(file.Read(i, &record), 1);
             EXPECT_EQ(std::memcmp(&record, &expected[i], offsetof(INVESTMENT_DATA, Unused)), 0)
                 << record.Name;
         }
     }
 };
 
-TEST_F(WorkingDay, EveryRecordIsAsItShouldBe) {
-    const dbDATE today = Today();
-    for (const char* name : {"Old hand", "Short lived", "My first one"})
-        Name("Add", "Add a Portfolio", name);
-    for (const Typed& typed : Day) {
-        Then(
-            "Add button", [] { Press(Main(), "add button"); });
-        Fill("Add an Investment", [&typed] { FillForm(typed); });
+TEST_F(WorkingDay, NeedsNoMouseAndEveryRecordIsAsItShouldBe) {
+    Name(Qt::Key_A, "Add a Portfolio", "Later");
+    Name(Qt::Key_A, "Add a Portfolio", "Now");
+    INVESTMENT_DATA birch = MakeInvestment("Later", "Birch & Sons", 333.333F, 1.01F, "Bond Fund");
+    INVESTMENT_DATA acme = MakeInvestment("Later", "Acme", 12345.678F, 98.7654F, "stock");
+    INVESTMENT_DATA cedar = MakeInvestment("Now", Cedar, 1000, 0.25F);
+    for (INVESTMENT_DATA* each : {&birch, &acme, &cedar}) {
+        CopyTextZeroed(each->Risk, "High");
+        each->Retire = 1;
+        each->Date = Today();
     }
-    Expect({"Acme", "Birch & Sons", CedarName, "Dogwood", "Elm", "Fir", "Grove",
-            "Hazel, long in name but not too", "Ironwood", "Juniper"});
-
-    Then("select two", [] {
-        ClickRow(1);
-        ClickRow(3, Qt::ControlModifier);
+    Add(birch, "333.333", "1.01");
+    Add(acme, "12345.678", "98.7654");
+    Add(cedar, "1e3", "0.25");
+    Expect({birch.Name, acme.Name, Cedar}, "$1,219,912.50");
+    // The list's header comes after the list, and its first column is the name.
+    ToTheList();
+    Press(Qt::Key_Tab);
+    Press(Qt::Key_Space);
+    Expect({acme.Name, birch.Name, Cedar});
+    // Enter edits the row that a typed letter has found; Escape leaves it as it was.
+    ToTheList();
+    for (const Qt::Key key : {Qt::Key_Home, Qt::Key_C, Qt::Key_Return})
+        Press(key);
+    In("Edit this Investment", [] { Type("not kept", Qt::Key_Escape); });
+    Expect({acme.Name, birch.Name, Cedar});
+    Press(Qt::Key_Return);
+    In("Edit this Investment", [] {
+        Type("Cypress");
+        Key(Qt::Key_S, Qt::AltModifier);
+        Key(Qt::Key_Tab);
+        TypeOver("41.5", Qt::Key_Return);
     });
-    Choose("Investment", "Cut");
-    Pick("Old hand");
-    Expect({});
-    Choose("Investment", "Paste");
-    Expect({"Birch & Sons", "Dogwood"});
-    Pick("My first one");
-    Await("eight rows", [] { return Names().size() == 8; });
-
-    // A double click edits; the row keeps its place.
-    Then("edit Elm", [] {
-        ClickRow(2);
-        QTest::mouseDClick(RowsWidget()->viewport(), Qt::LeftButton, {}, PlaceOfRow(2));
+    Expect({acme.Name, birch.Name, "Cypress"}).Then("the row that was edited", [] {
+        EXPECT_EQ(RowsWidget()->currentIndex().row(), 2);
+        EXPECT_STREQ(Row(2)->Text(5), "41.50");
     });
-    Fill(
-        "Edit this Investment",
-        [] {
-            TypeOver("Elm again", Qt::Key_Tab);
-            Driver::Window("Edit this Investment")->findChild<QLineEdit*>("price control")->setFocus();
-            TypeOver("41.5", Qt::Key_Return);
-        });
-    When(
-        "the edited row", [] { return Names().at(2) == "Elm again"; },
-        [] { EXPECT_STREQ(Row(2)->Text(5), "41 1/2"); });
-
-    Name("Edit", "Edit Portfolio", Reserve);
-    Then("sort by name", [] {
-        QTest::mouseClick(Main()->findChild<QWidget*>("column labels"), Qt::LeftButton, {}, QPoint(80, 6));
-    });
-    const Texts rest = {"Acme",     CedarName, "Elm again", "Fir", "Grove", "Hazel, long in name but not too",
-                        "Ironwood", "Juniper"};
-    Expect(rest);
-
-    Pick("Short lived");
-    Expect({});
-    Choose("Portfolio", "Del");
-    Answer("Are you sure you want to delete this portfolio?", "Yes").Answer("Are you really sure?", "Yes");
-    Expect({"Birch & Sons", "Dogwood"}, "$31.50");
-    Choose("File", "Quit");
+    // Two rows go to the other portfolio.
+    ToTheList();
+    Press(Qt::Key_Home);
+    Press(Qt::Key_Down, Qt::ShiftModifier);
+    Choose(Qt::Key_I, Qt::Key_C);
+    Expect({"Cypress"});
+    Press(Qt::Key_O, Qt::AltModifier); // the selector
+    PressInMenu({Qt::Key_Up, Qt::Key_Return});
+    Showing("Later");
+    Choose(Qt::Key_I, Qt::Key_P);
+    Expect({acme.Name, birch.Name});
+    Name(Qt::Key_E, "Edit Portfolio", Reserve);
+    Press(Qt::Key_O, Qt::AltModifier);
+    PressInMenu({Qt::Key_Down, Qt::Key_Return});
+    Expect({"Cypress"});
+    // Buttons by their letters: the charts, and back by Escape.
+    Press(Qt::Key_C, Qt::AltModifier);
+    In("Quorvan", [] { QTest::keyClick(QApplication::activeModalWidget(), Qt::Key_Escape); });
+    Choose(Qt::Key_P, Qt::Key_D);
+    for (const char* question : {"Are you sure you want to delete this portfolio?", "Are you really sure?"})
+        In(question, [] { QTest::keyClick(Alert(), Qt::Key_Y, Qt::AltModifier); });
+    Expect({acme.Name, birch.Name});
+    Press(Qt::Key_Q, Qt::ControlModifier);
     Run();
+    EXPECT_EQ(Portfolios(), Texts{Reserve});
+    for (INVESTMENT_DATA* each : {&birch, &acme})
+        CopyTextZeroed(each->Portfolio, Reserve);
+    ExpectRecords({acme, birch});
 
-    std::vector<INVESTMENT_DATA> expected;
-    for (const std::size_t i : {0U, 2U, 4U, 5U, 6U, 7U, 8U, 9U})
-        expected.push_back(Expected(Reserve, Day[i], today));
-    CopyTextZeroed(expected[2].Name, "Elm again");
-    expected[2].Price = 41.5F;
-    expected[2].Value = 7 * 41.5F;
-    CopyTextZeroed(expected[5].Ticker, "HAZELNU");
-    for (const std::size_t i : {1U, 3U})
-        expected.push_back(Expected("Old hand", Day[i], today));
-    ExpectInvestments(expected);
-    EXPECT_EQ(Portfolios(), (Texts{"Old hand", Reserve}));
-
-    Expect(rest);
-    Choose("File", "Quit");
+    Expect({acme.Name, birch.Name});
+    Press(Qt::Key_Q, Qt::ControlModifier);
     Run();
-    ExpectInvestments(expected);
+    ExpectRecords({acme, birch});
 }
 
 } // namespace
