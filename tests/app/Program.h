@@ -1,6 +1,5 @@
 #pragma once
 
-#include <cstdlib>
 #include <string>
 #include <vector>
 
@@ -93,15 +92,14 @@ class Program : public DataFolder, public Driver {
     }
 
     static QWidget* Main() { return Driver::Window("Quorvan"); }
-    static NorvelWindow* Window() {
-        auto* window = static_cast<NorvelWindow*>(GetAppWindow(be_app, "Quorvan"));
-        if (!window)
-            std::abort(); // a step that comes without a window
-        return window;
-    }
+    static NorvelWindow* Window() { return static_cast<NorvelWindow*>(GetAppWindow(be_app, "Quorvan")); }
+    // The first such view at or below this one.
     template <class View>
-    static View* Find() {
-        return FindBelow<View>(Window()->FindView("top view"));
+    static View* Find(BView* view = Window()->FindView("top view")) {
+        auto* found = dynamic_cast<View*>(view);
+        for (int32 i = 0; !found && i < view->CountChildren(); ++i)
+            found = Find<View>(view->ChildAt(i));
+        return found;
     }
     static ColumnListView* List() { return Find<ColumnListView>(); }
     static BMenu* Selector() { return Find<BMenuField>()->Menu(); }
@@ -114,29 +112,16 @@ class Program : public DataFolder, public Driver {
         return names;
     }
     static QAbstractItemView* RowsWidget() { return Main()->findChild<QAbstractItemView*>(); }
-    static QPoint PlaceOfRow(int32 index) {
+    static void ClickRow(int32 index, Qt::KeyboardModifiers keys = {}) {
         List()->ScrollToRow(index);
         const BRect frame = List()->ItemFrame(index);
-        return {30, static_cast<int>((frame.top + frame.bottom) / 2 - List()->Bounds().top)};
-    }
-    static void ClickRow(int32 index, Qt::KeyboardModifiers keys = {}) {
-        QTest::mouseClick(RowsWidget()->viewport(), Qt::LeftButton, keys, PlaceOfRow(index));
+        const QPoint place(30, static_cast<int>((frame.top + frame.bottom) / 2 - List()->Bounds().top));
+        QTest::mouseClick(RowsWidget()->viewport(), Qt::LeftButton, keys, place);
     }
     // Changes to the list want its window's lock.
     static void Locked(const Action& change) {
         ASSERT_TRUE(Window()->Lock());
         change();
         Window()->Unlock();
-    }
-
-  private:
-    template <class View>
-    static View* FindBelow(BView* view) {
-        if (auto* found = dynamic_cast<View*>(view))
-            return found;
-        for (int32 i = 0; view && i < view->CountChildren(); ++i)
-            if (View* found = FindBelow<View>(view->ChildAt(i)))
-                return found;
-        return nullptr;
     }
 };
