@@ -39,10 +39,7 @@ class Program : public DataFolder, public Driver {
         return application.ExitStatus();
     }
     // The same, with a last step that closes the main window.
-    int RunAndClose() {
-        Close();
-        return Run();
-    }
+    int RunAndClose() { return Close().Run(); }
     // A step as soon as the main window is shown and nothing keeps the person out of it.
     Program& Then(std::string what, Action action) {
         When(
@@ -52,32 +49,34 @@ class Program : public DataFolder, public Driver {
         return *this;
     }
     Program& Close() {
-        Then("close box", [] { Main()->close(); });
-        return *this;
+        return Then(
+            "close box", [] { Main()->close(); });
     }
     // A step that sends a command and waits for what it led to.
     Program& Send(uint32 code) {
-        Then("command " + std::to_string(code), [code] { Window()->PostMessage(code); });
-        return *this;
+        return Then(
+            "command " + std::to_string(code), [code] { Window()->PostMessage(code); });
     }
     Program& Select(const std::string& portfolio) {
-        Then("select " + portfolio, [portfolio] {
-            BMessage message(1015);
-            message.AddString("PortfolioName", portfolio.c_str());
-            Window()->PostMessage(&message);
-        });
-        return *this;
+        return Then(
+            "select " + portfolio,
+            [portfolio] {
+                BMessage message(1015);
+                message.AddString("PortfolioName", portfolio.c_str());
+                Window()->PostMessage(&message);
+            });
     }
     // A step that selects these rows of the list and no others.
     Program& Mark(std::vector<int32> rows) {
-        Then("mark rows", [rows = std::move(rows)] {
-            Locked([&] {
-                List()->DeselectAll();
-                for (const int32 row : rows)
-                    List()->Select(row, true);
+        return Then(
+            "mark rows",
+            [rows = std::move(rows)] {
+                Locked([&] {
+                    List()->DeselectAll();
+                    for (const int32 row : rows)
+                        List()->Select(row, true);
+                });
             });
-        });
-        return *this;
     }
     // A step that waits until the list shows these investments, by name and in this order; then, if one is
     // given, the total must be this.
