@@ -225,7 +225,7 @@ TEST(DataFileOpening, SaysWhatIsWrongByName) {
              std::filesystem::create_directory(path);
          },
          "cannot be opened: it is no file.\n"},
-        {"text", [&] { folder.Write("invest.db", "hello"); },
+        {"cut in its header", [&] { folder.Write("invest.db", whole.substr(0, 300)); },
          "is no data file, or its beginning is damaged. It is left as it is.\n"},
         {"another layout", nothing, "holds other records than Quorvan's. It is left as it is.\n", false,
          noneOfOurs},

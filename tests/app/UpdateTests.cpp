@@ -10,7 +10,7 @@
 #include <dlfcn.h>
 #include <netdb.h>
 
-#include "WatchedFiles.h"
+#include "db/FaultyFiles.h"
 #include "platform/StatusBar.h"
 #include "quotes/LoopbackServer.h"
 #include "quotes/QuoteRetrieval.h"
@@ -20,6 +20,7 @@
 namespace {
 
 constexpr const char* Title = "Getting current prices...";
+constexpr const char* NotSaved = "The change could not be saved! Is the disk full, or the file protected?";
 constexpr const char* NoConnection =
     "No Internet connection found!\nPlease establish your connection and try again.";
 
@@ -56,8 +57,6 @@ class PriceUpdate : public testing::Test, protected Program {
         for (const char* ticker : {"RISE", "FALL", "SAME", "FAIL", "NEW"})
             AddInvestment(Holding(ticker, 11, NoPreviousPrice));
     }
-    using Program::Run;
-
     void Update() {
         Then(
             "update", [] { Press(Main(), "Update button"); });
@@ -67,10 +66,18 @@ class PriceUpdate : public testing::Test, protected Program {
         Await(
             "the progress window goes", [] { return Main() && !Driver::Window(Title); });
     }
-    // Once so many requests have come; the last one's ticker is one that the server is held at.
-    void WhenAsked(std::size_t times, Action action) {
+    // Updates until the server is held at a ticker, and then does this.
+    void UpdateUpTo(const char* ticker, std::size_t requests, Action action) {
+        held_ = ticker;
+        Update();
         When(
-            "requests", [this, times] { return server_.Requests().size() == times; }, std::move(action));
+            "requests", [this, requests] { return server_.Requests().size() == requests; },
+            std::move(action));
+    }
+    // A step from which on the investments' file is this.
+    void Watch(FaultyFiles& files) {
+        Then(
+            "watch", [this, &files] { files.Watch(app_state->investments, File("invest.db")); });
     }
     INVESTMENT_DATA Record(long number) const {
         INVESTMENT_DATA record{};
@@ -78,12 +85,9 @@ class PriceUpdate : public testing::Test, protected Program {
         return record;
     }
     void ExpectUntouched(long number, const char* ticker) const {
-        const INVESTMENT_DATA record = Record(number);
         const INVESTMENT_DATA before = Holding(ticker, 11, NoPreviousPrice);
-        const auto bytes = [](const INVESTMENT_DATA& data) {
-            return std::string(reinterpret_cast<const char*>(&data), sizeof data);
-        };
-        EXPECT_EQ(bytes(record), bytes(before)) << ticker;
+        const INVESTMENT_DATA record = Record(number);
+        EXPECT_EQ(std::memcmp(&record, &before, sizeof before), 0) << ticker;
     }
 
     std::string held_; // the server says nothing when it is asked for this ticker
@@ -100,40 +104,33 @@ class PriceUpdate : public testing::Test, protected Program {
 };
 
 TEST(ApplyQuote, ChangesWhatItShall) {
-    const float infinity = std::numeric_limits<float>::infinity();
-    const struct {
-        float quote;
-        QuoteOutcome outcome;
-        float price, previous, value;
-        int error;
-    } cases[] = {
-        {12.5F, QuoteOutcome::Priced, 12.5F, 11, 125, 0},
-        {NoQuote, QuoteOutcome::NoPrice, 11, 5, 110, 1},
-        {infinity, QuoteOutcome::NoPrice, 11, 5, 110, 1},
-        {3e38F, QuoteOutcome::NoPrice, 11, 5, 110, 1},
-        {0, QuoteOutcome::Failed, 11, 5, 110, 7},
-        {NoQuoteSources, QuoteOutcome::Failed, 11, 5, 110, 7},
-        {std::nanf(""), QuoteOutcome::Failed, 11, 5, 110, 7},
-    };
-    for (const auto& each : cases) {
-        SCOPED_TRACE(each.quote);
+    constexpr auto failed = QuoteOutcome::Failed;
+    for (const auto& [quote, outcome] : {std::pair{12.5F, QuoteOutcome::Priced},
+                                         {NoQuote, QuoteOutcome::NoPrice},
+                                         {std::numeric_limits<float>::infinity(), QuoteOutcome::NoPrice},
+                                         {3e38F, QuoteOutcome::NoPrice},
+                                         {0, failed},
+                                         {NoQuoteSources, failed},
+                                         {std::nanf(""), failed}}) {
         INVESTMENT_DATA record = Holding("T", 11, 5);
         record.QuoteError = 7;
-        const dbDATE date = each.outcome == QuoteOutcome::Priced ? Today() : record.Date;
-        EXPECT_EQ(ApplyQuote(record, each.quote), each.outcome);
-        EXPECT_EQ(record.Price, each.price);
-        EXPECT_EQ(record.PrevPrice, each.previous);
-        EXPECT_EQ(record.Value, each.value);
-        EXPECT_EQ(record.QuoteError, each.error);
-        EXPECT_EQ(std::memcmp(&record.Date, &date, sizeof date), 0);
+        INVESTMENT_DATA expected = record;
+        if (outcome == QuoteOutcome::Priced) {
+            expected = Holding("T", quote, 11);
+            expected.Date = Today();
+        } else if (outcome == QuoteOutcome::NoPrice) {
+            expected.QuoteError = 1;
+        }
+        EXPECT_EQ(ApplyQuote(record, quote), outcome) << quote;
+        EXPECT_EQ(std::memcmp(&record, &expected, sizeof record), 0) << quote;
     }
 }
 
 // A row without a ticker is left out; the others show how their prices moved.
 TEST_F(PriceUpdate, AsksForTheSelectedRowsThatHaveATicker) {
     AddInvestment(Holding(" ", 48200, NoPreviousPrice));
-    WatchedFiles files;
-    Then("watch the file", [&] { files.Watch(app_state->investments, File("invest.db")); });
+    FaultyFiles files;
+    Watch(files);
     Mark({5, 0, 1, 2, 3});
     Update();
     UntilDone();
@@ -148,11 +145,8 @@ TEST_F(PriceUpdate, AsksForTheSelectedRowsThatHaveATicker) {
             EXPECT_EQ(Total(), "Total Value: $482,558.75");
         });
     RunAndClose();
-    EXPECT_EQ(Record(1).Price, 10.375F);
     EXPECT_EQ(Record(1).PrevPrice, 11);
-    EXPECT_EQ(Record(4).QuoteError, 0);
-    EXPECT_EQ(Record(5).Price, 48200);
-    EXPECT_EQ(Record(5).QuoteError, 0);
+    ExpectUntouched(4, "NEW");
     const std::string log = Read("Quorvan.log");
     EXPECT_EQ(log.find("Checked '127.0.0.1', connection found ok\nChecking price for 'RISE'\n"), 0U) << log;
     EXPECT_NE(log.find("GetPriceQuote() returned -4.00\n"), std::string::npos) << log;
@@ -187,9 +181,7 @@ TEST_F(PriceUpdate, FromThePressToTheEndThereIsNoOtherCommand) {
 }
 
 TEST_F(PriceUpdate, CancelledHalfWayItLeavesTheFirstHalfUpdated) {
-    held_ = "SAME";
-    Update();
-    WhenAsked(3, [] {
+    UpdateUpTo("SAME", 3, [] {
         const auto* bar = static_cast<BStatusBar*>(GetAppWindow(be_app, Title)->FindView("Status Bar"));
         EXPECT_EQ(bar->MaxValue(), 6);
         EXPECT_EQ(bar->CurrentValue(), 3);
@@ -198,7 +190,6 @@ TEST_F(PriceUpdate, CancelledHalfWayItLeavesTheFirstHalfUpdated) {
     });
     UntilDone();
     RunAndClose();
-    EXPECT_EQ(Record(0).Price, 12.5F);
     EXPECT_EQ(Record(1).Price, 10.375F);
     ExpectUntouched(2, "SAME");
     EXPECT_EQ(server_.Requests().size(), 3U); // no reload is shown, and nobody was asked again
@@ -206,21 +197,17 @@ TEST_F(PriceUpdate, CancelledHalfWayItLeavesTheFirstHalfUpdated) {
 
 // Until then another command would change the file at the same time.
 TEST_F(PriceUpdate, WhenClosedItGoesOnceItsChangesAreOnTheDisk) {
-    WatchedFiles files;
+    FaultyFiles files;
     std::atomic<bool> syncing = false;
     std::binary_semaphore go(0);
-    Then("watch the file", [&] {
-        files.Watch(app_state->investments, File("invest.db"));
-        files.failing = true;
-        files.beforeSync = [&] {
-            const bool first = !syncing.exchange(true);
-            EXPECT_TRUE(!first || go.try_acquire_for(std::chrono::seconds(50)));
-        };
-    });
-    held_ = "FALL";
-    Update();
-    WhenAsked(
-        2, [] { Driver::Window(Title)->close(); });
+    files.may = [&](char call) {
+        const bool first = call == 's' && !syncing.exchange(true);
+        EXPECT_TRUE(!first || go.try_acquire_for(std::chrono::seconds(50)));
+        return call != 's';
+    };
+    Watch(files);
+    UpdateUpTo(
+        "FALL", 2, [] { Driver::Window(Title)->close(); });
     When(
         "the worker waits for the disk", [&] { return syncing.load(); },
         [&] {
@@ -228,7 +215,7 @@ TEST_F(PriceUpdate, WhenClosedItGoesOnceItsChangesAreOnTheDisk) {
             EXPECT_EQ(QApplication::activeModalWidget(), Driver::Window(Title));
             go.release();
         });
-    Answer("The change could not be saved! Is the disk full, or the file protected?", "Ok");
+    Answer(NotSaved, "Ok");
     UntilDone();
     RunAndClose();
     EXPECT_EQ(Record(0).Price, 12.5F);
@@ -268,27 +255,15 @@ TEST_F(PriceUpdate, EndsWithAnAlertWhenNobodyCanBeAsked) {
     ExpectUntouched(0, "RISE");
 }
 
-TEST_F(PriceUpdate, TheProgramsEndStopsIt) {
-    held_ = "FALL";
-    Update();
-    WhenAsked(2, [] { be_app->PostMessage(B_QUIT_REQUESTED); });
+TEST_F(PriceUpdate, TheProgramsEndStopsItAndTellsOfADiskThatFails) {
+    FaultyFiles files;
+    files.may = [](char call) { return call != 's'; };
+    Watch(files);
+    UpdateUpTo("FALL", 2, [] { be_app->PostMessage(B_QUIT_REQUESTED); });
+    Answer(NotSaved, "Ok");
     Run();
     EXPECT_EQ(Record(0).Price, 12.5F);
     ExpectUntouched(1, "FALL");
-}
-
-TEST_F(PriceUpdate, TheProgramsEndTellsOfADiskThatFails) {
-    WatchedFiles files;
-    Then("watch the file", [&] {
-        files.Watch(app_state->investments, File("invest.db"));
-        files.failing = true;
-    });
-    held_ = "FALL";
-    Update();
-    WhenAsked(2, [] { be_app->PostMessage(B_QUIT_REQUESTED); });
-    Answer("The change could not be saved! Is the disk full, or the file protected?", "Ok");
-    Run();
-    EXPECT_EQ(Record(0).Price, 12.5F);
 }
 
 } // namespace

@@ -3,24 +3,67 @@
 
 #include <map>
 
-#include <QPushButton>
-
-#include "WatchedFiles.h"
+#include "db/FaultyFiles.h"
 #include "platform/MenuItem.h"
 #include "platform/Roster.h"
 
 namespace {
 
+constexpr const char* NotSaved = "The change could not be saved! Is the disk full, or the file protected?";
+constexpr const char* NotRead = "An investment could not be read from its file!";
+constexpr const char* NotPasted =
+    "What you cut has not been pasted yet, and would be lost. Go on all the same?";
+constexpr const char* NoPortfolio = "This command requires that a portfolio be created first.";
+constexpr const char* NothingToTake = "You must select a(n) investment(s) to cut or copy.";
+
+enum class Needs { Nothing, Portfolio, Investment };
+enum Files { None, Portfolios, Investments, Both };
+
+// Each command, in an order in which those that change files can follow each other, from a portfolio P with
+// the investments a, b and c.
+constexpr struct {
+    uint32 code;
+    Needs needs;         // or its item is grey
+    const char* refusal; // what it says when there is nothing at all
+    Files changes = None;
+    int32 marked = -1;            // the row that it works on
+    const char* rows = "";        // those that are there then
+    int32 current = -1;           // and the one where the keyboard is
+    const char* dialog = nullptr; // its title
+    const char* name = nullptr;   // what is typed there
+} Commands[] = {
+    {MessageSettings, Needs::Nothing, nullptr},
+    {MessageHelp, Needs::Nothing, nullptr},
+    {B_ABOUT_REQUESTED, Needs::Nothing, nullptr},
+    {B_QUIT_REQUESTED, Needs::Nothing, nullptr},
+    {MessagePortfolioChart, Needs::Investment,
+     "This command requires a portfolio with at least one investment."},
+    {MessagePortfolioPrint, Needs::Investment, NoPortfolio},
+    {MessagePortfolioUpdate, Needs::Investment, NoPortfolio},
+    {MessageInvestmentCopy, Needs::Investment, NothingToTake},
+    {MessageInvestmentAdd, Needs::Portfolio, NoPortfolio, Investments, -1, "abcd", 3, "Add an Investment",
+     "d"},
+    {MessageInvestmentEdit, Needs::Investment, "You must select an investment to edit!", Investments, 1,
+     "aecd", 1, "Edit this Investment", "e"},
+    {MessageInvestmentDelete, Needs::Investment, "You must select an investment to delete!", Investments, 0,
+     "ecd"},
+    {MessageInvestmentCut, Needs::Investment, NothingToTake, Investments, 0, "cd"},
+    {MessageInvestmentPaste, Needs::Portfolio, nullptr, Investments, -1, "cde", 2},
+    {MessagePortfolioEdit, Needs::Portfolio, nullptr, Both, -1, "cde", -1, "Edit Portfolio", "Q"},
+    {MessagePortfolioAdd, Needs::Nothing, nullptr, Portfolios, -1, "", -1, "Add a Portfolio", "R"},
+    {MessagePortfolioDelete, Needs::Portfolio, "There are no portfolios to delete!", Portfolios, -1, "cde"},
+};
+
 class MainWindow : public testing::Test, protected Program {
   protected:
+    using Program::Run;
+
     // A portfolio with an investment of each of these names, of equal value.
     void AddPortfolioOf(const char* name, const Texts& investments, float value = 1) const {
         AddPortfolio(name);
         for (const std::string& each : investments)
             AddInvestment(MakeInvestment(name, each, 1, value));
     }
-    // A step that sends a command and answers the alert that it leads to.
-    void Refused(uint32 code, const char* text) { Send(code).Answer(text, "Ok"); }
     // Steps that delete the current portfolio, up to an answer other than Yes.
     void DeletePortfolio(const char* first, const char* second) {
         Send(MessagePortfolioDelete).Answer("Are you sure you want to delete this portfolio?", first);
@@ -31,80 +74,106 @@ class MainWindow : public testing::Test, protected Program {
         const BMenuItem* marked = Selector()->FindMarked();
         return marked ? marked->Label() : "";
     }
-};
-
-struct MenuState {
-    uint32 code;
-    bool noPortfolio, noInvestment, investments;
-};
-constexpr MenuState MenuStates[] = {
-    {1000, true, true, true},   // Settings
-    {1010, true, true, true},   // Portfolio Add
-    {1011, false, true, true},  // Edit
-    {1012, false, true, true},  // Del
-    {1013, false, false, true}, // Chart
-    {1014, false, false, true}, // Print
-    {1016, false, false, true}, // Update prices
-    {1020, false, true, true},  // Investment Add
-    {1021, false, false, true}, // Edit
-    {1022, false, false, true}, // Del
-    {1023, false, false, true}, // Cut
-    {1024, false, false, true}, // Copy
-    {1025, false, true, true},  // Paste
-    {1030, true, true, true},   // Help
-    {B_ABOUT_REQUESTED, true, true, true},
-    {B_QUIT_REQUESTED, true, true, true},
-};
-
-// The items, once each menu has been opened.
-void ExpectMenus(bool MenuState::*state) {
-    for (const char* menu : {"File", "Portfolio", "Investment", "Help"}) {
-        Driver::ClickTitle(Program::Main(), menu);
-        ASSERT_TRUE(Driver::OpenMenu());
-        Driver::Key(Qt::Key_Escape);
+    // The names of the rows.
+    static std::string Letters() {
+        std::string all;
+        for (const std::string& each : Names())
+            all += each;
+        return all;
     }
-    for (const MenuState& each : MenuStates)
-        EXPECT_EQ(Program::Find<BMenuBar>()->FindItem(each.code)->IsEnabled(), each.*state) << each.code;
+    // The items, once a menu has been opened.
+    static void ExpectMenus(Needs has) {
+        ClickTitle(Main(), "File");
+        ASSERT_TRUE(OpenMenu());
+        Key(Qt::Key_Escape);
+        for (const auto& each : Commands)
+            EXPECT_EQ(Find<BMenuBar>()->FindItem(each.code)->IsEnabled(), each.needs <= has) << each.code;
+    }
+    // Runs the commands that change files, while their writes (w) or syncs (s) fail.
+    void WorkOn(char failing) {
+        FaultyFiles files[2];
+        AddPortfolioOf("P", {"a", "b", "c"});
+        Then("watch the files", [&] {
+            files[0].Watch(app_state->portfolios, File("portfol.db"));
+            files[1].Watch(app_state->investments, File("invest.db"));
+            for (FaultyFiles& each : files)
+                each.may = [failing](char call) { return call != failing; };
+        });
+        for (const auto& each : Commands) {
+            if (each.changes == None)
+                continue;
+            if (each.code == MessagePortfolioDelete)
+                DeletePortfolio("Yes", "Yes");
+            else
+                Mark(each.marked < 0 ? std::vector<int32>() : std::vector{each.marked}).Send(each.code);
+            if (each.dialog)
+                When(
+                    each.dialog, [&each] { return Field() && WindowShown(each.dialog)(); },
+                    [&each] { TypeOver(each.name, Qt::Key_Return); });
+            if (failing)
+                Answer(NotSaved, "Ok");
+            for (const int i : {0, 1})
+                if (!failing && (each.changes & (i + 1)) != 0)
+                    Await("on the disk", [&, i] { return files[i].HaveSynced(); });
+            const std::string rows = failing == 'w' ? "abc" : each.rows;
+            const int32 current = failing == 'w' ? -1 : each.current;
+            const int32 selected = failing == 'w' && each.code == MessageInvestmentEdit ? 1 : 0;
+            Await(rows, [=] {
+                return Letters() == rows && CountSelectedItems(List()) == selected &&
+                       (current < 0 || List()->CurrentRow() == current);
+            });
+        }
+        Close();
+        if (failing)
+            Answer(NotPasted, "Yes"); // it is no less the only copy
+        Run();
+    }
+};
+
+TEST_F(MainWindow, WhatACommandChangesIsOnTheDiskWhenItEnds) {
+    WorkOn('\0');
+}
+
+TEST_F(MainWindow, ADiskThatIsFoundToFailLaterIsTold) {
+    WorkOn('s');
+}
+
+TEST_F(MainWindow, ADiskThatFailsLeavesEverythingAsItWas) {
+    WorkOn('w');
+    EXPECT_EQ(Portfolios(), Texts{"P"});
+    EXPECT_EQ(Investments(), (Texts{"P/a", "P/b", "P/c"}));
 }
 
 TEST_F(MainWindow, ShowsAPortfolioAndOffersWhatCanBeDoneWithIt) {
     for (const char* name : {"Empty", "First one", "Second"})
         AddPortfolio(name);
     AddInvestment(MakeInvestment("First one", "a", 1000, 1234.5F));
-    AddInvestment(MakeInvestment("Second", "b", 1, 2));
+    AddInvestment(MakeInvestment("Second", "b", 1, 0));
     AddInvestment(MakeInvestment("First one", "c", 1, 0.25F));
-    Expect({"b"}, "$2.00").Then("start", [] {
+    Expect({"b"}, "$0.00").Then("start", [] {
         EXPECT_EQ(Marked(), "Second");
         EXPECT_EQ(Selector()->CountItems(), 3);
-        ExpectMenus(&MenuState::investments);
+        ExpectMenus(Needs::Investment);
     });
+    Send(MessagePortfolioChart).Answer("Unable to chart. Total value of portfolio equals zero!", "Ok");
     Select("First one").Expect({"a", "c"}, "$1,234,500.25");
     Select("Empty").Expect({}, "$0.00").Then("without investments", [] {
         EXPECT_EQ(Marked(), "Empty");
-        ExpectMenus(&MenuState::noInvestment);
+        ExpectMenus(Needs::Portfolio);
     });
     RunAndClose();
 }
 
 TEST_F(MainWindow, SaysWhatACommandLacks) {
-    constexpr const char* noPortfolio = "This command requires that a portfolio be created first.";
     Then("without portfolios", [] {
-        ExpectMenus(&MenuState::noPortfolio);
+        ExpectMenus(Needs::Nothing);
         EXPECT_EQ(Marked(), "");
         EXPECT_STREQ(Selector()->Name(), "        ");
         Press(Main(), "add button");
-    }).Answer(noPortfolio, "Ok");
-    for (const uint32 code : {MessagePortfolioPrint, MessagePortfolioUpdate, MessageInvestmentAdd})
-        Refused(code, noPortfolio);
-    Refused(MessagePortfolioChart, "This command requires a portfolio with at least one investment.");
-    Refused(MessagePortfolioDelete, "There are no portfolios to delete!");
-    Refused(MessageInvestmentEdit, "You must select an investment to edit!");
-    RunAndClose();
-
-    AddPortfolioOf("Worthless", {"a"}, 0);
-    Expect({"a"});
-    Refused(MessagePortfolioChart, "Unable to chart. Total value of portfolio equals zero!");
-    Refused(MessageInvestmentDelete, "You must select an investment to delete!");
+    }).Answer(NoPortfolio, "Ok");
+    for (const auto& each : Commands)
+        if (each.refusal)
+            Send(each.code).Answer(each.refusal, "Ok");
     RunAndClose();
 }
 
@@ -142,66 +211,38 @@ TEST_F(MainWindow, AClickOnAHeaderSortsByText) {
     AddPortfolio("A");
     for (const auto& [name, value] : {std::pair{"b", 980.F}, {"a", 1250.F}, {"C", 7.F}, {"d", 12345.F}})
         AddInvestment(MakeInvestment("A", name, 1, value));
-    const auto click = [this](InvestmentColumn column) {
-        Then("click", [column] {
+    Expect({"b", "a", "C", "d"});
+    for (const auto& [column, rows] :
+         {std::pair{InvestmentColumn::Value, Texts{"d", "a", "C", "b"}}, // 12,345.00, 1250.00, 7.00, 980.00
+          {InvestmentColumn::Name, {"a", "b", "C", "d"}},
+          {InvestmentColumn::Name, {"d", "C", "b", "a"}}})
+        Then("click", [column = column] {
             const CLVColumn* clicked = List()->ColumnAt(static_cast<int32>(column));
             QTest::mouseClick(Main()->findChild<QWidget*>("column labels"), Qt::LeftButton, {},
                               QPoint(static_cast<int>((clicked->Begin() + clicked->End()) / 2), 8));
-        });
-    };
-    Expect({"b", "a", "C", "d"});
-    click(InvestmentColumn::Value);
-    Expect({"d", "a", "C", "b"}); // "12,345.00", "1250.00", "7.00", "980.00"
-    click(InvestmentColumn::Name);
-    Expect({"a", "b", "C", "d"});
-    click(InvestmentColumn::Name);
-    Expect({"d", "C", "b", "a"}).Select("A").Expect({"d", "C", "b", "a"}); // loaded anew, and still sorted
+        }).Expect(rows);
+    Select("A").Expect({"d", "C", "b", "a"}); // loaded anew, and still sorted
     RunAndClose();
 }
 
 TEST_F(MainWindow, DeletesTheSelectedInvestments) {
     AddPortfolioOf("A", {"a", "b", "c", "d", "e"}, 1.5F);
-    Expect({"a", "b", "c", "d", "e"}).Then("select b, c, e", [] {
-        ClickRow(1);
-        ClickRow(2, Qt::ShiftModifier);
-        Locked([] { List()->Select(4, true); });
-        EXPECT_EQ(CountSelectedItems(List()), 3);
-    });
-    Send(MessageInvestmentDelete).Expect({"a", "d"}, "$3.00");
+    Mark({1, 2, 4}).Send(MessageInvestmentDelete).Expect({"a", "d"}, "$3.00");
     Mark({0, 1}).Send(MessageInvestmentDelete).Expect({}, "$0.00");
     RunAndClose();
     EXPECT_EQ(RecordSlots("invest.db"), 0);
 }
 
-TEST_F(MainWindow, CutsCopiesAndPastesBetweenPortfolios) {
-    constexpr const char* nothing = "You must select a(n) investment(s) to cut or copy.";
-    AddPortfolioOf("From", {"a", "b", "c"});
-    AddPortfolio("To");
-    Select("From").Expect({"a", "b", "c"}).Send(MessageInvestmentPaste); // there is nothing yet
-    Refused(MessageInvestmentCut, nothing);
-    Mark({0, 1}).Send(MessageInvestmentCopy);
-    When(
-        "two copied", [] { return app_state->clipboardCount == 2; }, [] {});
-    Mark({1}).Send(MessageInvestmentCut).Expect({"a", "c"});
-    Refused(MessageInvestmentCopy, nothing);
-    Select("To").Expect({}).Send(MessageInvestmentPaste).Expect({"b"});
-    Send(MessageInvestmentPaste).Expect({"b", "b"}, "$2.00");
-    RunAndClose();
-    EXPECT_EQ(Investments(), (Texts{"From/a", "From/c", "To/b", "To/b"}));
-}
-
 TEST_F(MainWindow, DeletesAPortfolioAfterTwoQuestions) {
     for (const char* name : {"A", "B", "C"})
         AddPortfolioOf(name, {std::string("in ") + name});
-    Expect({"in C"});
     DeletePortfolio("No", nullptr);
     DeletePortfolio("Yes", "No");
-    Then("nothing deleted", [this] { EXPECT_EQ(Portfolios().size(), 3U); });
     Select("B").Expect({"in B"});
     DeletePortfolio("Yes", "Yes");
-    Expect({"in A"}).Then("first is current", [] {
+    Expect({"in A"}).Then("first is current", [this] {
         EXPECT_EQ(Marked(), "A");
-        EXPECT_EQ(Selector()->CountItems(), 2);
+        EXPECT_EQ(Portfolios(), (Texts{"A", "C"}));
     });
     DeletePortfolio("Yes", "Yes");
     Expect({"in C"});
@@ -212,21 +253,19 @@ TEST_F(MainWindow, DeletesAPortfolioAfterTwoQuestions) {
 }
 
 TEST_F(MainWindow, TellsWhatItCannotReadAndLeavesItAlone) {
-    WatchedFiles files;
+    FaultyFiles files;
     AddPortfolioOf("A", {"a", "b"});
-    const char* notRead = "An investment could not be read from its file!";
     Expect({"a", "b"}).Mark({0, 1}).Then("the disk fails", [&] {
         files.Watch(app_state->investments, File("invest.db"));
         app_state->investments->SetReadCache(0);
-        files.reads = 1;
+        files.Arm(Fault::NoReads, 0);
     });
-    Refused(MessageInvestmentCopy, notRead);
+    Send(MessageInvestmentCopy).Answer(NotRead, "Ok");
     Then("nothing copied", [] { EXPECT_EQ(app_state->clipboardCount, 0); });
-    Select("A").Answer(notRead, "Ok");
+    Select("A").Answer(NotRead, "Ok");
     Expect({}, "not known");
     DeletePortfolio("Yes", "Yes");
-    Answer("The change could not be saved! Is the disk full, or the file protected?", "Ok");
-    Answer(notRead, "Ok");
+    Answer(NotSaved, "Ok").Answer(NotRead, "Ok");
     RunAndClose();
     EXPECT_EQ(Portfolios(), Texts{"A"});
 }
@@ -239,146 +278,65 @@ TEST_F(MainWindow, SettingsHelpAndAboutOpen) {
     });
     std::filesystem::create_directory(File("help"));
     Write("help/Quorvan.html", "help");
-    Send(MessageHelp).Await("help", [] { return !launched.empty(); });
-    Then("main window",
-         [] {
-             Window()->PostMessage(1000);
-             be_app->PostMessage(B_ABOUT_REQUESTED);
-         })
+    Send(MessageHelp)
+        .Await(
+            "help", [] { return !launched.empty(); });
+    Then("about", [] { be_app->PostMessage(B_ABOUT_REQUESTED); })
         .Answer("Quorvan version 1.0\n\nThe manual is the file help/Quorvan.html in your Quorvan folder. "
                 "Help opens it in your web browser.",
                 "Ok");
-    When("settings", WindowShown("Settings"), [] {
+    Send(MessageSettings).When("settings", WindowShown("Settings"), [] {
         EXPECT_EQ(Driver::Window("Settings")->geometry().topLeft(), QPoint(150, 150));
-        auto* field = Driver::Window("Settings")->findChild<QLineEdit*>();
-        QTest::keyClicks(field, "abc");
-        QTest::keyClick(field, Qt::Key_Return);
+        Driver::Window("Settings")->close();
     });
     RunAndClose();
     EXPECT_EQ(launched, Path() + "//help/Quorvan.html");
-    EXPECT_NE(Read("Quorvan.ini").find("[GENERAL]\nPassword=abc\n"), std::string::npos);
 }
 
 TEST_F(MainWindow, WhatWasCutOnlyGoesWhenThePersonSaysSo) {
-    constexpr const char* question =
-        "What you cut has not been pasted yet, and would be lost. Go on all the same?";
-    AddPortfolioOf("P", {"a", "b", "c"});
-    const auto take = [&](uint32 command) { Mark({0}).Send(command); };
-    Expect({"a", "b", "c"});
-    take(MessageInvestmentCut);
-    Expect({"b", "c"});
-    take(MessageInvestmentCopy);
-    Answer(question, "No");
-    Close().Answer(question, "No");
-    Then("quit", [] { be_app->PostMessage(B_QUIT_REQUESTED); }).Answer(question, "No");
-    Send(MessageInvestmentPaste).Expect({"b", "c", "a"});
-    take(MessageInvestmentCut);
-    Expect({"c", "a"});
-    take(MessageInvestmentCut);
-    Answer(question, "Yes");
-    Expect({"a"}).Close().Answer(question, "Yes");
-    EXPECT_EQ(Program::Run(), 0);
-    EXPECT_EQ(Investments(), Texts{"P/a"});
+    AddPortfolioOf("From", {"a", "b", "c"});
+    AddPortfolio("To");
+    const auto refuses = [this] { Answer(NotPasted, "No"); };
+    Select("From").Expect({"a", "b", "c"}).Send(MessageInvestmentPaste); // there is nothing yet
+    Mark({0, 1}).Send(MessageInvestmentCopy).Await("copied", [] { return app_state->clipboardCount == 2; });
+    Mark({1}).Send(MessageInvestmentCut).Expect({"a", "c"});
+    Mark({0}).Send(MessageInvestmentCopy);
+    refuses();
+    Close();
+    refuses();
+    Then("quit", [] { be_app->PostMessage(B_QUIT_REQUESTED); });
+    refuses();
+    Select("To").Expect({}).Send(MessageInvestmentPaste).Expect({"b"});
+    Send(MessageInvestmentPaste).Expect({"b", "b"}, "$2.00");
+    Mark({0}).Send(MessageInvestmentCut).Expect({"b"});
+    Mark({0}).Send(MessageInvestmentCut).Answer(NotPasted, "Yes");
+    Expect({}).Close().Answer(NotPasted, "Yes");
+    EXPECT_EQ(Run(), 0);
+    EXPECT_EQ(Investments(), (Texts{"From/a", "From/c"}));
 }
 
-// The second program finds the files as the first one would leave them if it were killed after the cut.
-TEST(CutInvestments, ComeBackAtTheNextStart) {
+// The second run finds the files as the first one would leave them if it were killed after the cut.
+TEST_F(MainWindow, WhatWasCutComesBackAtTheNextStart) {
     std::map<std::string, std::string> files;
-    {
-        Program killed;
-        killed.AddPortfolio("P");
-        for (const char* name : {"a", "b", "c"})
-            killed.AddInvestment(MakeInvestment("P", name));
-        killed.Expect({"a", "b", "c"}).Mark({0, 2}).Send(MessageInvestmentCut).Expect({"b"});
-        killed.Then("kept", [&] {
-            for (const char* name : {"portfol.db", "invest.db", "cut.db"})
-                files[name] = killed.Read(name);
-        });
-        killed.Send(MessageInvestmentPaste).Expect({"b", "a", "c"});
-        killed.Then("pasted", [&] { EXPECT_FALSE(killed.Has("cut.db")); });
-        EXPECT_EQ(killed.RunAndClose(), 0);
-    }
-    Program next;
-    for (const auto& [name, content] : files)
-        next.Write(name, content);
-    next.Answer("What had been cut and not pasted when Quorvan last ended is back in its portfolio.", "Ok");
-    next.Expect({"b", "a", "c"});
-    EXPECT_EQ(next.RunAndClose(), 0);
-    EXPECT_FALSE(next.Has("cut.db"));
-}
-
-TEST_F(MainWindow, WhatACommandChangesIsOnTheDiskWhenItEnds) {
-    WatchedFiles portfolios;
-    WatchedFiles investments;
     AddPortfolioOf("P", {"a", "b", "c"});
-    Then(
-        "watch the files",
-        [&] {
-            portfolios.Watch(app_state->portfolios, File("portfol.db"));
-            investments.Watch(app_state->investments, File("invest.db"));
-        });
-    const auto done = [&](WatchedFiles& files) {
-        Await(
-            "on the disk", [&] { return files.HaveSynced(); });
-    };
-    const auto fill = [&](uint32 command, const char* title, const char* name) {
-        Send(command).When(
-            title, [title] { return Field() && WindowShown(title)(); },
-            [name] { TypeOver(name, Qt::Key_Return); });
-    };
-    const auto shown = [&](int32 row) {
-        Await("current", [row] { return List()->CurrentRow() == row && CountSelectedItems(List()) == 0; });
-    };
-    Mark({0}).Send(MessageInvestmentDelete).Expect({"b", "c"});
-    done(investments);
-    Mark({0}).Send(MessageInvestmentCut).Expect({"c"});
-    done(investments);
-    Then("what is pasted is there before its copy goes",
-         [&] { investments.beforeSync = [this] { EXPECT_TRUE(Has("cut.db")); }; });
-    Send(MessageInvestmentPaste).Expect({"c", "b"});
-    Then("pasted", [&] { investments.beforeSync = nullptr; });
-    shown(1);
-    done(investments);
-    Mark({1});
-    fill(MessageInvestmentEdit, "Edit this Investment", "e");
-    done(investments);
-    shown(1);
-    fill(MessageInvestmentAdd, "Add an Investment", "d");
-    done(investments);
-    shown(2);
-    fill(MessagePortfolioEdit, "Edit Portfolio", "Q");
-    done(portfolios);
-    done(investments);
-    fill(MessagePortfolioAdd, "Add a Portfolio", "R");
-    done(portfolios);
-    Expect({});
-    DeletePortfolio("Yes", "Yes");
-    done(portfolios);
-    Expect({"c", "e", "d"});
-    RunAndClose();
-}
-
-TEST_F(MainWindow, ADiskThatFailsIsToldOnce) {
-    WatchedFiles investments;
-    AddPortfolioOf("P", {"a", "b"});
-    Then(
-        "watch the file", [&] { investments.Watch(app_state->investments, File("invest.db")); });
-    const auto fails = [&](uint32 command) {
-        Then("the disk fails", [&] { investments.failing = true; });
-        Send(command).Answer("The change could not be saved! Is the disk full, or the file protected?", "Ok");
-        Then("told", [&] { investments.failing = false; });
-    };
-    Mark({0});
-    fails(MessageInvestmentCut);
-    fails(MessageInvestmentPaste);
-    Expect({"b", "a"})
+    Expect({"a", "b", "c"})
+        .Mark({0, 2})
+        .Send(MessageInvestmentCut)
+        .Expect({"b"})
         .Then(
-            "kept", [&] { EXPECT_TRUE(Has("cut.db")); });
-    Mark({0}).Send(MessageInvestmentDelete).Expect({"a"}).Await("on the disk", [&] {
-        return investments.HaveSynced();
-    });
-    Close().Answer("What you cut has not been pasted yet, and would be lost. Go on all the same?", "Yes");
-    Program::Run();
+            "kept",
+            [&] {
+                for (const char* name : {"portfol.db", "invest.db", "cut.db"})
+                    files[name] = Read(name);
+            });
+    Send(MessageInvestmentPaste).Expect({"b", "a", "c"}).Then("pasted", [&] { EXPECT_FALSE(Has("cut.db")); });
+    RunAndClose();
+    for (const auto& [name, content] : files)
+        Write(name, content);
+    Answer("What had been cut and not pasted when Quorvan last ended is back in its portfolio.", "Ok");
+    Expect({"b", "a", "c"});
+    EXPECT_EQ(RunAndClose(), 0);
+    EXPECT_FALSE(Has("cut.db"));
 }
 
 } // namespace

@@ -5,11 +5,14 @@
 #include <cerrno>
 #include <climits>
 #include <csignal>
+#include <functional>
+#include <memory>
 #include <string>
+#include <utility>
 
 #include <fcntl.h>
 
-#include "db/File.h"
+#include "db/Database.h"
 
 enum class Fault {
     Error,         // the call does nothing and fails
@@ -19,6 +22,7 @@ enum class Fault {
     Broken,        // the same, and every later call fails
     Interrupted,   // the call is to be made again
     NoRead,        // a read fails; the reads are counted and nothing else
+    NoReads,       // the same, and every later read fails
     KilledBefore,  // the process ends before the call
     KilledAfter,   // the process ends after the call
 };
@@ -46,6 +50,14 @@ class FaultyFiles : public FileOperations {
     }
     // A letter for each write, sync, rename and removal so far: w, s, r, x.
     [[nodiscard]] const std::string& Order() const { return order_; }
+    // Whether changes reached the disk since this was last asked, and all of them.
+    [[nodiscard]] bool HaveSynced() { return std::exchange(order_, "").ends_with('s'); }
+    // Called before each write (w) and sync (s), which fails when it says no.
+    std::function<bool(char)> may = [](char) { return true; };
+    // Opens a file of a running program anew; the database goes before this object.
+    void Watch(std::unique_ptr<DATABASE>& database, const std::string& path) {
+        database = std::make_unique<DATABASE>(path.c_str(), *this);
+    }
     // The permissions that the last new file began with.
     [[nodiscard]] mode_t FirstMode() const { return firstMode_; }
     // Makes every opening for writing fail so, as for a file that may only be read.
@@ -65,11 +77,14 @@ class FaultyFiles : public FileOperations {
         return System::Close(file);
     }
     ssize_t ReadAt(int file, void* data, std::size_t size, off_t offset) override {
-        const bool fails = fault_ == Fault::NoRead && calls_++ == at_;
+        const int after = IsOfReads() ? calls_++ - at_ : -1;
+        const bool fails = at_ >= 0 && (after == 0 || (after > 0 && fault_ == Fault::NoReads));
         return fails ? Failed(error_) : System::ReadAt(file, data, (size + 1) / 2, offset);
     }
     ssize_t WriteAt(int file, const void* data, std::size_t size, off_t offset) override {
         order_ += 'w';
+        if (!may('w'))
+            return Failed(error_);
         if (calls_ != at_ || size < 2 || fault_ < Fault::HalfThenError || fault_ > Fault::Broken)
             return Meet([&] { return System::WriteAt(file, data, size, offset); });
         const ssize_t half = System::WriteAt(file, data, size / 2, offset);
@@ -79,7 +94,7 @@ class FaultyFiles : public FileOperations {
         return Meet([&] { return System::Truncate(file, size); });
     }
     int Sync(int file) override {
-        return Meet([&] { return System::Sync(file); }, 's');
+        return may('s') ? Meet([&] { return System::Sync(file); }, 's') : Failed(error_);
     }
     int SetOwner(int file, uid_t user, gid_t group) override {
         return Meet([&] { return System::SetOwner(file, user, group); });
@@ -99,10 +114,11 @@ class FaultyFiles : public FileOperations {
         errno = error;
         return -1;
     }
+    [[nodiscard]] bool IsOfReads() const { return fault_ == Fault::NoRead || fault_ == Fault::NoReads; }
     template <class Call>
     auto Meet(const Call& call, char letter = 0) -> decltype(call()) {
         order_ += letter == 0 ? "" : std::string(1, letter);
-        const int after = fault_ == Fault::NoRead ? -1 : calls_++ - at_;
+        const int after = IsOfReads() ? -1 : calls_++ - at_;
         const int met = fault_ == Fault::Broken ? INT_MAX : fault_ == Fault::Twice ? 1 : 0;
         if (at_ < 0 || after < 0 || after > met)
             return call();
