@@ -11,6 +11,7 @@
 #include <QLineEdit>
 #include <QMenuBar>
 #include <QMessageBox>
+#include <QPointer>
 #include <QTest>
 
 #include "platform/Application.h"
@@ -46,11 +47,15 @@ class StepDriver : public QObject {
             std::move(what), std::move(condition), [] {});
     }
 
-    // Waits for an alert with this text and presses one of its buttons.
+    // Waits for an alert with this text and presses one of its buttons. The next step comes when the code
+    // that showed it has gone on.
     StepDriver& Answer(const std::string& text, const char* button) {
         return When(
             "alert: " + text, [text] { return Alert() && Alert()->text() == QString::fromStdString(text); },
-            [button] { Press(Alert(), button); });
+            [this, button] {
+                answered_ = Alert();
+                Press(answered_, button);
+            });
     }
 
     // The alert that is shown; null when there is none.
@@ -141,7 +146,7 @@ class StepDriver : public QObject {
         // action may wait in a loop of its own.
         killTimer(timer_);
         timer_ = startTimer(PollMilliseconds);
-        if (!steps_.empty() && steps_.front().condition()) {
+        if (!answered_ && !steps_.empty() && steps_.front().condition()) {
             const Action action = std::move(steps_.front().action);
             steps_.pop_front();
             deadline_.setRemainingTime(PatienceMilliseconds);
@@ -156,6 +161,7 @@ class StepDriver : public QObject {
 
     static inline StepDriver* self_ = nullptr;
     std::deque<Step> steps_;
+    QPointer<QMessageBox> answered_;
     QDeadlineTimer deadline_;
     int timer_ = 0;
 };

@@ -50,6 +50,8 @@ INVESTMENT_DATA Holding(const char* ticker, float price, float previousPrice) {
 // of their prices.
 class PriceUpdate : public testing::Test, protected Program {
   protected:
+    using Program::Run;
+
     PriceUpdate() {
         Write("Quorvan.ini", "[GENERAL]\nIsConnectedURL=127.0.0.1\n[DISPLAY]\n");
         Write("Quorvan.cfg", "local " + server_.Host() + " /quote/ Last 1\n");
@@ -223,32 +225,26 @@ TEST_F(PriceUpdate, WhenClosedItGoesOnceItsChangesAreOnTheDisk) {
 
 TEST_F(PriceUpdate, EndsWithAnAlertWhenNobodyCanBeAsked) {
     TlsServer stranger(TlsIdentity("IP:127.0.0.1"), [](const std::string&) { return Reply{}; });
-    const struct {
-        const char* ini;
-        std::string sources;
-        const char* logged;
-        const char* alert = NoConnection;
-    } cases[] = {
-        {"[GENERAL]\nIsConnectedURL=127.0.0.1\n", "", "Unable to open '"},
-        {"[GENERAL]\r\nIsConnectedURL=127.0.0.1\r\n", "reset 127.0.0.1:1 /a Last 1\n", "connect() error\n"},
-        {"[GENERAL]\nIsConnectedURL=127.0.0.1\n", "stranger " + stranger.Host() + " /a Last 1\n",
-         "https error: SSL certificate problem",
-         "The server 127.0.0.1 could not be trusted: its certificate was refused, and it was not asked for a "
-         "price.\nIs the name in Quorvan.cfg right, and the date of this computer?"},
-        {"[GENERAL]\n", ";\n", "Checked '', no connection found!\n"},
-    };
-    for (const auto& each : cases) {
-        Then("prepare", [this, &each] {
-            Write("Quorvan.ini", each.ini);
-            std::filesystem::remove(File("Quorvan.cfg"));
-            if (!each.sources.empty())
-                Write("Quorvan.cfg", each.sources);
+    const std::string toStranger = "stranger " + stranger.Host() + " /a Last 1\n";
+    constexpr const char* notTrusted =
+        "The server 127.0.0.1 could not be trusted: its certificate was refused, and it was not asked for a "
+        "price.\nIs the name in Quorvan.cfg right, and the date of this computer?";
+    std::filesystem::remove(File("Quorvan.cfg"));
+    for (const auto& [host, sources, alert, logged] :
+         {std::tuple{"127.0.0.1", "", NoConnection, "Unable to open '"},
+          {"127.0.0.1\r", "reset 127.0.0.1:1 /a Last 1\n", NoConnection, "connect() error\n"},
+          {"127.0.0.1", toStranger.c_str(), notTrusted, "https error: SSL certificate problem"},
+          {"", ";\n", NoConnection, "Checked '', no connection found!\n"}}) {
+        Then("prepare", [this, host = host, sources = sources] {
+            Write("Quorvan.ini", std::string("[GENERAL]\nIsConnectedURL=") + host + "\n");
+            if (*sources != '\0')
+                Write("Quorvan.cfg", sources);
         });
         Update();
-        Answer(each.alert, "Ok");
+        Answer(alert, "Ok");
         UntilDone();
-        Then("the log", [this, &each] {
-            EXPECT_NE(Read("Quorvan.log").find(each.logged), std::string::npos) << Read("Quorvan.log");
+        Then("the log", [this, logged = logged] {
+            EXPECT_NE(Read("Quorvan.log").find(logged), std::string::npos) << Read("Quorvan.log");
         });
     }
     RunAndClose();
