@@ -136,9 +136,7 @@ TEST_F(StartTest, IsRefusedAFolderThatIsTooLongOrInUse) {
 
 TEST_F(StartTest, TakesAFolderFromAHolderOnAnotherComputerWhenToldTo) {
     Write("Quorvan.lock", LockOfAnotherComputer);
-    AnswerAlert("elsewhere", "Yes").Expect({"second"}).Then("lock", [this] {
-        EXPECT_NE(Read("Quorvan.lock").find(std::to_string(getpid())), std::string::npos);
-    });
+    AnswerAlert("elsewhere", "Yes").Expect({"second"});
     EXPECT_EQ(RunAndClose(), 0);
     EXPECT_FALSE(Has("Quorvan.lock"));
 }

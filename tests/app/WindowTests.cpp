@@ -145,23 +145,30 @@ TEST_F(MainWindow, ADiskThatFailsLeavesEverythingAsItWas) {
 }
 
 TEST_F(MainWindow, ShowsAPortfolioAndOffersWhatCanBeDoneWithIt) {
-    for (const char* name : {"Empty", "First one", "Second"})
-        AddPortfolio(name);
-    AddInvestment(MakeInvestment("First one", "a", 1000, 1234.5F));
-    AddInvestment(MakeInvestment("Second", "b", 1, 0));
-    AddInvestment(MakeInvestment("First one", "c", 1, 0.25F));
-    Expect({"b"}, "$0.00").Then("start", [] {
-        EXPECT_EQ(Marked(), "Second");
+    AddPortfolio("Empty");
+    AddPortfolioOf("Full", {"a", "b", "c", "d", "e"}, 123456.75F);
+    AddPortfolioOf("Worthless", {"f"}, 0);
+    Expect({"f"}, "$0.00").Then("start", [] {
+        EXPECT_EQ(Marked(), "Worthless");
         EXPECT_EQ(Selector()->CountItems(), 3);
         ExpectMenus(Needs::Investment);
     });
     Send(MessagePortfolioChart).Answer("Unable to chart. Total value of portfolio equals zero!", "Ok");
-    Select("First one").Expect({"a", "c"}, "$1,234,500.25");
-    Select("Empty").Expect({}, "$0.00").Then("without investments", [] {
+    DeletePortfolio("No", nullptr);
+    DeletePortfolio("Yes", "No");
+    Select("Full").Expect({"a", "b", "c", "d", "e"}, "$617,283.75");
+    Mark({1, 2, 4}).Send(MessageInvestmentDelete).Expect({"a", "d"}, "$246,913.50");
+    DeletePortfolio("Yes", "Yes");
+    Expect({}, "$0.00").Then("first is current", [] {
         EXPECT_EQ(Marked(), "Empty");
         ExpectMenus(Needs::Portfolio);
     });
+    DeletePortfolio("Yes", "Yes");
+    Expect({"f"});
+    DeletePortfolio("Yes", "Yes");
+    Expect({}, "$0.00");
     RunAndClose();
+    EXPECT_EQ(RecordSlots("portfol.db") + RecordSlots("invest.db"), 0);
 }
 
 TEST_F(MainWindow, SaysWhatACommandLacks) {
@@ -217,29 +224,6 @@ TEST_F(MainWindow, AClickOnAHeaderSortsByText) {
         });
     Expect({"d", "C", "b", "a"}).Select("A").Expect({"d", "C", "b", "a"}); // loaded anew, and still sorted
     RunAndClose();
-}
-
-TEST_F(MainWindow, DeletesTheSelectedInvestments) {
-    AddPortfolioOf("A", {"a", "b", "c", "d", "e"}, 1.5F);
-    Mark({1, 2, 4}).Send(MessageInvestmentDelete).Expect({"a", "d"}, "$3.00");
-    Mark({0, 1}).Send(MessageInvestmentDelete).Expect({}, "$0.00");
-    RunAndClose();
-    EXPECT_EQ(RecordSlots("invest.db"), 0);
-}
-
-TEST_F(MainWindow, DeletesAPortfolioAfterTwoQuestions) {
-    for (const char* name : {"A", "B", "C"})
-        AddPortfolioOf(name, {std::string("in ") + name});
-    DeletePortfolio("No", nullptr);
-    DeletePortfolio("Yes", "No");
-    Select("B").Expect({"in B"});
-    for (const Texts& next : {Texts{"in A"}, {"in C"}, {}}) {
-        DeletePortfolio("Yes", "Yes");
-        Expect(next).Then("first is current",
-                          [next] { EXPECT_EQ("in " + Marked(), next.empty() ? "in " : next[0]); });
-    }
-    RunAndClose();
-    EXPECT_EQ(RecordSlots("portfol.db") + RecordSlots("invest.db"), 0);
 }
 
 TEST_F(MainWindow, TellsWhatItCannotReadAndLeavesItAlone) {
