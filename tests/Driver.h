@@ -9,6 +9,12 @@ class Driver : public StepDriver {
   public:
     ~Driver() override { FailForStepsLeft(); }
 
+    // A step as soon as the keyboard is in a field.
+    void InField(Action action) {
+        When(
+            "a field", [] { return Field() != nullptr; }, std::move(action));
+    }
+
   protected:
     void Fail(const std::string& sentence) override { ADD_FAILURE() << sentence; }
 };

@@ -15,69 +15,52 @@
 
 namespace {
 
-constexpr uint32 MessageIgnored = 3000;
-constexpr uint32 MessageDone = 3001;
+constexpr uint32 MessageOwn = 3000;
 
-// Counts what it is told, accepts Ok only when it is let to, and has a field and two buttons of its own.
+// Counts what it is told, refuses Ok as often as it should, and has a field and a button of its own.
 class TestDialog : public BDialog {
   public:
     explicit TestDialog(uint16 flags = DialogHasOk | DialogHasCancel)
         : BDialog({50, 50, 350, 200}, "Test", flags) {
         auto* field = new BTextControl({10, 10, 290, 30}, "field", "Field:", "text", nullptr);
         TopView()->AddChild(field);
-        TopView()->AddChild(
-            new BButton({10, 50, 90, 70}, "ignored", "Ignored", new BMessage(MessageIgnored)));
-        TopView()->AddChild(new BButton({110, 50, 190, 70}, "done", "Done", new BMessage(MessageDone)));
+        TopView()->AddChild(new BButton({110, 50, 190, 70}, "own", "Own", new BMessage(MessageOwn)));
         field->MakeFocus();
     }
     ~TestDialog() override { destroyed++; }
 
-    int OnOK() override {
-        confirmed++;
-        return accepts ? 1 : 0;
-    }
-    int HandleMessage(BMessage* message) override {
-        if (message->what == MessageDone)
-            return 2;
-        return message->what == MessageIgnored ? 1 : 0;
-    }
+    int OnOK() override { return ++confirmed > refusals ? 1 : 0; }
+    int HandleMessage(BMessage* message) override { return message->what == MessageOwn ? handled : 0; }
 
-    static inline int destroyed = 0;
-    static inline int confirmed = 0;
-    static inline bool accepts = true;
+    static inline int destroyed = 0, confirmed = 0, refusals = 0, handled = 2;
 };
 
-QWidget* Shown() {
-    return Driver::Window("Test");
-}
-
-bool FieldHasFocus() {
-    return Shown() && QApplication::focusWidget() && QApplication::focusWidget()->objectName() == "field";
+void Press(const char* button) {
+    Driver::Press(QApplication::activeModalWidget(), button);
 }
 
 // The dialog's own end comes a moment after its result.
-void ExpectGone() {
+void ExpectGone(int confirmed) {
     EXPECT_TRUE(QTest::qWaitFor([] { return TestDialog::destroyed == 1; }));
+    EXPECT_EQ(TestDialog::confirmed, confirmed);
+    TestDialog::destroyed = TestDialog::confirmed = 0;
 }
 
 TEST(BDialog, FlagsSayWhichButtonsThereAre) {
     const BApplication application("test");
     for (uint16 flags = 0; flags < 4; ++flags) {
         auto* dialog = new TestDialog(flags);
-        BView* ok = dialog->FindView("Ok button");
-        BView* cancel = dialog->FindView("cancel button");
+        dialog->ResizeTo(300, 250);
+        const BView* ok = dialog->FindView("Ok button");
+        const BView* cancel = dialog->FindView("cancel button");
         EXPECT_EQ(ok != nullptr, (flags & DialogHasOk) != 0);
         EXPECT_EQ(cancel != nullptr, (flags & DialogHasCancel) != 0);
         if (ok && cancel) {
-            const float height = GetFontHeight(be_bold_font);
-            EXPECT_LT(ok->Frame().right, cancel->Frame().left);
-            EXPECT_EQ(cancel->Frame().bottom, dialog->Bounds().bottom - 20);
-            EXPECT_EQ(cancel->Frame().Height(), 1.5F * height);
-            EXPECT_FLOAT_EQ(cancel->Frame().right, dialog->Bounds().right - 10);
-            EXPECT_FLOAT_EQ(ok->Frame().Width(), cancel->Frame().Width());
-            dialog->ResizeTo(300, 250);
-            EXPECT_EQ(ok->Frame().bottom, 230);
+            EXPECT_FLOAT_EQ(cancel->Frame().right, 290);
+            EXPECT_FLOAT_EQ(ok->Frame().right, 280 - cancel->Frame().Width());
+            EXPECT_EQ(cancel->Frame().Height(), 1.5F * GetFontHeight(be_bold_font));
             EXPECT_EQ(cancel->Frame().bottom, 230);
+            EXPECT_EQ(ok->Frame().bottom, 230);
         }
         dialog->Quit();
     }
@@ -85,75 +68,62 @@ TEST(BDialog, FlagsSayWhichButtonsThereAre) {
 
 TEST(BDialog, EveryWayOutHasItsResult) {
     const BApplication application("test");
-    const struct {
-        const char* what;
-        uint32 result;
-        int confirmed;
-        std::function<void()> way;
-    } cases[] = {
-        {"Enter in the field", DialogOk, 1, [] { Driver::Key(Qt::Key_Return); }},
-        {"the Ok button", DialogOk, 1, [] { Driver::Press(Shown(), "Ok button"); }},
-        {"the Cancel button", DialogCancel, 0, [] { Driver::Press(Shown(), "cancel button"); }},
-        {"Escape", DialogCancel, 0, [] { Driver::Key(Qt::Key_Escape); }},
-        {"the close box", DialogCancel, 0, [] { Shown()->close(); }},
-        {"a control that ends it", DialogOk, 0, [] { Driver::Press(Shown(), "done"); }},
-    };
-    for (const auto& each : cases) {
-        TestDialog::destroyed = TestDialog::confirmed = 0;
+    const std::tuple<uint32, int, std::function<void()>> cases[] = {
+        {DialogOk, 1, [] { Driver::Key(Qt::Key_Return); }},
+        {DialogOk, 1, [] { Press("Ok button"); }},
+        {DialogOk, 0, [] { Press("own"); }},
+        {DialogCancel, 0, [] { Press("cancel button"); }},
+        {DialogCancel, 0, [] { Driver::Key(Qt::Key_Escape); }},
+        {DialogCancel, 0, [] { QApplication::activeModalWidget()->close(); }},
+        {DialogCancel, 0, [] { be_app->PostMessage(B_QUIT_REQUESTED); }}};
+    int number = 0;
+    for (const auto& [result, confirmed, way] : cases) {
         Driver driver;
-        driver.When(each.what, FieldHasFocus, each.way);
-        EXPECT_EQ((new TestDialog)->DoModal(), each.result) << each.what;
-        EXPECT_EQ(TestDialog::confirmed, each.confirmed) << each.what;
-        ExpectGone();
+        driver.InField(way);
+        EXPECT_EQ((new TestDialog)->DoModal(), result) << number++;
+        ExpectGone(confirmed);
     }
 }
 
 // The key that opened the dialog may still be down.
 TEST(BDialog, TheRepeatsOfAHeldKeyPressNothing) {
     const BApplication application("test");
-    TestDialog::destroyed = TestDialog::confirmed = 0;
     const auto send = [](QEvent::Type type, quint64 time, bool repeat, int key = Qt::Key_Return) {
         QKeyEvent event(type, key, {}, "\r", repeat);
         event.setTimestamp(time);
-        QApplication::sendEvent(QApplication::focusWidget(), &event);
+        QApplication::sendEvent(Driver::Field(), &event);
     };
     Driver driver;
-    driver.When(
-        "dialog", FieldHasFocus,
-        [&] {
-            send(QEvent::KeyPress, 10, true);
-            // Not always does the toolkit see that it is a repeat.
-            send(QEvent::KeyRelease, 20, false);
-            send(QEvent::KeyPress, 20, false);
-            send(QEvent::KeyRelease, 25, false, Qt::Key_C);
-            qt_sendShortcutOverrideEvent(QApplication::focusWidget(), 25, Qt::Key_C, Qt::AltModifier);
-            EXPECT_FALSE(Shown()->findChild<QPushButton*>("cancel button")->isDown());
-        });
-    driver.When(
-        "nothing", [] { return FieldHasFocus(); },
-        [&] {
-            EXPECT_EQ(TestDialog::confirmed, 0);
-            send(QEvent::KeyPress, 30, false);
-        });
+    driver.InField([&] {
+        send(QEvent::KeyPress, 10, true);
+        // Not always does the toolkit see that it is a repeat.
+        send(QEvent::KeyRelease, 20, false);
+        send(QEvent::KeyPress, 20, false);
+        send(QEvent::KeyRelease, 25, false, Qt::Key_C);
+        qt_sendShortcutOverrideEvent(Driver::Field(), 25, Qt::Key_C, Qt::AltModifier);
+        EXPECT_FALSE(Driver::Window("Test")->findChild<QPushButton*>("cancel button")->isDown());
+    });
+    driver.InField([&] {
+        EXPECT_EQ(TestDialog::confirmed, 0);
+        send(QEvent::KeyPress, 30, false);
+    });
     EXPECT_EQ((new TestDialog)->DoModal(), DialogOk);
-    EXPECT_EQ(TestDialog::confirmed, 1);
-    ExpectGone();
+    ExpectGone(1);
 }
 
 TEST(BDialog, ARefusedOkKeepsItOpenAsItIs) {
     const BApplication application("test");
-    TestDialog::accepts = false;
+    TestDialog::refusals = TestDialog::handled = 1;
     Driver driver;
-    driver.When("dialog", FieldHasFocus, [] { Driver::Type("more", Qt::Key_Return); })
-        .When(
-            "refused", [] { return TestDialog::confirmed == 1; }, [] { Driver::Press(Shown(), "ignored"); })
-        .When("still shown", Shown, [] {
-            EXPECT_EQ(Shown()->findChild<QLineEdit*>("field")->text(), "more");
-            Driver::Key(Qt::Key_Escape);
-        });
+    driver.InField([] { Driver::Type("more", Qt::Key_Return); });
+    driver.When(
+        "refused", [] { return TestDialog::confirmed == 1; }, [] { Press("own"); });
+    driver.When("still shown", Driver::WindowShown("Test"), [] {
+        EXPECT_EQ(Driver::Window("Test")->findChild<QLineEdit*>()->text(), "more");
+        Driver::Key(Qt::Key_Escape);
+    });
     EXPECT_EQ((new TestDialog)->DoModal(), DialogCancel);
-    EXPECT_EQ(TestDialog::confirmed, 1);
-    ExpectGone();
+    ExpectGone(1);
 }
 
 TEST(BDialog, TheCallersWindowWaitsButPaints) {
@@ -173,59 +143,32 @@ TEST(BDialog, TheCallersWindowWaitsButPaints) {
     };
     stage.Show();
     stage.window->PostMessage(1);
-    int before = 0;
     Driver driver;
+    driver.InField([&] {
+        view->paints = 0;
+        view->Invalidate();
+        stage.window->PostMessage(2);
+    });
     driver.When(
-        "dialog", FieldHasFocus,
-        [&] {
-            before = view->paints;
-            view->Invalidate();
-            stage.window->PostMessage(2);
-        });
-    driver.When(
-        "a paint pass", [&] { return view->paints > before; }, [] { Driver::Key(Qt::Key_Return); });
+        "a paint pass", [&] { return view->paints > 0; }, [] { Driver::Key(Qt::Key_Return); });
     EXPECT_EQ(stage.Received(2), (Codes{1, 2}));
 }
 
 TEST(BDialog, AWorkerCanRunOneAndItsStopEndsIt) {
     const BApplication application("test");
     for (const bool stopped : {false, true}) {
-        TestDialog::destroyed = 0;
         std::atomic<uint32> result = 0;
         auto* dialog = new TestDialog;
-        Driver driver;
         const Worker worker([&] {
             result = dialog->DoModal();
             return 0;
         });
-        driver.When(
-            "dialog", FieldHasFocus,
-            [&] {
-                if (stopped)
-                    kill_thread(worker.Id());
-                else
-                    Driver::Key(Qt::Key_Return);
-            });
+        Driver driver;
+        driver.InField([&] { stopped ? void(kill_thread(worker.Id())) : Driver::Key(Qt::Key_Return); });
         EXPECT_TRUE(QTest::qWaitFor([&] { return result != 0; }));
         EXPECT_EQ(result, stopped ? DialogCancel : DialogOk);
-        ExpectGone();
+        ExpectGone(stopped ? 0 : 1);
     }
-}
-
-// Also while a window's handler waits for it.
-TEST(BDialog, TheApplicationsQuitEndsIt) {
-    Stage stage;
-    uint32 result = DialogOk;
-    stage.window->inside = [&](uint32) { result = (new TestDialog)->DoModal(); };
-    stage.Show();
-    stage.window->PostMessage(1);
-    Driver driver;
-    driver.When("dialog", FieldHasFocus, [&] { stage.application.PostMessage(B_QUIT_REQUESTED); });
-    stage.application.Run();
-    EXPECT_EQ(result, DialogCancel);
-    EXPECT_EQ(TestDialog::confirmed, 0);
-    EXPECT_EQ(TestDialog::destroyed, 1);
-    EXPECT_EQ(stage.application.CountWindows(), 0);
 }
 
 } // namespace
