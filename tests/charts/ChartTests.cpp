@@ -22,22 +22,21 @@
 namespace {
 
 struct Picture : QImage {
-    explicit Picture(BView& view, float scaling = 1) : scale(scaling) {
-        loadFromData(QByteArray::fromStdString(DrawPicture(&view, PictureFormat::Png, scale)));
+    explicit Picture(BView& view) {
+        loadFromData(QByteArray::fromStdString(DrawPicture(&view, PictureFormat::Png)));
     }
     [[nodiscard]] rgb_color At(float x, float y) const {
-        const QColor color = pixelColor(static_cast<int>(x * scale), static_cast<int>(y * scale));
-        return {static_cast<uint8>(color.red()), static_cast<uint8>(color.green()),
-                static_cast<uint8>(color.blue()), 255};
+        const QColor color = pixelColor(static_cast<int>(x), static_cast<int>(y));
+        const auto part = [](int value) { return static_cast<uint8>(value); };
+        return {part(color.red()), part(color.green()), part(color.blue()), 255};
     }
     [[nodiscard]] bool Has(BRect part, rgb_color color) const {
         bool has = false;
-        for (int y = 0; static_cast<float>(y) <= part.Height(); ++y)
-            for (int x = 0; static_cast<float>(x) <= part.Width(); ++x)
-                has |= At(part.left + static_cast<float>(x), part.top + static_cast<float>(y)) == color;
+        for (float y = part.top; y <= part.bottom; ++y)
+            for (float x = part.left; x <= part.right; ++x)
+                has |= At(x, y) == color;
         return has;
     }
-    float scale;
 };
 
 // All that is written in the view, in the order it is drawn.
@@ -53,13 +52,13 @@ std::string Texts(BView& view) {
 
 class Chart : public testing::Test {
   protected:
-    Picture Show(const std::vector<float>& values, const std::vector<const char*>& labels, float scale = 1) {
+    Picture Show(const std::vector<float>& values, const std::vector<const char*>& labels) {
         values_ = values;
         view_.SetTitle("Title");
         EXPECT_EQ(view_.SetData(values_.data(), static_cast<int>(values_.size())), 0);
         for (std::size_t i = 0; i < labels.size(); ++i)
             EXPECT_EQ(view_.SetLegendLabel(static_cast<int>(i), labels[i]), 0);
-        return Picture(view_, scale);
+        return Picture(view_);
     }
     // The colour box of a legend's line, without its outline.
     [[nodiscard]] BRect Box(int line) const {
@@ -93,26 +92,18 @@ Slices SlicesIn(const CHART_DATA_SET& set) {
 
 struct Held {
     std::string_view name, ticker, type, risk;
-    bool retire;
+    int8 retire;
     float shares, value;
 };
-constexpr Held Portfolio[] = {
-    {"Acme", "ABC", "Stock Fund", "MED", true, 1, 10},
-    {"Birch", "abc", "STOCK", "Med", false, 2, 20},
-    {"Acme", "ABC", "Bond Fund", "low", false, 4, 40},
-    {"Cedar", " ", "Cash", "Medium", false, 8, 80},
-    {"Dogwood", "", "", "", true, 16, 160},
-};
 
-ChartDataSets SetsOf(std::span<const Held> all) {
+ChartDataSets SetsOf(const std::vector<Held>& all) {
     ChartDataSets sets;
     EXPECT_EQ(sets.GenerateDataSets(static_cast<long>(all.size())), 0);
-    int index = 0;
-    for (const Held& held : all) {
+    for (int index = 0; const Held& held : all) {
         INVESTMENT_DATA record = MakeInvestment("P", held.name, held.shares, 1, held.type);
         CopyTextZeroed(record.Ticker, held.ticker);
         CopyTextZeroed(record.Risk, held.risk);
-        record.Retire = held.retire ? 1 : 0;
+        record.Retire = held.retire;
         record.Value = held.value;
         sets.AccumulateDataSet(index++, record);
     }
@@ -122,26 +113,21 @@ ChartDataSets SetsOf(std::span<const Held> all) {
 } // namespace
 
 TEST_F(Chart, SlicesRunCounterClockwiseFromThreeOClock) {
-    for (const float scale : {1.0F, 2.0F}) {
-        // The last one's sweep is out of the legend's way.
-        const Picture picture = Show({1, 2, 1, 4}, {"", "", "", ""}, scale);
-        EXPECT_EQ(picture.width(), scale * (area_.Width() + 1));
-        const double middles[] = {22.5, 90, 157.5, 270};
-        for (std::size_t i = 0; i < std::size(middles); ++i)
-            EXPECT_EQ(AtAngle(picture, middles[i]), PieChartColors[i]) << i;
-        EXPECT_EQ(picture.At(pie_.center.x, pie_.center.y + pie_.yRadius + 3), colors::dark_gray);
-        EXPECT_EQ(picture.At(pie_.center.x, pie_.center.y - pie_.yRadius - 4), colors::gray);
-    }
+    // The last one's sweep is out of the legend's way.
+    const Picture picture = Show({1, 2, 1, 4}, {"", "", "", ""});
+    const double middles[] = {22.5, 90, 157.5, 270};
+    for (std::size_t i = 0; i < std::size(middles); ++i)
+        EXPECT_EQ(AtAngle(picture, middles[i]), PieChartColors[i]) << i;
+    EXPECT_EQ(picture.At(pie_.center.x, pie_.center.y + pie_.yRadius + 3), colors::dark_gray);
+    EXPECT_EQ(picture.At(pie_.center.x, pie_.center.y - pie_.yRadius - 4), colors::gray);
     EXPECT_EQ(Texts(view_), "Title|");
 }
 
 TEST_F(Chart, LegendLinesKeepStepWithTheirSlices) {
     const Picture picture = Show({1, 1, 0, 1}, {"First", "", "Nothing", "A label of thirty-one bytes, aaa"});
     const rgb_color boxes[] = {PieChartColors[0], colors::gray, PieChartColors[2], PieChartColors[3]};
-    for (int i = 0; i < 4; ++i) {
-        EXPECT_EQ(picture.At(Box(i).left, Box(i).top), boxes[i]) << i;
+    for (int i = 0; i < 4; ++i)
         EXPECT_EQ(picture.At(Box(i).right, Box(i).bottom), boxes[i]) << i;
-    }
     EXPECT_EQ(view_.AccessibleDescription(), "Title\nFirst: $1.00 33.33%\nNothing: $0.00 0.00%\n"
                                              "A label of thirty-one bytes, aa: $1.00 33.33%");
     EXPECT_EQ(view_.SetLegendLabel(4, "too many"), 1);
@@ -153,9 +139,6 @@ TEST_F(Chart, ColorsBeginAgainAndALongLegendSaysWhatIsMissing) {
     EXPECT_EQ(AtAngle(picture, 16.5 / 60 * 360), PieChartColors[0]);
     EXPECT_EQ(picture.At(Box(16).left, Box(16).top), PieChartColors[0]);
     const int room = static_cast<int>((legend_.Height() + 2) / (lineHeight_ + 2));
-    EXPECT_EQ(picture.At(Box(room - 2).left, Box(room - 2).top),
-              PieChartColors[static_cast<std::size_t>(room - 2) % 16]);
-    EXPECT_EQ(picture.At(Box(room - 1).left, Box(room - 1).top), colors::gray);
     EXPECT_TRUE(Texts(view_).ends_with("|x: $1.00 1.67%|and " + std::to_string(60 - room + 1) + " more|"));
 }
 
@@ -180,12 +163,9 @@ TEST_F(Chart, LegendTextsStayReadableAndInTheView) {
 }
 
 TEST_F(Chart, SaysWhenThereIsNothingToChart) {
-    for (const std::vector<float>& values :
-         std::vector<std::vector<float>>{{}, {0, 0, 0}, {5, -5, 0}, {1, std::nanf(""), 2}}) {
-        const Picture picture = Show(values, {});
+    for (const std::vector<float>& values : {std::vector<float>(), {0, 0}, {5, -5}, {1, std::nanf("")}}) {
+        EXPECT_FALSE(Show(values, {}).Has(area_, PieChartColors[0])) << values.size();
         EXPECT_EQ(Texts(view_), "Title|Nothing to Chart!|");
-        EXPECT_TRUE(picture.Has({100, 170, 250, 200}, colors::black)) << values.size();
-        EXPECT_FALSE(picture.Has(area_, PieChartColors[0])) << values.size();
     }
 }
 
@@ -211,12 +191,9 @@ TEST_F(Chart, LinesRunFromTheCornerToTheirValues) {
 
     view.Toggle20And25Percent();
     const Picture some(view);
-    EXPECT_FALSE(some.Has(area_, colors::magenta));
-    EXPECT_FALSE(some.Has(area_, colors::yellow));
+    EXPECT_FALSE(some.Has(area_, colors::magenta) || some.Has(area_, colors::yellow));
     EXPECT_TRUE(some.Has(at(graph.right, graph.top + 3), colors::blue));
     EXPECT_EQ(Texts(view), axis + "1000|7384|13,768|20,151|26,535|32,919|5%|10%|15%|");
-    view.Toggle20And25Percent();
-    EXPECT_TRUE(Picture(view).Has(area_, colors::magenta));
 }
 
 TEST_F(Chart, DrawsWithoutGrowth) {
@@ -227,7 +204,7 @@ TEST_F(Chart, DrawsWithoutGrowth) {
 }
 
 TEST(ChartWindow, TheMenuAndTheCheckBoxChooseWhatIsShown) {
-    DataFolder folder;
+    const DataFolder folder;
     folder.AddInvestment(MakeInvestment("P", "Acme", 10, 10));
     folder.AddInvestment(MakeInvestment("Q", "Other", 10, 10));
     Driver driver;
@@ -235,43 +212,42 @@ TEST(ChartWindow, TheMenuAndTheCheckBoxChooseWhatIsShown) {
     AppState state;
     state.investments = std::make_unique<DATABASE>(folder.File("invest.db").c_str());
     app_state = &state;
-    const auto choose = [&](const char* title) {
-        driver.When(
-            "menu", Driver::WindowShown("Quorvan"),
-            [] { QTest::mouseClick(Driver::Window("Quorvan")->findChild<QPushButton*>(), Qt::LeftButton); });
-        driver.When(
-            title, [] { return Driver::OpenMenu() != nullptr; }, [title] { Driver::ClickItem(title); });
+    const auto choose = [](const char* title) {
+        return [title] {
+            for (QAction* item : Driver::Window("Quorvan")->findChild<QPushButton*>()->menu()->actions())
+                if (item->objectName() == title)
+                    item->trigger();
+        };
     };
-    const auto view = [](const char* name) { return GetAppWindow(be_app, "Quorvan")->FindView(name); };
-    const auto pie = [view] { return view("pie chart view")->AccessibleDescription(); };
-    driver.When("first", Driver::WindowShown("Quorvan"), [&] {
-        EXPECT_EQ(pie(), "Value by Investment\nAcme: $100.00 100.00%");
-        EXPECT_TRUE(view("value chart view")->IsHidden());
-        EXPECT_EQ(Driver::Window("Quorvan")->windowModality(), Qt::ApplicationModal);
-    });
-    choose("Shares by Investment");
-    driver.Await("shares", [&] { return pie() == "Shares by Investment\nAcme: 10.00 100.00%"; });
-    choose("Value over Time");
-    driver.When(
-        "growth", [&] { return !view("value chart view")->IsHidden(); },
-        [&] {
-            EXPECT_TRUE(view("pie chart view")->IsHidden());
-            Driver::Press(Driver::Window("Quorvan"), "last percentage check");
-        });
-    driver.When(
-        "without 25%",
-        [&] { return view("value chart view")->AccessibleDescription().find("25%") == std::string::npos; },
-        [] { Driver::Window("Quorvan")->close(); });
-    driver.When(
-        "closed", [] { return !GetAppWindow(be_app, "Quorvan"); },
-        [] { be_app->PostMessage(B_QUIT_REQUESTED); });
+    // Waits until one view alone is seen, and tells this of itself.
+    const auto seen = [&](const char* first, const char* last, const StepDriver::Action& action) {
+        const auto ready = [=] {
+            std::string told;
+            for (const char* name : {"pie chart view", "value chart view"})
+                if (const BView* view = GetAppWindow(be_app, "Quorvan")->FindView(name); !view->IsHidden())
+                    told += view->AccessibleDescription();
+            return told.starts_with(first) && told.ends_with(last);
+        };
+        driver.When(last, ready, action);
+    };
+    seen("Value by Investment", "\nAcme: $100.00 100.00%", choose("Shares by Investment"));
+    seen("Shares by Investment", "\nAcme: 10.00 100.00%", choose("Value over Time"));
+    seen(
+        "Value over Time", "\n25%: 26,470",
+        [] { Driver::Press(Driver::Window("Quorvan"), "last percentage check"); });
+    seen("Value over Time", "\n15%: 3292", [] { be_app->PostMessage(B_QUIT_REQUESTED); });
     new ChartWindow(50, 50, "P");
+    EXPECT_EQ(Driver::Window("Quorvan")->windowModality(), Qt::ApplicationModal);
     application.Run();
     app_state = nullptr;
 }
 
 TEST(ChartDataSets, GroupByTheirKeysInTheOrderMet) {
-    const ChartDataSets sets = SetsOf(Portfolio);
+    const ChartDataSets sets = SetsOf({{"Acme", "ABC", "Stock Fund", "MED", 1, 1, 10},
+                                       {"Birch", "abc", "STOCK", "Med", 0, 2, 20},
+                                       {"Acme", "ABC", "Bond Fund", "low", 0, 4, 40},
+                                       {"Cedar", " ", "Cash", "Medium", 0, 8, 80},
+                                       {"Dogwood", "", "", "", 1, 16, 160}});
     const Slices expected[] = {
         {{"Acme", 10}, {"Birch", 20}, {"Acme", 40}, {"Cedar", 80}, {"Dogwood", 160}},
         {{"ABC", 50}, {"abc", 20}},
@@ -287,7 +263,7 @@ TEST(ChartDataSets, GroupByTheirKeysInTheOrderMet) {
 }
 
 TEST(ChartDataSets, HaveTheirFixedSlicesAndKeepWithinTheirCapacity) {
-    ChartDataSets sets = SetsOf({Portfolio, 1});
+    ChartDataSets sets = SetsOf({{"Acme", "ABC", "Fund", "Med", 1, 1, 10}});
     for (int i = 1; i < 10; ++i)
         sets.AccumulateDataSet(i, MakeInvestment("P", std::to_string(i), 1, 1, std::to_string(i)));
     for (const std::uint32_t chart : {2000, 2002, 2006})
