@@ -76,8 +76,7 @@ TEST(BDialog, EveryWayOutHasItsResult) {
         {DialogCancel, 0, [] { Driver::Key(Qt::Key_Escape); }},
         {DialogCancel, 0, [] { QApplication::activeModalWidget()->close(); }},
         {DialogCancel, 0, [] { be_app->PostMessage(B_QUIT_REQUESTED); }}};
-    int number = 0;
-    for (const auto& [result, confirmed, way] : cases) {
+    for (int number = 0; const auto& [result, confirmed, way] : cases) {
         Driver driver;
         driver.InField(way);
         EXPECT_EQ((new TestDialog)->DoModal(), result) << number++;
@@ -116,8 +115,8 @@ TEST(BDialog, ARefusedOkKeepsItOpenAsItIs) {
     TestDialog::refusals = TestDialog::handled = 1;
     Driver driver;
     driver.InField([] { Driver::Type("more", Qt::Key_Return); });
-    driver.When(
-        "refused", [] { return TestDialog::confirmed == 1; }, [] { Press("own"); });
+    const auto refused = [] { return TestDialog::confirmed == 1; };
+    driver.When("refused", refused, [] { Press("own"); });
     driver.When("still shown", Driver::WindowShown("Test"), [] {
         EXPECT_EQ(Driver::Window("Test")->findChild<QLineEdit*>()->text(), "more");
         Driver::Key(Qt::Key_Escape);
@@ -128,12 +127,12 @@ TEST(BDialog, ARefusedOkKeepsItOpenAsItIs) {
 
 TEST(BDialog, TheCallersWindowWaitsButPaints) {
     struct Painted : BView {
-        using BView::BView;
+        Painted() : BView({0, 0, 99, 99}, "", B_FOLLOW_NONE, B_WILL_DRAW) {}
         void Draw(BRect) override { paints++; }
         int paints = 0;
     };
     Stage stage;
-    auto* view = stage.Add(new Painted(BRect(0, 0, 99, 99), "", B_FOLLOW_ALL_SIDES, B_WILL_DRAW));
+    auto* view = stage.Add(new Painted);
     uint32 result = 0;
     stage.window->inside = [&](uint32 code) {
         if (code == 1)
@@ -149,8 +148,8 @@ TEST(BDialog, TheCallersWindowWaitsButPaints) {
         view->Invalidate();
         stage.window->PostMessage(2);
     });
-    driver.When(
-        "a paint pass", [&] { return view->paints > 0; }, [] { Driver::Key(Qt::Key_Return); });
+    const auto painted = [&] { return view->paints > 0; };
+    driver.When("a paint pass", painted, [] { Driver::Key(Qt::Key_Return); });
     EXPECT_EQ(stage.Received(2), (Codes{1, 2}));
 }
 
