@@ -47,20 +47,13 @@ class DataFolder : public TemporaryFolder {
     }
     // "portfolio/name" of every investment in the file, or the names of the portfolios, in record order.
     std::vector<std::string> Investments() const {
-        std::vector<std::string> all;
-        DATABASE file(File("invest.db").c_str());
-        for (const void* data = file.QueryGetFirst(nullptr); data; data = file.QueryGetNext(nullptr)) {
-            const auto* record = static_cast<const INVESTMENT_DATA*>(data);
-            all.push_back(std::string(record->Portfolio) + "/" + record->Name);
-        }
-        return all;
+        return All<INVESTMENT_DATA>(
+            "invest.db",
+            [](const INVESTMENT_DATA& record) { return std::string(record.Portfolio) + "/" + record.Name; });
     }
     std::vector<std::string> Portfolios() const {
-        std::vector<std::string> all;
-        DATABASE file(File("portfol.db").c_str());
-        for (const void* data = file.QueryGetFirst(nullptr); data; data = file.QueryGetNext(nullptr))
-            all.emplace_back(static_cast<const PORTFOLIO_DATA*>(data)->Name);
-        return all;
+        return All<PORTFOLIO_DATA>(
+            "portfol.db", [](const PORTFOLIO_DATA& record) { return record.Name; });
     }
     // Records in the file, deleted ones included.
     std::int32_t RecordSlots(const std::string& file) const {
@@ -70,6 +63,14 @@ class DataFolder : public TemporaryFolder {
     }
 
   private:
+    template <class Record, class ToText>
+    std::vector<std::string> All(const char* name, ToText text) const {
+        std::vector<std::string> all;
+        DATABASE file(File(name).c_str());
+        for (const void* data = file.QueryGetFirst(nullptr); data; data = file.QueryGetNext(nullptr))
+            all.emplace_back(text(*static_cast<const Record*>(data)));
+        return all;
+    }
     template <std::size_t Count>
     void Create(const char* name, const std::array<COLUMN_ENTRY, Count>& columns) const {
         if (DATABASE(nullptr).Create(File(name).c_str(), name, Count, columns.data()) != 0)

@@ -11,8 +11,8 @@ class Driver : public StepDriver {
 
     // A step as soon as the keyboard is in a field.
     void InField(Action action) {
-        When(
-            "a field", [] { return Field() != nullptr; }, std::move(action));
+        const auto ready = [] { return Field() != nullptr; };
+        When("a field", ready, std::move(action));
     }
 
   protected:

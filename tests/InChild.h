@@ -2,7 +2,6 @@
 
 #include <csignal>
 #include <functional>
-#include <stdexcept>
 
 #include <sys/wait.h>
 #include <unistd.h>
@@ -30,21 +29,13 @@ inline int ResultAsOrdinaryUser(const std::function<int()>& work) {
 class WaitingChild {
   public:
     // The work is done when the constructor returns; it should not end the process.
-    explicit WaitingChild(const std::function<void()>& work) {
-        int ends[2];
-        if (pipe(ends) != 0)
-            throw std::runtime_error("no pipe");
-        id_ = fork();
+    explicit WaitingChild(const std::function<void()>& work) : id_(fork()) {
         if (id_ == 0) {
             work();
-            static_cast<void>(!write(ends[1], "", 1));
             for (;;)
-                pause();
+                raise(SIGSTOP);
         }
-        close(ends[1]);
-        char done = 0;
-        static_cast<void>(!read(ends[0], &done, 1));
-        close(ends[0]);
+        waitpid(id_, nullptr, WUNTRACED);
     }
     WaitingChild(const WaitingChild&) = delete;
     WaitingChild& operator=(const WaitingChild&) = delete;
@@ -52,12 +43,11 @@ class WaitingChild {
 
     [[nodiscard]] pid_t Id() const { return id_; }
     // It has no chance to clear up.
-    void Kill() {
-        if (!killed_ && kill(id_, SIGKILL) == 0)
-            killed_ = waitpid(id_, nullptr, 0) == id_;
+    void Kill() const {
+        if (kill(id_, SIGKILL) == 0)
+            waitpid(id_, nullptr, 0);
     }
 
   private:
-    pid_t id_ = -1;
-    bool killed_ = false;
+    pid_t id_;
 };

@@ -1,22 +1,12 @@
 #pragma once
 
-#include <array>
 #include <cstdio>
-#include <memory>
 #include <string>
 #include <vector>
 
-// PDF files read back with a PDF reader's programs.
+#include "Output.h"
 
-// What a command prints.
-inline std::string Output(const std::string& command) {
-    const std::unique_ptr<FILE, int (*)(FILE*)> pipe(popen(command.c_str(), "r"), pclose);
-    std::string output;
-    std::array<char, 4096> part;
-    while (pipe && std::fgets(part.data(), part.size(), pipe.get()))
-        output += part.data();
-    return output;
-}
+// PDF files read back with a PDF reader's programs.
 
 // A word on the page, in points from the sheet's left top.
 struct PdfWord {
@@ -50,7 +40,5 @@ inline PdfWord FindWord(const std::vector<PdfWord>& words, const std::string& te
 }
 
 inline int PdfPages(const std::string& file) {
-    const std::string info = Output("pdfinfo " + file);
-    const std::size_t place = info.find("Pages:");
-    return place == std::string::npos ? 0 : std::atoi(info.c_str() + place + 6);
+    return std::atoi(Output("pdfinfo " + file + " | sed -n 's/^Pages: *//p'").c_str());
 }

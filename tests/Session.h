@@ -3,7 +3,6 @@
 #include <array>
 #include <chrono>
 #include <csignal>
-#include <cstdio>
 #include <cstdlib>
 #include <functional>
 #include <memory>
@@ -16,6 +15,8 @@
 #include <sys/prctl.h>
 #include <sys/wait.h>
 #include <unistd.h>
+
+#include "Output.h"
 
 // Programs that a test starts, and a display of the test's own for them.
 
@@ -106,13 +107,3 @@ class Display {
   private:
     Server server_;
 };
-
-// The first line that the command prints.
-inline std::string Output(const std::string& command) {
-    FILE* pipe = popen(command.c_str(), "r");
-    std::array<char, 64> line{};
-    const bool got = fgets(line.data(), line.size(), pipe) != nullptr;
-    pclose(pipe);
-    const std::string text = got ? line.data() : "";
-    return text.substr(0, text.find('\n'));
-}
