@@ -14,9 +14,7 @@
 #include "dialogs/InvestmentInput.h"
 #include "dialogs/PasswordDialogs.h"
 #include "dialogs/PortfolioDialog.h"
-#include "dialogs/PortfolioDialog.h"
-#include "dialogs/PasswordDialogs.h"
-#include "platform/TextControl.h"
+#include "platform/Font.h"
 #include "util/Dates.h"
 #include "util/interface/InterfaceHelpers.h"
 
@@ -94,32 +92,14 @@ TEST_F(FormTest, ThePasswordIsTakenByOkAlone) {
     EXPECT_STREQ(answer, "0123456789abcde");
 }
 
-TEST_F(FormTest, ALargeFontLeavesRoomForButtonsAndFields) {
-    const BFont* usual = be_plain_font;
-    BFont large;
-    large.SetSize(3 * large.Size());
-    be_plain_font = &large;
-    char name[NameSize] = "";
-    INVESTMENT_DATA record{};
-    auto* small = new PortfolioAddDialog(0, 0, "small", name, state_.portfolios.get());
-    EXPECT_GE(small->FindView("Ok button")->Frame().left, 0);
-    small->Quit();
-    auto* form = new InvestmentDialog(0, 0, "form", &record, Both);
-    const auto* field = dynamic_cast<BTextControl*>(form->FindView("ticker control"));
-    EXPECT_GE(field->Frame().Width() - field->Divider(), large.StringWidth("123456"));
-    form->Quit();
-    be_plain_font = usual;
-}
-
 TEST_F(FormTest, APortfolioNameIsNewAndFitsItsRecord) {
     ASSERT_TRUE(AddPortfolio(*state_.portfolios, "growth"));
     Refused("  ", "Invalid portfolio name!");
     Refused("Growth", "Portfolio name already exists!");
     InField([] { TypeOver("Growth Fund 0123456789012345678\xC3\xBC", Qt::Key_Return); });
     char name[NameSize] = "";
-    EXPECT_EQ((new PortfolioAddDialog(50, 50, "Add", name, state_.portfolios.get()))->DoModal(), DialogOk);
+    EXPECT_EQ((new PortfolioAddDialog(50, 50, "", name, state_.portfolios.get()))->DoModal(), DialogOk);
     EXPECT_STREQ(name, "Growth Fund 0123456789012345678");
-
     Refused("growth", "Portfolio name already exists!"); // unchanged
     InField([] { TypeOver("Else", Qt::Key_Escape); });
     char old[NameSize] = "growth";
