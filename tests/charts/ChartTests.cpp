@@ -177,7 +177,7 @@ TEST_F(Chart, LinesRunFromTheCornerToTheirValues) {
         all.Has(at(graph.right, graph.bottom - 94'396.0F * graph.Height() / 263'698), colors::yellow));
     EXPECT_TRUE(all.Has(at(graph.left + 4, graph.bottom), colors::magenta)); // the last one lies on top
     // The last year, under its line's end.
-    EXPECT_TRUE(all.Has({graph.right - 9, graph.bottom + 9, graph.right + 9, area_.bottom}, colors::black));
+    EXPECT_TRUE(all.Has({graph.right - 9, graph.bottom + 9, graph.right + 9, legend.top - 1}, colors::black));
     EXPECT_EQ(all.At(graph.left + 10, graph.top + 10), (rgb_color{205, 168, 157, 255}));
     // The legend's first text, between two boxes.
     const float text = legend.left + 30 + lineHeight_ + 3;
