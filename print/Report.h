@@ -29,6 +29,7 @@ enum class ReportResult {
 // Makes the whole job for a window, which must be locked. Without kept settings it shows the page dialog and
 // the job dialog, which proposes the portfolio's name for a file, and keeps what was chosen there; otherwise
 // it only asks before it replaces a file, and shows the job dialog for another one. With settings that were
-// cancelled halfway or could not be printed with, the next job's dialogs are shown again and start from these.
+// cancelled halfway or could not be printed with, the next job's dialogs are shown again and start from
+// these.
 [[nodiscard]] ReportResult RunReportJob(BWindow* window, const char* portfolio, DATABASE& investments,
                                         std::unique_ptr<BMessage>& settings);

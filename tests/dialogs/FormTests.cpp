@@ -8,8 +8,8 @@
 #include <QPushButton>
 
 #include "DataFolder.h"
-#include "app/state/AppState.h"
 #include "app/model/PortfolioRules.h"
+#include "app/state/AppState.h"
 #include "dialogs/InvestmentDialog.h"
 #include "dialogs/InvestmentInput.h"
 #include "dialogs/PasswordDialogs.h"
@@ -40,7 +40,7 @@ class FormTest : public testing::Test, protected Driver {
     ~FormTest() override { app_state = nullptr; }
 
     // Types over what is selected in the form, and ends it by the key.
-    void Enter(PasswordForm* form, const char* shown, const char* typed, Qt::Key key) {
+    void Enter(FieldForm* form, const char* shown, const char* typed, Qt::Key key) {
         InField([=] {
             EXPECT_EQ(Field()->text(), shown);
             Key(Qt::Key_Backspace);
