@@ -251,7 +251,7 @@ int Measure(const OPTIONS& options) {
         NorvelApp application;
         application.Run();
     }
-    std::printf("%ld prices: %.1f ms, bare requests %.1f ms: %.2f x; with the window %.1f ms\n",
+    std::printf("%ld prices: %.1f ms, bare requests %.1f ms: %.2f x (at most 2.5); with the window %.1f ms\n",
                 options.records, Median(times.prices), Median(times.bare), Median(times.ratios),
                 Median(times.withWindow));
     std::printf("%d mouse events meanwhile, the longest wait %.1f ms\n", times.mouseEvents,

@@ -6,7 +6,7 @@
 #include <cstring>
 #include <string>
 
-#include "quotes/HostField.h"
+#include "quotes/Host.h"
 #include "quotes/QuoteSource.h"
 
 namespace {

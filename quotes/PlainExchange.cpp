@@ -1,17 +1,15 @@
-#include "quotes/PlainExchange.h"
+#include "quotes/Exchange.h"
 
 #include <arpa/inet.h>
 #include <cerrno>
-#include <chrono>
 #include <cstring>
 #include <netinet/in.h>
 #include <poll.h>
-#include <string_view>
+#include <string>
 #include <sys/socket.h>
-#include <utility>
+#include <unistd.h>
 
-#include "quotes/HostField.h"
-#include "quotes/HostLookup.h"
+#include "quotes/Host.h"
 #include "quotes/QuoteReport.h"
 #include "quotes/QuoteRetrieval.h"
 #include "quotes/QuoteScanner.h"
@@ -21,173 +19,123 @@
 namespace {
 
 constexpr std::size_t BufferSize = 1024; // of the request and of each receive
-// A call on the socket waits no longer; then the stop descriptor is waited for as well, and the wait is worth
-// the time to write the log. To poll before every call took a tenth of the time of a request to a near
-// server.
-constexpr std::chrono::milliseconds ShortWait(10);
 
-bool MustWait() {
-    return errno == EAGAIN || errno == EWOULDBLOCK || errno == EINTR;
-}
+// Its socket never blocks: every wait is one for the stop descriptor as well.
+class PlainExchange {
+  public:
+    PlainExchange(const QuoteContext& context, QuoteReport& report) : context_(context), report_(report) {}
+    PlainExchange(const PlainExchange&) = delete;
+    PlainExchange& operator=(const PlainExchange&) = delete;
+    ~PlainExchange() {
+        if (socket_ >= 0)
+            close(socket_);
+    }
 
-bool LimitWaits(int socket) {
-    timeval limit{};
-    limit.tv_usec = std::chrono::microseconds(ShortWait).count();
-    return setsockopt(socket, SOL_SOCKET, SO_RCVTIMEO, &limit, sizeof limit) == 0 &&
-           setsockopt(socket, SOL_SOCKET, SO_SNDTIMEO, &limit, sizeof limit) == 0;
-}
+    [[nodiscard]] float Ask(const HostField& host, const char* path, QuoteScanner& scanner);
 
-} // namespace
+  private:
+    // The steps are false when they failed, with the answer in status_, or the caller shall stop.
+    [[nodiscard]] bool LookUp(const char* host);
+    [[nodiscard]] bool Connect(std::uint16_t port);
+    [[nodiscard]] bool Send(const char* path);
+    // Until there is a price, or no more of the page.
+    [[nodiscard]] bool Receive(QuoteScanner& scanner);
+    bool Fail(float status, const char* line, const char* reason = std::strerror(errno));
+    [[nodiscard]] bool Wait(short events) const {
+        return WaitUnlessStopped(socket_, events, context_.stopFd);
+    }
 
-PlainExchange::PlainExchange(const QuoteContext& context, QuoteReport& report)
-    : context_(context),
-      report_(report),
-      lastConnection_(context.lastConnection ? *context.lastConnection : ownLastConnection_) {}
-
-PlainExchange::~PlainExchange() {
-    if (socket_ >= 0)
-        lastConnection_.Keep(socket_);
-}
+    const QuoteContext& context_;
+    QuoteReport& report_;
+    in_addr address_{};
+    int socket_ = -1;
+    float status_ = QuoteCancelled;
+};
 
 float PlainExchange::Ask(const HostField& host, const char* path, QuoteScanner& scanner) {
-    Step step = LookUp(host.name.c_str());
-    if (step == Step::Failed)
-        return NoQuote;
-    if (step == Step::Done)
-        step = Connect(host.port);
-    if (step == Step::Done)
-        step = Send(path);
-    lastConnection_.Close();
-    if (step == Step::Failed)
-        return QuoteNetworkFailure;
-    if (step == Step::Done)
-        step = Receive(scanner);
-    if (step == Step::Stopped)
-        return EndConnection();
+    if (!LookUp(host.name.c_str()) || !Connect(host.port) || !Send(path) || !Receive(scanner))
+        return status_;
     report_.LogNumber("Returning price = ", scanner.Price());
     return scanner.Price();
 }
 
-float PlainExchange::EndConnection() {
-    lastConnection_.Keep(std::exchange(socket_, -1));
-    lastConnection_.Close();
-    return QuoteCancelled;
-}
-
-PlainExchange::Step PlainExchange::Fail(const char* line) {
-    const std::string reason = errno != 0 ? std::strerror(errno) : "the name does not resolve";
-    report_.Log("%s\n", line);
+bool PlainExchange::Fail(float status, const char* line, const char* reason) {
+    status_ = status;
+    report_.Log(std::string(line) + "\n");
     report_.Observer().Failed((std::string(line) + ": " + reason).c_str());
-    return Step::Failed;
+    return false;
 }
 
-void PlainExchange::ExpectALongWait() {
-    report_.Flush();
-    lastConnection_.Close();
+bool PlainExchange::LookUp(const char* host) {
+    const HostLookup result = LookUpHost(host, context_.stopFd, &address_);
+    if (result == HostLookup::NotFound)
+        return Fail(NoQuote, "gethostbyname() error", "the name does not resolve");
+    if (result == HostLookup::Found)
+        report_.LogText("gethostname() ok\n");
+    return result == HostLookup::Found;
 }
 
-bool PlainExchange::Wait(short events) {
-    ExpectALongWait();
-    return WaitUnlessStopped(socket_, events, context_.stopFd) != Waited::Stopped;
-}
-
-bool PlainExchange::IsStoppedMeanwhile() {
-    const auto now = std::chrono::steady_clock::now();
-    if (now - lastLook_ < ShortWait)
-        return false;
-    lastLook_ = now;
-    return IsStopped(context_.stopFd);
-}
-
-PlainExchange::Step PlainExchange::LookUp(const char* host) {
-    in_addr address{};
-    HostLookup result = HostLookup::Found;
-    if (!ReadNumericAddress(host, &address)) {
-        ExpectALongWait();
-        result = LookUpHost(host, context_.stopFd, &address);
-    }
-    if (result == HostLookup::Stopped)
-        return Step::Stopped;
-    if (result == HostLookup::NotFound) {
-        errno = 0;
-        return Fail("gethostbyname() error");
-    }
-    address_ = address.s_addr;
-    report_.LogText("gethostname() ok\n");
-    return Step::Done;
-}
-
-PlainExchange::Step PlainExchange::Connect(std::uint16_t port) {
-    socket_ = socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0);
-    if (socket_ < 0 || !LimitWaits(socket_))
-        return Fail("socket() error");
+bool PlainExchange::Connect(std::uint16_t port) {
+    socket_ = socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0);
+    if (socket_ < 0)
+        return Fail(QuoteNetworkFailure, "socket() error");
     report_.LogText("socket created ok\n");
     sockaddr_in server{};
     server.sin_family = AF_INET;
     server.sin_port = htons(port);
-    server.sin_addr.s_addr = address_;
+    server.sin_addr = address_;
     int error = connect(socket_, reinterpret_cast<const sockaddr*>(&server), sizeof server) == 0 ? 0 : errno;
-    if (error == EINPROGRESS || error == EINTR) {
+    if (error == EINPROGRESS) {
         if (!Wait(POLLOUT))
-            return Step::Stopped;
+            return false;
         socklen_t size = sizeof error;
         getsockopt(socket_, SOL_SOCKET, SO_ERROR, &error, &size);
     }
-    errno = error;
     if (error != 0)
-        return Fail("connect() error");
+        return Fail(QuoteNetworkFailure, "connect() error", std::strerror(error));
     report_.LogText("connected ok\n");
-    if (context_.observer)
-        ReportConnection(port);
-    return Step::Done;
-}
-
-void PlainExchange::ReportConnection(std::uint16_t port) const {
     char address[INET_ADDRSTRLEN] = "";
     inet_ntop(AF_INET, &address_, address, sizeof address);
     report_.Observer().Connected((std::string(address) + " port " + std::to_string(port)).c_str());
+    return true;
 }
 
-PlainExchange::Step PlainExchange::Send(const char* path) {
+bool PlainExchange::Send(const char* path) {
     char request[BufferSize];
-    if (!FormatInto(request, sizeof request, "GET %s HTTP/1.0\n\n", path)) {
-        errno = EMSGSIZE;
-        return Fail("send() error");
-    }
+    if (!FormatInto(request, sizeof request, "GET %s HTTP/1.0\n\n", path))
+        return Fail(QuoteNetworkFailure, "send() error", std::strerror(EMSGSIZE));
     report_.LogText(request);
-    std::string_view rest(request);
-    while (!rest.empty()) {
-        const ssize_t sent = send(socket_, rest.data(), rest.size(), MSG_NOSIGNAL);
-        if (sent >= 0)
-            rest.remove_prefix(static_cast<std::size_t>(sent));
-        else if (!MustWait())
-            return Fail("send() error");
-        else if (!Wait(POLLOUT))
-            return Step::Stopped;
-    }
-    return Step::Done;
+    // A new connection takes so little at once.
+    const std::size_t length = std::strlen(request);
+    if (send(socket_, request, length, MSG_NOSIGNAL) != static_cast<ssize_t>(length))
+        return Fail(QuoteNetworkFailure, "send() error");
+    return true;
 }
 
-PlainExchange::Step PlainExchange::Receive(QuoteScanner& scanner) {
+bool PlainExchange::Receive(QuoteScanner& scanner) {
     char buffer[BufferSize];
     for (;;) {
+        if (!Wait(POLLIN))
+            return false;
         const ssize_t received = recv(socket_, buffer, sizeof buffer, 0);
-        if (received < 0 && MustWait()) {
-            if (!Wait(POLLIN))
-                return Step::Stopped;
+        if (received < 0 && errno == EAGAIN)
             continue;
-        }
         if (received < 0)
-            return Fail("recv() error");
-        if (received == 0) {
+            Fail(NoQuote, "recv() error");
+        else if (received == 0)
             report_.LogText("received zero bytes\n");
-            return Step::Failed;
-        }
+        if (received <= 0)
+            return true;
         const std::string_view piece(buffer, static_cast<std::size_t>(received));
         report_.Observer().PieceReceived(piece);
         if (scanner.Scan(piece))
-            return Step::Done;
-        if (IsStoppedMeanwhile())
-            return Step::Stopped;
+            return true;
     }
+}
+
+} // namespace
+
+float AskPlainly(const HostField& host, const char* path, QuoteScanner& scanner, const QuoteContext& context,
+                 QuoteReport& report) {
+    return PlainExchange(context, report).Ask(host, path, scanner);
 }

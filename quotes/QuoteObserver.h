@@ -10,9 +10,6 @@ struct QuoteSource;
 // what is passed is borrowed for that call alone. Page text is as the server sent it: any bytes.
 class QuoteObserver {
   public:
-    QuoteObserver() = default;
-    QuoteObserver(const QuoteObserver&) = delete;
-    QuoteObserver& operator=(const QuoteObserver&) = delete;
     virtual ~QuoteObserver() = default;
 
     // A source is about to be asked; its path ends with the ticker.

@@ -2,37 +2,17 @@
 
 #include <string>
 
-#include "quotes/HostField.h"
-#include "quotes/HostLookup.h"
-#include "quotes/PlainExchange.h"
+#include "quotes/Exchange.h"
+#include "quotes/Host.h"
 #include "quotes/QuoteReport.h"
 #include "quotes/QuoteScanner.h"
 #include "quotes/QuoteSource.h"
 #include "quotes/StopSignal.h"
-#include "quotes/TlsExchange.h"
 #include "util/WholeFile.h"
 
 namespace {
 
 constexpr std::size_t MaxSourceFileSize = 16'000'000;
-
-float AskSource(const char* host, const char* path, const char* tag, int skip, const QuoteContext& context,
-                QuoteReport& report) {
-    report.LogText("In GetQuote\n");
-    if (IsStopped(context.stopFd))
-        return QuoteCancelled;
-    HostField server;
-    if (!ParseHostField(host, &server)) {
-        const char* reason = "the host is none of NAME, NAME:PORT and https://NAME[:PORT]";
-        report.Log("'%s': %s\n", host, reason);
-        report.Observer().Failed(reason);
-        return NoQuote;
-    }
-    QuoteScanner scanner(tag, skip, report);
-    if (server.tls)
-        return AskOverTls(server, path, scanner, context, report);
-    return PlainExchange(context, report).Ask(server, path, scanner);
-}
 
 // Null, or why the line cannot be used for this ticker.
 const char* PrepareSource(const QuoteSourceReader& reader, const char* ticker, QuoteSource* source) {
@@ -43,9 +23,9 @@ const char* PrepareSource(const QuoteSourceReader& reader, const char* ticker, Q
 }
 
 float AskForTicker(const QuoteSource& source, const QuoteContext& context, QuoteReport& report) {
-    report.Log("Checking '%s%s'\n", source.host, source.path);
+    report.Log(std::string("Checking '") + source.host + source.path + "'\n");
     report.Observer().SourceTried(source);
-    const float result = AskSource(source.host, source.path, source.tag, source.skip, context, report);
+    const float result = GetQuote(source.host, source.path, source.tag, source.skip, context);
     report.Observer().SourceAnswered(result);
     if (result > 0)
         report.LogNumber("Price = ", result);
@@ -58,9 +38,21 @@ bool EndsTheSearch(float result) {
     return result > 0 || result == QuoteSearchEnded || result == QuoteCancelled;
 }
 
-float SearchSources(std::string_view sources, const char* ticker, const QuoteContext& context,
-                    QuoteReport& report) {
+} // namespace
+
+float GetPriceQuote(const char* ticker, const QuoteContext& context) {
+    std::string sources;
+    if (ReadWholeFile(context.sourcePath, sources, MaxSourceFileSize))
+        return GetPriceQuoteFrom(sources, ticker, context);
+    QuoteReport report(context.logPath, context.observer);
+    report.Log(std::string("Unable to open '") + context.sourcePath + "'\n");
+    report.Observer().Failed((std::string("the file ") + context.sourcePath + " cannot be read").c_str());
+    return NoQuoteSources;
+}
+
+float GetPriceQuoteFrom(std::string_view sources, const char* ticker, const QuoteContext& context) {
     using Line = QuoteSourceReader::Line;
+    QuoteReport report(context.logPath, context.observer);
     QuoteSourceReader reader(sources);
     float result = NoQuote;
     bool anySource = false;
@@ -76,7 +68,7 @@ float SearchSources(std::string_view sources, const char* ticker, const QuoteCon
         anySource = true;
         QuoteSource source;
         if (const char* problem = PrepareSource(reader, ticker, &source)) {
-            report.Log("Skipped line %d: %s\n", reader.LineNumber(), problem);
+            report.Log("Skipped line " + std::to_string(reader.LineNumber()) + ": " + problem + "\n");
             report.Observer().SourceSkipped(reader.LineNumber(), problem);
             continue;
         }
@@ -87,27 +79,22 @@ float SearchSources(std::string_view sources, const char* ticker, const QuoteCon
     return result;
 }
 
-} // namespace
-
-float GetPriceQuote(const char* ticker, const QuoteContext& context) {
-    QuoteReport report(context.log, context.observer);
-    std::string sources;
-    if (!ReadWholeFile(context.sourcePath, sources, MaxSourceFileSize)) {
-        report.Log("Unable to open '%s'\n", context.sourcePath);
-        report.Observer().Failed((std::string("the file ") + context.sourcePath + " cannot be read").c_str());
-        return NoQuoteSources;
-    }
-    return SearchSources(sources, ticker, context, report);
-}
-
-float GetPriceQuoteFrom(std::string_view sources, const char* ticker, const QuoteContext& context) {
-    QuoteReport report(context.log, context.observer);
-    return SearchSources(sources, ticker, context, report);
-}
-
 float GetQuote(const char* host, const char* path, const char* tag, int skip, const QuoteContext& context) {
-    QuoteReport report(context.log, context.observer);
-    return AskSource(host, path, tag, skip, context, report);
+    QuoteReport report(context.logPath, context.observer);
+    report.LogText("In GetQuote\n");
+    if (IsStopped(context.stopFd))
+        return QuoteCancelled;
+    HostField server;
+    if (!ParseHostField(host, &server)) {
+        const char* reason = "the host is none of NAME, NAME:PORT and https://NAME[:PORT]";
+        report.Log(std::string("'") + host + "': " + reason + "\n");
+        report.Observer().Failed(reason);
+        return NoQuote;
+    }
+    QuoteScanner scanner(tag, skip, report);
+    if (server.tls)
+        return AskOverTls(server, path, scanner, context, report);
+    return AskPlainly(server, path, scanner, context, report);
 }
 
 bool IsConnected(const char* hostName, int stopFd) {

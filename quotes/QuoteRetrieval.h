@@ -3,8 +3,6 @@
 #include <limits>
 #include <string_view>
 
-class GatheredLog;
-class LastConnection;
 class QuoteObserver;
 
 // The look-up of a share's price on the web pages that the quote-source file lists (doc/quote-sources.md). It
@@ -23,11 +21,10 @@ inline constexpr float QuoteCancelled = -std::numeric_limits<float>::infinity();
 // What a look-up works with. Everything is borrowed for the call.
 struct QuoteContext {
     const char* sourcePath = "";       // the quote-source file
-    GatheredLog* log = nullptr;        // the debug log, which the caller writes afterwards; null for none
+    const char* logPath = nullptr;     // the debug log; null for none
     int stopFd = -1;                   // once readable, the call returns at once; -1 for never
     const char* caFile = nullptr;      // certificates to trust in place of the system's, as a PEM file
     QuoteObserver* observer = nullptr; // is told what is done and found
-    LastConnection* lastConnection = nullptr; // for a run of look-ups, to save time between them
 };
 
 // The price of the ticker from the first source that knows one, in the file's order, or a status. Every step

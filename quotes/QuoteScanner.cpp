@@ -1,16 +1,55 @@
 #include "quotes/QuoteScanner.h"
 
 #include <algorithm>
+#include <climits>
 #include <cmath>
+#include <cstdlib>
 #include <limits>
+#include <optional>
 
-#include "quotes/Fraction.h"
 #include "quotes/QuoteReport.h"
 #include "quotes/QuoteRetrieval.h"
 #include "quotes/Tokens.h"
 #include "util/Numbers.h"
+#include "util/Strings.h"
 
 namespace {
+
+constexpr double Malformed = -1;
+
+// The integer at the start of the token, 0 when there is none.
+int LeadingInteger(std::string_view token) {
+    const long value = std::strtol(std::string(token).c_str(), nullptr, 10);
+    return static_cast<int>(std::clamp<long>(value, INT_MIN, INT_MAX));
+}
+
+// `otherwise` when a number is missing, or the divisor is 0.
+double Quotient(std::optional<std::string_view> numerator, std::optional<std::string_view> denominator,
+                double otherwise) {
+    const int divisor = numerator && denominator ? LeadingInteger(*denominator) : 0;
+    return divisor == 0 ? otherwise : static_cast<double>(LeadingInteger(*numerator)) / divisor;
+}
+
+// The token inside the mark-up that `mark` opens: the next one behind the first ">" after it. Moves `text` to
+// behind that token.
+std::optional<std::string_view> MarkedToken(std::string_view& text, std::string_view mark) {
+    const std::size_t start = text.find(mark);
+    const std::size_t bracket = start == text.npos ? text.npos : text.find('>', start);
+    if (bracket == text.npos)
+        return std::nullopt;
+    text.remove_prefix(bracket + 1);
+    return TakeToken(text, " <");
+}
+
+double MarkedFraction(std::string_view text) {
+    const auto numerator = MarkedToken(text, "sup");
+    return Quotient(numerator, MarkedToken(text, "sub"), Malformed);
+}
+
+double PlainFraction(std::string_view text) {
+    const auto numerator = TakeToken(text, " /");
+    return Quotient(numerator, TakeToken(text, " <>"), 0);
+}
 
 // The sum as a price; NoQuote when no float holds it.
 float PriceOf(double whole, double fraction) {
@@ -20,6 +59,12 @@ float PriceOf(double whole, double fraction) {
 }
 
 } // namespace
+
+double LookForFraction(char* text) {
+    strlwr(text);
+    const std::string_view lowered(text);
+    return lowered.find("sup") != lowered.npos ? MarkedFraction(lowered) : PlainFraction(lowered);
+}
 
 QuoteScanner::QuoteScanner(std::string_view tag, int skip, QuoteReport& report)
     : report_(report), tag_(tag), remaining_(skip), price_(NoQuote) {}
@@ -66,7 +111,7 @@ bool QuoteScanner::PassBrackets(std::string_view& rest) {
 
 void QuoteScanner::ReadPrice(std::string_view token, std::string_view following) {
     const std::string text(token);
-    report_.Log("value string is '%s'\n", text.c_str());
+    report_.Log(std::string("value string is '") + text.c_str() + "'\n");
     double whole = 0;
     const bool readable = ReadDecimal(text.c_str(), &whole);
     std::string rest(following);

@@ -1,9 +1,10 @@
 #include "quotes/QuoteSource.h"
 
 #include <algorithm>
-#include <charconv>
+#include <climits>
+#include <cstdlib>
 #include <cstring>
-#include <limits>
+#include <string>
 
 #include "quotes/Tokens.h"
 #include "util/CharacterBuffer.h"
@@ -30,21 +31,18 @@ const char* TakeField(std::string_view& line, char (&field)[Size], const char* t
 
 // Reads as far as there are digits.
 const char* TakeNumber(std::string_view& line, int* number) {
-    auto word = TakeToken(line, WhiteSpace);
+    const auto word = TakeToken(line, WhiteSpace);
     if (!word)
         return TooFewFields;
-    if (word->size() > 1 && word->front() == '+' && (*word)[1] != '-')
-        word->remove_prefix(1);
-    const auto [end, error] = std::from_chars(word->data(), word->data() + word->size(), *number);
-    if (error == std::errc::result_out_of_range)
-        *number = word->front() == '-' ? std::numeric_limits<int>::min() : std::numeric_limits<int>::max();
-    return error == std::errc::invalid_argument ? "its skip count is no number" : nullptr;
+    const std::string text(*word);
+    char* end = nullptr;
+    const long value = std::strtol(text.c_str(), &end, 10);
+    *number = static_cast<int>(std::clamp<long>(value, INT_MIN, INT_MAX));
+    return end == text.c_str() ? "its skip count is no number" : nullptr;
 }
 
-} // namespace
-
+// Null, or why the line is no source; then `source` holds nothing of use.
 const char* ParseQuoteSource(std::string_view line, QuoteSource* source) {
-    line = line.substr(0, line.find('\0'));
     *source = {};
     const char* problem = TakeField(line, source->label, "its label has more than 31 bytes");
     if (!problem)
@@ -57,6 +55,8 @@ const char* ParseQuoteSource(std::string_view line, QuoteSource* source) {
         problem = TakeNumber(line, &source->skip);
     return problem;
 }
+
+} // namespace
 
 bool AppendTicker(QuoteSource* source, std::string_view ticker) {
     const std::size_t length = std::strlen(source->path);

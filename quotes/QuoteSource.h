@@ -11,16 +11,14 @@ struct QuoteSource {
     int skip = 0;
 };
 
-// Splits a line into the five fields of a source. Null when it is one; otherwise the reason why not (fewer
-// than five fields, one that is too long, or a skip count that is no number), and `source` holds nothing of
-// use. A skip count beyond an int counts as the nearest int; what follows the fifth field is ignored.
-[[nodiscard]] const char* ParseQuoteSource(std::string_view line, QuoteSource* source);
-
 // Puts the ticker right behind the path. False, with nothing changed, when both do not fit together.
 [[nodiscard]] bool AppendTicker(QuoteSource* source, std::string_view ticker);
 
 // Goes through the lines of a quote-source file's content. It opens no file, and borrows the content. A local
 // object of one look-up.
+//
+// A source that cannot be used has fewer than five fields, one that is too long, or a skip count that is no
+// number. A skip count beyond an int counts as the nearest int; what follows the fifth field is ignored.
 class QuoteSourceReader {
   public:
     enum class Line {

@@ -1,11 +1,11 @@
-#include "quotes/TlsExchange.h"
+#include "quotes/Exchange.h"
 
 #include <algorithm>
 #include <curl/curl.h>
 #include <memory>
 #include <string_view>
 
-#include "quotes/HostField.h"
+#include "quotes/Host.h"
 #include "quotes/QuoteReport.h"
 #include "quotes/QuoteRetrieval.h"
 #include "quotes/QuoteScanner.h"
@@ -18,13 +18,6 @@ constexpr long TotalSeconds = 30;
 constexpr long MaxRedirects = 5;
 constexpr std::size_t MaxPageSize = 10'000'000;
 constexpr int WaitMilliseconds = 1000; // the longest the library is left alone with its own timers
-
-struct EndTransfer {
-    void operator()(CURL* transfer) const { curl_easy_cleanup(transfer); }
-};
-struct EndTransfers {
-    void operator()(CURLM* transfers) const { curl_multi_cleanup(transfers); }
-};
 
 // The path as part of an address: what cannot stand there is written as %XX.
 std::string Escaped(std::string_view path) {
@@ -60,27 +53,22 @@ std::size_t TakeBytes(const char* bytes, std::size_t one, std::size_t count, voi
     return count;
 }
 
+// Lives for one page. The system's or the given certificates are trusted.
 class Transfer {
   public:
     Transfer(const std::string& address, const char* caFile);
-    ~Transfer();
     Transfer(const Transfer&) = delete;
     Transfer& operator=(const Transfer&) = delete;
+    ~Transfer() { curl_multi_remove_handle(multi_.get(), easy_.get()); }
 
     // False when the caller shall stop.
     [[nodiscard]] bool Run(int stopFd);
+    [[nodiscard]] CURL* Handle() const { return easy_.get(); }
     [[nodiscard]] CURLcode Result() const { return result_; }
     [[nodiscard]] std::string Problem() const;
-    // Whether there was a connection to be trusted, on which a request goes out at once.
-    [[nodiscard]] bool RequestWasSent() const;
-    // Empty when there was no connection.
-    [[nodiscard]] std::string Server() const;
-    // The host asked last, which is another one after a redirect.
-    [[nodiscard]] std::string LastHost() const;
     [[nodiscard]] const std::string& PageText() const { return page_.text; }
 
   private:
-    void SetUp(const std::string& address, const char* caFile);
     template <class Value>
     void Set(CURLoption option, Value value) {
         if (result_ == CURLE_OK)
@@ -89,25 +77,13 @@ class Transfer {
 
     Page page_;
     char reason_[CURL_ERROR_SIZE] = "";
-    std::unique_ptr<CURL, EndTransfer> easy_;
-    std::unique_ptr<CURLM, EndTransfers> multi_;
+    std::unique_ptr<CURL, decltype(&curl_easy_cleanup)> easy_{curl_easy_init(), curl_easy_cleanup};
+    std::unique_ptr<CURLM, decltype(&curl_multi_cleanup)> multi_{curl_multi_init(), curl_multi_cleanup};
     CURLcode result_ = CURLE_OK;
 };
 
-Transfer::Transfer(const std::string& address, const char* caFile)
-    : easy_(curl_easy_init()), multi_(curl_multi_init()) {
-    if (!easy_ || !multi_)
-        result_ = CURLE_FAILED_INIT;
-    else
-        SetUp(address, caFile);
-}
-
-Transfer::~Transfer() {
-    if (easy_ && multi_)
-        curl_multi_remove_handle(multi_.get(), easy_.get());
-}
-
-void Transfer::SetUp(const std::string& address, const char* caFile) {
+// The library's calls refuse a handle that could not be had.
+Transfer::Transfer(const std::string& address, const char* caFile) {
     Set(CURLOPT_ERRORBUFFER, reason_);
     Set(CURLOPT_URL, address.c_str());
     Set(CURLOPT_USERAGENT, "Quorvan");
@@ -125,7 +101,7 @@ void Transfer::SetUp(const std::string& address, const char* caFile) {
         Set(CURLOPT_CAINFO, caFile);
     Set(CURLOPT_WRITEFUNCTION, &TakeBytes);
     Set(CURLOPT_WRITEDATA, &page_);
-    if (result_ == CURLE_OK && curl_multi_add_handle(multi_.get(), easy_.get()) != CURLM_OK)
+    if (curl_multi_add_handle(multi_.get(), easy_.get()) != CURLM_OK)
         result_ = CURLE_FAILED_INIT;
 }
 
@@ -153,40 +129,38 @@ std::string Transfer::Problem() const {
     return reason_[0] != '\0' ? reason_ : curl_easy_strerror(result_);
 }
 
-bool Transfer::RequestWasSent() const {
-    curl_off_t handshake = 0;
-    curl_easy_getinfo(easy_.get(), CURLINFO_APPCONNECT_TIME_T, &handshake);
-    return handshake > 0;
-}
-
-std::string Transfer::Server() const {
+// Empty when there was no connection.
+std::string Server(CURL* transfer) {
     char* address = nullptr;
     long port = 0;
-    curl_easy_getinfo(easy_.get(), CURLINFO_PRIMARY_IP, &address);
-    curl_easy_getinfo(easy_.get(), CURLINFO_PRIMARY_PORT, &port);
+    curl_easy_getinfo(transfer, CURLINFO_PRIMARY_IP, &address);
+    curl_easy_getinfo(transfer, CURLINFO_PRIMARY_PORT, &port);
     if (!address || *address == '\0')
         return {};
     return std::string(address) + " port " + std::to_string(port);
 }
 
-std::string Transfer::LastHost() const {
+// The host asked last, which is another one after a redirect.
+std::string LastHost(CURL* transfer) {
     const char* address = nullptr;
-    curl_easy_getinfo(easy_.get(), CURLINFO_EFFECTIVE_URL, &address);
+    curl_easy_getinfo(transfer, CURLINFO_EFFECTIVE_URL, &address);
     std::string_view host(address ? address : "");
     host.remove_prefix(std::min(host.size(), std::string_view("https://").size()));
     return std::string(host.substr(0, host.find_first_of(":/?#")));
 }
 
+// Whether there was a connection to be trusted, on which a request goes out at once.
+bool RequestWasSent(CURL* transfer) {
+    curl_off_t handshake = 0;
+    curl_easy_getinfo(transfer, CURLINFO_APPCONNECT_TIME_T, &handshake);
+    return handshake > 0;
+}
+
 // What a transfer that could not ask says about the price.
 float StatusOf(CURLcode result) {
-    switch (result) {
-    case CURLE_COULDNT_RESOLVE_HOST:
-    case CURLE_COULDNT_RESOLVE_PROXY:
-    case CURLE_URL_MALFORMAT:
-        return NoQuote;
-    default:
-        return QuoteNetworkFailure;
-    }
+    const bool nowhere = result == CURLE_COULDNT_RESOLVE_HOST || result == CURLE_COULDNT_RESOLVE_PROXY ||
+                         result == CURLE_URL_MALFORMAT;
+    return nowhere ? NoQuote : QuoteNetworkFailure;
 }
 
 } // namespace
@@ -194,24 +168,23 @@ float StatusOf(CURLcode result) {
 float AskOverTls(const HostField& host, const char* path, QuoteScanner& scanner, const QuoteContext& context,
                  QuoteReport& report) {
     Transfer transfer(Address(host, path), context.caFile);
-    report.Flush();
     if (!transfer.Run(context.stopFd))
         return QuoteCancelled;
-    if (const std::string server = transfer.Server(); !server.empty()) {
-        report.Log("connected to %s\n", server.c_str());
+    if (const std::string server = Server(transfer.Handle()); !server.empty()) {
+        report.Log("connected to " + server + "\n");
         report.Observer().Connected((server + ", TLS").c_str());
     }
     if (transfer.Result() != CURLE_OK) {
-        report.Log("https error: %s\n", transfer.Problem().c_str());
+        report.Log("https error: " + transfer.Problem() + "\n");
         report.Observer().Failed(transfer.Problem().c_str());
         if (transfer.Result() == CURLE_PEER_FAILED_VERIFICATION) {
-            report.Observer().CertificateRefused(transfer.LastHost().c_str());
+            report.Observer().CertificateRefused(LastHost(transfer.Handle()).c_str());
             return QuoteNetworkFailure;
         }
-        if (!transfer.RequestWasSent())
+        if (!RequestWasSent(transfer.Handle()))
             return StatusOf(transfer.Result());
     }
-    report.Log("received %zu bytes\n", transfer.PageText().size());
+    report.Log("received " + std::to_string(transfer.PageText().size()) + " bytes\n");
     report.Observer().PieceReceived(transfer.PageText());
     (void)scanner.Scan(transfer.PageText());
     report.LogNumber("Returning price = ", scanner.Price());

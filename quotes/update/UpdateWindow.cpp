@@ -3,19 +3,11 @@
 #include <utility>
 
 #include "ColumnListView/ColumnListView.h"
-#include "app/model/PortfolioRules.h"
 #include "app/rows/NorvelItem.h"
 #include "app/state/AppState.h"
 #include "app/state/MessageCodes.h"
 #include "platform/Application.h"
 #include "platform/StatusBar.h"
-#include "quotes/QuoteObserver.h"
-#include "quotes/QuoteRetrieval.h"
-#include "quotes/run/PriceUpdate.h"
-#include "util/CharacterBuffer.h"
-#include "util/Numbers.h"
-#include "util/Strings.h"
-#include "util/WholeFile.h"
 #include "util/interface/InterfaceHelpers.h"
 
 namespace {
@@ -24,29 +16,16 @@ constexpr const char* MainWindowTitle = "Quorvan";
 constexpr float Width = 200;
 constexpr float Height = 60;
 constexpr float Margin = 10;
-constexpr std::size_t MaxSources = 1'000'000;
 constexpr bigtime_t LockPatience = 20'000; // microseconds between looks at the stop request
 
-std::vector<int32> RecordNumbers(const ColumnListView* list) {
+std::vector<long> RecordNumbers(const ColumnListView* list) {
     const bool all = list->CurrentSelection() < 0;
-    std::vector<int32> numbers;
+    std::vector<long> numbers;
     for (int32 i = 0; i < list->CountItems(); ++i)
         if (all || list->IsItemSelected(i))
             numbers.push_back(static_cast<const NorvelItem*>(list->ItemAt(i))->RecordNumber());
     return numbers;
 }
-
-// Remembers whether the source asked last was one that cannot be trusted.
-class RefusedCertificate : public QuoteObserver {
-  public:
-    void SourceTried(const QuoteSource& /*source*/) override { host_.clear(); }
-    void CertificateRefused(const char* host) override { host_ = host; }
-    // Empty for no.
-    [[nodiscard]] const std::string& Host() const { return host_; }
-
-  private:
-    std::string host_;
-};
 
 } // namespace
 
@@ -57,8 +36,7 @@ UpdateWindow::UpdateWindow(BPoint leftTop, const char* portfolioName, DATABASE* 
               B_NOT_RESIZABLE | B_NOT_ZOOMABLE | B_WILL_ACCEPT_FIRST_CLICK),
       recordNumbers_(RecordNumbers(list)),
       database_(database),
-      portfolioName_(portfolioName),
-      log_(app_state->logPath) {
+      portfolioName_(portfolioName) {
     if (const BWindow* mainWindow = GetAppWindow(be_app, MainWindowTitle))
         mainWindow_ = BMessenger(mainWindow);
     AddStatusBar(static_cast<float>(recordNumbers_.size()) + 1);
@@ -116,88 +94,43 @@ bool UpdateWindow::QuitRequested() {
 
 int32 UpdateWindow::updateThread(void* window) {
     auto* self = static_cast<UpdateWindow*>(window);
-    self->UpdateAll();
+    QuoteContext context;
+    context.sourcePath = app_state->quoteSourcePath;
+    context.logPath = app_state->logPath;
+    context.stopFd = thread_stop_fd();
+    self->isOnDisk_ = PriceRun(*self->database_, context, *self).Run(self->recordNumbers_);
     self->TellMainWindow(thread_stop_requested());
     self->ended_ = true;
     self->PostMessage(B_QUIT_REQUESTED);
     return 0;
 }
 
-void UpdateWindow::UpdateAll() {
-    // Whatever is wrong with the file, GetPriceQuote tells.
-    static_cast<void>(ReadWholeFile(app_state->quoteSourcePath, sources_, MaxSources));
-    for (const int32 recordNumber : recordNumbers_)
-        if (thread_stop_requested() || !UpdateOne(recordNumber))
-            break;
-    lastConnection_.Close();
-    log_.Write();
-    isOnDisk_ = database_->Sync() == 0;
+void UpdateWindow::Asking(const std::string& ticker) {
+    if (!LockUnlessStopped())
+        return;
+    statusBar_->SetText((" " + ticker).c_str());
+    Unlock();
 }
 
-bool UpdateWindow::UpdateOne(int32 recordNumber) {
-    INVESTMENT_DATA record;
-    if (!ReadInvestment(*database_, recordNumber, &record)) {
-        log_.Add("Database Read() error -1\n");
-        return false;
-    }
-    const std::string ticker(FieldText(record.Ticker));
-    // Without a ticker a page could only give the price of something else.
-    if (IsBlank(ticker)) {
-        log_.Add("No ticker for '" + std::string(FieldText(record.Name)) + "'\n");
-        ShowProgress();
-        return true;
-    }
-    log_.Add("Checking price for '" + ticker + "'\n");
-    ShowTicker(ticker.c_str());
-    RefusedCertificate refused;
-    QuoteContext context;
-    context.observer = &refused;
-    context.sourcePath = app_state->quoteSourcePath;
-    context.log = &log_;
-    context.lastConnection = &lastConnection_;
-    context.stopFd = thread_stop_fd();
-    const float quote = sources_.empty() ? GetPriceQuote(ticker.c_str(), context)
-                                         : GetPriceQuoteFrom(sources_, ticker.c_str(), context);
-    // Whatever a call that was cut short answers, it says nothing about the price.
-    if (thread_stop_requested())
-        return false;
-    char number[64];
-    FormatFixed(quote, number, sizeof number, 2);
-    log_.Add(std::string("GetPriceQuote() returned ") + number + "\n");
-    if (!Apply(quote, refused.Host().c_str(), recordNumber, &record))
-        return false;
-    ShowProgress();
-    return true;
-}
-
-bool UpdateWindow::Apply(float quote, const char* refused, int32 recordNumber, INVESTMENT_DATA* record) {
-    if (ApplyQuote(*record, quote) == QuoteOutcome::Failed) {
-        log_.Write();
-        if (*refused == '\0')
+void UpdateWindow::Done(const PriceRunResult& result) {
+    switch (result.outcome) {
+    case QuoteOutcome::NotRead:
+        break;
+    case QuoteOutcome::NotSaved:
+        TellNotSaved();
+        break;
+    case QuoteOutcome::Failed:
+        if (result.refusedHost.empty())
             TellNotConnected();
         else
-            TellNotTrusted(refused);
-        return false;
+            TellNotTrusted(result.refusedHost.c_str());
+        break;
+    default:
+        if (LockUnlessStopped()) {
+            statusBar_->Update(1);
+            Unlock();
+        }
     }
-    if (database_->Write(recordNumber, record) != 0) {
-        TellNotSaved();
-        return false;
-    }
-    return true;
-}
-
-void UpdateWindow::ShowTicker(const char* ticker) {
-    if (!LockUnlessStopped())
-        return;
-    statusBar_->SetText((std::string(" ") + ticker).c_str());
-    Unlock();
-}
-
-void UpdateWindow::ShowProgress() {
-    if (!LockUnlessStopped())
-        return;
-    statusBar_->Update(1);
-    Unlock();
 }
 
 bool UpdateWindow::LockUnlessStopped() {

@@ -4,26 +4,23 @@
 #include <string>
 #include <vector>
 
-#include "app/model/RecordLayouts.h"
 #include "platform/Kernel.h"
 #include "platform/Message.h"
 #include "platform/Window.h"
-#include "quotes/LastConnection.h"
-#include "util/GatheredLog.h"
+#include "quotes/run/PriceRun.h"
 
 class BStatusBar;
 class ColumnListView;
-class DATABASE;
 
 // Brings the prices of a portfolio's investments up to date, one after another on a worker thread, and shows
 // how far it has come. At the end it asks the main window to show the portfolio anew, and goes. Closing it
 // cancels what remains: an investment in hand is then wholly updated or as it was.
 //
 // The caller creates it with new on the interface thread and keeps no pointer to it; it deletes itself. It
-// does not fetch quotes itself (GetPriceQuote does) and looks at the list no more once it is built. While it
+// does not touch the records itself (PriceRun does) and looks at the list no more once it is built. While it
 // is there the person can do nothing else in the program, and the worker has the investment file to itself:
 // the database must outlive the window, and app_state both.
-class UpdateWindow : public BWindow {
+class UpdateWindow : public BWindow, private PriceRunObserver {
   public:
     // Builds and shows the window with its left top corner at the given place of the screen, and starts on
     // the list's selected rows, or all of them when none is selected. The rows are NorvelItems. An investment
@@ -46,15 +43,8 @@ class UpdateWindow : public BWindow {
     void StartWorker();
 
     // --- on the worker ---
-    // Goes through the investments until one cannot be asked for, or the worker is stopped.
-    void UpdateAll();
-    // False when the run ends with this investment.
-    [[nodiscard]] bool UpdateOne(int32 recordNumber);
-    // False when the run ends with what came back. `refused` names the server that could not be trusted, if
-    // the last one asked was such.
-    [[nodiscard]] bool Apply(float quote, const char* refused, int32 recordNumber, INVESTMENT_DATA* record);
-    void ShowTicker(const char* ticker);
-    void ShowProgress();
+    void Asking(const std::string& ticker) override;
+    void Done(const PriceRunResult& result) override;
     // False, without the lock, when the worker is to stop: then the window may be going, and its lock would
     // never come.
     [[nodiscard]] bool LockUnlessStopped();
@@ -64,14 +54,11 @@ class UpdateWindow : public BWindow {
 
     BStatusBar* statusBar_ = nullptr; // the window's
     thread_id worker_ = -1;
-    std::vector<int32> recordNumbers_; // of the investments to be asked for, in the list's order
+    std::vector<long> recordNumbers_; // of the investments to be asked for, in the list's order
     DATABASE* database_;
     std::string portfolioName_;
-    LastConnection lastConnection_; // the worker's
-    GatheredLog log_;               // the worker's
-    bool isOnDisk_ = true;          // what the worker wrote; to be looked at when that has ended
+    bool isOnDisk_ = true; // what the worker wrote; to be looked at when that has ended
     std::atomic<bool> ended_ = false;
     bool isWaiting_ = false; // for the worker's end; what comes meanwhile must not delete the window
-    std::string sources_;    // the quote-source file, read once for the run; empty when it cannot be
     BMessenger mainWindow_;  // found at the start, on the thread on which windows come and go
 };

@@ -15,7 +15,7 @@
 #include "quotes/LoopbackServer.h"
 #include "quotes/QuoteRetrieval.h"
 #include "quotes/TlsServer.h"
-#include "quotes/run/PriceUpdate.h"
+#include "quotes/run/PriceRun.h"
 
 namespace {
 

@@ -26,7 +26,6 @@ struct Reply {
     };
     std::vector<std::string> pieces; // each in a send of its own
     End end = End::Close;
-    bool inStep = false; // send each piece only when the test has called Taken for all before it
 };
 
 // A listening or merely reserved TCP socket on 127.0.0.1.
@@ -96,31 +95,25 @@ class LoopbackServer {
     }
 
     [[nodiscard]] std::uint16_t Port() const { return socket_.Port(); }
-    // As a quote source's host field.
     [[nodiscard]] std::string Host() const { return socket_.Host(); }
 
     [[nodiscard]] std::vector<std::string> Requests() const {
         const std::lock_guard lock(mutex_);
         return requests_;
     }
-    // False when not as many requests came, and connections ended on both sides, within ten seconds.
-    [[nodiscard]] bool WaitFor(std::size_t requests, std::size_t ends = 0) const {
+    // False when not as many requests came within ten seconds.
+    [[nodiscard]] bool WaitFor(std::size_t requests) const {
         std::unique_lock lock(mutex_);
         return changed_.wait_for(lock, std::chrono::seconds(10),
-                                 [&] { return requests_.size() >= requests && ends_ >= ends; });
+                                 [&] { return requests_.size() >= requests; });
     }
     // Lets the connection held at present be closed.
     void Release() {
         Change([this] { shutdown(connection_, SHUT_RD); });
     }
-    // For replies in step: the client has taken this many bytes.
-    void Taken(std::size_t bytes) {
-        Change([this, bytes] { taken_ += bytes; });
-    }
 
   private:
-    template <class Work>
-    void Change(Work work) {
+    void Change(const std::function<void()>& work) {
         const std::lock_guard lock(mutex_);
         work();
         changed_.notify_all();
@@ -138,10 +131,7 @@ class LoopbackServer {
             });
             if (!stopped)
                 Serve(*makeStream_(fd));
-            Change([&] {
-                close(std::exchange(connection_, -1));
-                ++ends_;
-            });
+            Change([&] { close(std::exchange(connection_, -1)); });
         }
     }
 
@@ -155,29 +145,11 @@ class LoopbackServer {
             request.append(bytes, static_cast<std::size_t>(got));
         }
         const Reply reply = answer_(request);
-        Change([&] {
-            requests_.push_back(request);
-            taken_ = 0;
-        });
-        if (Send(stream, reply))
-            End(stream, reply);
-    }
-
-    bool Send(ServerStream& stream, const Reply& reply) {
-        std::size_t sent = 0;
-        for (const std::string& piece : reply.pieces) {
-            if (std::unique_lock lock(mutex_); reply.inStep)
-                changed_.wait(lock, [&] { return stopping_ || taken_ >= sent; });
+        Change([&] { requests_.push_back(request); });
+        for (const std::string& piece : reply.pieces)
             if (stream.Write(piece) <= 0)
-                return false;
-            sent += piece.size();
-        }
-        return true;
-    }
-
-    void End(ServerStream& stream, const Reply& reply) {
-        char unused[1024];
-        while (reply.end == Reply::End::Hold && stream.Read(unused, sizeof unused) > 0) {
+                return;
+        while (reply.end == Reply::End::Hold && stream.Read(bytes, sizeof bytes) > 0) {
         }
         while (reply.end == Reply::End::Endless && stream.Write(reply.pieces.back()) > 0) {
         }
@@ -195,7 +167,6 @@ class LoopbackServer {
     mutable std::condition_variable changed_;
     std::vector<std::string> requests_;
     int connection_ = -1;
-    std::size_t ends_ = 0, taken_ = 0;
     bool stopping_ = false;
     std::thread thread_; // last, since it uses all of the above
 };

@@ -24,13 +24,10 @@ class TlsIdentity {
                                    -1, -1, 0);
         X509_set_issuer_name(certificate.get(), name);
         X509_set_pubkey(certificate.get(), key.get());
-        for (const auto& [kind, value] :
-             {std::pair<int, std::string>{NID_basic_constraints, "critical,CA:TRUE"},
-              {NID_subject_alt_name, names}}) {
-            X509_EXTENSION* extension = X509V3_EXT_conf_nid(nullptr, nullptr, kind, value.c_str());
-            X509_add_ext(certificate.get(), extension, -1);
-            X509_EXTENSION_free(extension);
-        }
+        X509_EXTENSION* extension =
+            X509V3_EXT_conf_nid(nullptr, nullptr, NID_subject_alt_name, names.c_str());
+        X509_add_ext(certificate.get(), extension, -1);
+        X509_EXTENSION_free(extension);
         X509_sign(certificate.get(), key.get(), EVP_sha256());
         SSL_CTX_use_certificate(context_.get(), certificate.get());
         SSL_CTX_use_PrivateKey(context_.get(), key.get());
