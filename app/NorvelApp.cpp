@@ -18,7 +18,7 @@
 #include "resources/DesktopFiles.h"
 #include "resources/StatusImages.h"
 #include "util/CharacterBuffer.h"
-#include "util/FolderProbe.h"
+#include "util/File.h"
 #include "util/IniFile.h"
 #include "util/Strings.h"
 #include "util/interface/InterfaceHelpers.h"
@@ -26,6 +26,7 @@
 namespace {
 
 constexpr const char* Signature = "application/x-vnd.Palandri-Quorvan";
+constexpr const char* Program = "quorvan"; // as a lock names it
 
 struct StatusBitmap {
     BBitmap** global;
@@ -60,6 +61,14 @@ void KeepRowMemory() {
     constexpr int keptBytes = 64 * 1024 * 1024;
     mallopt(M_TOP_PAD, keptBytes);
     mallopt(M_TRIM_THRESHOLD, keptBytes);
+}
+
+// Whether the person says that the program has ended which the folder's lock names.
+bool HasEnded(const FolderLock& lock, const std::string& folder) {
+    const std::string question = "The folder " + folder + " was in use by " + DescribeHolder(lock.Holder()) +
+                                 ", and it cannot be seen from here whether it still is. Two programs that "
+                                 "change the same files damage them.\n\nHas that program ended?";
+    return !YesNoBox(question.c_str());
 }
 
 } // namespace
@@ -132,15 +141,17 @@ bool NorvelApp::BuildPaths() {
 }
 
 bool NorvelApp::EnterFolders(std::string& complaints) {
-    const std::vector<std::string> folders =
-        FoldersOf(state_.homeFolder, DailyBackup::FilesKeptWith("invest.db"));
-    return std::all_of(folders.begin(), folders.end(),
-                       [&](const std::string& folder) { return EnterFolder(folder, complaints); });
+    return TakeFolders(
+        locks_, state_.homeFolder, DailyBackup::FilesKeptWith("invest.db"), Program,
+        [&](FolderLock& lock, const std::string& folder, FolderLock::Outcome outcome) {
+            return EnterFolder(lock, folder, outcome, complaints);
+        });
 }
 
-bool NorvelApp::EnterFolder(const std::string& folder, std::string& complaints) {
-    FolderLock& lock = locks_.emplace_back();
-    const FolderLock::Outcome outcome = TakeLock(lock, folder);
+bool NorvelApp::EnterFolder(FolderLock& lock, const std::string& folder, FolderLock::Outcome outcome,
+                            std::string& complaints) {
+    if (outcome == FolderLock::Outcome::Doubtful && HasEnded(lock, folder))
+        outcome = lock.Take(folder, Program, FolderLock::Doubt::PassOver);
     if (outcome == FolderLock::Outcome::Held)
         MessageBox(("Quorvan cannot start: its folder " + folder + " is in use by " +
                     DescribeHolder(lock.Holder()) + ". Please close that program first.")
@@ -160,17 +171,6 @@ bool NorvelApp::EnterFolder(const std::string& folder, std::string& complaints) 
         complaints += "The disk of the folder " + folder +
                       " is full. Please make room: until then changes may not be kept.\n";
     return true;
-}
-
-FolderLock::Outcome NorvelApp::TakeLock(FolderLock& lock, const std::string& folder) {
-    constexpr const char* program = "quorvan";
-    FolderLock::Outcome outcome = lock.Take(folder, program);
-    if (outcome != FolderLock::Outcome::Doubtful)
-        return outcome;
-    const std::string question = "The folder " + folder + " was in use by " + DescribeHolder(lock.Holder()) +
-                                 ", and it cannot be seen from here whether it still is. Two programs that "
-                                 "change the same files damage them.\n\nHas that program ended?";
-    return YesNoBox(question.c_str()) ? outcome : lock.Take(folder, program, FolderLock::Doubt::PassOver);
 }
 
 void NorvelApp::PrepareBackup() {

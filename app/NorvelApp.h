@@ -6,9 +6,8 @@
 #include <optional>
 #include <string>
 
-#include "app/model/BackedUpFiles.h"
 #include "app/model/DailyBackup.h"
-#include "app/model/ReadOnlyFiles.h"
+#include "app/model/DataFileOpening.h"
 #include "app/state/AppState.h"
 #include "platform/Application.h"
 #include "platform/Bitmap.h"
@@ -24,7 +23,7 @@
 class NorvelApp : public BApplication {
   public:
     // It says where the manual is, since Help shows nothing where there is no browser.
-    static constexpr const char* AboutText = "Quorvan version 1.0\n\nThe manual is the file "
+    static constexpr const char* AboutText = "Quorvan version " QUORVAN_VERSION "\n\nThe manual is the file "
                                              "help/Quorvan.html in your Quorvan folder. Help opens it in "
                                              "your web browser.";
 
@@ -49,8 +48,8 @@ class NorvelApp : public BApplication {
     // Takes the home folder for this program, and those in which data files lie that are links in it. When
     // one of them cannot be written, lookOnly_ is set.
     [[nodiscard]] bool EnterFolders(std::string& complaints);
-    [[nodiscard]] bool EnterFolder(const std::string& folder, std::string& complaints);
-    [[nodiscard]] static FolderLock::Outcome TakeLock(FolderLock& lock, const std::string& folder);
+    [[nodiscard]] bool EnterFolder(FolderLock& lock, const std::string& folder, FolderLock::Outcome outcome,
+                                   std::string& complaints);
     void OpenDatabases(std::string& complaints);
     void PrepareBackup();
     void RestoreCut(std::string& complaints);

@@ -19,8 +19,6 @@
 
 namespace {
 
-constexpr const char* WindowTitle = "Quorvan"; // the price update finds the window by it
-
 constexpr float LeastSize = 200;
 constexpr float GreatestSize = 10000;
 constexpr float ScrollBarSpace = 14;

@@ -33,13 +33,10 @@ void Preset(CHART_DATA_SET& set, const char* const (&labels)[Size]) {
 }
 
 std::size_t CategoryOf(std::string_view type) {
-    const std::string text(type);
-    char lower[NameSize];
-    CopyText(lower, text);
-    strlwr(lower);
-    if (std::strstr(lower, "fund"))
+    const std::string lowered = Lowered(type);
+    if (lowered.find("fund") != lowered.npos)
         return 0;
-    return std::strstr(lower, "stock") ? 1 : 2;
+    return lowered.find("stock") != lowered.npos ? 1 : 2;
 }
 
 } // namespace

@@ -2,7 +2,7 @@
 
 #include <string>
 
-#include "db/File.h"
+#include "util/File.h"
 
 /// The files that take part in a compaction (DATABASE::Compress).
 struct COMPACTION_PATHS {

@@ -6,7 +6,6 @@
 #include <string_view>
 
 #include "db/LittleEndian.h"
-#include "util/LoweredText.h"
 #include "util/Strings.h"
 
 namespace {

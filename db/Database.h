@@ -10,9 +10,9 @@
 #include "db/DatesTimes.h"
 #include "db/Errors.h"
 #include "db/FieldChange.h"
-#include "db/File.h"
 #include "db/ReadCache.h"
 #include "db/RecordTypes.h"
+#include "util/File.h"
 #include "util/Paths.h"
 
 /// How a query works on the result set that is there.

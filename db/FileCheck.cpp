@@ -268,9 +268,7 @@ int FileCheck::WriteBackup(const File& file, const std::string& path, std::strin
     }
     if (error != 0)
         return error;
-    error = CopyTo(copy, file);
-    error = error != 0 ? error : copy.TakeOwnerForCopy(file);
-    error = error != 0 ? error : copy.Sync();
+    error = copy.CopyFrom(file);
     error = error != 0 ? error : SyncFolderOf(operations_, name);
     if (error != 0) {
         static_cast<void>(RemoveFile(operations_, name)); // half a copy is of no use to anybody
@@ -278,17 +276,6 @@ int FileCheck::WriteBackup(const File& file, const std::string& path, std::strin
     }
     *backup = name;
     return 0;
-}
-
-int FileCheck::CopyTo(File& copy, const File& file) const {
-    std::vector<std::uint8_t> block(BlockBytes);
-    int error = 0;
-    for (std::int64_t at = 0; at < length_ && error == 0; at += static_cast<std::int64_t>(BlockBytes)) {
-        const auto size = static_cast<std::size_t>(std::min<std::int64_t>(BlockBytes, length_ - at));
-        error = file.ReadAt(at, block.data(), size);
-        error = error != 0 ? error : copy.WriteAt(at, block.data(), size);
-    }
-    return error;
 }
 
 // Writes the counts of header_ over those in the file; the texts of the header stay as they are.

@@ -5,7 +5,7 @@
 #include <vector>
 
 #include "db/DataFile.h"
-#include "db/File.h"
+#include "util/File.h"
 
 /// Something that a check noticed about a data file.
 struct FILE_FINDING {
@@ -65,7 +65,6 @@ class FileCheck {
     void Add(FILE_FINDING finding);
     void Forget();
     [[nodiscard]] int WriteBackup(const File& file, const std::string& path, std::string* backup);
-    [[nodiscard]] int CopyTo(File& copy, const File& file) const;
     [[nodiscard]] int WriteCounts(File& file) const;
 
     FileOperations& operations_;

@@ -4,7 +4,7 @@
 #include <memory>
 
 #include "db/DataFile.h"
-#include "db/File.h"
+#include "util/File.h"
 
 /// A range of consecutive whole records held in memory, status bytes included. It reads ahead: a whole buffer
 /// at first and while records are asked for in order (up or down), a little when they are asked for here and

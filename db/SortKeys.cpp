@@ -10,7 +10,7 @@
 
 #include "db/Allocate.h"
 #include "db/LittleEndian.h"
-#include "util/LoweredText.h"
+#include "util/Strings.h"
 
 namespace {
 

@@ -8,26 +8,19 @@
 #include <limits>
 #include <string_view>
 
+#include "util/CharacterBuffer.h"
 #include "util/Numbers.h"
+#include "util/Strings.h"
 
 namespace {
 
 constexpr const char* Delimiters = " \t\n\r";
 constexpr const char* ValueDelimiters = "\t\n\r";
 
-// Takes the next token off `rest`, the delimiter that ended it included.
-bool TakeToken(std::string_view* rest, const char* delimiters, char (&token)[TokenSize]) {
-    std::size_t begin = rest->find_first_not_of(delimiters);
-    if (begin == std::string_view::npos)
-        return false;
-    std::size_t end = rest->find_first_of(delimiters, begin);
-    std::string_view text = rest->substr(begin, end == std::string_view::npos ? end : end - begin);
-    if (text.size() >= TokenSize)
-        return false;
-    text.copy(token, text.size());
-    token[text.size()] = '\0';
-    *rest = end == std::string_view::npos ? std::string_view() : rest->substr(end + 1);
-    return true;
+// Copies the next token off `rest`; false without one that fits.
+bool TakeInto(char (&token)[TokenSize], std::string_view& rest, std::string_view delimiters) {
+    const auto text = TakeToken(rest, delimiters);
+    return text && CopyText(token, *text);
 }
 
 // Reads numbers of fixed widths that stand one after the other; those after the first that is missing are 0.
@@ -46,8 +39,8 @@ bool SplitStatement(const char* statement, STATEMENT* result) {
     if (statement == nullptr)
         return false;
     std::string_view rest(statement, strnlen(statement, LongestStatement + 1));
-    return rest.size() <= LongestStatement && TakeToken(&rest, Delimiters, result->column) &&
-           TakeToken(&rest, Delimiters, result->op) && TakeToken(&rest, ValueDelimiters, result->value);
+    return rest.size() <= LongestStatement && TakeInto(result->column, rest, Delimiters) &&
+           TakeInto(result->op, rest, Delimiters) && TakeInto(result->value, rest, ValueDelimiters);
 }
 
 std::int64_t WholeNumber(const char* text) {

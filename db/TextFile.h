@@ -5,7 +5,7 @@
 #include <memory>
 #include <span>
 
-#include "db/File.h"
+#include "util/File.h"
 
 /// Reads a text file line by line, a block at a time. It borrows the file.
 class LineReader {

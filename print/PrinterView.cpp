@@ -63,7 +63,7 @@ void PrinterView::Draw(BRect page) {
     const Bar bars[] = {{"", "Quorvan Personal Portfolio Manager", "Page 1  "},
                         {"", portfolio_, ""},
                         {TotalValueText(totalValue_), "", ""},
-                        {"  Quorvan, version 1.0", count, date}};
+                        {"  Quorvan, version " QUORVAN_VERSION, count, date}};
     SetBarFont(page.Width(), bars);
     const float tops[] = {page.top, page.top + 2 * BarHeight, page.top + 3 * BarHeight, place.bottom};
     for (std::size_t i = 0; i < std::size(bars); ++i)

@@ -8,7 +8,7 @@
 #include "quotes/QuoteScanner.h"
 #include "quotes/QuoteSource.h"
 #include "quotes/StopSignal.h"
-#include "util/WholeFile.h"
+#include "util/File.h"
 
 namespace {
 
@@ -42,7 +42,7 @@ bool EndsTheSearch(float result) {
 
 float GetPriceQuote(const char* ticker, const QuoteContext& context) {
     std::string sources;
-    if (ReadWholeFile(context.sourcePath, sources, MaxSourceFileSize))
+    if (ReadWholeFile(context.sourcePath, sources, MaxSourceFileSize) == 0)
         return GetPriceQuoteFrom(sources, ticker, context);
     QuoteReport report(context.logPath, context.observer);
     report.Log(std::string("Unable to open '") + context.sourcePath + "'\n");

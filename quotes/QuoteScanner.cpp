@@ -9,7 +9,6 @@
 
 #include "quotes/QuoteReport.h"
 #include "quotes/QuoteRetrieval.h"
-#include "quotes/Tokens.h"
 #include "util/Numbers.h"
 #include "util/Strings.h"
 

@@ -6,8 +6,8 @@
 #include <cstring>
 #include <string>
 
-#include "quotes/Tokens.h"
 #include "util/CharacterBuffer.h"
+#include "util/Strings.h"
 
 namespace {
 

@@ -1,35 +1,28 @@
-#include "tools/ChartCommand.h"
-
 #include <CLI/CLI.hpp>
 #include <cmath>
 #include <cstring>
 #include <filesystem>
-#include <iostream>
 #include <memory>
 #include <optional>
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include "app/model/DataFolders.h"
 #include "charts/ChartWindow.h"
 #include "charts/PieChartView.h"
 #include "charts/ValueChartView.h"
 #include "db/Database.h"
 #include "platform/ViewPicture.h"
-#include "tools/HomeFolder.h"
-#include "tools/OffscreenApplication.h"
+#include "tools/Commands.h"
+#include "util/File.h"
 #include "util/Strings.h"
-#include "util/WholeFile.h"
 
 namespace {
 
-constexpr int Failed = 1;
 constexpr int WrongUse = 2;
 
-struct ChartOptions {
-    std::string home;
-    std::string portfolio;
+struct ChartOptions : PortfolioOptions {
     std::string chart;
-    std::string output;
     float scale = 2;
 };
 
@@ -52,42 +45,26 @@ std::optional<PictureFormat> FormatOf(const std::string& path) {
     return std::nullopt;
 }
 
-int Fail(const std::string& sentence, int status = Failed) {
-    std::cerr << "quorvan-cli: " << sentence << '\n';
-    return status;
-}
-
-struct OutputTarget {
-    std::string path;
-    mode_t mode;
-};
-
-// A file that exists keeps its permissions, and a link to it stays a link. Nothing, with errno telling why,
-// when there is something that a picture must not replace.
-std::optional<OutputTarget> TargetOf(const std::string& path) {
-    std::error_code missing;
-    const std::string existing = std::filesystem::canonical(path, missing).string();
-    if (missing) {
-        const mode_t mask = umask(0);
-        umask(mask);
-        return OutputTarget{path, 0666 & ~mask};
-    }
+// The errno number that tells why there is something that a picture must not replace, or 0.
+int WhyNotReplaced(const std::string& path) {
     struct stat status {};
-    if (stat(existing.c_str(), &status) != 0 || access(existing.c_str(), W_OK) != 0)
-        return std::nullopt;
-    if (!S_ISREG(status.st_mode)) {
-        errno = S_ISDIR(status.st_mode) ? EISDIR : EOPNOTSUPP;
-        return std::nullopt;
-    }
-    return OutputTarget{existing, status.st_mode & 0777U};
+    if (stat(path.c_str(), &status) != 0)
+        return 0;
+    if (!S_ISREG(status.st_mode))
+        return S_ISDIR(status.st_mode) ? EISDIR : EOPNOTSUPP;
+    return access(path.c_str(), W_OK) == 0 ? 0 : errno;
 }
 
+// A file that exists keeps its permissions, and a link to it stays a link.
 int Write(const std::string& path, const std::string& bytes) {
-    const std::optional<OutputTarget> target = TargetOf(path);
-    if (target && WriteWholeFile(target->path, target->path + ".part" + std::to_string(getpid()), bytes,
-                                 target->mode, ExistingFile::Replace))
-        return 0;
-    return Fail(path + " cannot be written: " + std::strerror(errno));
+    const mode_t mask = umask(0);
+    umask(mask);
+    const std::string target = RealPath(path);
+    int error = WhyNotReplaced(target);
+    if (error == 0)
+        error = WriteWholeFile(target, target + ".part" + std::to_string(getpid()), bytes, 0666 & ~mask,
+                               ExistingFile::Replace);
+    return error == 0 ? 0 : Fail(path + " cannot be written: " + std::strerror(error));
 }
 
 int DrawChart(const ChartOptions& options, const ChartInfo& chart, PictureFormat format,
@@ -123,10 +100,8 @@ int RunChart(ChartOptions& options) {
         return Fail("the name of the picture must end with .png, .svg or .pdf", WrongUse);
     if (std::isnan(options.scale)) // which no range keeps out
         return Fail("the scale must be a number", WrongUse);
-    if (options.home.empty())
-        options.home = DefaultHomeFolder();
-    const auto investments = OpenInvestments(options.home, options.portfolio, std::cerr);
-    return investments ? DrawChart(options, *chart, *format, *investments) : Failed;
+    const auto investments = OpenInvestments(options);
+    return investments ? DrawChart(options, *chart, *format, *investments) : 1;
 }
 
 std::string ChartList() {
@@ -142,19 +117,12 @@ void AddChartCommand(CLI::App& application, int& status) {
     CLI::App* command =
         application.add_subcommand("chart", "Write one of a portfolio's charts into a picture file.");
     const auto options = std::make_shared<ChartOptions>();
-    command->add_option("PORTFOLIO", options->portfolio, "The portfolio's name")->required();
+    AddPortfolioOptions(*command, *options, "A .png, .svg or .pdf file; replaced where it exists");
     command->add_option("CHART", options->chart, "The chart's code or title, in any letter case")->required();
-    command->add_option("-o,--output", options->output, "A .png, .svg or .pdf file; replaced where it exists")
-        ->required()
-        ->type_name("FILE");
     command->add_option("--scale", options->scale, "Pixels of a .png for each pixel of the window")
         ->check(CLI::Range(0.25F, 16.0F))
         ->capture_default_str();
-    command
-        ->add_option("--home", options->home,
-                     "Quorvan's folder (default: that of quorvan-cli when it holds an "
-                     "invest.db, else ~/Quorvan)")
-        ->type_name("FOLDER");
+    AddHomeOption(*command, options->home);
     command->footer(ChartList());
     command->callback([options, &status] { status = RunChart(*options); });
 }

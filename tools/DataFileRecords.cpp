@@ -6,12 +6,9 @@
 #include "db/Statement.h"
 #include "tools/DataFileTool.h"
 #include "tools/RecordFields.h"
+#include "tools/Sentences.h"
 
 namespace {
-
-std::string Records(long count) {
-    return std::to_string(count) + (count == 1 ? " record" : " records");
-}
 
 // Stores a value in a record's data. Returns a sentence about what is wrong with it, or nothing.
 std::string StoreIn(const COLUMN_ENTRY& column, const std::string& value, std::uint8_t* data) {
@@ -21,7 +18,7 @@ std::string StoreIn(const COLUMN_ENTRY& column, const std::string& value, std::u
 
 } // namespace
 
-bool DataFileTool::Select(const SELECTION& selection) {
+bool DataFileTool::Select(const Selection& selection) {
     database_.SetCaseSensitivity(selection.exact ? 1 : 0);
     long count = database_.Query(selection.statement.c_str(), QueryMode::New);
     for (std::size_t i = 0; i < selection.further.size() && count >= 0; ++i) {
@@ -32,7 +29,7 @@ bool DataFileTool::Select(const SELECTION& selection) {
            (selection.sortColumn.empty() || database_.SortBy(selection.sortColumn.c_str(), 0) == 0);
 }
 
-int DataFileTool::Query(const SELECTION& selection) {
+int DataFileTool::Query(const Selection& selection) {
     if (!Open(Access::Read))
         return 1;
     return Select(selection) ? PrintSet() : FailAsEngine();
@@ -55,7 +52,7 @@ int DataFileTool::PrintSet() {
     for (const COLUMN_ENTRY& column : columns)
         names.emplace_back(column.name);
     TableWriter writer(format_, names, output_);
-    std::vector<CELL> row(names.size());
+    std::vector<Cell> row(names.size());
     const auto fill = [&](long number, const std::uint8_t* data) {
         row[0].SetNumber(number);
         for (std::size_t i = 0; i < columns.size(); ++i)
@@ -76,7 +73,7 @@ int DataFileTool::PrintSet() {
     });
 }
 
-int DataFileTool::Set(const std::string& statement, const SELECTION& selection) {
+int DataFileTool::Set(const std::string& statement, const Selection& selection) {
     if (!Open(Access::Change))
         return 1;
     STATEMENT parts{};
@@ -90,13 +87,13 @@ int DataFileTool::Set(const std::string& statement, const SELECTION& selection) 
     const long changed = database_.QueryUpdate(statement.c_str());
     if (changed < 0)
         return FailAsEngine();
-    Tell("changed", changed, Records(changed) + " changed");
+    Tell("changed", changed, Counted(changed, "record") + " changed");
     return 0;
 }
 
 // Sets a column to what Append would store. The engine's statement would store something else for a value
 // that the column cannot hold, and a day that exists for no date.
-int DataFileTool::SetValue(const COLUMN_ENTRY& column, const std::string& value, const SELECTION& selection) {
+int DataFileTool::SetValue(const COLUMN_ENTRY& column, const std::string& value, const Selection& selection) {
     std::vector<std::uint8_t> wanted = EmptyData();
     if (const std::string wrong = StoreIn(column, value, wanted.data()); !wrong.empty())
         return Fail(wrong);
@@ -107,7 +104,7 @@ int DataFileTool::SetValue(const COLUMN_ENTRY& column, const std::string& value,
         std::copy_n(wanted.begin() + column.offset, column.size, data.begin() + column.offset);
         return database_.Write(number, data.data());
     };
-    return Apply({"changed", set}, {}, &selection);
+    return Apply("changed", set, {}, &selection);
 }
 
 std::vector<std::uint8_t> DataFileTool::EmptyData() const {
@@ -152,27 +149,14 @@ std::string DataFileTool::StoreValue(const std::vector<COLUMN_ENTRY>& columns, c
     return StoreIn(columns[best], assignment.substr(length), data);
 }
 
-int DataFileTool::Delete(const std::vector<long>& records, const SELECTION* selection) {
-    return Mark({"deleted", [this](long n) { return database_.Delete(n); }}, records, selection);
+int DataFileTool::Mark(const char* done, int (DATABASE::*mark)(long), const std::vector<long>& records,
+                       const Selection* selection) {
+    const auto apply = [&](long number) { return (database_.*mark)(number); };
+    return Open(Access::Change) ? Apply(done, apply, records, selection) : 1;
 }
 
-int DataFileTool::UnDelete(const std::vector<long>& records) {
-    return Mark({"undeleted", [this](long n) { return database_.UnDelete(n); }}, records, nullptr);
-}
-
-int DataFileTool::Lock(const std::vector<long>& records, const SELECTION* selection) {
-    return Mark({"locked", [this](long n) { return database_.Lock(n); }}, records, selection);
-}
-
-int DataFileTool::UnLock(const std::vector<long>& records, const SELECTION* selection) {
-    return Mark({"unlocked", [this](long n) { return database_.UnLock(n); }}, records, selection);
-}
-
-int DataFileTool::Mark(const MARKING& marking, const std::vector<long>& records, const SELECTION* selection) {
-    return Open(Access::Change) ? Apply(marking, records, selection) : 1;
-}
-
-int DataFileTool::Apply(const MARKING& marking, std::vector<long> records, const SELECTION* selection) {
+int DataFileTool::Apply(const char* done, const std::function<int(long)>& apply, std::vector<long> records,
+                        const Selection* selection) {
     if (selection != nullptr) {
         if (!Select(*selection))
             return FailAsEngine();
@@ -180,11 +164,11 @@ int DataFileTool::Apply(const MARKING& marking, std::vector<long> records, const
             return 1;
     }
     int status = 0;
-    long done = 0;
+    long count = 0;
     for (const long number : records) {
         errno = 0;
-        if (marking.apply(number) == 0) {
-            ++done;
+        if (apply(number) == 0) {
+            ++count;
             continue;
         }
         const int code = database_.GetLastError(nullptr);
@@ -192,6 +176,6 @@ int DataFileTool::Apply(const MARKING& marking, std::vector<long> records, const
         if (IsFileFailure(code))
             break;
     }
-    Tell(marking.done, done, Records(done) + " " + marking.done);
+    Tell(done, count, Counted(count, "record") + " " + done);
     return status;
 }

@@ -12,6 +12,7 @@
 #include "db/Compaction.h"
 #include "db/FileCheck.h"
 #include "tools/RecordFields.h"
+#include "tools/Sentences.h"
 
 DataFileTool::DataFileTool(std::string file, OutputFormat format, TextOutput& output, std::ostream& errors,
                            FileOperations& operations)
@@ -74,27 +75,22 @@ bool DataFileTool::IsFileFailure(int code) {
 
 bool DataFileTool::TakeFolders() {
     const std::filesystem::path real(RealPath(file_));
-    const std::vector<std::string> together = DailyBackup::FilesKeptWith(real.filename());
-    const std::vector<std::string> folders = FoldersOf(FolderOf(real), together);
-    return std::all_of(folders.begin(), folders.end(),
-                       [this](const std::string& folder) { return TakeFolder(folder); });
-}
-
-bool DataFileTool::TakeFolder(const std::string& folder) {
-    FolderLock& lock = locks_.emplace_back();
-    const FolderLock::Outcome outcome = lock.Take(folder, "quorvan-cli");
-    if (outcome == FolderLock::Outcome::Held)
-        Warn("the folder is in use by " + DescribeHolder(lock.Holder()) + "; nothing is changed");
-    else if (outcome == FolderLock::Outcome::Doubtful)
-        Warn("the folder was in use by " + DescribeHolder(lock.Holder()) +
-             "; once that program has ended, delete " + folder + "/" + FolderLock::FileName);
-    else if (outcome == FolderLock::Outcome::Failed && lock.Error() != ENOENT)
-        Warn("other programs cannot be kept out of the folder: " + folder + "/" + FolderLock::FileName +
-             (lock.Error() == EINVAL ? " is in the way"
-                                     : " cannot be made: " + std::generic_category().message(lock.Error())));
-    else
-        return true; // where there is no folder, there is no file either
-    return false;
+    const auto goesOn = [this](const FolderLock& lock, const std::string& folder,
+                               FolderLock::Outcome outcome) {
+        const std::string use = UseOf(lock, folder, outcome);
+        if (!use.empty())
+            Warn("the folder" + use + (outcome == FolderLock::Outcome::Held ? "; nothing is changed" : ""));
+        // Where there is no folder, there is no file either.
+        const bool failed = outcome == FolderLock::Outcome::Failed && lock.Error() != ENOENT;
+        if (failed)
+            Warn("other programs cannot be kept out of the folder: " + folder + "/" + FolderLock::FileName +
+                 (lock.Error() == EINVAL
+                      ? " is in the way"
+                      : " cannot be made: " + std::generic_category().message(lock.Error())));
+        return use.empty() && !failed;
+    };
+    return ::TakeFolders(locks_, FolderOf(real), DailyBackup::FilesKeptWith(real.filename()), ToolName,
+                         goesOn);
 }
 
 bool DataFileTool::KeepBackup() {
@@ -144,17 +140,22 @@ std::string DataFileTool::WhyNotOpened() const {
     return file_.size() >= PathBufferSize ? "the path is longer than 127 bytes" : "there is no memory for it";
 }
 
+int DataFileTool::Print(const std::vector<std::string>& names, const std::vector<std::vector<Cell>>& rows) {
+    TableWriter writer(format_, names, output_);
+    for (const std::vector<Cell>& row : rows)
+        writer.Measure(row);
+    writer.WriteHeading();
+    for (const std::vector<Cell>& row : rows)
+        writer.WriteRow(row);
+    return 0;
+}
+
 // The result of a command that changes something: a sentence for a person, or a number under a name.
 void DataFileTool::Tell(const char* name, long number, const std::string& sentence) {
-    if (format_ == OutputFormat::Table) {
+    if (format_ == OutputFormat::Table)
         output_.Write(sentence + '\n');
-        return;
-    }
-    CELL cell;
-    cell.SetNumber(number);
-    TableWriter writer(format_, {name}, output_);
-    writer.WriteHeading();
-    writer.WriteRow({&cell, 1});
+    else
+        Print({name}, {{NumberCell(number)}});
 }
 
 int DataFileTool::Finish(int status) {
@@ -175,58 +176,36 @@ int DataFileTool::Info() {
     database_.GetHeaderInfo(&header);
     const std::vector<std::string> names = {"description", "version", "records",    "deleted",   "active",
                                             "columns",     "length",  "data_start", "read_only", "damaged"};
-    std::vector<CELL> values(names.size());
-    auto* next = values.data();
-    (next++)->SetText(header.description);
-    (next++)->SetFloat(header.version, 1);
-    for (const std::int64_t number :
-         {std::int64_t{header.recordCount}, std::int64_t{header.deletedCount},
-          std::int64_t{database_.GetNumberOfActiveRecords()}, std::int64_t{header.columnCount},
-          std::int64_t{header.recordLength}, DataStart(header.columnCount)})
-        (next++)->SetNumber(number);
-    (next++)->SetTruth(database_.IsReadOnly());
-    next->SetTruth(database_.IsDamaged());
-    if (format_ != OutputFormat::Table) {
-        TableWriter writer(format_, names, output_);
-        writer.WriteHeading();
-        writer.WriteRow(values);
-        return 0;
-    }
+    const std::vector<Cell> values = {
+        TextCell(header.description),
+        {Cell::Kind::Float, {}, 0, header.version, 1},
+        NumberCell(header.recordCount),
+        NumberCell(header.deletedCount),
+        NumberCell(database_.GetNumberOfActiveRecords()),
+        NumberCell(header.columnCount),
+        NumberCell(header.recordLength),
+        NumberCell(DataStart(header.columnCount)),
+        {Cell::Kind::Truth, {}, database_.IsReadOnly()},
+        {Cell::Kind::Truth, {}, database_.IsDamaged()},
+    };
+    if (format_ != OutputFormat::Table)
+        return Print(names, {values});
     // A person reads one value under the other more easily.
-    TableWriter writer(format_, {"property", "value"}, output_);
-    for (const bool write : {false, true}) {
-        if (write)
-            writer.WriteHeading();
-        for (std::size_t i = 0; i < names.size(); ++i) {
-            CELL row[2];
-            row[0].SetText(names[i]);
-            row[1] = values[i];
-            write ? writer.WriteRow(row) : writer.Measure(row);
-        }
-    }
-    return 0;
+    std::vector<std::vector<Cell>> rows;
+    for (std::size_t i = 0; i < names.size(); ++i)
+        rows.push_back({TextCell(names[i]), values[i]});
+    return Print({"property", "value"}, rows);
 }
 
 int DataFileTool::Columns() {
     if (!Open(Access::Read))
         return 1;
-    TableWriter writer(format_, {"name", "type", "width", "offset", "decimals"}, output_);
-    const std::vector<COLUMN_ENTRY> columns = AllColumns();
-    for (const bool write : {false, true}) {
-        if (write)
-            writer.WriteHeading();
-        for (const COLUMN_ENTRY& column : columns) {
-            CELL row[5];
-            row[0].SetText(column.name);
-            row[1].SetText(ColumnTypeName(column.type));
-            row[2].SetNumber(column.size);
-            row[3].SetNumber(column.offset);
-            if (column.type == ColumnType::Float)
-                row[4].SetNumber(column.format & 15);
-            write ? writer.WriteRow(row) : writer.Measure(row);
-        }
-    }
-    return 0;
+    std::vector<std::vector<Cell>> rows;
+    for (const COLUMN_ENTRY& column : AllColumns())
+        rows.push_back({TextCell(column.name), TextCell(ColumnTypeName(column.type)), NumberCell(column.size),
+                        NumberCell(column.offset),
+                        column.type == ColumnType::Float ? NumberCell(column.format & 15) : Cell()});
+    return Print({"name", "type", "width", "offset", "decimals"}, rows);
 }
 
 std::vector<COLUMN_ENTRY> DataFileTool::AllColumns() {

@@ -10,11 +10,10 @@
 #include "db/Database.h"
 #include "tools/TableWriter.h"
 #include "tools/TextCheck.h"
-#include "tools/TextOutput.h"
 #include "util/FolderLock.h"
 
 // Which records a command is about.
-struct SELECTION {
+struct Selection {
     std::string statement; // a query statement; empty for all records
     // Further statements in their order, each with QueryMode::And or QueryMode::Or.
     std::vector<std::pair<int, std::string>> further;
@@ -40,25 +39,23 @@ class DataFileTool {
     int Info();
     int Columns();
     // The records of the selection.
-    int Query(const SELECTION& selection);
+    int Query(const Selection& selection);
     // Applies a set statement to the selection. With "=" a value is taken as Append takes it, or refused.
-    int Set(const std::string& statement, const SELECTION& selection);
+    int Set(const std::string& statement, const Selection& selection);
     // Adds a record. The values are NAME=VALUE; columns without one are zero or empty.
     int Append(const std::vector<std::string>& values);
 
-    // Marks records, by number or those of a selection. A record that is refused is told of, and the others
-    // are done all the same.
-    int Delete(const std::vector<long>& records, const SELECTION* selection);
-    int UnDelete(const std::vector<long>& records);
-    int Lock(const std::vector<long>& records, const SELECTION* selection);
-    int UnLock(const std::vector<long>& records, const SELECTION* selection);
+    // Marks records, by number or those of a selection, by an operation of the engine; `done` says in a word
+    // what that does. A record that is refused is told of, and the others are done all the same.
+    int Mark(const char* done, int (DATABASE::*mark)(long), const std::vector<long>& records,
+             const Selection* selection);
 
     // Writes text lines of the selection, or of all records when it is null, to a file that is replaced. Load
     // reads them with the same format.
-    int Export(const std::string& path, const TEXT_FORMAT& format, const SELECTION* selection);
+    int Export(const std::string& path, const TextFormat& format, const Selection* selection);
     // Appends the records of a text file, or none when TextCheck finds a line wrong. A field ends at any
     // character of the separator and at the line's end.
-    int Load(const std::string& path, const TEXT_FORMAT& format);
+    int Load(const std::string& path, const TextFormat& format);
 
     int Compact();
     // Makes a new file. The columns are as ParseColumn reads them. Refused in the place of a file of which an
@@ -74,17 +71,11 @@ class DataFileTool {
 
   private:
     enum class Access { Read, Change };
-    // What is done to one record after the other.
-    struct MARKING {
-        const char* done;               // "deleted"
-        std::function<int(long)> apply; // as an operation of the engine
-    };
 
     [[nodiscard]] bool Open(Access access);
     // Keep other programs out of the folders of the file, and of those that are backed up with it, while the
     // tool lives.
     [[nodiscard]] bool TakeFolders();
-    [[nodiscard]] bool TakeFolder(const std::string& folder);
     [[nodiscard]] bool KeepBackup();
     [[nodiscard]] std::string WhyNotOpened() const;
     [[nodiscard]] int Fail(const std::string& sentence);
@@ -98,22 +89,24 @@ class DataFileTool {
     [[nodiscard]] static bool IsFileFailure(int code);
     [[nodiscard]] static const char* Hint(int code);
     void Warn(const std::string& sentence);
+    // Rows that are there all at once. Returns 0.
+    int Print(const std::vector<std::string>& names, const std::vector<std::vector<Cell>>& rows);
     void Tell(const char* name, long number, const std::string& sentence);
 
     [[nodiscard]] std::vector<COLUMN_ENTRY> AllColumns();
-    [[nodiscard]] bool Select(const SELECTION& selection);
+    [[nodiscard]] bool Select(const Selection& selection);
     [[nodiscard]] int PrintSet();
     [[nodiscard]] int ForEachSelected(const std::function<void(long, const std::uint8_t*)>& use);
     [[nodiscard]] std::string StoreValue(const std::vector<COLUMN_ENTRY>& columns,
                                          const std::string& assignment, std::vector<bool>& given,
                                          std::uint8_t* data) const;
     [[nodiscard]] int SetValue(const COLUMN_ENTRY& column, const std::string& value,
-                               const SELECTION& selection);
+                               const Selection& selection);
     [[nodiscard]] std::vector<std::uint8_t> EmptyData() const;
-    int Mark(const MARKING& marking, const std::vector<long>& records, const SELECTION* selection);
     // To records by number and those of the selection, once the file is open.
-    int Apply(const MARKING& marking, std::vector<long> records, const SELECTION* selection);
-    [[nodiscard]] int CheckText(const std::string& path, const TEXT_FORMAT& format,
+    int Apply(const char* done, const std::function<int(long)>& apply, std::vector<long> records,
+              const Selection* selection);
+    [[nodiscard]] int CheckText(const std::string& path, const TextFormat& format,
                                 const std::string& separators);
     [[nodiscard]] bool RestoreLeftover();
     void PrintFindings(const class FileCheck& check);

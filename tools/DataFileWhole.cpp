@@ -6,21 +6,18 @@
 #include "db/FileCheck.h"
 #include "tools/DataFileTool.h"
 #include "tools/RecordFields.h"
+#include "tools/Sentences.h"
 
 namespace {
 
-std::string Records(long count) {
-    return std::to_string(count) + (count == 1 ? " record" : " records");
-}
-
 // As the engine numbers it.
-int ByteFormat(const TEXT_FORMAT& format) {
+int ByteFormat(const TextFormat& format) {
     return format.characters ? 1 : 2;
 }
 
 } // namespace
 
-int DataFileTool::Export(const std::string& path, const TEXT_FORMAT& format, const SELECTION* selection) {
+int DataFileTool::Export(const std::string& path, const TextFormat& format, const Selection* selection) {
     if (!Open(Access::Read))
         return 1;
     if (selection != nullptr && !Select(*selection))
@@ -31,12 +28,12 @@ int DataFileTool::Export(const std::string& path, const TEXT_FORMAT& format, con
     const long lines = database_.Export(path.c_str(), selection == nullptr ? 1 : 0, format.separator.c_str());
     if (lines < 0)
         return FailAsEngine(path + ": ");
-    Tell("exported", lines, Records(lines) + " exported to " + path);
+    Tell("exported", lines, Counted(lines, "record") + " exported to " + path);
     return 0;
 }
 
 // Tells of the lines that are wrong, or why the text cannot be read. Returns an exit status.
-int DataFileTool::CheckText(const std::string& path, const TEXT_FORMAT& format,
+int DataFileTool::CheckText(const std::string& path, const TextFormat& format,
                             const std::string& separators) {
     File text(SystemFiles());
     errno = text.Open(path, FileMode::ReadOnly);
@@ -52,7 +49,7 @@ int DataFileTool::CheckText(const std::string& path, const TEXT_FORMAT& format,
     return check.Wrong().empty() ? 0 : 1;
 }
 
-int DataFileTool::Load(const std::string& path, const TEXT_FORMAT& format) {
+int DataFileTool::Load(const std::string& path, const TextFormat& format) {
     const std::string separators = format.separator + "\r\n";
     if (!Open(Access::Change) || CheckText(path, format, separators) != 0)
         return 1;
@@ -63,7 +60,7 @@ int DataFileTool::Load(const std::string& path, const TEXT_FORMAT& format) {
     const long loaded = database_.Load(path.c_str(), separators.c_str());
     if (loaded < 0)
         return FailAsEngine(path + ": ");
-    Tell("loaded", loaded, Records(loaded) + " loaded from " + path);
+    Tell("loaded", loaded, Counted(loaded, "record") + " loaded from " + path);
     return 0;
 }
 
@@ -78,7 +75,8 @@ int DataFileTool::Compact() {
     database_.GetHeaderInfo(&compacted);
     const long removed = static_cast<long>(header.recordCount) - compacted.recordCount;
     Tell("removed", removed,
-         "compacted: " + Records(removed) + " removed, " + Records(compacted.recordCount) + " left");
+         "compacted: " + Counted(removed, "record") + " removed, " +
+             Counted(compacted.recordCount, "record") + " left");
     return 0;
 }
 
@@ -108,8 +106,7 @@ int DataFileTool::Create(const std::string& description, const std::vector<std::
     errno = SyncFolderOf(operations_, file_);
     if (errno != 0)
         return FailWithCode(DatabaseError::SyncFailed);
-    Tell("columns", static_cast<long>(entries.size()),
-         "created with " + std::to_string(entries.size()) + (entries.size() == 1 ? " column" : " columns"));
+    Tell("columns", static_cast<long>(entries.size()), "created with " + Counted(entries.size(), "column"));
     return 0;
 }
 
@@ -155,18 +152,9 @@ void DataFileTool::PrintFindings(const FileCheck& check) {
         output_.Write("nothing is wrong\n");
         return;
     }
-    TableWriter writer(format_, {"kind", "offset", "record", "finding"}, output_);
-    for (const bool write : {false, true}) {
-        if (write)
-            writer.WriteHeading();
-        for (const FILE_FINDING& finding : check.Findings()) {
-            CELL row[4];
-            row[0].SetText(finding.problem ? "problem" : "remark");
-            row[1].SetNumber(finding.offset);
-            if (finding.record >= 0)
-                row[2].SetNumber(finding.record);
-            row[3].SetText(finding.text);
-            write ? writer.WriteRow(row) : writer.Measure(row);
-        }
-    }
+    std::vector<std::vector<Cell>> rows;
+    for (const FILE_FINDING& finding : check.Findings())
+        rows.push_back({TextCell(finding.problem ? "problem" : "remark"), NumberCell(finding.offset),
+                        finding.record >= 0 ? NumberCell(finding.record) : Cell(), TextCell(finding.text)});
+    Print({"kind", "offset", "record", "finding"}, rows);
 }

@@ -1,5 +1,3 @@
-#include "tools/DbCommand.h"
-
 #include <CLI/CLI.hpp>
 #include <csignal>
 #include <functional>
@@ -10,36 +8,37 @@
 #include <unistd.h>
 #include <vector>
 
+#include "tools/Commands.h"
 #include "tools/DataFileTool.h"
 #include "tools/RecordFields.h"
 
 namespace {
 
 // What a command line says; each command uses a part of it.
-struct DB_OPTIONS {
+struct DbOptions {
     std::string file;
     OutputFormat format = OutputFormat::Table;
     std::string statement;
-    SELECTION selection;
+    Selection selection;
     bool all = false;
     std::vector<long> records;
     std::vector<std::string> values;
     std::string path;
-    TEXT_FORMAT text;
+    TextFormat text;
     std::string description;
     bool repair = false;
 };
 
-using Options = std::shared_ptr<DB_OPTIONS>;
-using Action = std::function<int(DataFileTool&, const DB_OPTIONS&)>;
+using Options = std::shared_ptr<DbOptions>;
+using Action = std::function<int(DataFileTool&, const DbOptions&)>;
 
 // The selection that --where made, or null without it.
-const SELECTION* Selected(const DB_OPTIONS& options) {
+const Selection* Selected(const DbOptions& options) {
     return options.selection.statement.empty() ? nullptr : &options.selection;
 }
 
 // Takes over --and and --or, which work in the order in which they are given.
-void CollectSteps(const CLI::App& command, SELECTION* selection) {
+void CollectSteps(const CLI::App& command, Selection* selection) {
     std::map<const CLI::Option*, std::size_t> used;
     for (const CLI::Option* option : command.parse_order()) {
         const bool narrows = option->check_name("--and");
@@ -62,13 +61,12 @@ class DbCommand {
   private:
     void AddFormat(CLI::App* command);
     CLI::App* Add(const char* name, const char* description, Action action);
-    CLI::App* AddMarking(const char* name, const char* description, Action action);
     CLI::Option* AddWhere(CLI::App* command, const char* description);
     void AddSelection(CLI::App* command, CLI::Option* where = nullptr);
 
     CLI::App* command_;
     int& status_;
-    Options options_ = std::make_shared<DB_OPTIONS>();
+    Options options_ = std::make_shared<DbOptions>();
 };
 
 DbCommand::DbCommand(CLI::App& application, int& status)
@@ -135,10 +133,10 @@ void DbCommand::AddSelection(CLI::App* command, CLI::Option* where) {
 void DbCommand::AddReadingCommands() {
     Add(
         "info", "Show what the header says",
-        [](DataFileTool& tool, const DB_OPTIONS&) { return tool.Info(); });
+        [](DataFileTool& tool, const DbOptions&) { return tool.Info(); });
     Add(
-        "columns", "List the columns", [](DataFileTool& tool, const DB_OPTIONS&) { return tool.Columns(); });
-    CLI::App* query = Add("query", "Show records", [](DataFileTool& tool, const DB_OPTIONS& options) {
+        "columns", "List the columns", [](DataFileTool& tool, const DbOptions&) { return tool.Columns(); });
+    CLI::App* query = Add("query", "Show records", [](DataFileTool& tool, const DbOptions& options) {
         return tool.Query(options.selection);
     });
     query->add_option("STATEMENT", options_->selection.statement,
@@ -149,13 +147,13 @@ void DbCommand::AddReadingCommands() {
         ->option_text("COLUMN");
     CLI::App* check =
         Add("check", "Say what is wrong with the file, and where",
-            [](DataFileTool& tool, const DB_OPTIONS& options) { return tool.Check(options.repair); });
+            [](DataFileTool& tool, const DbOptions& options) { return tool.Check(options.repair); });
     check->add_flag("--repair", options_->repair, "Set the header's counts right, after a backup");
 }
 
 void DbCommand::AddChangingCommands() {
     CLI::App* set =
-        Add("set", "Change a column of records", [](DataFileTool& tool, const DB_OPTIONS& options) {
+        Add("set", "Change a column of records", [](DataFileTool& tool, const DbOptions& options) {
             if (!options.all && Selected(options) == nullptr)
                 throw CLI::RequiredError("--where or --all");
             return tool.Set(options.statement, options.selection);
@@ -168,7 +166,7 @@ void DbCommand::AddChangingCommands() {
     AddSelection(set, where);
     CLI::App* append = Add(
         "append", "Add a record",
-        [](DataFileTool& tool, const DB_OPTIONS& options) { return tool.Append(options.values); });
+        [](DataFileTool& tool, const DbOptions& options) { return tool.Append(options.values); });
     append->add_option("NAME=VALUE", options_->values, "A column's value; without one it is zero or empty")
         ->check(CLI::Validator(
             [](const std::string& value) {
@@ -178,40 +176,37 @@ void DbCommand::AddChangingCommands() {
             ""));
 }
 
-CLI::App* DbCommand::AddMarking(const char* name, const char* description, Action action) {
-    CLI::App* command = Add(name, description, [action = std::move(action)](auto& tool, const auto& options) {
-        if (options.records.empty() && Selected(options) == nullptr)
-            throw CLI::RequiredError("A record's number");
-        return action(tool, options);
-    });
-    command->add_option("RECORD", options_->records, "The records' numbers");
-    return command;
-}
-
 void DbCommand::AddMarkingCommands() {
-    for (CLI::App* command :
-         {AddMarking("delete", "Delete records; they keep their numbers until the file is compacted",
-                     [](DataFileTool&tool, const DB_OPTIONS&options) {
-                         return tool.Delete(options.records, Selected(options));
-                     }),
-          AddMarking("lock", "Mark records as locked",
-                     [](DataFileTool&tool, const DB_OPTIONS&options) {
-                         return tool.Lock(options.records, Selected(options));
-                     }),
-          AddMarking("unlock", "Take the mark off records", [](DataFileTool&tool, const DB_OPTIONS&options) {
-              return tool.UnLock(options.records, Selected(options));
-          })}) {
+    const struct {
+        const char* name;
+        const char* description;
+        const char* done;
+        int (DATABASE::*mark)(long);
+    } commands[] = {
+        {"delete", "Delete records; they keep their numbers until the file is compacted", "deleted",
+         &DATABASE::Delete},
+        {"lock", "Mark records as locked", "locked", &DATABASE::Lock},
+        {"unlock", "Take the mark off records", "unlocked", &DATABASE::UnLock},
+        {"undelete", "Take deleted records back", "undeleted", &DATABASE::UnDelete},
+    };
+    for (const auto& [name, description, done, mark] : commands) {
+        CLI::App* command = Add(name, description, [done, mark](auto& tool, const auto& options) {
+            if (options.records.empty() && Selected(options) == nullptr)
+                throw CLI::RequiredError("A record's number");
+            return tool.Mark(done, mark, options.records, Selected(options));
+        });
+        command->add_option("RECORD", options_->records, "The records' numbers");
+        if (mark == &DATABASE::UnDelete)
+            continue; // a selection has no deleted records
         CLI::Option* where = AddWhere(command, "Those that match, instead of numbers");
         where->excludes("RECORD");
         AddSelection(command, where);
     }
-    AddMarking("undelete", "Take deleted records back",
-               [](DataFileTool& tool, const DB_OPTIONS& options) { return tool.UnDelete(options.records); });
 }
 
 void DbCommand::AddTextCommands() {
     CLI::App* exporting = Add("export", "Write records to a text file, a line each",
-                              [](DataFileTool& tool, const DB_OPTIONS& options) {
+                              [](DataFileTool& tool, const DbOptions& options) {
                                   return tool.Export(options.path, options.text, Selected(options));
                               });
     exporting->add_option("TEXTFILE", options_->path, "The text file; replaced when it exists")->required();
@@ -227,7 +222,7 @@ void DbCommand::AddTextCommands() {
         ->needs(where);
     CLI::App* load = Add(
         "load", "Append the records of a text file, or none when a line is wrong",
-        [](DataFileTool& tool, const DB_OPTIONS& options) { return tool.Load(options.path, options.text); });
+        [](DataFileTool& tool, const DbOptions& options) { return tool.Load(options.path, options.text); });
     load->add_option("TEXTFILE", options_->path, "The text file, a line for each record")->required();
     load->add_option("--separators", options_->text.separator,
                      "The characters that end a field (default: a tab)")
@@ -239,7 +234,7 @@ void DbCommand::AddTextCommands() {
 }
 
 void DbCommand::AddFileCommands() {
-    CLI::App* create = Add("create", "Make a new file", [](DataFileTool& tool, const DB_OPTIONS& options) {
+    CLI::App* create = Add("create", "Make a new file", [](DataFileTool& tool, const DbOptions& options) {
         return tool.Create(options.description, options.values);
     });
     create
@@ -258,7 +253,7 @@ void DbCommand::AddFileCommands() {
     create->add_option("--description", options_->description, "A text of at most 31 bytes")
         ->option_text("TEXT");
     Add("compact", "Rewrite the file without its deleted records; the others get new numbers",
-        [](DataFileTool& tool, const DB_OPTIONS&) { return tool.Compact(); });
+        [](DataFileTool& tool, const DbOptions&) { return tool.Compact(); });
 }
 
 } // namespace

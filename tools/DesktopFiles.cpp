@@ -2,25 +2,22 @@
 
 #include <algorithm>
 #include <array>
-#include <cerrno>
 #include <cstdlib>
 #include <filesystem>
-#include <locale>
 #include <ostream>
 #include <string_view>
-#include <sys/stat.h>
 #include <system_error>
-#include <unistd.h>
 
 #include "resources/DesktopFiles.h"
-#include "util/WholeFile.h"
+#include "util/File.h"
+#include "util/Utf8.h"
 
 namespace {
 
 namespace fs = std::filesystem;
 
 constexpr std::size_t MaxDesktopFileSize = std::size_t{1} << 20U;
-constexpr mode_t FileMode = 0644;
+constexpr mode_t ReadableByAll = 0644;
 
 struct DesktopFile {
     const char* folder; // below the data folder
@@ -39,18 +36,6 @@ constexpr std::array<DesktopFile, 3> DesktopFilesInOrder = {{
     {"applications", ".desktop", DesktopEntryTemplate},
 }};
 constexpr const DesktopFile& EntryFile = DesktopFilesInOrder.back();
-
-bool IsUtf8(std::string_view text) {
-    using Codes = std::codecvt<char32_t, char8_t, std::mbstate_t>;
-    std::u32string letters(text.size(), U'\0');
-    std::mbstate_t state{};
-    const auto* begin = reinterpret_cast<const char8_t*>(text.data());
-    const char8_t* end = begin;
-    char32_t* lettersEnd = nullptr;
-    return std::use_facet<Codes>(std::locale::classic())
-               .in(state, begin, begin + text.size(), end, letters.data(), letters.data() + letters.size(),
-                   lettersEnd) == Codes::ok;
-}
 
 std::string WithBackslashBefore(std::string_view letters, std::string_view text) {
     std::string result;
@@ -132,11 +117,10 @@ class Work {
 };
 
 Work::Found Work::Look(const std::string& path, std::string& content) {
-    struct stat status {};
-    if (lstat(path.c_str(), &status) != 0)
+    if (!FileExists(path))
         return Found::Nothing;
     const bool ours =
-        ReadWholeFile(path, content, MaxDesktopFileSize) && content.find(DesktopId) != std::string::npos;
+        ReadWholeFile(path, content, MaxDesktopFileSize) == 0 && content.find(DesktopId) != std::string::npos;
     return ours ? Found::Ours : Found::Foreign;
 }
 
@@ -150,9 +134,10 @@ void Work::Install(const DesktopFile& file, std::string_view content) {
         return Say("kept", path);
     std::error_code error;
     fs::create_directories(fs::path(path).parent_path(), error);
-    if (!error && !WriteWholeFile(path, path + ".part", content, FileMode,
-                                  found == Found::Ours ? ExistingFile::Replace : ExistingFile::Keep))
-        error = {errno, std::generic_category()};
+    if (!error)
+        error = {WriteWholeFile(path, path + ".part", content, ReadableByAll,
+                                found == Found::Ours ? ExistingFile::Replace : ExistingFile::Keep),
+                 std::generic_category()};
     if (error)
         return FailToDo("made", path, error);
     const std::string before = ValueOf(present, "TryExec");
@@ -165,10 +150,12 @@ void Work::Remove(const DesktopFile& file) {
     std::string present;
     const Found found = Look(path, present);
     if (found == Found::Foreign)
-        Say("kept", path, "it is not Quorvan's");
-    else if (found == Found::Ours && unlink(path.c_str()) != 0)
-        FailToDo("removed", path, {errno, std::generic_category()});
-    else if (found == Found::Ours)
+        return Say("kept", path, "it is not Quorvan's");
+    if (found == Found::Nothing)
+        return;
+    if (const int error = RemoveFile(SystemFiles(), path); error != 0)
+        FailToDo("removed", path, {error, std::generic_category()});
+    else
         Say("removed", path);
 }
 

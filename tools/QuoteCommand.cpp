@@ -1,5 +1,3 @@
-#include "tools/QuoteCommand.h"
-
 #include <CLI/CLI.hpp>
 #include <algorithm>
 #include <iostream>
@@ -9,7 +7,7 @@
 
 #include "quotes/QuoteRetrieval.h"
 #include "quotes/QuoteSource.h"
-#include "tools/HomeFolder.h"
+#include "tools/Commands.h"
 #include "tools/QuoteTrace.h"
 #include "util/Numbers.h"
 
@@ -38,8 +36,7 @@ std::string CheckTicker(const std::string& ticker) {
 }
 
 int RunQuote(const QuoteOptions& options) {
-    const std::string home = options.home.empty() ? DefaultHomeFolder() : options.home;
-    const std::string sourcePath = home + "/Quorvan.cfg";
+    const std::string sourcePath = HomeFolder(options.home) + "/Quorvan.cfg";
     QuoteContext context;
     context.sourcePath = sourcePath.c_str();
     bool all = true;
@@ -68,10 +65,7 @@ void AddQuoteCommand(CLI::App& application, int& status) {
         "quote", "Look up prices as the program does, and show why a source works or does not.");
     const auto options = std::make_shared<QuoteOptions>();
     command->add_option("TICKER", options->tickers, "What to look up")->required()->check(CheckTicker);
-    auto* home =
-        command->add_option("--home", options->home,
-                            "The folder with Quorvan.cfg (default: the one of quorvan-cli when it is "
-                            "a Quorvan folder, else ~/Quorvan)");
+    CLI::Option* home = AddHomeOption(*command, options->home);
     command
         ->add_option("--source", options->source,
                      "Try this line, 'LABEL HOST PATH MARKER SKIP', in place of Quorvan.cfg")

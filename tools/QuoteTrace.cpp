@@ -6,6 +6,7 @@
 #include "quotes/QuoteRetrieval.h"
 #include "quotes/QuoteSource.h"
 #include "util/Numbers.h"
+#include "util/Utf8.h"
 
 namespace {
 
@@ -13,23 +14,8 @@ constexpr std::size_t Around = 60;     // bytes shown on either side of the mark
 constexpr std::size_t Beginning = 160; // bytes shown of a page without the marker
 
 std::string Printable(std::string_view text) {
-    constexpr char digits[] = "0123456789ABCDEF";
     std::string printable;
-    for (const char c : text) {
-        const auto byte = static_cast<unsigned char>(c);
-        if (c == '\n')
-            printable += "\\n";
-        else if (c == '\r')
-            printable += "\\r";
-        else if (c == '\t')
-            printable += "\\t";
-        else if (c == '\\')
-            printable += "\\\\";
-        else if (byte < 0x20 || byte >= 0x7F)
-            printable += {'\\', 'x', digits[byte >> 4U], digits[byte & 0xFU]};
-        else
-            printable += c;
-    }
+    AppendEscaped(printable, text, Letters::Ascii);
     return printable;
 }
 

@@ -142,7 +142,7 @@ const char* ColumnTypeName(std::int8_t type) {
     return code < TypeNames.size() ? TypeNames[code] : "unknown";
 }
 
-void FillCell(const COLUMN_ENTRY& column, const std::uint8_t* data, CELL* cell) {
+void FillCell(const COLUMN_ENTRY& column, const std::uint8_t* data, Cell* cell) {
     const std::uint8_t* field = data + column.offset;
     const std::size_t width = WidthOf(column);
     const auto bits = [field, width](std::size_t most) {
@@ -179,7 +179,7 @@ void FillCell(const COLUMN_ENTRY& column, const std::uint8_t* data, CELL* cell) 
         break;
     }
     default:
-        cell->kind = CELL::Kind::Nothing;
+        cell->kind = Cell::Kind::Nothing;
     }
 }
 

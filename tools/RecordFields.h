@@ -14,7 +14,7 @@
 [[nodiscard]] const char* ColumnTypeName(std::int8_t type);
 
 // Makes `cell` the value of the column in a record's data. A column of unknown type has none.
-void FillCell(const COLUMN_ENTRY& column, const std::uint8_t* data, CELL* cell);
+void FillCell(const COLUMN_ENTRY& column, const std::uint8_t* data, Cell* cell);
 
 // Writes a value into the column of a record's data, which must be zeroed. Refused are a text that is too
 // long or has a byte 0 in it, a number that is none or beyond the column's range, an infinite float, and a

@@ -1,9 +1,6 @@
-#include "tools/ReportCommand.h"
-
 #include <CLI/CLI.hpp>
 #include <cerrno>
 #include <cstring>
-#include <iostream>
 #include <memory>
 #include <string>
 #include <vector>
@@ -11,15 +8,11 @@
 #include "db/Database.h"
 #include "platform/PrintJob.h"
 #include "print/Report.h"
-#include "tools/HomeFolder.h"
-#include "tools/OffscreenApplication.h"
+#include "tools/Commands.h"
 
 namespace {
 
-struct ReportOptions {
-    std::string home;
-    std::string portfolio;
-    std::string output;
+struct ReportOptions : PortfolioOptions {
     std::string page = "A4";
     bool landscape = false;
 };
@@ -39,19 +32,16 @@ ReportResult WriteReport(const ReportOptions& options, DATABASE& investments, in
 }
 
 int RunReport(ReportOptions& options) {
-    if (options.home.empty())
-        options.home = DefaultHomeFolder();
-    const auto investments = OpenInvestments(options.home, options.portfolio, std::cerr);
+    const auto investments = OpenInvestments(options);
     if (!investments)
         return 1;
     int error = 0;
     const ReportResult result = WriteReport(options, *investments, error);
     if (result == ReportResult::NotRead)
-        std::cerr << "quorvan-cli: the investments in " << options.home << " could not all be read\n";
-    else if (result != ReportResult::Printed)
-        std::cerr << "quorvan-cli: " << options.output << " cannot be written: " << std::strerror(error)
-                  << '\n';
-    return result == ReportResult::Printed ? 0 : 1;
+        return Fail("the investments in " + options.home + " could not all be read");
+    return result == ReportResult::Printed
+               ? 0
+               : Fail(options.output + " cannot be written: " + std::strerror(error));
 }
 
 } // namespace
@@ -60,20 +50,13 @@ void AddReportCommand(CLI::App& application, int& status) {
     CLI::App* command =
         application.add_subcommand("report", "Write a portfolio's printed report into a PDF file.");
     const auto options = std::make_shared<ReportOptions>();
-    command->add_option("PORTFOLIO", options->portfolio, "The portfolio's name")->required();
-    command->add_option("-o,--output", options->output, "The PDF file; replaced where it exists")
-        ->required()
-        ->type_name("FILE");
+    AddPortfolioOptions(*command, *options, "The PDF file; replaced where it exists");
     const std::vector<std::string> pages = {"A3", "A4",     "A5",    "A6",        "B4",
                                             "B5", "Letter", "Legal", "Executive", "Tabloid"};
     command->add_option("--page", options->page, "The paper's size (default: A4)")
         ->transform(CLI::IsMember(pages, CLI::ignore_case))
         ->type_name("NAME");
     command->add_flag("--landscape", options->landscape, "The paper lies on its long side");
-    command
-        ->add_option("--home", options->home,
-                     "Quorvan's folder (default: that of quorvan-cli when it holds an "
-                     "invest.db, else ~/Quorvan)")
-        ->type_name("FOLDER");
+    AddHomeOption(*command, options->home);
     command->callback([options, &status] { status = RunReport(*options); });
 }

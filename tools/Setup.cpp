@@ -3,22 +3,22 @@
 #include <cerrno>
 #include <filesystem>
 #include <functional>
+#include <list>
 #include <ostream>
 #include <span>
 #include <string_view>
 #include <sys/stat.h>
 #include <system_error>
-#include <unistd.h>
 #include <utility>
 
+#include "app/model/DataFolders.h"
 #include "app/model/RecordLayouts.h"
 #include "db/Compaction.h"
 #include "db/Database.h"
 #include "tools/DesktopFiles.h"
 #include "tools/FirstFiles.h"
-#include "tools/SampleData.h"
-#include "util/FolderLock.h"
-#include "util/WholeFile.h"
+#include "tools/Sentences.h"
+#include "util/File.h"
 
 namespace {
 
@@ -30,22 +30,10 @@ std::string Reason(int error) {
     return std::generic_category().message(error);
 }
 
-// Whether the name is taken, be it by a link that leads nowhere.
-bool Exists(const std::string& path) {
-    struct stat status {};
-    return lstat(path.c_str(), &status) == 0;
-}
-
 // What is made here is the person's alone, whatever the mask: it tells what the person owns.
 constexpr mode_t PrivateFile = 0600;
 constexpr mode_t PrivateProgram = 0700;
 constexpr mode_t PrivateFolder = 0700;
-
-// What is replaced keeps its permissions.
-mode_t PermissionsOf(const std::string& path, mode_t ofNew) {
-    struct stat status {};
-    return stat(path.c_str(), &status) == 0 ? status.st_mode & 0777 : ofNew;
-}
 
 // Makes the folder, and those above it that are missing. Returns 0, also when it is there, or an errno
 // number.
@@ -80,9 +68,9 @@ class FolderSetup {
 
   private:
     bool FindFolder();
-    bool MakeFolder();
+    // `words` begin the sentence of its failure.
+    bool MakeFolder(const char* words, const std::string& path);
     bool TakeFolder();
-    bool MakeSubfolder(const std::string& name);
     void MakeDataFiles();
     // Prepares all of the files before the first takes its name, and makes none when one fails: investments
     // without their portfolios would be no sample.
@@ -94,13 +82,14 @@ class FolderSetup {
     void MakeHelpFile(const std::string& name, std::string_view content);
     // Copies the program of that name from where it lies, empty when it was not found.
     void InstallProgram(const std::string& name, const std::string& from);
-    void CopyProgram(const std::string& name, const std::string& from, std::string_view content,
-                     ExistingFile existing);
     bool HasDataFolder();
     void AddToDesktop();
 
-    // The outcome of a step that ends with a file of that name: errno has the reason of a failure.
-    void Conclude(bool done, const std::string& name, const std::string& remark);
+    // Writes the file of that name, in the place of one that is there only when `existing` says so.
+    void Write(const std::string& name, std::string_view content, mode_t mode, ExistingFile existing,
+               const std::string& remark = "");
+    // The outcome of a step that ends with a file of that name: 0 or an errno number.
+    void Conclude(int error, const std::string& name, const std::string& remark);
     void Made(const std::string& name, const std::string& remark);
     void Kept(const std::string& name, const std::string& remark);
     void Fail(const std::string& sentence);
@@ -116,7 +105,7 @@ class FolderSetup {
     std::ostream& output_;
     std::ostream& errors_;
     std::string folder_;
-    FolderLock lock_;
+    std::list<FolderLock> locks_;
     bool failed_ = false;
 };
 
@@ -133,9 +122,13 @@ void FolderSetup::Fail(const std::string& sentence) {
     failed_ = true;
 }
 
-void FolderSetup::Conclude(bool done, const std::string& name, const std::string& remark) {
-    const int error = errno;
-    if (done)
+void FolderSetup::Write(const std::string& name, std::string_view content, mode_t mode, ExistingFile existing,
+                        const std::string& remark) {
+    Conclude(WriteWholeFile(PathOf(name), TemporaryFor(name), content, mode, existing), name, remark);
+}
+
+void FolderSetup::Conclude(int error, const std::string& name, const std::string& remark) {
+    if (error == 0)
         Made(name, remark);
     else if (error == EEXIST)
         Kept(name, "");
@@ -165,36 +158,30 @@ bool FolderSetup::FindFolder() {
     return true;
 }
 
-bool FolderSetup::MakeFolder() {
-    const int error = MakeFolders(folder_);
-    if (error != 0)
-        Fail("The folder " + folder_ + " cannot be made: " + Reason(error) + ".");
-    return error == 0;
-}
-
 bool FolderSetup::TakeFolder() {
-    const FolderLock::Outcome outcome = lock_.Take(folder_, "quorvan-cli");
-    const std::string holder = DescribeHolder(lock_.Holder());
-    if (outcome == FolderLock::Outcome::Held)
-        Fail("The folder " + folder_ + " is in use by " + holder + "; close that program first.");
-    if (outcome == FolderLock::Outcome::Doubtful)
-        Fail("The folder " + folder_ + " was in use by " + holder + "; once that program has ended, delete " +
-             PathOf(FolderLock::FileName) + ".");
-    // Where the lock cannot be made nothing else can: what is missing is told file by file.
-    return !failed_;
+    const auto goesOn = [this](const FolderLock& lock, const std::string& folder,
+                               FolderLock::Outcome outcome) {
+        const std::string use = UseOf(lock, folder, outcome);
+        if (!use.empty())
+            Fail("The folder " + folder + use +
+                 (outcome == FolderLock::Outcome::Held ? "; close that program first." : "."));
+        // Where the lock cannot be made nothing else can: what is missing is told file by file.
+        return use.empty();
+    };
+    return TakeFolders(locks_, folder_, {}, ToolName, goesOn);
 }
 
-bool FolderSetup::MakeSubfolder(const std::string& name) {
-    const int error = MakeFolders(PathOf(name));
+bool FolderSetup::MakeFolder(const char* words, const std::string& path) {
+    const int error = MakeFolders(path);
     if (error != 0)
-        Fail(PathOf(name) + " cannot be made: " + Reason(error) + ".");
+        Fail(words + path + " cannot be made: " + Reason(error) + ".");
     return error == 0;
 }
 
 bool FolderSetup::PrepareDataFile(const DataFilePlan& plan) {
     const std::string name = FileOf(plan.stem);
     const std::string temporary = TemporaryFor(name);
-    unlink(temporary.c_str());
+    static_cast<void>(RemoveFile(SystemFiles(), temporary));
     std::vector<COLUMN_ENTRY> columns(plan.columns.begin(), plan.columns.end());
     DATABASE database(nullptr);
     if (database.Create(temporary.c_str(), plan.description, static_cast<int>(columns.size()),
@@ -204,14 +191,15 @@ bool FolderSetup::PrepareDataFile(const DataFilePlan& plan) {
     const int error = errno;
     char message[128] = "";
     database.GetLastError(message);
-    unlink(temporary.c_str());
+    static_cast<void>(RemoveFile(SystemFiles(), temporary));
     Fail(PathOf(name) + " cannot be made: " + message + (error != 0 ? " (" + Reason(error) + ")." : "."));
     return false;
 }
 
 std::string FolderSetup::Present(const std::string& stem) const {
     std::string name = FileOf(stem);
-    return Exists(PathOf(name)) ? name : fs::path(FindCompactionLeftover(PathOf(name))).filename().string();
+    return FileExists(PathOf(name)) ? name
+                                    : fs::path(FindCompactionLeftover(PathOf(name))).filename().string();
 }
 
 void FolderSetup::MakeTogether(std::span<const DataFilePlan> plans) {
@@ -224,7 +212,7 @@ void FolderSetup::MakeTogether(std::span<const DataFilePlan> plans) {
             Kept(present, "");
         else if (prepared)
             Conclude(MoveWithoutReplacing(TemporaryFor(name), PathOf(name)), name, plan.content);
-        unlink(TemporaryFor(name).c_str());
+        static_cast<void>(RemoveFile(SystemFiles(), TemporaryFor(name)));
     }
 }
 
@@ -251,22 +239,14 @@ void FolderSetup::MakeDataFiles() {
 }
 
 void FolderSetup::MakeFile(const std::string& name, std::string_view content) {
-    if (Exists(PathOf(name)))
+    if (FileExists(PathOf(name)))
         Kept(name, "");
     else
-        Conclude(WriteWholeFile(PathOf(name), TemporaryFor(name), content, PrivateFile, ExistingFile::Keep),
-                 name, "");
-}
-
-void FolderSetup::CopyProgram(const std::string& name, const std::string& from, std::string_view content,
-                              ExistingFile existing) {
-    Conclude(WriteWholeFile(PathOf(name), TemporaryFor(name), content,
-                            PermissionsOf(PathOf(name), PrivateProgram), existing),
-             name, "copied from " + from);
+        Write(name, content, PrivateFile, ExistingFile::Keep);
 }
 
 void FolderSetup::InstallProgram(const std::string& name, const std::string& from) {
-    const bool there = Exists(PathOf(name));
+    const bool there = FileExists(PathOf(name));
     std::string content;
     std::string present;
     if (from.empty())
@@ -274,14 +254,13 @@ void FolderSetup::InstallProgram(const std::string& name, const std::string& fro
             Kept(name, "");
         else
             Fail("The program " + name + " was not found beside quorvan-cli; name it with --program FILE.");
-    else if (!ReadWholeFile(from, content, MaxProgramSize))
-        Fail("The program " + from + " cannot be read: " + Reason(errno) + ".");
-    else if (!there)
-        CopyProgram(name, from, content, ExistingFile::Keep);
-    else if (ReadWholeFile(PathOf(name), present, MaxProgramSize) && present == content)
+    else if (const int error = ReadWholeFile(from, content, MaxProgramSize); error != 0)
+        Fail("The program " + from + " cannot be read: " + Reason(error) + ".");
+    else if (there && ReadWholeFile(PathOf(name), present, MaxProgramSize) == 0 && present == content)
         Kept(name, "");
-    else if (options_.updateProgram)
-        CopyProgram(name, from, content, ExistingFile::Replace);
+    else if (!there || options_.updateProgram)
+        Write(name, content, PrivateProgram, there ? ExistingFile::Replace : ExistingFile::Keep,
+              "copied from " + from);
     else
         Kept(name, "it differs from " + from + "; --update-program replaces it");
 }
@@ -306,31 +285,26 @@ int FolderSetup::RemoveFromDesktop() {
 
 void FolderSetup::MakeHelpFile(const std::string& name, std::string_view content) {
     std::string present;
-    if (!Exists(PathOf(name)) || !options_.updateProgram) {
+    if (!FileExists(PathOf(name)) || !options_.updateProgram)
         MakeFile(name, content);
-    } else if (ReadWholeFile(PathOf(name), present, content.size()) && present == content) {
+    else if (ReadWholeFile(PathOf(name), present, content.size()) == 0 && present == content)
         Kept(name, "");
-    } else {
-        Conclude(WriteWholeFile(PathOf(name), TemporaryFor(name), content,
-                                PermissionsOf(PathOf(name), PrivateFile), ExistingFile::Replace),
-                 name, "brought up to date");
-    }
+    else
+        Write(name, content, PrivateFile, ExistingFile::Replace, "brought up to date");
 }
 
 void FolderSetup::MakeHelp() {
-    if (!MakeSubfolder("help"))
+    if (!MakeFolder("", PathOf("help")))
         return;
     MakeHelpFile("help/Quorvan.html", HelpDocument());
-    if (!MakeSubfolder("help/pictures"))
+    if (!MakeFolder("", PathOf("help/pictures")))
         return;
     for (const EmbeddedFile& picture : HelpPictures())
         MakeHelpFile(std::string("help/pictures/") + picture.name, picture.content);
 }
 
 int FolderSetup::Run() {
-    if (!FindFolder() || !MakeFolder())
-        return 1;
-    if (!TakeFolder())
+    if (!FindFolder() || !MakeFolder("The folder ", folder_) || !TakeFolder())
         return 1;
     output_ << "Quorvan folder " << folder_ << '\n';
     MakeDataFiles();

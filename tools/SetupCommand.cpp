@@ -1,19 +1,13 @@
-#include "tools/SetupCommand.h"
-
 #include <CLI/CLI.hpp>
 #include <filesystem>
 #include <iostream>
 #include <memory>
 
+#include "tools/Commands.h"
 #include "tools/DesktopFiles.h"
 #include "tools/Setup.h"
 
 namespace {
-
-std::filesystem::path OwnPath() {
-    std::error_code error;
-    return std::filesystem::read_symlink("/proc/self/exe", error);
-}
 
 // The program lies beside quorvan-cli, above its bin folder, or in its own folder of the same build. Empty
 // when it is in none of them.

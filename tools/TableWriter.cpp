@@ -1,16 +1,20 @@
 #include "tools/TableWriter.h"
 
 #include <algorithm>
+#include <cerrno>
 #include <charconv>
 #include <cmath>
 #include <iterator>
 #include <nlohmann/json.hpp>
 #include <set>
+#include <unistd.h>
 
-#include "tools/DisplayText.h"
 #include "util/Numbers.h"
+#include "util/Utf8.h"
 
 namespace {
+
+constexpr std::size_t PieceSize = std::size_t{256} * 1024;
 
 // The shortest text that reads back as the same number, without an exponent as long as that is no burden.
 void AppendShortest(std::string& out, float value) {
@@ -27,25 +31,39 @@ void AppendShortest(std::string& out, float value) {
 
 } // namespace
 
-void CELL::SetText(std::string_view bytes) {
+void TextOutput::Write(std::string_view text) {
+    kept_ += text;
+    if (kept_.size() >= PieceSize)
+        Flush();
+}
+
+int TextOutput::Flush() {
+    std::string_view rest = kept_;
+    while (error_ == 0 && !rest.empty()) {
+        const ssize_t written = write(descriptor_, rest.data(), rest.size());
+        if (written >= 0)
+            rest.remove_prefix(static_cast<std::size_t>(written));
+        else if (errno != EINTR)
+            error_ = errno;
+    }
+    kept_.clear();
+    return error_;
+}
+
+void Cell::SetText(std::string_view bytes) {
     kind = Kind::Text;
     text = bytes;
 }
 
-void CELL::SetNumber(std::int64_t whole) {
+void Cell::SetNumber(std::int64_t whole) {
     kind = Kind::Number;
     number = whole;
 }
 
-void CELL::SetFloat(float single, int shownDecimals) {
+void Cell::SetFloat(float single, int shownDecimals) {
     kind = Kind::Float;
     value = single;
     decimals = shownDecimals;
-}
-
-void CELL::SetTruth(bool truth) {
-    kind = Kind::Truth;
-    number = truth ? 1 : 0;
 }
 
 // An object whose members keep their order, and whose values are replaced row by row.
@@ -61,9 +79,9 @@ class TableWriter::JsonLine {
         }
     }
 
-    [[nodiscard]] std::string Text(std::span<const CELL> row) {
+    [[nodiscard]] std::string Text(std::span<const Cell> row) {
         auto member = object_.begin();
-        for (const CELL& cell : row)
+        for (const Cell& cell : row)
             *member++ = ValueOf(cell);
         return object_.dump(-1, ' ', false, Json::error_handler_t::replace) + '\n';
     }
@@ -73,17 +91,17 @@ class TableWriter::JsonLine {
     using Json = nlohmann::basic_json<nlohmann::ordered_map, std::vector, std::string, bool, std::int64_t,
                                       std::uint64_t, float>;
 
-    static Json ValueOf(const CELL& cell) {
+    static Json ValueOf(const Cell& cell) {
         switch (cell.kind) {
-        case CELL::Kind::Text:
+        case Cell::Kind::Text:
             return cell.text;
-        case CELL::Kind::Number:
+        case Cell::Kind::Number:
             return cell.number;
-        case CELL::Kind::Float:
+        case Cell::Kind::Float:
             return cell.value;
-        case CELL::Kind::Truth:
+        case Cell::Kind::Truth:
             return cell.number != 0;
-        case CELL::Kind::Nothing:
+        case Cell::Kind::Nothing:
             break;
         }
         return nullptr;
@@ -105,35 +123,35 @@ TableWriter::TableWriter(OutputFormat format, const std::vector<std::string>& na
 TableWriter::~TableWriter() = default;
 
 // The cell's text in a table or in tab-separated text.
-void TableWriter::Render(const CELL& cell) {
+void TableWriter::Render(const Cell& cell) {
     char buffer[64];
     field_.clear();
     switch (cell.kind) {
-    case CELL::Kind::Text:
+    case Cell::Kind::Text:
         AppendEscaped(field_, cell.text);
         break;
-    case CELL::Kind::Number:
+    case Cell::Kind::Number:
         field_.append(buffer, std::to_chars(buffer, std::end(buffer), cell.number).ptr);
         break;
-    case CELL::Kind::Float:
+    case Cell::Kind::Float:
         if (format_ == OutputFormat::Table && FormatFixed(cell.value, buffer, sizeof(buffer), cell.decimals))
             field_ = buffer;
         else
             AppendShortest(field_, cell.value);
         break;
-    case CELL::Kind::Truth:
+    case Cell::Kind::Truth:
         field_ = cell.number != 0 ? "yes" : "no";
         break;
-    case CELL::Kind::Nothing:
+    case Cell::Kind::Nothing:
         break;
     }
 }
 
-void TableWriter::Measure(std::span<const CELL> row) {
+void TableWriter::Measure(std::span<const Cell> row) {
     for (std::size_t i = 0; format_ == OutputFormat::Table && i < row.size(); ++i) {
         Render(row[i]);
         widths_[i] = std::max(widths_[i], DisplayWidth(field_));
-        right_[i] = row[i].kind == CELL::Kind::Number || row[i].kind == CELL::Kind::Float;
+        right_[i] = row[i].kind == Cell::Kind::Number || row[i].kind == Cell::Kind::Float;
     }
 }
 
@@ -147,7 +165,7 @@ void TableWriter::WriteHeading() {
         output_.Write(line_ += '\n');
 }
 
-void TableWriter::WriteRow(std::span<const CELL> row) {
+void TableWriter::WriteRow(std::span<const Cell> row) {
     if (json_) {
         output_.Write(json_->Text(row));
         return;
@@ -155,7 +173,7 @@ void TableWriter::WriteRow(std::span<const CELL> row) {
     line_.clear();
     for (std::size_t i = 0; i < row.size(); ++i) {
         Render(row[i]);
-        const bool number = row[i].kind == CELL::Kind::Number || row[i].kind == CELL::Kind::Float;
+        const bool number = row[i].kind == Cell::Kind::Number || row[i].kind == Cell::Kind::Float;
         AppendAligned(i, number, i + 1 == row.size());
     }
     output_.Write(line_ += '\n');

@@ -5,9 +5,29 @@
 #include <memory>
 #include <span>
 #include <string>
+#include <string_view>
 #include <vector>
 
-#include "tools/TextOutput.h"
+// Text for an open file descriptor, kept back and written in large pieces. The first failure ends it: what
+// comes later is dropped, and the owner asks for the failure when it is done. It neither opens nor closes the
+// descriptor. Used on one thread.
+class TextOutput {
+  public:
+    explicit TextOutput(int descriptor) : descriptor_(descriptor) {}
+    TextOutput(const TextOutput&) = delete;
+    TextOutput& operator=(const TextOutput&) = delete;
+
+    void Write(std::string_view text);
+    // Writes what was kept back. Returns 0, or the errno number of the first failure since the beginning.
+    int Flush();
+    // False once writing has failed: there is no use in going on.
+    [[nodiscard]] bool IsWorking() const { return error_ == 0; }
+
+  private:
+    int descriptor_;
+    int error_ = 0;
+    std::string kept_;
+};
 
 enum class OutputFormat {
     Table, // aligned with blanks, under a heading line
@@ -16,7 +36,7 @@ enum class OutputFormat {
 };
 
 // One value of a row. A row's cells are filled again and again, so that their texts keep their room.
-struct CELL {
+struct Cell {
     enum class Kind {
         Nothing, // empty; null in JSON
         Text,    // bytes; what is no valid UTF-8 becomes U+FFFD in JSON
@@ -33,8 +53,14 @@ struct CELL {
     void SetText(std::string_view bytes);
     void SetNumber(std::int64_t whole);
     void SetFloat(float single, int shownDecimals);
-    void SetTruth(bool truth);
 };
+
+[[nodiscard]] inline Cell TextCell(std::string_view text) {
+    return {Cell::Kind::Text, std::string(text)};
+}
+[[nodiscard]] inline Cell NumberCell(std::int64_t number) {
+    return {Cell::Kind::Number, {}, number};
+}
 
 // Writes rows of cells as a table, as tab-separated text or as JSON lines. It keeps no row: for a table, all
 // rows are to be measured before the first is written, and those not measured stand out of line.
@@ -45,15 +71,15 @@ class TableWriter {
     ~TableWriter();
 
     // Makes the columns of a table as wide as this row needs; nothing in the other formats.
-    void Measure(std::span<const CELL> row);
+    void Measure(std::span<const Cell> row);
     // Writes the heading line, which JSON has none of. To be called once, before the first row.
     void WriteHeading();
-    void WriteRow(std::span<const CELL> row);
+    void WriteRow(std::span<const Cell> row);
 
   private:
     class JsonLine;
     void AppendAligned(std::size_t column, bool toTheRight, bool last);
-    void Render(const CELL& cell);
+    void Render(const Cell& cell);
 
     OutputFormat format_;
     std::vector<std::string> names_;

@@ -5,8 +5,9 @@
 #include <cstring>
 
 #include "db/Errors.h"
-#include "tools/DisplayText.h"
 #include "tools/RecordFields.h"
+#include "tools/Sentences.h"
+#include "util/Utf8.h"
 
 namespace {
 
@@ -15,10 +16,6 @@ std::size_t DataSize(std::span<const COLUMN_ENTRY> columns) {
     for (const COLUMN_ENTRY& column : columns)
         size = std::max(size, column.offset + column.size);
     return static_cast<std::size_t>(size);
-}
-
-std::string Counted(std::size_t count, const char* thing) {
-    return std::to_string(count) + " " + thing + (count == 1 ? "" : "s");
 }
 
 // A text of any bytes between quotation marks.
@@ -30,7 +27,7 @@ std::string Quoted(std::string_view text) {
 
 } // namespace
 
-TextCheck::TextCheck(std::span<const COLUMN_ENTRY> columns, const TEXT_FORMAT& format,
+TextCheck::TextCheck(std::span<const COLUMN_ENTRY> columns, const TextFormat& format,
                      const std::string& separators)
     : columns_(columns),
       characters_(format.characters),

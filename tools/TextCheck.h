@@ -6,12 +6,12 @@
 #include <string_view>
 #include <vector>
 
-#include "db/File.h"
 #include "db/RecordText.h"
 #include "db/TextFile.h"
+#include "util/File.h"
 
 // How records are written as lines of text, and read.
-struct TEXT_FORMAT {
+struct TextFormat {
     std::string separator = "\t"; // behind each field; read, any one of its characters ends a field
     bool characters = false;      // a byte is the character of that code instead of a number
     bool heading = false;         // the first line names the columns
@@ -26,8 +26,7 @@ struct TEXT_FORMAT {
 class TextCheck {
   public:
     // `separators` are the characters that end a field, those at the end of a line included.
-    TextCheck(std::span<const COLUMN_ENTRY> columns, const TEXT_FORMAT& format,
-              const std::string& separators);
+    TextCheck(std::span<const COLUMN_ENTRY> columns, const TextFormat& format, const std::string& separators);
 
     // Reads the whole text. A line may have `longest` characters, its newline included. Returns 0 or, with
     // errno set, the engine's code of what hindered it.

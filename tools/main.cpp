@@ -1,13 +1,8 @@
 #include <CLI/CLI.hpp>
 #include <csignal>
 #include <exception>
-#include <iostream>
 
-#include "tools/ChartCommand.h"
-#include "tools/DbCommand.h"
-#include "tools/QuoteCommand.h"
-#include "tools/ReportCommand.h"
-#include "tools/SetupCommand.h"
+#include "tools/Commands.h"
 
 namespace {
 
@@ -40,7 +35,6 @@ int main(int argc, char** argv) {
     try {
         return Run(argc, argv);
     } catch (const std::exception& error) {
-        std::cerr << "quorvan-cli: " << error.what() << '\n';
-        return 1;
+        return Fail(error.what());
     }
 }

@@ -4,21 +4,14 @@
 #include <cstdarg>
 #include <cstdio>
 #include <cstring>
+#include <string>
+
+#include "util/Utf8.h"
 
 namespace {
 
 bool IsContinuation(char byte) {
     return (static_cast<unsigned char>(byte) & 0xC0U) == 0x80U;
-}
-
-// How many bytes the character that begins with `lead` takes; 1 for a byte that begins none.
-std::size_t CharacterLength(char lead) {
-    const auto byte = static_cast<unsigned char>(lead);
-    if (byte >= 0xF0U && byte <= 0xF4U)
-        return 4;
-    if (byte >= 0xE0U)
-        return byte <= 0xEFU ? 3 : 1;
-    return byte >= 0xC2U ? 2 : 1;
 }
 
 } // namespace
@@ -30,9 +23,8 @@ std::string_view CutToBytes(std::string_view text, std::size_t maxBytes) {
     std::size_t lead = maxBytes;
     while (lead > 0 && maxBytes - lead < 3 && IsContinuation(text[lead]))
         --lead;
-    if (lead + CharacterLength(text[lead]) > maxBytes && !IsContinuation(text[lead]))
-        return text.substr(0, lead);
-    return text.substr(0, maxBytes);
+    const bool reachesOver = lead + DecodeFirst(text.substr(lead)).length > maxBytes;
+    return text.substr(0, reachesOver ? lead : maxBytes);
 }
 
 bool CopyText(char* target, std::size_t size, std::string_view text) {
@@ -53,18 +45,13 @@ bool FormatInto(char* target, std::size_t size, const char* format, ...) {
     va_start(arguments, format);
     const int length = std::vsnprintf(target, size, format, arguments);
     va_end(arguments);
-    if (length < 0) {
-        target[0] = '\0';
-        return false;
-    }
-    if (static_cast<std::size_t>(length) < size)
+    if (length >= 0 && static_cast<std::size_t>(length) < size)
         return true;
-    // The text that was cut off is not known any more, so a character that the cut may have split is judged
-    // by what is left of it: a lead byte that wants more bytes than follow it.
-    std::size_t lead = size - 1;
-    while (lead > 0 && size - 1 - lead < 3 && IsContinuation(target[lead - 1]))
-        --lead;
-    if (lead > 0 && lead - 1 + CharacterLength(target[lead - 1]) > size - 1)
-        target[lead - 1] = '\0';
+    // Once more in full, so that it can be cut between characters.
+    std::string whole(static_cast<std::size_t>(std::max(length, 0)) + 1, '\0');
+    va_start(arguments, format);
+    std::vsnprintf(whole.data(), whole.size(), format, arguments);
+    va_end(arguments);
+    CopyText(target, size, whole);
     return false;
 }

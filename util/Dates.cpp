@@ -65,7 +65,7 @@ int FormatDate(const char* yyyymmdd, char* out, int style) {
     int month = 0;
     int day = 0;
     // The widths bound every number, so none can be out of range.
-    (void)std::sscanf(yyyymmdd, "%4d%2d%2d", &year, &month, &day);
+    static_cast<void>(std::sscanf(yyyymmdd, "%4d%2d%2d", &year, &month, &day));
     if (style == 0)
         FormatWithName(out, ShortMonthNames, year, month, day);
     else if (style == 1)

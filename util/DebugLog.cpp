@@ -13,6 +13,6 @@ void PrintDebugStatement(const char* text, const char* logPath) {
         return;
     // A log that cannot take the text loses it: there is nobody to tell.
     if (!clear)
-        (void)!write(file, text, std::strlen(text));
+        static_cast<void>(!write(file, text, std::strlen(text)));
     close(file);
 }

@@ -3,12 +3,10 @@
 #include <algorithm>
 #include <cstdlib>
 #include <limits>
-#include <memory>
-#include <sys/stat.h>
 
 #include "util/CharacterBuffer.h"
+#include "util/File.h"
 #include "util/Strings.h"
-#include "util/WholeFile.h"
 
 namespace {
 
@@ -95,12 +93,6 @@ std::string WithEntry(std::string_view rest, std::string_view section, std::stri
     return content;
 }
 
-// Where `path` leads to when it is a symbolic link: the link must stay. Empty when it leads nowhere.
-std::string FollowLinks(const char* path) {
-    const std::unique_ptr<char, decltype(&std::free)> resolved(realpath(path, nullptr), &std::free);
-    return resolved == nullptr ? std::string() : std::string(resolved.get());
-}
-
 } // namespace
 
 INI_FILEx::INI_FILEx(const char* path) {
@@ -110,7 +102,7 @@ INI_FILEx::INI_FILEx(const char* path) {
 
 bool INI_FILEx::Find(std::string_view section, std::string_view key, std::string& value) const {
     std::string content;
-    if (!ReadWholeFile(filePath_, content, MaxFileSize))
+    if (ReadWholeFile(filePath_, content, MaxFileSize) != 0)
         return false;
     const std::string header = HeaderOf(section);
     bool inSection = false;
@@ -147,17 +139,15 @@ int INI_FILEx::ReadInt(const char* section, const char* key, int defaultValue) c
 
 int INI_FILEx::WriteString(const char* section, const char* key, const char* value) const {
     std::string content;
-    struct stat status {};
     const std::string file = FollowLinks(filePath_);
-    if (!CanBeWritten(section, key, value) || !ReadWholeFile(file, content, MaxFileSize) ||
-        stat(file.c_str(), &status) != 0)
+    if (!CanBeWritten(section, key, value) || ReadWholeFile(file, content, MaxFileSize) != 0)
         return 1;
     const std::string changed = WithEntry(content, section, key, value);
     // Nothing to rewrite: the eleven column widths of a closing window are mostly the old ones.
     if (changed == content)
         return 0;
     const std::string temporary = file.substr(0, file.rfind('/') + 1) + "ini_file.tmp";
-    return WriteWholeFile(file, temporary, changed, status.st_mode & 07777U, ExistingFile::Replace) ? 0 : 1;
+    return WriteWholeFile(file, temporary, changed, 0600, ExistingFile::Replace) == 0 ? 0 : 1;
 }
 
 int INI_FILEx::WriteInt(const char* section, const char* key, int value) const {

@@ -1,17 +1,9 @@
 #include "util/Strings.h"
 
-#include <cstring>
-
-#include "util/LoweredText.h"
-
 namespace {
 
 bool IsAscii(char c) {
-    return static_cast<unsigned char>(c) < FirstNonAscii;
-}
-
-char Lowered(char c) {
-    return static_cast<char>(LoweredByte(static_cast<unsigned char>(c)));
+    return static_cast<std::uint8_t>(c) < FirstNonAscii;
 }
 
 char Raised(char c) {
@@ -36,7 +28,7 @@ void Trim(char* text) {
 
 void strlwr(char* text) {
     for (; *text != '\0' && IsAscii(*text); ++text)
-        *text = Lowered(*text);
+        *text = static_cast<char>(LoweredByte(static_cast<std::uint8_t>(*text)));
 }
 
 void strupr(char* text) {
@@ -44,16 +36,12 @@ void strupr(char* text) {
         *text = Raised(*text);
 }
 
+std::string Lowered(std::string_view text) {
+    std::string lowered(text);
+    strlwr(lowered.data());
+    return lowered;
+}
+
 int strcmpi(const char* a, const char* b) {
-    // While the texts agree, both reach their first byte of 128 or above together: one flag serves both.
-    bool fold = true;
-    for (;; ++a, ++b) {
-        fold = fold && IsAscii(*a) && IsAscii(*b);
-        const auto x = static_cast<unsigned char>(fold ? Lowered(*a) : *a);
-        const auto y = static_cast<unsigned char>(fold ? Lowered(*b) : *b);
-        if (x != y)
-            return x < y ? -1 : 1;
-        if (x == 0)
-            return 0;
-    }
+    return Lowered(a).compare(Lowered(b));
 }

@@ -10,7 +10,7 @@
 
 namespace {
 
-struct [[gnu::packed]] CUT_DATA {
+struct [[gnu::packed]] CutData {
     INVESTMENT_DATA investment;
     std::int32_t record; // its number in invest.db
 };
@@ -19,7 +19,7 @@ struct [[gnu::packed]] CUT_DATA {
 std::vector<COLUMN_ENTRY> Columns() {
     std::vector<COLUMN_ENTRY> columns(InvestmentColumns.begin(), InvestmentColumns.end());
     columns.push_back({"Unused", ColumnType::String, sizeof(INVESTMENT_DATA::Unused), 0, 0});
-    columns.push_back({"Record", ColumnType::Long, sizeof(CUT_DATA::record), 0, 0});
+    columns.push_back({"Record", ColumnType::Long, sizeof(CutData::record), 0, 0});
     return columns;
 }
 
@@ -30,11 +30,11 @@ bool AreSame(const INVESTMENT_DATA& one, const INVESTMENT_DATA& other) {
     return bytes(one) == bytes(other);
 }
 
-bool ReadAll(const std::string& path, std::vector<CUT_DATA>* kept) {
+bool ReadAll(const std::string& path, std::vector<CutData>* kept) {
     DATABASE file(path.c_str());
     DATABASE_HEADER header{};
     file.GetHeaderInfo(&header);
-    if (!file.IsOpen() || file.IsDamaged() || header.recordLength != sizeof(CUT_DATA) + 1)
+    if (!file.IsOpen() || file.IsDamaged() || header.recordLength != sizeof(CutData) + 1)
         return false;
     kept->resize(static_cast<std::size_t>(header.recordCount));
     for (std::size_t i = 0; i < kept->size(); ++i)
@@ -46,7 +46,7 @@ bool ReadAll(const std::string& path, std::vector<CUT_DATA>* kept) {
 } // namespace
 
 bool CutFile::Keep(std::span<const INVESTMENT_DATA> investments, std::span<const long> numbers) const {
-    std::vector<CUT_DATA> records(investments.size());
+    std::vector<CutData> records(investments.size());
     for (std::size_t i = 0; i < records.size(); ++i)
         records[i] = {investments[i], static_cast<std::int32_t>(numbers[i])};
     std::error_code error;
@@ -59,7 +59,7 @@ bool CutFile::Keep(std::span<const INVESTMENT_DATA> investments, std::span<const
     DATABASE file(nullptr, operations_);
     if (file.Create(unfinished.c_str(), "cut investments", static_cast<int>(columns.size()),
                     columns.data()) == 0 &&
-        file.AppendAll(records.data(), sizeof(CUT_DATA), static_cast<std::int32_t>(records.size())) >= 0 &&
+        file.AppendAll(records.data(), sizeof(CutData), static_cast<std::int32_t>(records.size())) >= 0 &&
         file.Sync() == 0 && RenameFile(operations_, unfinished, path_) == 0 &&
         SyncFolderOf(operations_, path_) == 0)
         return true;
@@ -78,11 +78,11 @@ CutFile::Outcome CutFile::Restore(DATABASE& investments) const {
     std::error_code error;
     if (!std::filesystem::exists(path_, error))
         return Outcome::NothingKept;
-    std::vector<CUT_DATA> kept;
+    std::vector<CutData> kept;
     if (!ReadAll(path_, &kept))
         return Outcome::Failed;
     std::vector<INVESTMENT_DATA> lost;
-    for (const CUT_DATA& each : kept) {
+    for (const CutData& each : kept) {
         INVESTMENT_DATA present;
         const bool read = ReadInvestment(investments, each.record, &present);
         if (!read && investments.GetLastError(nullptr) == DatabaseError::ReadFailed)

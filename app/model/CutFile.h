@@ -4,7 +4,7 @@
 #include <string>
 
 #include "app/model/RecordLayouts.h"
-#include "db/File.h"
+#include "util/File.h"
 
 class DATABASE;
 

@@ -2,10 +2,9 @@
 
 #include <algorithm>
 #include <cerrno>
-#include <cstdint>
 #include <cstdlib>
+#include <fcntl.h>
 #include <filesystem>
-#include <memory>
 #include <string_view>
 #include <system_error>
 
@@ -163,30 +162,11 @@ int DailyBackup::CopyToPart(const std::string& file) {
         error = target.Open(part, FileMode::CreateNew);
     if (error != 0)
         return error;
-    error = CopyBytes(source, target);
-    if (error == 0)
-        error = target.TakeOwnerForCopy(source);
-    if (error == 0)
-        error = target.Sync();
+    error = target.CopyFrom(source, &stop_);
     target.Close();
     if (error != 0)
         static_cast<void>(RemoveFile(operations_, part));
     return error;
-}
-
-int DailyBackup::CopyBytes(const File& source, File& target) const {
-    constexpr std::size_t bufferSize = 256 * 1024;
-    const auto buffer = std::make_unique<char[]>(bufferSize);
-    std::size_t got = bufferSize;
-    for (std::int64_t offset = 0; got == bufferSize; offset += static_cast<std::int64_t>(got)) {
-        if (stop_)
-            return ECANCELED;
-        if (const int error = source.ReadUpTo(offset, buffer.get(), bufferSize, &got); error != 0)
-            return error;
-        if (const int error = target.WriteAt(offset, buffer.get(), got); error != 0)
-            return error;
-    }
-    return 0;
 }
 
 void DailyBackup::RemoveOldOf(const std::string& file) {
@@ -207,4 +187,31 @@ void DailyBackup::RemoveOldOf(const std::string& file) {
     std::sort(days.begin(), days.end());
     for (std::size_t i = 0; i + Generations - 1 < days.size(); ++i)
         static_cast<void>(RemoveFile(operations_, Kept(file, days[i])));
+}
+
+int BackedUpFiles::Open(const char* path, int flags, mode_t mode) {
+    const int descriptor = FileOperations::Open(path, flags, mode);
+    if (descriptor >= 0 && (flags & O_ACCMODE) == O_RDWR && (flags & O_CREAT) == 0)
+        dataFiles_.push_back(descriptor);
+    return descriptor;
+}
+
+int BackedUpFiles::Close(int descriptor) {
+    std::erase(dataFiles_, descriptor);
+    return FileOperations::Close(descriptor);
+}
+
+ssize_t BackedUpFiles::WriteAt(int descriptor, const void* data, std::size_t size, off_t offset) {
+    BeforeChange(descriptor);
+    return FileOperations::WriteAt(descriptor, data, size, offset);
+}
+
+int BackedUpFiles::Truncate(int descriptor, off_t length) {
+    BeforeChange(descriptor);
+    return FileOperations::Truncate(descriptor, length);
+}
+
+void BackedUpFiles::BeforeChange(int descriptor) {
+    if (std::find(dataFiles_.begin(), dataFiles_.end(), descriptor) != dataFiles_.end())
+        static_cast<void>(backup_.Keep());
 }

@@ -8,7 +8,7 @@
 #include <thread>
 #include <vector>
 
-#include "db/File.h"
+#include "util/File.h"
 
 // Keeps what data files held before the first change of a day: in the folder "backups" beside each, a file
 // such as invest.db.2026-11-22. Each of these is complete and on the disk under its name, or is not there at
@@ -17,7 +17,7 @@
 // copy is made.
 //
 // It does not see changes by itself: who is about to change one of the files calls Keep first (BackedUpFiles
-// does so for a DATABASE), and holds the FolderLock of all their folders (FoldersOf) all the while. The
+// does so for a DATABASE), and holds the FolderLock of all their folders (TakeFolders) all the while. The
 // application object or a tool owns it. Keep may be called from any thread; everything else belongs to the
 // owner's.
 class DailyBackup {
@@ -63,7 +63,6 @@ class DailyBackup {
     [[nodiscard]] int KeepAll();
     [[nodiscard]] int KeepFile(const std::string& file);
     [[nodiscard]] int CopyToPart(const std::string& file);
-    [[nodiscard]] int CopyBytes(const File& source, File& target) const;
     void EndPreparing();
     void RemoveOldOf(const std::string& file);
 
@@ -81,4 +80,26 @@ class DailyBackup {
     std::time_t dayBegin_ = 0; // the day of which Keep has made sure
     std::time_t dayEnd_ = 0;
     int error_ = 0; // of that day
+};
+
+// The system's file operations for one DATABASE, which let the day's backup be kept before the data file
+// changes. A file that was opened for reading and writing counts as data file; new files, such as a
+// compaction's temporary one, do not, nor does the rename of a compaction: it drops nothing but deleted
+// records. A backup that fails does not keep the change from being made: see DailyBackup::OnFailure.
+//
+// The owner of the DATABASE owns it and lets it live longer; it is used on the thread that uses the DATABASE.
+class BackedUpFiles : public FileOperations {
+  public:
+    explicit BackedUpFiles(DailyBackup& backup) : backup_(backup) {}
+
+    int Open(const char* path, int flags, mode_t mode) override;
+    int Close(int descriptor) override;
+    ssize_t WriteAt(int descriptor, const void* data, std::size_t size, off_t offset) override;
+    int Truncate(int descriptor, off_t length) override;
+
+  private:
+    void BeforeChange(int descriptor);
+
+    DailyBackup& backup_;
+    std::vector<int> dataFiles_; // descriptors
 };

@@ -1,6 +1,7 @@
 #include "app/model/DataFileOpening.h"
 
 #include <cerrno>
+#include <fcntl.h>
 #include <system_error>
 
 #include "db/Compaction.h"
@@ -32,7 +33,24 @@ std::string WhyNotWritten(const std::string& path, FileOperations& operations) {
     return error == 0 ? std::string() : ": " + Reason(error);
 }
 
+int Refuse() {
+    errno = EROFS;
+    return -1;
+}
+
 } // namespace
+
+int ReadOnlyFiles::Open(const char* path, int flags, mode_t mode) {
+    return (flags & O_ACCMODE) == O_RDONLY ? FileOperations::Open(path, flags, mode) : Refuse();
+}
+
+int ReadOnlyFiles::Rename(const char* /*from*/, const char* /*to*/) {
+    return Refuse();
+}
+
+int ReadOnlyFiles::Remove(const char* /*path*/) {
+    return Refuse();
+}
 
 std::unique_ptr<DATABASE> OpenDataFile(const std::string& folder, const std::string& name,
                                        bool (*holds)(DATABASE&), DataFileUse use, FileOperations& operations,

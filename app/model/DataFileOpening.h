@@ -7,6 +7,15 @@
 
 // How the program opens a data file at start: what it found is said in words that a person understands.
 
+// The system's file operations for looking only: what would make or change a file fails with EROFS. A
+// DATABASE opens its file for reading then. It holds no state.
+class ReadOnlyFiles : public FileOperations {
+  public:
+    int Open(const char* path, int flags, mode_t mode) override;
+    int Rename(const char* from, const char* to) override;
+    int Remove(const char* path) override;
+};
+
 enum class DataFileUse { Change, Look };
 
 // Opens the data file `name` in the folder for a DATABASE that holds(), and appends to `complaints`, each

@@ -12,10 +12,7 @@ namespace {
 constexpr int Parts = 32; // a stock's price is shown in thirty-seconds
 
 bool IsStock(const char* type) {
-    char lower[NameSize];
-    CopyText(lower, type);
-    strlwr(lower);
-    return std::strstr(lower, "stock") != nullptr;
+    return Lowered(type).find("stock") != std::string::npos;
 }
 
 } // namespace

@@ -66,12 +66,6 @@ bool CollectNames(DATABASE& database, std::vector<std::string>* names) {
         });
 }
 
-// A name as queries compare it.
-std::string Lowered(std::string name) {
-    strlwr(name.data());
-    return name;
-}
-
 } // namespace
 
 bool HoldsPortfolios(DATABASE& database) {

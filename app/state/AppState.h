@@ -44,6 +44,9 @@ struct AppState {
     bool clipboardIsOnlyCopy = false; // cut, and not pasted since
 };
 
+// The main window's; the price update finds the window by it.
+inline constexpr const char* WindowTitle = "Quorvan";
+
 // Null when there is no application object.
 extern AppState* app_state;
 

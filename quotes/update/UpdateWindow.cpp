@@ -12,7 +12,6 @@
 
 namespace {
 
-constexpr const char* MainWindowTitle = "Quorvan";
 constexpr float Width = 200;
 constexpr float Height = 60;
 constexpr float Margin = 10;
@@ -37,7 +36,7 @@ UpdateWindow::UpdateWindow(BPoint leftTop, const char* portfolioName, DATABASE* 
       recordNumbers_(RecordNumbers(list)),
       database_(database),
       portfolioName_(portfolioName) {
-    if (const BWindow* mainWindow = GetAppWindow(be_app, MainWindowTitle))
+    if (const BWindow* mainWindow = GetAppWindow(be_app, WindowTitle))
         mainWindow_ = BMessenger(mainWindow);
     AddStatusBar(static_cast<float>(recordNumbers_.size()) + 1);
     Show();

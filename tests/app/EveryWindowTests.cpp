@@ -9,7 +9,6 @@
 
 #include "ColumnListView/CLVColumn.h"
 #include "tools/FirstFiles.h"
-#include "tools/SampleData.h"
 #include "util/IniFile.h"
 
 namespace {

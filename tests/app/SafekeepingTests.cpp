@@ -6,10 +6,8 @@
 
 #include "DataFolder.h"
 #include "InChild.h"
-#include "app/model/BackedUpFiles.h"
 #include "app/model/DailyBackup.h"
 #include "app/model/DataFileOpening.h"
-#include "app/model/ReadOnlyFiles.h"
 #include "db/FaultyFiles.h"
 
 namespace {

@@ -13,6 +13,7 @@
 #include <fcntl.h>
 
 #include "db/Database.h"
+#include "util/File.h"
 
 enum class Fault {
     Error,         // the call does nothing and fails

@@ -7,31 +7,9 @@
 #include "CommandTest.h"
 #include "db/Database.h"
 #include "tools/DataFileTool.h"
-#include "tools/DisplayText.h"
 #include "tools/RecordFields.h"
 
 namespace {
-
-TEST(DisplayText, StaysOnItsLineAndCanBeTurnedBack) {
-    const std::tuple<std::string, const char*, std::size_t> cases[] = {
-        {"plain", "plain", 5},
-        {"a\tb\nc\rd\\e", "a\\tb\\nc\\rd\\\\e", 13},
-        {"\x1B[31m\x7F", "\\x1B[31m\\x7F", 12},
-        {"\xC3\xA4 \xE0\xA0\x80\xF0\x90\x80\x80", "\xC3\xA4 \xE0\xA0\x80\xF0\x90\x80\x80", 4},
-        {"\xE6\x97\xA5", "\xE6\x97\xA5", 2},                  // wide
-        {"e\xCC\x81", "e\xCC\x81", 1},                        // combining
-        {"\xC2\x9B", "\\xC2\\x9B", 8},                        // a control character
-        {"\xE2\x80\xAE", "\\xE2\\x80\\xAE", 12},              // turns the direction
-        {"\xFF \xC3 \xC0\x80", "\\xFF \\xC3 \\xC0\\x80", 18}, // no UTF-8, and an overlong form
-        {"\xED\xA0\x80\xF4\x90\x80\x80", "\\xED\\xA0\\x80\\xF4\\x90\\x80\\x80", 28}, // beyond Unicode
-    };
-    for (const auto& [bytes, shown, width] : cases) {
-        std::string escaped;
-        AppendEscaped(escaped, bytes);
-        EXPECT_EQ(escaped, shown);
-        EXPECT_EQ(DisplayWidth(escaped), width) << shown;
-    }
-}
 
 TEST(RecordFields, KnowWhatAColumnHolds) {
     COLUMN_ENTRY column{};
@@ -39,17 +17,13 @@ TEST(RecordFields, KnowWhatAColumnHolds) {
          {"A:string:1", "A:byte:1", "A:short:2", "A:long:4", "A:float:4", "A:date:4", "A:time:3"})
         EXPECT_EQ(ParseColumn(least, &column), "") << least;
     for (const char* wrong :
-         {"Price",     "Price:",     ":long",       "a b:long",      "A:text:4",
-          "A:string",  "A:string:0", "A:string:x",  "A:byte:0",      "A:short:1",
-          "A:long:3",  "A:float:3",  "A:date:3",    "A:time:2",      "A:long:32768",
-          "A:long::2", "A:float::0", "A:float::16", "A:float:8:2:1", "a-name-of-thirty-two-characters-:long"})
+         {"Price", "Price:", ":long", "a b:long", "A:string", "A:string:0", "A:string:x", "A:byte:0",
+          "A:short:1", "A:long:3", "A:float:3", "A:date:3", "A:time:2", "A:long:32768", "A:long::2",
+          "A:float::0", "A:float::16", "A:float:8:2:1", "a-name-of-thirty-two-characters-:long"})
         EXPECT_NE(ParseColumn(wrong, &column), "") << wrong;
-    // One narrower than its type, as another program may have made it.
-    std::array<std::uint8_t, 3> data{};
+    std::array<std::uint8_t, 2> data{}; // narrower than its type, as another program may have made it
     EXPECT_EQ(StoreField({"A", ColumnType::Long, 2, 0, 0}, "65535", data.data()), "");
-    EXPECT_NE(StoreField({"A", ColumnType::Long, 2, 0, 0}, "65536", data.data()), "")
-        << "it would come back as 0";
-    EXPECT_EQ(data[2], 0);
+    EXPECT_NE(StoreField({"A", ColumnType::Long, 2, 0, 0}, "65536", data.data()), "") << "it would read 0";
 }
 
 class DbCommandTest : public CommandTest {
@@ -107,11 +81,14 @@ TEST_F(DbCommandTest, ShowsRecords) {
         {"query 'Tag = 0' --and 'Price > 0' --or 'Tag = -7' --sort Price --format tsv",
          heading_ + apple_ + acorn_},
         {"query --sort Price --and 'Name contains F' --case --format tsv", heading_ + acorn_},
+        {"export a.txt --separator ';' --heading --where 'Price > 0' --sort Price --format tsv",
+         "exported\n2\n"},
         {"columns", "name   type    width  offset  decimals\nName   string     16       0\n"
                     "Price  float       4      16         3\nDay    date        4      20\n"
                     "At     time        3      24\nTag    byte        1      27\n"},
-        {"check", "nothing is wrong\n"},
         {"check --repair", "nothing is wrong\n"}});
+    EXPECT_EQ(folder_.Read("a.txt"), "Name;Price;Day;At;Tag;\n\xC3\xA4pfel\tb;0.100;00000000;000000;0;\n"
+                                     "Acorn Fund;12.500;20240229;091530;-7;\n");
     EXPECT_EQ(Printed("quorvan-cli --version"), "quorvan-cli 1.0\n");
     EXPECT_EQ(Printed("db() { quorvan-cli db b.db $*; }; db create --column record:byte; db append record=1; "
                       "db query --format json"),
@@ -131,31 +108,11 @@ TEST_F(DbCommandTest, ChangesRecords) {
                                           "1\t\xC3\xA4pfel\\tb\t0.2\t19990105\t000000\t0\n"},
         {"lock --where 'Tag = -7' --format tsv", "locked\n1\n"},
         {"unlock 0 1", "1 record unlocked\n", {"record 1: 2403 "}},
-        {"lock 0 1", "2 records locked\n"},
-        {"unlock --where 'Day = 19990105'", "1 record unlocked\n"},
         {"undelete 2", "1 record undeleted\n"},
         {"delete --where 'Tag = 0'", "2 records deleted\n"},
-        {"compact --format json", "{\"removed\":2}\n"},
-        {"delete 0", "1 record deleted\n"},
-        {"append", "record 1 appended\n"},
-        {"compact", "compacted: 1 record removed, 1 record left\n"}});
+        {"compact --format json", "{\"removed\":2}\n"}});
     EXPECT_TRUE(Works("quorvan-cli db a.db info --format json", R"("description":"sample")"));
     EXPECT_TRUE(folder_.Says(R"("records":1,"deleted":0,"active":1,"columns":5,)"));
-}
-
-TEST_F(DbCommandTest, TextGoesOutAndComesBack) {
-    MakeSample();
-    Db({{"set 'Tag = 65' --all", "3 records changed\n"},
-        {"set 'Name = plain' --where 'Tag = 65'", "3 records changed\n"},
-        {"export a.txt --separator ';' --characters --heading --where 'Price < 100' --sort Price",
-         "3 records exported to a.txt\n"}});
-    EXPECT_EQ(folder_.Read("a.txt"), "Name;Price;Day;At;Tag;\nplain;-1000000.000;00000000;000000;A;\n"
-                                     "plain;0.100;00000000;000000;A;\nplain;12.500;20240229;091530;A;\n");
-    Db({{"delete --where 'Price = 12.5'", "1 record deleted\n"},
-        {"load a.txt --separators '#;' --characters --heading --format tsv", "loaded\n3\n"},
-        {"query 'Price = 12.5' --format tsv", heading_ + "5\tplain\t12.5\t20240229\t091530\t65\n"},
-        {"export a.txt --format tsv", "exported\n5\n"}});
-    EXPECT_EQ(folder_.Read("a.txt").substr(0, 33), "plain\t0.100\t00000000\t000000\t65\t\np");
 }
 
 // Bytes of every kind in all ways that they can be written, and what is at the limits of its column.
@@ -173,10 +130,15 @@ TEST_F(DbCommandTest, WhatIsExportedLoadsBackTheSame) {
         {"append Name=\xC3\xBF\\\\ A=+7 F=1.6777217e7 D=20240229", "record 2 appended\n"},
         {"query --format tsv", content}});
     const std::string whole = folder_.Read("a.db");
-    for (const std::string options : {"", " --characters", " --heading", " --characters --heading"}) {
-        Db({{"export a.txt" + options, "3 records exported to a.txt\n"},
+    const std::pair<std::string, std::string> ways[] = {
+        {"", ""},
+        {"--characters", "--characters"},
+        {"--heading", "--heading"},
+        {"--characters --heading --separator '|'", "--characters --heading --separators '#|'"}};
+    for (const auto& [out, in] : ways) {
+        Db({{"export a.txt " + out, "3 records exported to a.txt\n"},
             {"delete 0 1 2", "3 records deleted\n"},
-            {"load a.txt" + options, "3 records loaded from a.txt\n"},
+            {"load a.txt " + in, "3 records loaded from a.txt\n"},
             {"compact", "compacted: 3 records removed, 3 records left\n"},
             {"query --format tsv", content}});
         folder_.Write("a.db", whole);
@@ -210,9 +172,8 @@ TEST_F(DbCommandTest, TextWithAWrongLineIsNotLoaded) {
     MakeSample();
     const std::string before = folder_.Read("a.db");
     const std::string good = "Birch\t+1e1\t20240229\t091530\t-7\t\r\n";
-    const std::string names = "Name\tPrice\tDay\tAt\tTag\n";
+    const std::string names = heading_.substr(heading_.find('\t') + 1);
     const std::string rest = "\t5\t20240229\t091530\t0\n";
-    const std::string longLine(500, 'x');
     const std::array<std::string, 3> cases[] = {
         // a text, the options, the only thing wrong
         {good + "\n\n \t5\t2026\t000000\t0", "", "4: Day: '2026' is no date of the form YYYYMMDD"},
@@ -221,26 +182,19 @@ TEST_F(DbCommandTest, TextWithAWrongLineIsNotLoaded) {
         {std::string("a\0b", 3) + rest, "", "1: Name: 'a\\x00b' has a byte 0"},
         {good + "a\t\t20240229\t091530\t0\n", "",
          "2: 4 fields, the data file has 5 columns (an empty field needs a"},
-        {good + "a\t1\t20240229\t091530\t0\tmore\n", "", "2: 6 fields, the data file has 5 columns\n"},
-        {good + longLine + "\n" + good, "", "2: the line is longer than "},
-        {names + good, "", "1: Price: 'Price' is no number"},
         {good, "--heading", "1: 'Birch' stands where the column Name is to be named"},
-        {"", "--heading", "1: 0 fields, the data file has 5 columns"},
         {names + "a\n", "--heading", "2: 1 field, the data file has 5 columns"},
     };
     for (const auto& [text, options, wrong] : cases) {
         folder_.Write("a.txt", text);
         EXPECT_TRUE(folder_.Fails("quorvan-cli db a.db load a.txt " + options, 1, "a.txt, line " + wrong));
     }
-    folder_.Write("a.txt", longLine + "\na\n"); // each is told
-    Db({{"load a.txt", "", {"line 1: the line is longer than ", "line 2: 1 field, the data file has 5"}}});
+    folder_.Write("a.txt", std::string(500, 'x') + "\n\n6" + rest + "6\t6" + rest); // each is told
+    Db({{"load a.txt", "", {"line 1: the line is longer than ", "line 4: 6 fields, the data file has 5"}}});
     EXPECT_EQ(folder_.Read("a.db"), before);
-    folder_.Write("a.txt", "\xEF\xBB\xBF\r\n" + good + "\r\n");
-    Db({{"load a.txt", "1 record loaded from a.txt\n"}});
-    folder_.Write("a.txt", names + "\n" + good);
+    folder_.Write("a.txt", "\xEF\xBB\xBF" + names + "\r\n" + good + "\r\n");
     Db({{"load a.txt --heading", "1 record loaded from a.txt\n"},
-        {"query 'Name = Birch' --format tsv", heading_ + "3\tBirch\t10\t20240229\t091530\t-7\n"
-                                                         "4\tBirch\t10\t20240229\t091530\t-7\n"}});
+        {"query 'Name = Birch' --format tsv", heading_ + "3\tBirch\t10\t20240229\t091530\t-7\n"}});
 }
 
 TEST_F(DbCommandTest, DamageIsToldAndMended) {
@@ -252,12 +206,12 @@ TEST_F(DbCommandTest, DamageIsToldAndMended) {
         "problem      36          the header counts 9 records, the file has room for 3\n";
     folder_.Write("a.db", bytes.replace(36, 1, "\x09"));
     Db({{"query 'Tag = -7' --format tsv", heading_ + acorn_, {"the file is damaged"}, 0},
-        {"check", finding, {}, 1}});
-    EXPECT_TRUE(Works("quorvan-cli db a.db info", "read_only    no\ndamaged      yes\n"));
-    EXPECT_EQ(folder_.Read("a.db"), bytes);
-    Db({{"check --repair", finding, {"the file as it was is " + path_ + ".before-repair\n"}, 0}});
+        {"check", finding, {}, 1},
+        {"check --repair", finding, {"the file as it was is " + path_ + ".before-repair\n"}, 0}});
+    EXPECT_EQ(folder_.Read("a.db.before-repair"), bytes);
     EXPECT_EQ(folder_.Read("a.db"), whole);
     folder_.Write("a.db", bytes.replace(52 + 32, 1, "\x63"));
+    EXPECT_TRUE(Works("quorvan-cli db a.db info", "read_only    no\ndamaged      yes\n"));
     EXPECT_EQ(folder_.Run("quorvan-cli db a.db check --repair --format json"), 1)
         << "a count is mended, and something is left";
     EXPECT_TRUE(folder_.Complains("the counts are mended") && folder_.Complains("is left as it is"));
@@ -274,9 +228,8 @@ TEST_F(DbCommandTest, DamageIsToldAndMended) {
 TEST_F(DbCommandTest, KeepsTheStateBeforeTheDaysFirstChange) {
     MakeSample();
     const std::string before = folder_.Read("a.db");
-    ASSERT_TRUE(Works("rm -r backups; mkdir else; ln -s ../a.db else/link.db"));
-    EXPECT_TRUE(Works("quorvan-cli db else/link.db delete 0"));
-    Db({{"compact", "compacted: 1 record removed, 2 records left\n"}});
+    ASSERT_TRUE(Works("rm -r backups; mkdir else; ln -s ../a.db else/link.db; "
+                      "quorvan-cli db else/link.db delete 0; quorvan-cli db a.db compact"));
     EXPECT_EQ(Printed("cat backups/a.db.*"), before) << "there is one backup, of what was there at first";
     EXPECT_FALSE(folder_.Has("Quorvan.lock") || folder_.Has("else/backups"));
 }
@@ -293,25 +246,22 @@ TEST_F(DbCommandTest, ADiskThatFailsIsTold) {
         }
         int reads = 1000, syncs = 0;
     } disk;
-    const auto told = [&disk](const std::string& path, const std::function<int(DataFileTool&)>& work) {
+    const auto told = [&](const std::string& name, const std::function<int(DataFileTool&)>& work) {
         TextOutput output(STDOUT_FILENO);
         std::ostringstream errors;
-        DataFileTool tool(path, OutputFormat::Table, output, errors, disk);
+        DataFileTool tool(folder_.File(name), OutputFormat::Table, output, errors, disk);
         const int status = tool.Finish(work(tool));
         EXPECT_EQ(status, errors.str().empty() ? 0 : 1);
         return errors.str();
     };
     MakeSample();
     const std::string reason = ": 3001 Sync error - unable to reach the disk (Input/output error)\n";
-    EXPECT_EQ(told(path_, [](auto& tool) { return tool.Append({}); }), "quorvan-cli: " + path_ + reason);
-    for (const int syncs : {0, 1}) { // the second is of the folder, for the file's name
-        const std::string made = folder_.File("made" + std::to_string(syncs));
-        disk.syncs = syncs;
-        EXPECT_EQ(told(made, [](auto& tool) { return tool.Create("", {"A:long"}); }),
-                  "quorvan-cli: " + made + reason);
-    }
+    EXPECT_EQ(told("a.db", [](auto& tool) { return tool.Append({}); }), "quorvan-cli: " + path_ + reason);
+    disk.syncs = 1; // the second is of the folder, for the file's name
+    EXPECT_EQ(told("new", [](auto& tool) { return tool.Create("", {"A:long"}); }),
+              "quorvan-cli: " + folder_.File("new") + reason);
     int failed = 0;
-    for (disk.reads = 0; !told(path_, [](auto& tool) { return tool.Query({}); }).empty();
+    for (disk.reads = 0; !told("a.db", [](auto& tool) { return tool.Query({}); }).empty();
          disk.reads = ++failed)
         ASSERT_LT(failed, 100);
     EXPECT_GT(failed, 2) << "opening, and reading the records";
@@ -324,23 +274,14 @@ TEST_F(DbCommandTest, OutputThatNobodyTakesIsNoFailure) {
     EXPECT_EQ(folder_.Read("status") + folder_.Errors(), "0\n");
 }
 
-// What --help offers stands in the manual page as well.
 TEST_F(DbCommandTest, ManualNamesEveryCommandAndOption) {
-    ASSERT_EQ(folder_.Run("tr -d '\\\\' <'" QUORVAN_SOURCES "/doc/man/quorvan-cli.1'"), 0);
-    const std::string manual = folder_.Output();
-    int found = 0;
-    for (const char* arguments :
-         {"", "setup", "quote", "chart", "report", "db", "db x info", "db x query", "db x set", "db x append",
-          "db x delete", "db x check", "db x create", "db x export", "db x load"}) {
-        ASSERT_EQ(folder_.Run("quorvan-cli " + std::string(arguments) +
-                              " --help | sed -n 's/^  \\(-., *\\)*\\(--[^ ,]*\\).*/\\2/p; "
-                              "/^Subcommands:/,$ s/^  \\([^ ]\\+\\).*/\\1/p'"),
-                  0);
-        std::istringstream words(folder_.Output());
-        for (std::string word; words >> word; ++found)
-            EXPECT_NE(manual.find(word), manual.npos) << arguments << ": " << word;
-    }
-    EXPECT_GT(found, 40);
+    EXPECT_TRUE(Works(R"sh(for command in '' setup quote chart report db 'db x info' 'db x query' 'db x set' \
+            'db x append' 'db x delete' 'db x check' 'db x create' 'db x export' 'db x load'; do
+            quorvan-cli $command --help | sed -n 's/^  \(-., *\)*\(--[^ ,]*\).*/\2/p
+                /^Subcommands:/,$ s/^  \([^ ]\+\).*/\1/p'
+        done | sort -u >offered; [ $(wc -l <offered) -gt 30 ] && tr -d '\\' <')sh" QUORVAN_SOURCES
+                      R"sh(/doc/man/quorvan-cli.1' >man; while read -r word; do
+            grep -qF -e "$word" man || { echo "$word" >&2; false; } || exit 1; done <offered)sh"));
 }
 
 } // namespace

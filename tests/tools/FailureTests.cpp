@@ -18,20 +18,13 @@ TEST_F(FailureTest, AWrongCommandLineDoesNothing) {
         {"quote ''", "a ticker is empty"},
         {"quote \"$(printf 'A\\tB')\"", "control characters"},
         {"quote A --source 'net h /q?s= Last'", "it has fewer than five fields"},
-        {"quote A --source ';net h /q?s= Last 2'", "is no source"},
-        {"quote A --source 'a b c d 1'", "is no source"},
         {"chart A 2008 -o new.png", "there is no chart '2008'; there are 2000 to 2007"},
-        {"chart A Value -o new.png", "there is no chart 'Value'"},
         {"chart A 2000 -o new.gif", "must end with .png, .svg or .pdf"},
         {"chart A 2000 -o new.png --scale nan", "the scale must be a number"},
-        {"chart A 2000 -o new.png --scale 17", "--scale"},
-        {"report A -o new.pdf --page 2", "--page"},
-        {"setup new --simple", "--simple"},
         {"setup new --desktop --remove-desktop", "excludes"},
         {"db new.db query --format xml", "'xml' is none of table, tsv and json"},
         {"db new.db set 'N = 1'", "--where or --all"},
         {"db new.db set 'N = 1' --where ''", "the statement is empty"},
-        {"db new.db set 'N = 1' --all --where 'N = 2'", "excludes"},
         {"db new.db delete 1 --where 'N = 1'", "excludes"},
         {"db new.db undelete --where 'N = 1'", "RECORD"},
         {"db new.db delete", "A record's number"},
@@ -51,9 +44,8 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
         mkdir other held left block folder.png; mkfifo p; ln -s p pipe.png; echo old | tee old.png >old.pdf
         cp home/*.db other; cp a.db other/invest.db; cp a.db held; ln -s ../held/a.db other/link.db
         cp a.db block; echo >block/backups; cp a.db left/a.bak; cp a.db left/b.new
-        cp -r home helpless; rm -r helpless/help; echo >helpless/help
         cp -r home new; rm new/quorvan; cp "$(command -v quorvan-cli)" alone
-        cp -r home "$(printf '\377')"; cp -r home "$(printf 'a\tb')"
+        cp -r home "$(printf '\377')"
         XDG_DATA_HOME=$PWD/full quorvan-cli setup home --program built --desktop
         rm -r full/applications; echo >full/applications
         mkdir kept; cp a.db kept; chmod 444 kept/a.db; chmod 777 . kept)sh"));
@@ -67,80 +59,51 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
 
     const std::string held = "in use by quorvan (process " + std::to_string(getpid()) + " on ";
     const std::string doubt = "once that program has ended, delete " + folder_.File("other/Quorvan.lock");
-    const std::string damage = "its header disagrees with it; nothing is changed before `check --repair`";
-    const std::string left = ", as an interrupted compaction leaves it; `check --repair`";
     const std::string chart = "quorvan-cli chart --home home 'My Retirement Fund' 2000 -o ";
     const std::string report = "quorvan-cli report --home home 'My Retirement Fund' -o ";
-    const std::string create = "quorvan-cli db new.db create --column N:byte ";
     const std::pair<std::string, std::string> cases[] = {
         {"quorvan-cli chart --home home A 2000 -o old.png", "there is no portfolio \"A\" in home"},
         {chart + "missing/new.png", "missing/new.png cannot be written: No such file"},
         {"ulimit -f 4; trap '' XFSZ; " + chart + "old.png", "old.png cannot be written: "},
-        {chart + "folder.png", "cannot be written: Is a directory"},
         {chart + "pipe.png", "pipe.png cannot be written: "},
-        {"quorvan-cli report --home home '' -o old.pdf", "there is no portfolio \"\" in home"},
         {"quorvan-cli report --home nowhere A -o old.pdf", "nowhere/portfol.db cannot be opened"},
-        {"quorvan-cli report --home other 'My Retirement Fund' -o old.pdf",
-         "other/invest.db has other columns"},
-        {report + "missing/new.pdf", "missing/new.pdf cannot be written: No such file"},
-        {report + ".", ". cannot be written: Is a directory"},
+        {"quorvan-cli report --home other 'My Retirement Fund' -o a", "other/invest.db has other columns"},
         {"ulimit -f 4; " + report + "old.pdf", "old.pdf cannot be written: "},
         {Setup("", "built/home"), "cannot be made: Not a directory"},
-        {Setup("", "/proc/no/home"), "The folder /proc/no/home cannot be made: No such file"},
-        {Setup("", "built"), "cannot be made: Not a directory"},
         {Setup("", ""), "the name is empty"},
         {Setup("", std::string(109, 'd')), "path is too long"},
         {Setup("", "held"), held},
         {Setup("", "other"), doubt},
-        {Setup("", "helpless"), "helpless/help cannot be made: Not a directory"},
         {"./alone setup new", "The program quorvan was not found beside quorvan-cli"},
         {"quorvan-cli setup home --program nothing --desktop", "nothing cannot be read: No such file"},
-        {Setup("--remove-desktop", ""), "the name is empty"},
         {"XDG_DATA_HOME=relative HOME= " + Setup("--remove-desktop"), "There is no home folder"},
-        {"XDG_DATA_HOME=relative HOME= " + Setup("--desktop"), "There is no home folder"},
         {"XDG_DATA_HOME=$PWD/full " + Setup("--desktop"), ".desktop cannot be made: Not a directory"},
         {Setup("--desktop", "\xFF"), "its path has a sign that no entry can hold"},
-        {Setup("--desktop", "a\tb"), "its path has a sign that no entry can hold"},
-        {"quorvan-cli db none.db info", "1103 Open error - file could not be opened: No such file"},
         {"quorvan-cli db folder.png info", "this is no regular file"},
         {"quorvan-cli db short.db info", "header and 2 columns need 140"},
         {"quorvan-cli db a.db query Name=", ": a condition is a column, an operator and a value"},
-        {"quorvan-cli db a.db query 'Nome = x'", "1602 Query error - invalid column name"},
         {"quorvan-cli db a.db query --sort Nome", "1701 "},
         {"quorvan-cli db a.db query >/dev/full", "the output cannot be written: No space left on device"},
         {"quorvan-cli db a.db append N=1 N=2", "the column N is given twice"},
-        {"quorvan-cli db a.db append N=", "N: '' is no whole number"},
         {"quorvan-cli db a.db append Nn=1", "'Nn=1' begins with no column's name"},
-        {"quorvan-cli db a.db append =1", "'=1' begins with no column's name"},
         {"quorvan-cli db a.db set N=1 --all", ": a change is a column, an operator and a value"},
-        {"quorvan-cli db a.db set 'Name + x' --all", "2203 "},
         {"quorvan-cli db a.db load a.db", "a.db: 1801 "},
         {"quorvan-cli db a.db load no/where", "no/where: 1801 Load error - unable to open file (No such"},
         {"quorvan-cli db a.db export no/where", "1901 Export error - unable to open output file (No such"},
         {"quorvan-cli db a.db create --column N:byte", "1102 Create error - file already exists"},
-        {"quorvan-cli db no/a.db create --column N:byte", "(No such file or directory)"},
-        {create + "--column N:long", "the column N is given twice"},
-        {create + "--description thirty-two-bytes-thirty-two-bytes",
-         "the description is longer than 31 bytes"},
-        {"quorvan-cli db bad.db append", damage},
-        {"quorvan-cli db bad.db set 'N = 1' --all", damage},
-        {"quorvan-cli db bad.db delete 0", damage},
-        {"quorvan-cli db bad.db compact", damage},
-        {"quorvan-cli db bad.db load old.png", damage},
+        {"quorvan-cli db n create --column N:byte --column N:long", "the column N is given twice"},
+        {"quorvan-cli db n create --column N:byte --description thirty-two-bytes-thirty-two-bytes",
+         "31 bytes"},
+        {"quorvan-cli db bad.db append",
+         "its header disagrees with it; nothing is changed before `check --repair`"},
         {reader + " db kept/a.db append", "the file may only be read, not changed"},
-        {reader + " db kept/a.db compact", "the file may only be read, not changed"},
         {"quorvan-cli db held/a.db append", held},
-        {"quorvan-cli db other/link.db compact", held},
         {"quorvan-cli db held/a.db check --repair", held},
-        {"quorvan-cli db held/new.db create --column N:byte", held},
         {"quorvan-cli db other/portfol.db append", doubt},
-        {"quorvan-cli db left/a.db info",
-         "1103 Open error - file could not be opened: there is no such file, but "},
-        {"quorvan-cli db left/b.db info", "left/b.new" + left},
-        {"quorvan-cli db left/a.db create --column N:byte", "left/a.bak" + left},
-        {"quorvan-cli db left/b.db create --column N:byte", "; nothing is made"},
-        {"quorvan-cli db block/a.db append",
-         "block/a.db: the day's backup cannot be made in the folder backups"},
+        {"quorvan-cli db left/a.db info", "file could not be opened: there is no such file, but "},
+        {"quorvan-cli db left/b.db create --column N:byte",
+         "left/b.new, as an interrupted compaction leaves it; `check --repair`"},
+        {"quorvan-cli db block/a.db append", "the day's backup cannot be made in the folder backups"},
     };
     for (const auto& [command, reason] : cases)
         EXPECT_TRUE(folder_.Fails(command, 1, reason));

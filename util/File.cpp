@@ -1,8 +1,11 @@
-#include "db/File.h"
+#include "util/File.h"
 
+#include <array>
 #include <cerrno>
 #include <cstdio>
+#include <cstdlib>
 #include <filesystem>
+#include <memory>
 #include <utility>
 
 #include <fcntl.h>
@@ -197,11 +200,27 @@ int File::TakeOwnerAndMode(const File& other) {
                                                                : TakeOwner(theirs, theirs.st_mode & 07777);
 }
 
-int File::TakeOwnerForCopy(const File& other) {
+int File::CopyFrom(const File& other, const std::atomic<bool>* stop) {
     struct stat theirs {};
-    return operations_->Status(other.descriptor_, &theirs) < 0
-               ? errno
-               : TakeOwner(theirs, PermissionsBeside(theirs.st_mode));
+    int error = ErrorOf(operations_->Status(other.descriptor_, &theirs));
+    error = error != 0 ? error : CopyBytes(other, stop);
+    error = error != 0 ? error : TakeOwner(theirs, PermissionsBeside(theirs.st_mode));
+    return error != 0 ? error : Sync();
+}
+
+int File::CopyBytes(const File& other, const std::atomic<bool>* stop) {
+    constexpr std::size_t bufferSize = std::size_t{256} * 1024;
+    const auto buffer = std::make_unique<char[]>(bufferSize);
+    std::size_t got = bufferSize;
+    for (std::int64_t offset = 0; got == bufferSize; offset += static_cast<std::int64_t>(got)) {
+        if (stop != nullptr && *stop)
+            return ECANCELED;
+        if (const int error = other.ReadUpTo(offset, buffer.get(), bufferSize, &got); error != 0)
+            return error;
+        if (const int error = WriteAt(offset, buffer.get(), got); error != 0)
+            return error;
+    }
+    return 0;
 }
 
 int File::TakeOwner(const struct stat& theirs, mode_t mode) {
@@ -212,6 +231,10 @@ int File::TakeOwner(const struct stat& theirs, mode_t mode) {
         if (operations_->SetOwner(descriptor_, theirs.st_uid, theirs.st_gid) < 0)
             mode &= 0777; // another's file: what runs in the owner's name must not move to us
     }
+    return SetMode(mode);
+}
+
+int File::SetMode(mode_t mode) {
     return ErrorOf(Retry([&] { return operations_->SetMode(descriptor_, mode); }));
 }
 
@@ -275,4 +298,71 @@ std::string FollowLinks(const std::string& path) {
         current = folder / target; // an absolute target replaces the folder
     }
     return {};
+}
+
+int ReadWholeFile(const std::string& path, std::string& content, std::size_t maxBytes) {
+    content.clear();
+    File file;
+    std::int64_t length = 0;
+    int error = file.Open(path, FileMode::ReadOnly);
+    error = error != 0 ? error : file.Length(&length);
+    if (error == 0 && length > static_cast<std::int64_t>(maxBytes))
+        error = EFBIG;
+    if (error != 0)
+        return error;
+    content.resize(static_cast<std::size_t>(length));
+    std::size_t got = 0;
+    error = file.ReadUpTo(0, content.data(), content.size(), &got);
+    content.resize(error != 0 ? 0 : got);
+    return error;
+}
+
+int WriteWholeFile(const std::string& path, const std::string& temporaryPath, std::string_view content,
+                   mode_t mode, ExistingFile existing) {
+    struct stat replaced {};
+    if (existing == ExistingFile::Replace && ::stat(path.c_str(), &replaced) == 0)
+        mode = replaced.st_mode & 0777;
+    File file;
+    int error = RemoveFile(SystemFiles(), temporaryPath);
+    if (error == 0 || error == ENOENT)
+        error = file.Open(temporaryPath, FileMode::CreateNew);
+    if (error != 0)
+        return error;
+    error = file.WriteAt(0, content.data(), content.size());
+    error = error != 0 ? error : file.SetMode(mode);
+    error = error != 0 ? error : file.Sync();
+    if (error == 0)
+        error = existing == ExistingFile::Replace ? RenameFile(SystemFiles(), temporaryPath, path)
+                                                  : MoveWithoutReplacing(temporaryPath, path);
+    if (error != 0)
+        static_cast<void>(RemoveFile(SystemFiles(), temporaryPath));
+    return error;
+}
+
+int MoveWithoutReplacing(const std::string& from, const std::string& to) {
+    const int error = ErrorOf(renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, to.c_str(), RENAME_NOREPLACE));
+    // Not every file system knows that call; a second name for the file does not replace either.
+    if (error != EINVAL && error != ENOSYS)
+        return error;
+    return ErrorOf(::link(from.c_str(), to.c_str()) == 0 ? ::unlink(from.c_str()) : -1);
+}
+
+int TryWritingIn(const std::string& folder) {
+    std::string path = folder + "/Quorvan.XXXXXX";
+    const int file = mkostemp(path.data(), O_CLOEXEC);
+    if (file < 0)
+        return errno;
+    unlink(path.c_str());
+    // About what a day of changes to settings and data files takes.
+    const std::array<char, 65536> bytes{};
+    const ssize_t written = write(file, bytes.data(), bytes.size());
+    int error = 0;
+    if (written < 0)
+        error = errno;
+    else if (written < static_cast<ssize_t>(bytes.size()))
+        error = ENOSPC;
+    // Some file systems find out only now.
+    if (close(file) != 0 && error == 0)
+        error = errno;
+    return error;
 }

@@ -1,0 +1,57 @@
+#pragma once
+
+#include <filesystem>
+#include <memory>
+#include <string>
+
+#include "platform/Application.h"
+
+namespace CLI {
+class App;
+class Option;
+} // namespace CLI
+class DATABASE;
+
+// The subcommands of quorvan-cli. Each function adds one to `application`. When the command line names it,
+// parsing runs it and stores the process's exit status in `status`, which must live as long as the
+// application.
+void AddChartCommand(CLI::App& application, int& status);
+void AddDbCommand(CLI::App& application, int& status);
+void AddQuoteCommand(CLI::App& application, int& status);
+void AddReportCommand(CLI::App& application, int& status);
+void AddSetupCommand(CLI::App& application, int& status);
+
+// What they share. Options must live as long as the application.
+
+struct PortfolioOptions {
+    std::string home;
+    std::string portfolio;
+    std::string output;
+};
+
+// Adds PORTFOLIO and --output, of which `outputHelp` tells.
+void AddPortfolioOptions(CLI::App& command, PortfolioOptions& options, const char* outputHelp);
+// Adds --home; `home` stays empty when it is not given.
+CLI::Option* AddHomeOption(CLI::App& command, std::string& home);
+
+// The executable that runs; empty when it cannot be found out.
+[[nodiscard]] std::filesystem::path OwnPath();
+
+// The folder that --home named or else the usual one: that of quorvan-cli itself when it holds an invest.db,
+// else "Quorvan" in the person's own folder.
+[[nodiscard]] std::string HomeFolder(const std::string& named);
+
+// Opens the investment file of the portfolio, which must be listed in the portfolio file, for looking;
+// `options` gets the folder that is used and the portfolio's name as it is written there. Null, with one
+// sentence for the person, when a file cannot be read or there is no such portfolio.
+[[nodiscard]] std::unique_ptr<DATABASE> OpenInvestments(PortfolioOptions& options);
+
+// Writes the sentence for the person. Returns `status`.
+int Fail(const std::string& sentence, int status = 1);
+
+// An application for commands that draw and show nothing: it needs no display and does not even look for one.
+// Made on the main thread, in place of a BApplication.
+class OffscreenApplication : public BApplication {
+  public:
+    OffscreenApplication();
+};
