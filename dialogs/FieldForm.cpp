@@ -17,7 +17,7 @@ FieldForm::FieldForm(BPoint where, const char* title, const char* label, std::si
     : BDialog({where.x, where.y, where.x + FormWidth(Width), where.y + FirstHeight}, title, flags) {
     ResizeTo(Bounds().Width(), 7 * FontHeight());
     const BRect frame(Margin, Margin, Bounds().right - Margin, Margin + 1.5F * FontHeight());
-    field_ = new BTextControl(frame, "text control", label, "", nullptr, B_FOLLOW_LEFT | B_FOLLOW_TOP,
+    field_ = new BTextControl(frame, "text control", label, "", B_FOLLOW_LEFT | B_FOLLOW_TOP,
                               B_WILL_DRAW | B_NAVIGABLE);
     field_->SetDivider(TopView()->StringWidth((label + std::string(" ")).c_str()));
     field_->SetMaxBytes(static_cast<int32>(maxBytes));

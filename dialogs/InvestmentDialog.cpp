@@ -31,7 +31,7 @@ void MarkItem(BMenu* menu, const std::string& label) {
 }
 
 void Warn(const char* text) {
-    (new BAlert("", text, "Ok", nullptr, nullptr, B_WIDTH_AS_USUAL, B_WARNING_ALERT))->Go();
+    (new BAlert("", text, "Ok", nullptr, nullptr, B_WARNING_ALERT))->Go();
 }
 
 const char* WhyNot(InvestmentCheck check) {
@@ -99,7 +99,7 @@ void InvestmentDialog::AddRows() {
 BTextControl* InvestmentDialog::AddTextRow(const char* name, const char* label, const char* text, float width,
                                            int32 maxBytes) {
     const BRect frame(Margin, rowTop_, Margin + width, rowTop_ + FontHeight());
-    auto* control = new BTextControl(frame, name, label, "", nullptr);
+    auto* control = new BTextControl(frame, name, label, "");
     control->SetDivider(divider_);
     control->SetMaxBytes(maxBytes);
     control->SetText(text);

@@ -33,8 +33,6 @@ struct AlertLook {
 
 AlertLook LookOf(alert_type type) {
     switch (type) {
-    case B_EMPTY_ALERT:
-        return {QMessageBox::NoIcon, ""};
     case B_WARNING_ALERT:
         return {QMessageBox::Warning, "Warning"};
     case B_STOP_ALERT:
@@ -118,7 +116,7 @@ int32 ShowAlertAndWait(const AlertText& alert) {
 } // namespace
 
 BAlert::BAlert(const char* title, const char* text, const char* button1, const char* button2,
-               const char* button3, button_width, alert_type type)
+               const char* button3, alert_type type)
     : title_(title ? title : ""), text_(text ? text : ""), type_(type) {
     for (const char* button : {button1, button2, button3})
         if (button)

@@ -29,18 +29,6 @@ constexpr uint8 Spread(int value, int steps) {
     return static_cast<uint8>(value * 255 / (steps - 1));
 }
 
-QImage::Format FormatOf(color_space space) {
-    switch (space) {
-    case B_CMAP8:
-        return QImage::Format_Indexed8;
-    case B_RGBA32:
-        return QImage::Format_ARGB32;
-    case B_RGB32:
-        break;
-    }
-    return QImage::Format_RGB32;
-}
-
 QList<QRgb> MakeColorTable() {
     QList<QRgb> table;
     for (int index = 0; index < 256; index++)
@@ -64,26 +52,21 @@ const QImage& BitmapAccess::Image(const BBitmap& bitmap) {
     return bitmap.pixels_->image;
 }
 
-BBitmap::BBitmap(BRect bounds, color_space space)
-    : bounds_(bounds), space_(space), pixels_(std::make_unique<BitmapPixels>()) {
+BBitmap::BBitmap(BRect bounds, color_space) : bounds_(bounds), pixels_(std::make_unique<BitmapPixels>()) {
     const int width = std::max(1, static_cast<int>(bounds.Width()) + 1);
     const int height = std::max(1, static_cast<int>(bounds.Height()) + 1);
-    pixels_->image = QImage(width, height, FormatOf(space));
-    if (space == B_CMAP8) {
-        pixels_->image.setColorTable(MakeColorTable());
-        pixels_->image.fill(B_TRANSPARENT_MAGIC_CMAP8);
-    } else {
-        pixels_->image.fill(Qt::transparent);
-    }
+    pixels_->image = QImage(width, height, QImage::Format_Indexed8);
+    pixels_->image.setColorTable(MakeColorTable());
+    pixels_->image.fill(B_TRANSPARENT_MAGIC_CMAP8);
 }
 
 BBitmap::~BBitmap() = default;
 
-void BBitmap::SetBits(const void* data, int32 length, int32 offset, color_space space) {
-    if (space != space_ || length < 0 || offset < 0)
+void BBitmap::SetBits(const void* data, int32 length, int32 offset, color_space) {
+    if (length < 0 || offset < 0)
         return;
     QImage& image = pixels_->image;
-    const int rowBytes = image.width() * (space == B_CMAP8 ? 1 : 4);
+    const int rowBytes = image.width();
     const auto* source = static_cast<const uchar*>(data);
     const auto end = static_cast<int32>(std::min(int64{offset} + length, int64{rowBytes} * image.height()));
     for (int32 at = offset; at < end;) {

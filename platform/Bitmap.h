@@ -24,15 +24,13 @@ class BBitmap {
 
     [[nodiscard]] BRect Bounds() const { return bounds_; }
 
-    // Copies length bytes of pixels, rows top to bottom without padding, to the byte offset given. In B_CMAP8
-    // a pixel is one byte; in the other spaces four: blue, green, red, alpha. Bytes beyond the bitmap are
-    // left out.
+    // Copies length bytes of pixels, rows top to bottom without padding, to the byte offset given, one byte a
+    // pixel. Bytes beyond the bitmap are left out.
     void SetBits(const void* data, int32 length, int32 offset, color_space space);
 
   private:
     friend struct BitmapAccess;
 
     BRect bounds_;
-    color_space space_;
     std::unique_ptr<BitmapPixels> pixels_;
 };

@@ -17,15 +17,6 @@ BButton::BButton(BRect frame, const char* name, const char* label, BMessage* mes
                  uint32 flags)
     : BControl(frame, name, label, message, resizingMode, flags,
                std::make_unique<ViewPeer>(new QPushButton)) {
-    BButton::SetLabel(label);
+    ShowLabel(Widget(this), label);
     QObject::connect(Widget(this), &QPushButton::clicked, Widget(this), [this] { Invoke(); });
-}
-
-void BButton::SetLabel(const char* label) {
-    BControl::SetLabel(label);
-    ShowLabel(Widget(this), Label());
-}
-
-bool BButton::IsDefault() const {
-    return Widget(this)->isDefault();
 }

@@ -7,8 +7,4 @@ class BButton : public BControl {
   public:
     BButton(BRect frame, const char* name, const char* label, BMessage* message,
             uint32 resizingMode = B_FOLLOW_LEFT | B_FOLLOW_TOP, uint32 flags = B_WILL_DRAW | B_NAVIGABLE);
-
-    void SetLabel(const char* label) override;
-    // Whether Enter presses it wherever the focus is; set through BWindow::SetDefaultButton.
-    [[nodiscard]] bool IsDefault() const;
 };

@@ -16,16 +16,11 @@ QCheckBox* Widget(const BCheckBox* box) {
 BCheckBox::BCheckBox(BRect frame, const char* name, const char* label, BMessage* message, uint32 resizingMode,
                      uint32 flags)
     : BControl(frame, name, label, message, resizingMode, flags, std::make_unique<ViewPeer>(new QCheckBox)) {
-    BCheckBox::SetLabel(label);
+    ShowLabel(Widget(this), label);
     QObject::connect(Widget(this), &QCheckBox::clicked, Widget(this), [this](bool checked) {
         TakeValue(checked ? B_CONTROL_ON : B_CONTROL_OFF);
         Invoke();
     });
-}
-
-void BCheckBox::SetLabel(const char* label) {
-    BControl::SetLabel(label);
-    ShowLabel(Widget(this), Label());
 }
 
 void BCheckBox::SetValue(int32 value) {

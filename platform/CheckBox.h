@@ -9,6 +9,5 @@ class BCheckBox : public BControl {
     BCheckBox(BRect frame, const char* name, const char* label, BMessage* message,
               uint32 resizingMode = B_FOLLOW_LEFT | B_FOLLOW_TOP, uint32 flags = B_WILL_DRAW | B_NAVIGABLE);
 
-    void SetLabel(const char* label) override;
     void SetValue(int32 value) override;
 };

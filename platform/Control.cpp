@@ -1,7 +1,6 @@
 #include "platform/Control.h"
 
 #include "platform/Window.h"
-#include "platform/private/Convert.h"
 #include "platform/private/ViewPeer.h"
 
 BInvoker::BInvoker(BMessage* message, const BHandler* target) : message_(message) {
@@ -27,36 +26,10 @@ status_t BInvoker::Invoke(BMessage* message) {
 BControl::BControl(BRect frame, const char* name, const char* label, BMessage* message, uint32 resizingMode,
                    uint32 flags, std::unique_ptr<ViewPeer> peer)
     : BView(frame, name, resizingMode, flags, std::move(peer)), BInvoker(message, nullptr) {
-    BControl::SetLabel(label);
+    Peer()->widget->setAccessibleName(QString::fromUtf8(label));
 }
 
 BControl::~BControl() = default;
-
-void BControl::SetLabel(const char* label) {
-    label_ = label ? label : "";
-    if (QWidget* widget = Peer()->widget)
-        widget->setAccessibleName(QString::fromUtf8(label_));
-}
-
-void BControl::SetEnabled(bool enabled) {
-    enabled_ = enabled;
-    if (QWidget* widget = Peer()->widget)
-        widget->setEnabled(enabled);
-}
-
-void BControl::SetFont(const BFont* font, uint32 properties) {
-    BView::SetFont(font, properties);
-    BFont whole;
-    GetFont(&whole);
-    if (QWidget* widget = Peer()->widget)
-        widget->setFont(FontAccess::ToQt(whole));
-}
-
-void BControl::GetPreferredSize(float* width, float* height) const {
-    const QSize size = Peer()->widget->sizeHint();
-    *width = static_cast<float>(size.width() - 1);
-    *height = static_cast<float>(size.height() - 1);
-}
 
 BMessenger BControl::DefaultTarget() const {
     return BMessenger(Window());

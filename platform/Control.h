@@ -34,21 +34,13 @@ constexpr int32 B_CONTROL_OFF = 0;
 constexpr int32 B_CONTROL_ON = 1;
 
 // Base of the controls a person works: a toolkit widget with a label, a value and a message sent to the
-// window (or the target set) when it is worked.
+// window (or the target set) when it is worked. It keeps its label, and the person's font.
 class BControl : public BView, public BInvoker {
   public:
     ~BControl() override;
 
-    virtual void SetLabel(const char* label);
-    [[nodiscard]] const char* Label() const { return label_.c_str(); }
-    virtual void SetEnabled(bool enabled);
-    [[nodiscard]] bool IsEnabled() const { return enabled_; }
     virtual void SetValue(int32 value) { value_ = value; }
     [[nodiscard]] int32 Value() const { return value_; }
-
-    void SetFont(const BFont* font, uint32 properties = B_FONT_ALL) override;
-    // The size at which the control shows all of itself.
-    void GetPreferredSize(float* width, float* height) const;
 
   protected:
     BControl(BRect frame, const char* name, const char* label, BMessage* message, uint32 resizingMode,
@@ -58,7 +50,5 @@ class BControl : public BView, public BInvoker {
     void TakeValue(int32 value) { value_ = value; }
 
   private:
-    std::string label_;
     int32 value_ = B_CONTROL_OFF;
-    bool enabled_ = true;
 };

@@ -73,11 +73,8 @@ void BView::ConstrainClippingRegion(const BRegion* region) {
         painter->setClipping(false);
     if (!region)
         return;
-    QPainterPath path;
-    path.setFillRule(Qt::WindingFill);
-    for (int index = 0; index < region->CountRects(); index++)
-        path.addRect(ToQt(region->RectAt(index)));
-    painter->setClipPath(path, peer_->hasBaseClip ? Qt::IntersectClip : Qt::ReplaceClip);
+    const QRectF area = region->Frame().IsValid() ? ToQt(region->Frame()) : QRectF();
+    painter->setClipRect(area, peer_->hasBaseClip ? Qt::IntersectClip : Qt::ReplaceClip);
 }
 
 void BView::GetClippingRegion(BRegion* region) const {

@@ -23,7 +23,6 @@ class BHandler {
     virtual void MessageReceived(BMessage* message);
 
     [[nodiscard]] const char* Name() const { return name_.c_str(); }
-    virtual void SetName(const char* name) { name_ = name ? name : ""; }
 
     // The looper whose queue delivers this handler's messages; null while it belongs to none.
     [[nodiscard]] virtual BLooper* Looper() const { return nullptr; }
@@ -32,7 +31,7 @@ class BHandler {
     friend class BLooper;
     friend class BMessenger;
 
-    std::string name_;
+    const std::string name_;
     std::shared_ptr<HandlerToken> token_;
 };
 

@@ -1,7 +1,6 @@
 #include "platform/Kernel.h"
 
 #include <atomic>
-#include <chrono>
 #include <cstring>
 #include <map>
 #include <memory>
@@ -44,7 +43,6 @@ struct Thread {
     std::atomic<bool> stopRequested{false};
     bool started = false;
     bool finished = false;
-    int32 result = 0;
 };
 
 std::map<sem_id, std::shared_ptr<Semaphore>> gSemaphores;
@@ -81,10 +79,10 @@ void RunThread(const std::shared_ptr<Thread>& thread, thread_id id) {
     // what it does at its end.
     bool started = false;
     LookAtKernelState([&] { started = thread->started; });
-    const int32 result = started ? thread->function(thread->data) : 0;
+    if (started)
+        thread->function(thread->data);
     tCurrentThread = nullptr;
     ChangeKernelState([&] {
-        thread->result = result;
         thread->finished = true;
         gThreads.erase(id);
     });
@@ -94,13 +92,6 @@ void RequestStop(Thread& thread) {
     ChangeKernelState([&] { thread.stopRequested = true; });
     const std::uint64_t one = 1;
     [[maybe_unused]] const auto written = write(thread.stopFd, &one, sizeof one);
-}
-
-status_t WaitForEnd(const std::shared_ptr<Thread>& thread, int32* result, bigtime_t timeout) {
-    const status_t status = WaitUntil([&] { return thread->finished; }, timeout);
-    if (status == B_OK && result)
-        *result = thread->result;
-    return status;
 }
 
 } // namespace
@@ -129,18 +120,6 @@ status_t delete_sem(sem_id sem) {
     return status;
 }
 
-status_t release_sem(sem_id sem) {
-    const std::shared_ptr<Semaphore> semaphore = FindSemaphore(sem);
-    if (!semaphore)
-        return B_BAD_SEM_ID;
-    ChangeKernelState([&] { semaphore->count++; });
-    return B_OK;
-}
-
-status_t acquire_sem(sem_id sem) {
-    return acquire_sem_etc(sem, 1, B_RELATIVE_TIMEOUT, B_INFINITE_TIMEOUT);
-}
-
 status_t acquire_sem_etc(sem_id sem, int32 count, uint32, bigtime_t timeout) {
     const std::shared_ptr<Semaphore> semaphore = FindSemaphore(sem);
     if (!semaphore)
@@ -160,10 +139,6 @@ status_t acquire_sem_etc(sem_id sem, int32 count, uint32, bigtime_t timeout) {
     if (status == B_OK)
         return B_BAD_SEM_ID;
     return status == B_TIMED_OUT && timeout <= 0 ? B_WOULD_BLOCK : status;
-}
-
-int32 suggest_thread_priority(uint32, int32, bigtime_t, bigtime_t) {
-    return B_NORMAL_PRIORITY;
 }
 
 thread_id spawn_thread(thread_func function, const char* name, int32, void* data) {
@@ -192,17 +167,12 @@ status_t resume_thread(thread_id thread) {
     return B_OK;
 }
 
-status_t wait_for_thread(thread_id thread, int32* result) {
-    const std::shared_ptr<Thread> found = FindThread(thread);
-    return found ? WaitForEnd(found, result, B_INFINITE_TIMEOUT) : B_BAD_THREAD_ID;
-}
-
 status_t kill_thread(thread_id thread) {
     const std::shared_ptr<Thread> found = FindThread(thread);
     if (!found)
         return B_BAD_THREAD_ID;
     RequestStop(*found);
-    return WaitForEnd(found, nullptr, B_INFINITE_TIMEOUT);
+    return WaitUntil([&] { return found->finished; }, B_INFINITE_TIMEOUT);
 }
 
 status_t stop_thread(thread_id thread) {
@@ -226,17 +196,10 @@ status_t snooze(bigtime_t microseconds) {
     return status == B_TIMED_OUT ? B_OK : status;
 }
 
-bigtime_t system_time() {
-    using namespace std::chrono;
-    return duration_cast<std::chrono::microseconds>(steady_clock::now().time_since_epoch()).count();
-}
-
 void StopAllThreads(bigtime_t patience) {
     std::map<thread_id, std::shared_ptr<Thread>> threads;
     LookAtKernelState([&] { threads = gThreads; });
     for (const auto& [id, thread] : threads)
         RequestStop(*thread);
-    const bigtime_t deadline = system_time() + patience;
-    for (const auto& [id, thread] : threads)
-        WaitForEnd(thread, nullptr, std::max<bigtime_t>(0, deadline - system_time()));
+    WaitUntil([] { return gThreads.empty(); }, patience);
 }

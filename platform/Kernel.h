@@ -12,10 +12,6 @@ sem_id create_sem(int32 count, const char* name);
 // Deletes it; whoever waits on it wakes at once with B_BAD_SEM_ID. B_OK, or B_BAD_SEM_ID when there is no
 // such one.
 status_t delete_sem(sem_id sem);
-// Adds one and wakes a waiter. B_OK or B_BAD_SEM_ID.
-status_t release_sem(sem_id sem);
-// Takes one, waiting as long as it takes.
-status_t acquire_sem(sem_id sem);
 
 constexpr uint32 B_RELATIVE_TIMEOUT = 8;
 // Takes count, waiting at most timeout microseconds from now (flags B_RELATIVE_TIMEOUT; no other flag is
@@ -26,23 +22,18 @@ status_t acquire_sem_etc(sem_id sem, int32 count, uint32 flags, bigtime_t timeou
 
 using thread_func = int32 (*)(void* data);
 
-constexpr int32 B_LOW_PRIORITY = 5;
-constexpr int32 B_NORMAL_PRIORITY = 10;
-constexpr int32 B_DISPLAY_PRIORITY = 15;
-
-// The priority for an ordinary task of the given kind; 10 (B_NORMAL_PRIORITY) when nothing special is asked.
-int32 suggest_thread_priority(uint32 taskFlags = 0, int32 period = 0, bigtime_t jitter = 0,
-                              bigtime_t length = 0);
+// The priority for an ordinary task.
+constexpr int32 suggest_thread_priority() {
+    return 10;
+}
 
 // Prepares a thread that will run function(data); it starts with resume_thread. Returns its id (above 0), or
 // B_NO_MEMORY when no thread can be made. Priorities are advice; ordinary programs may not raise theirs.
 thread_id spawn_thread(thread_func function, const char* name, int32 priority, void* data);
 status_t resume_thread(thread_id thread);
-// Waits for the thread's end and stores what it returned. B_OK, B_BAD_THREAD_ID when there is no such thread
-// (any more). On the interface thread the wait keeps all windows painted.
-status_t wait_for_thread(thread_id thread, int32* result);
-// Asks the thread to stop and waits for its end as wait_for_thread does. Nothing is ever torn down by force:
-// the thread's waits in this header end at once with B_INTERRUPTED, thread_stop_fd becomes readable, and the
+// Asks the thread to stop and waits for its end. B_OK, or B_BAD_THREAD_ID when there is no such thread (any
+// more). On the interface thread the wait keeps all windows painted. Nothing is ever torn down by force: the
+// thread's waits in this header end at once with B_INTERRUPTED, thread_stop_fd becomes readable, and the
 // thread's own code is expected to look at thread_stop_requested between steps and return.
 status_t kill_thread(thread_id thread);
 
@@ -57,5 +48,3 @@ int thread_stop_fd();
 
 // Sleeps for the given microseconds. B_OK, or B_INTERRUPTED when the thread is asked to stop.
 status_t snooze(bigtime_t microseconds);
-// Microseconds since some fixed moment; it never goes back.
-bigtime_t system_time();

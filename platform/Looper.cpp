@@ -1,16 +1,7 @@
 #include "platform/Looper.h"
 
-#include <QTimer>
-
 #include "platform/private/Loop.h"
 #include "platform/private/LooperCore.h"
-
-namespace {
-
-// How long the interface thread stays away from a looper whose lock a worker holds.
-constexpr int kRetryMilliseconds = 1;
-
-} // namespace
 
 status_t LooperCore::Enqueue(const BMessage& message, std::shared_ptr<HandlerToken> handler) {
     const bool forLooper = handler == nullptr;
@@ -67,11 +58,6 @@ bool LooperCore::IsAlive() const {
     return alive_;
 }
 
-void LooperCore::RetrySoon(void (LooperCore::*step)()) {
-    QTimer::singleShot(
-        kRetryMilliseconds, [self = shared_from_this(), step] { (*self.*step)(); });
-}
-
 void LooperCore::ServeNext() {
     {
         const std::lock_guard guard(mutex_);
@@ -79,10 +65,8 @@ void LooperCore::ServeNext() {
         if (!alive_ || queue_.empty() || handling_ > 0)
             return;
     }
-    if (Lock(0) != B_OK) {
-        RetrySoon(&LooperCore::ServeNext);
+    if (Lock(B_INFINITE_TIMEOUT) != B_OK)
         return;
-    }
     Queued next;
     {
         const std::lock_guard guard(mutex_);
@@ -124,12 +108,7 @@ void LooperCore::Destroy() {
         return;
     }
     const auto self = shared_from_this();
-    const status_t locked = Lock(0);
-    if (locked == B_TIMED_OUT) {
-        RetrySoon(&LooperCore::Destroy);
-        return;
-    }
-    if (locked == B_OK) {
+    if (Lock(B_INFINITE_TIMEOUT) == B_OK) {
         destroying_ = true;
         delete looper_;
     }

@@ -8,9 +8,8 @@
 // in its queue, and other loopers go on.
 //
 // PostMessage, Lock, LockWithTimeout and Unlock may be called from any thread; everything else only on the
-// interface thread. The interface thread never waits for a worker: a message or a paint pass that finds the
-// lock taken by another thread is tried again a moment later. A worker must not wait for the interface thread
-// while it holds the lock.
+// interface thread. A message, a paint pass or an event that finds the lock taken by a worker waits for it: a
+// worker holds it for moments only, and must not wait for the interface thread meanwhile.
 class BLooper : public BHandler {
   public:
     explicit BLooper(const char* name = nullptr);

@@ -7,12 +7,15 @@
 #include "platform/private/MenuPeer.h"
 #include "platform/private/Mnemonics.h"
 
-BMenu::BMenu(const char* title, menu_layout layout) : BMenu(title, layout, std::make_unique<MenuPeer>()) {
-    QObject::connect(
-        peer_->menu.get(), &QMenu::aboutToShow, peer_->menu.get(), [this] { MenuAccess::Opening(*this); });
+BMenu::BMenu(const char* title) : BMenu(title, false) {}
+
+BMenu::BMenu(const char* title, bool radioMode) : BMenu(title, std::make_unique<MenuPeer>()) {
+    radioMode_ = radioMode;
+    QObject::connect(peer_->menu.get(), &QMenu::aboutToShow, peer_->menu.get(),
+                     [this] { MenuAccess::Opening(*this); });
 }
 
-BMenu::BMenu(const char* title, menu_layout, std::unique_ptr<MenuPeer> peer)
+BMenu::BMenu(const char* title, std::unique_ptr<MenuPeer> peer)
     : title_(title ? title : ""), peer_(std::move(peer)) {
     if (!peer_->menu)
         return;
@@ -27,18 +30,13 @@ BMenu::~BMenu() {
 }
 
 bool BMenu::AddItem(BMenuItem* item) {
-    return AddItem(item, CountItems());
-}
-
-bool BMenu::AddItem(BMenuItem* item, int32 index) {
-    if (!item || item->menu_ || index < 0 || index > CountItems())
+    if (!item || item->menu_)
         return false;
-    const BMenuItem* next = ItemAt(index);
-    items_.emplace(items_.begin() + index, item);
+    items_.emplace_back(item);
     item->menu_ = this;
     QAction* action = item->peer_->action;
     item->peer_->SetHost(peer_->host);
-    peer_->host->insertAction(next ? next->peer_->action : nullptr, action);
+    peer_->host->addAction(action);
     if (radioMode_ && !action->isSeparator()) {
         action->setCheckable(true);
         peer_->radioLook.addAction(action);
@@ -55,34 +53,25 @@ bool BMenu::AddItem(BMenu* submenu) {
 }
 
 bool BMenu::RemoveItem(BMenuItem* item) {
-    return RemoveItem(IndexOf(item)) != nullptr;
-}
-
-BMenuItem* BMenu::RemoveItem(int32 index) {
-    BMenuItem* item = ItemAt(index);
-    if (!item)
-        return nullptr;
+    const auto found =
+        std::find_if(items_.begin(), items_.end(), [&](const auto& owned) { return owned.get() == item; });
+    if (found == items_.end())
+        return false;
     QAction* action = item->peer_->action;
     peer_->radioLook.removeAction(action);
     if (peer_->host)
         peer_->host->removeAction(action);
     item->peer_->SetHost(nullptr);
     item->menu_ = nullptr;
-    [[maybe_unused]] const BMenuItem* released = items_[static_cast<std::size_t>(index)].release();
-    items_.erase(items_.begin() + index);
+    [[maybe_unused]] const BMenuItem* released = found->release();
+    items_.erase(found);
     if (peer_->itemsChanged)
         peer_->itemsChanged();
-    return item;
+    return true;
 }
 
 BMenuItem* BMenu::ItemAt(int32 index) const {
     return index >= 0 && index < CountItems() ? items_[static_cast<std::size_t>(index)].get() : nullptr;
-}
-
-int32 BMenu::IndexOf(const BMenuItem* item) const {
-    const auto found =
-        std::find_if(items_.begin(), items_.end(), [&](const auto& owned) { return owned.get() == item; });
-    return found == items_.end() ? -1 : static_cast<int32>(found - items_.begin());
 }
 
 BMenuItem* BMenu::FindItem(const char* label) const {
@@ -109,26 +98,6 @@ BMenuItem* BMenu::FindMarked() const {
     return nullptr;
 }
 
-void BMenu::SetRadioMode(bool on) {
-    radioMode_ = on;
-    for (const auto& item : items_) {
-        QAction* action = item->peer_->action;
-        if (action->isSeparator())
-            continue;
-        action->setCheckable(on || item->IsMarked());
-        if (on)
-            peer_->radioLook.addAction(action);
-        else
-            peer_->radioLook.removeAction(action);
-    }
-}
-
-void BMenu::SetLabelFromMarked(bool on) {
-    labelFromMarked_ = on;
-    if (peer_->itemsChanged)
-        peer_->itemsChanged();
-}
-
 void BMenu::SetTargetForItems(const BHandler* target) {
     peer_->target = BMessenger(target);
     peer_->hasTarget = target != nullptr;
@@ -153,21 +122,14 @@ void BMenu::ItemChanged(BMenuItem* item) {
         peer_->itemsChanged();
 }
 
-// The window enables and marks the items of its bar's menus; it is not asked while a worker has its lock.
+// The window enables and marks the items of its bar's menus.
 void MenuAccess::Opening(BMenu& menu) {
     const BMenuItem* superitem = menu.peer_->superitem;
     const BMenu* bar = superitem ? superitem->menu_ : nullptr;
     BWindow* window = bar && !bar->peer_->menu && bar->peer_->shower ? bar->peer_->shower->Window() : nullptr;
     if (window) {
         const InterfaceLock lock(window);
-        if (lock.IsHeld())
-            window->MenusBeginning();
+        window->MenusBeginning();
     }
     AssignMnemonics(menu.peer_->menu.get());
-}
-
-BPopUpMenu::BPopUpMenu(const char* title, bool radioMode, bool labelFromMarked, menu_layout layout)
-    : BMenu(title, layout) {
-    SetRadioMode(radioMode);
-    SetLabelFromMarked(labelFromMarked);
 }

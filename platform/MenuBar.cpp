@@ -13,10 +13,10 @@ QMenuBar* Widget(const BMenuBar* bar) {
 
 } // namespace
 
-BMenuBar::BMenuBar(BRect frame, const char* name, uint32 resizingMode, menu_layout layout, bool resizeToFit)
-    : BView(frame, name, resizingMode, B_WILL_DRAW, std::make_unique<ViewPeer>(new QMenuBar)),
-      BMenu(name, layout, std::make_unique<MenuPeer>(ViewAccess::Widget(this))),
-      resizeToFit_(resizeToFit) {
+BMenuBar::BMenuBar(BRect frame, const char* name)
+    : BView(frame, name, B_FOLLOW_LEFT_RIGHT | B_FOLLOW_TOP, B_WILL_DRAW,
+            std::make_unique<ViewPeer>(new QMenuBar)),
+      BMenu(name, std::make_unique<MenuPeer>(ViewAccess::Widget(this))) {
     Widget(this)->setNativeMenuBar(false);
     Widget(this)->setAccessibleName(QString::fromUtf8(BView::Name()));
     MenuPeer& peer = MenuAccess::Peer(*this);
@@ -28,12 +28,11 @@ BMenuBar::BMenuBar(BRect frame, const char* name, uint32 resizingMode, menu_layo
 BMenuBar::~BMenuBar() = default;
 
 void BMenuBar::AttachedToWindow() {
-    if (resizeToFit_ && Parent())
+    if (Parent())
         ResizeTo(Parent()->Bounds().Width(), Frame().Height());
     FitHeight();
 }
 
 void BMenuBar::FitHeight() {
-    if (resizeToFit_)
-        ResizeTo(Frame().Width(), static_cast<float>(Widget(this)->sizeHint().height() - 1));
+    ResizeTo(Frame().Width(), static_cast<float>(Widget(this)->sizeHint().height() - 1));
 }

@@ -7,8 +7,7 @@
 // window.
 class BMenuBar : public BView, public BMenu {
   public:
-    BMenuBar(BRect frame, const char* name, uint32 resizingMode = B_FOLLOW_LEFT_RIGHT | B_FOLLOW_TOP,
-             menu_layout layout = B_ITEMS_IN_ROW, bool resizeToFit = true);
+    BMenuBar(BRect frame, const char* name);
     ~BMenuBar() override;
 
     using BMenu::Name;
@@ -16,6 +15,4 @@ class BMenuBar : public BView, public BMenu {
 
   private:
     void FitHeight();
-
-    bool resizeToFit_;
 };

@@ -24,12 +24,11 @@ FieldButton* Button(const BMenuField* field) {
 BMenuField::BMenuField(BRect frame, const char* name, const char* label, BMenu* menu, uint32 resizingMode,
                        uint32 flags)
     : BView(frame, name, resizingMode, flags, std::make_unique<ViewPeer>(new LabelledBox(new FieldButton))),
-      label_(label ? label : ""),
       menu_(menu) {
     Box(this)->SetNames(Name());
-    Box(this)->SetLabel(Label());
+    Box(this)->SetLabel(label);
     Box(this)->LimitFieldToHint();
-    SetDivider(label_.empty() ? 0 : std::floor(frame.Width() / 2));
+    SetDivider(!label || *label == '\0' ? 0 : std::floor(frame.Width() / 2));
     Button(this)->SetMenu(MenuAccess::Peer(*menu_).menu.get());
     MenuPeer& peer = MenuAccess::Peer(*menu_);
     peer.shower = this;
@@ -59,18 +58,6 @@ void BMenuField::SetDivider(float divider) {
     Box(this)->SetDivider(static_cast<int>(std::lround(divider)));
 }
 
-float BMenuField::Divider() const {
-    return static_cast<float>(Box(this)->Divider());
-}
-
-void BMenuField::SetEnabled(bool enabled) {
-    Box(this)->setEnabled(enabled);
-}
-
-bool BMenuField::IsEnabled() const {
-    return !Box(this)->testAttribute(Qt::WA_ForceDisabled);
-}
-
 // The layout is done first: a widget that is not shown hears of its new size only later.
 float BMenuField::VisibleRight() const {
     Box(this)->LayOut();
@@ -82,7 +69,7 @@ void BMenuField::SetTextChangedHook(std::function<void()> hook) {
 }
 
 void BMenuField::ShowMarked() {
-    const BMenuItem* marked = menu_->IsLabelFromMarked() ? MenuItem() : nullptr;
+    const BMenuItem* marked = MenuItem();
     const std::string shown = marked ? marked->Label() : menu_->Name();
     if (shown == shownText_)
         return;

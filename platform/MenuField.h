@@ -17,11 +17,7 @@ class BMenuField : public BView {
 
     [[nodiscard]] BMenu* Menu() const { return menu_.get(); }
     [[nodiscard]] BMenuItem* MenuItem() const { return menu_->FindMarked(); }
-    [[nodiscard]] const char* Label() const { return label_.c_str(); }
     void SetDivider(float divider);
-    [[nodiscard]] float Divider() const;
-    void SetEnabled(bool enabled);
-    [[nodiscard]] bool IsEnabled() const;
     // The right edge of what is visible, in the parent's coordinates: the button's, not the frame's.
     [[nodiscard]] float VisibleRight() const;
     // Called after the shown text, and with it VisibleRight, has changed.
@@ -31,7 +27,6 @@ class BMenuField : public BView {
     void ShowMarked();
     void PrepareMenu();
 
-    std::string label_;
     std::string shownText_;
     std::unique_ptr<BMenu> menu_;
     std::function<void()> textChanged_;

@@ -4,7 +4,6 @@
 
 #include "platform/View.h"
 #include "platform/private/MenuPeer.h"
-#include "platform/private/Mnemonics.h"
 
 namespace {
 
@@ -22,30 +21,24 @@ QKeySequence Shortcut(char letter, uint32 modifierKeys) {
 } // namespace
 
 BMenuItem::BMenuItem(const char* label, BMessage* message, char shortcut, uint32 modifierKeys)
-    : BInvoker(message, nullptr), peer_(std::make_unique<MenuItemPeer>()) {
+    : BInvoker(message, nullptr), label_(label), peer_(std::make_unique<MenuItemPeer>()) {
     peer_->action->setShortcut(Shortcut(shortcut, modifierKeys));
     peer_->action->setMenuRole(QAction::NoRole);
-    SetLabel(label);
+    peer_->ShowLabel(label);
     QObject::connect(peer_->action, &QAction::triggered, peer_->action,
                      [this] { MenuAccess::Chosen(*this); });
 }
 
 BMenuItem::BMenuItem(BMenu* submenu)
     : BInvoker(nullptr, nullptr),
+      label_(submenu->Name()),
       submenu_(submenu),
       peer_(std::make_unique<MenuItemPeer>(MenuAccess::Peer(*submenu).menu->menuAction())) {
     MenuAccess::Peer(*submenu).superitem = this;
-    SetLabel(submenu->Name());
+    peer_->ShowLabel(Label());
 }
 
 BMenuItem::~BMenuItem() = default;
-
-void BMenuItem::SetLabel(const char* label) {
-    label_ = label ? label : "";
-    ShowLabel(peer_->action, Label());
-    if (menu_)
-        menu_->ItemChanged(this);
-}
 
 void BMenuItem::SetEnabled(bool enabled) {
     peer_->action->setEnabled(enabled);
@@ -74,7 +67,7 @@ BMessenger BMenuItem::DefaultTarget() const {
 
 // The toolkit has turned the mark over by itself; outside radio mode marks are the program's to change.
 void MenuAccess::Chosen(BMenuItem& item) {
-    if (item.menu_ && item.menu_->IsRadioMode())
+    if (item.menu_ && item.menu_->radioMode_)
         item.SetMarked(true);
     else
         item.peer_->action->setChecked(item.peer_->marked);

@@ -16,7 +16,6 @@ class BMenuItem : public BInvoker {
     explicit BMenuItem(BMenu* submenu);
     ~BMenuItem() override;
 
-    void SetLabel(const char* label);
     [[nodiscard]] const char* Label() const { return label_.c_str(); }
     void SetEnabled(bool enabled);
     [[nodiscard]] bool IsEnabled() const;
@@ -33,7 +32,7 @@ class BMenuItem : public BInvoker {
     friend class BMenu;
     friend struct MenuAccess;
 
-    std::string label_;
+    const std::string label_;
     BMenu* menu_ = nullptr;
     std::unique_ptr<BMenu> submenu_;
     std::unique_ptr<MenuItemPeer> peer_;

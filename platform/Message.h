@@ -20,11 +20,11 @@ constexpr uint32 message_code(const char (&letters)[5]) {
 constexpr uint32 B_QUIT_REQUESTED = message_code("_QRQ");
 constexpr uint32 B_ABOUT_REQUESTED = message_code("_ABR");
 
-// A message: a code and typed, named fields, each of which may hold several values in order. A plain value:
+// A message: a code and typed, named fields of one value each. A plain value:
 // copying it copies its fields. It reaches a looper by PostMessage, which keeps a copy of its own.
 //
 // Every Find operation returns B_OK and stores the value, or leaves the caller's variable alone and returns
-// B_NAME_NOT_FOUND (no such field), B_BAD_INDEX (fewer values) or B_BAD_TYPE (values of another type).
+// B_NAME_NOT_FOUND (no such field) or B_BAD_TYPE (a value of another type).
 class BMessage {
   public:
     BMessage() = default;
@@ -32,27 +32,27 @@ class BMessage {
 
     uint32 what = 0;
 
-    status_t AddString(const char* name, const char* value) { return Add(name, std::string(value)); }
-    status_t AddInt32(const char* name, int32 value) { return Add(name, value); }
-    status_t AddFloat(const char* name, float value) { return Add(name, value); }
-    status_t AddBool(const char* name, bool value) { return Add(name, value); }
-    status_t AddPoint(const char* name, BPoint value) { return Add(name, value); }
+    void AddString(const char* name, const char* value) { Add(name, std::string(value)); }
+    void AddInt32(const char* name, int32 value) { Add(name, value); }
+    void AddFloat(const char* name, float value) { Add(name, value); }
+    void AddBool(const char* name, bool value) { Add(name, value); }
+    void AddPoint(const char* name, BPoint value) { Add(name, value); }
 
     // The text stays valid until the message is changed or destroyed.
-    status_t FindString(const char* name, const char** value, int32 index = 0) const;
-    status_t FindInt32(const char* name, int32* value, int32 index = 0) const;
-    status_t FindFloat(const char* name, float* value, int32 index = 0) const;
-    status_t FindBool(const char* name, bool* value, int32 index = 0) const;
-    status_t FindPoint(const char* name, BPoint* value, int32 index = 0) const;
+    status_t FindString(const char* name, const char** value) const;
+    status_t FindInt32(const char* name, int32* value) const;
+    status_t FindFloat(const char* name, float* value) const;
+    status_t FindBool(const char* name, bool* value) const;
+    status_t FindPoint(const char* name, BPoint* value) const;
 
   private:
     using Value = std::variant<std::string, int32, float, bool, BPoint>;
 
-    status_t Add(const char* name, Value value);
+    void Add(const char* name, Value value) { fields_.insert_or_assign(name, std::move(value)); }
     template <class T>
-    status_t Find(const char* name, int32 index, const T** value) const;
+    status_t Find(const char* name, const T** value) const;
     template <class T>
-    status_t FindValue(const char* name, int32 index, T* value) const;
+    status_t FindValue(const char* name, T* value) const;
 
-    std::map<std::string, std::vector<Value>, std::less<>> fields_;
+    std::map<std::string, Value, std::less<>> fields_;
 };

@@ -2,13 +2,13 @@
 
 #include <algorithm>
 #include <cmath>
+#include <utility>
 
-#include <QGridLayout>
 #include <QLabel>
 #include <QProgressBar>
 #include <QTimer>
+#include <QVBoxLayout>
 
-#include "platform/private/Loop.h"
 #include "platform/private/ViewPeer.h"
 
 namespace {
@@ -18,25 +18,22 @@ constexpr int kSteps = 10000; // of the toolkit's bar, which counts in whole num
 // in a second.
 constexpr int kRefreshMilliseconds = 30;
 
-// The bar with its texts above. Owns its children.
+// The bar with its text above. Owns its children.
 class StatusWidget : public QWidget {
     Q_DISABLE_COPY_MOVE(StatusWidget)
 
   public:
-    StatusWidget() : text_(new QLabel(this)), trailing_(new QLabel(this)), bar_(new QProgressBar(this)) {
+    StatusWidget() : text_(new QLabel(this)), bar_(new QProgressBar(this)) {
         text_->setTextFormat(Qt::PlainText);
-        trailing_->setTextFormat(Qt::PlainText);
         bar_->setRange(0, kSteps);
         bar_->setTextVisible(false);
         bar_->setMinimumHeight(bar_->fontMetrics().height() / 2);
-        auto* layout = new QGridLayout(this);
+        auto* layout = new QVBoxLayout(this);
         layout->setContentsMargins(0, 0, 0, 0);
-        layout->setVerticalSpacing(2);
-        layout->addWidget(text_, 0, 0);
-        layout->addWidget(trailing_, 0, 1);
-        layout->addWidget(bar_, 1, 0, 1, 2);
-        layout->setColumnStretch(0, 1);
-        layout->setRowStretch(2, 1);
+        layout->setSpacing(2);
+        layout->addWidget(text_);
+        layout->addWidget(bar_);
+        layout->addStretch(1);
     }
 
     void SetNames(const QString& name) {
@@ -45,16 +42,14 @@ class StatusWidget : public QWidget {
         setObjectName(name + QLatin1String(" container"));
     }
 
-    void Show(const QString& text, const QString& trailing, float part) {
+    void Show(const QString& text, float part) {
         text_->setText(text);
-        trailing_->setText(trailing);
         bar_->setValue(static_cast<int>(std::lround(part * kSteps)));
         bar_->setAccessibleName(text);
     }
 
   private:
     QLabel* text_;
-    QLabel* trailing_;
     QProgressBar* bar_;
 };
 
@@ -64,77 +59,40 @@ StatusWidget* Widget(const BStatusBar* bar) {
 
 } // namespace
 
-BStatusBar::BStatusBar(BRect frame, const char* name, const char* label, const char* trailingLabel)
+BStatusBar::BStatusBar(BRect frame, const char* name, const char* label)
     : BView(frame, name, B_FOLLOW_LEFT | B_FOLLOW_TOP, B_WILL_DRAW,
             std::make_unique<ViewPeer>(new StatusWidget)),
-      label_(label ? label : ""),
-      trailingLabel_(trailingLabel ? trailingLabel : "") {
+      label_(label) {
     Widget(this)->SetNames(QString::fromUtf8(Name()));
     Refresh();
+    auto* timer = new QTimer(Widget(this));
+    QObject::connect(timer, &QTimer::timeout, Widget(this), [this] { Refresh(); });
+    timer->start(kRefreshMilliseconds);
 }
-
-BStatusBar::~BStatusBar() = default;
 
 void BStatusBar::SetMaxValue(float maximum) {
     const std::lock_guard guard(mutex_);
     maximum_ = std::max(maximum, 0.0F);
     value_ = std::min(value_, maximum_);
-    ScheduleRefresh();
+    changed_ = true;
 }
 
-float BStatusBar::MaxValue() const {
-    const std::lock_guard guard(mutex_);
-    return maximum_;
-}
-
-float BStatusBar::CurrentValue() const {
-    const std::lock_guard guard(mutex_);
-    return value_;
-}
-
-void BStatusBar::Update(float delta, const char* text, const char* trailingText) {
+void BStatusBar::Update(float delta) {
     const std::lock_guard guard(mutex_);
     value_ = std::clamp(value_ + delta, 0.0F, maximum_);
-    if (text)
-        text_ = text;
-    if (trailingText)
-        trailing_ = trailingText;
-    ScheduleRefresh();
+    changed_ = true;
 }
 
 void BStatusBar::SetText(const char* text) {
     const std::lock_guard guard(mutex_);
     text_ = text ? text : "";
-    ScheduleRefresh();
-}
-
-std::string BStatusBar::Text() const {
-    const std::lock_guard guard(mutex_);
-    return text_;
-}
-
-// Called with mutex_ held. The widget lives as long as the view, and whoever calls from another thread holds
-// the window's lock, so the view does.
-void BStatusBar::ScheduleRefresh() {
-    if (refreshPending_)
-        return;
-    refreshPending_ = true;
-    RunOnInterfaceThread(
-        [this] { QTimer::singleShot(kRefreshMilliseconds, Widget(this), [this] { Refresh(); }); },
-        ViewAccess::Widget(this));
+    changed_ = true;
 }
 
 void BStatusBar::Refresh() {
-    QString text;
-    QString trailing;
-    float part = 1;
-    {
-        const std::lock_guard guard(mutex_);
-        refreshPending_ = false;
-        text = QString::fromStdString(label_ + text_);
-        trailing = QString::fromStdString(trailing_ + trailingLabel_);
-        if (maximum_ > 0)
-            part = value_ / maximum_;
-    }
-    Widget(this)->Show(text, trailing, part);
+    const std::lock_guard guard(mutex_);
+    if (!std::exchange(changed_, false))
+        return;
+    const float part = maximum_ > 0 ? value_ / maximum_ : 1;
+    Widget(this)->Show(QString::fromStdString(label_ + text_), part);
 }

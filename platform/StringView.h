@@ -10,10 +10,8 @@ class BStringView : public BView {
 
     void SetText(const char* text);
     [[nodiscard]] const char* Text() const { return text_.c_str(); }
-    void SetAlignment(alignment side);
     void SetHighColor(rgb_color color) override;
     using BView::SetHighColor;
-    void SetFont(const BFont* font, uint32 properties = B_FONT_ALL) override;
 
   private:
     std::string text_;

@@ -103,46 +103,20 @@ QLineEdit* Line(const BTextControl* control) {
 } // namespace
 
 BTextControl::BTextControl(BRect frame, const char* name, const char* label, const char* text,
-                           BMessage* message, uint32 resizingMode, uint32 flags)
-    : BControl(frame, name, label, message, resizingMode, flags,
+                           uint32 resizingMode, uint32 flags)
+    : BControl(frame, name, label, nullptr, resizingMode, flags,
                std::make_unique<ViewPeer>(new LabelledBox(new QLineEdit))),
       filter_(new TextControlFilter(Line(this))) {
     Box(this)->SetNames(Name());
-    BTextControl::SetLabel(label);
-    float width = 0;
-    float height = 0;
-    GetPreferredSize(&width, &height);
-    ResizeTo(frame.Width(), height);
+    Box(this)->SetLabel(label);
+    ResizeTo(frame.Width(), static_cast<float>(Box(this)->sizeHint().height() - 1));
     SetDivider(std::floor(frame.Width() / 2));
     SetText(text);
-    QObject::connect(
-        Line(this), &QLineEdit::returnPressed, Line(this), [this] { Send(); });
-    QObject::connect(Line(this), &QLineEdit::editingFinished, Line(this), [this] {
-        if (sent_ != Text())
-            Send();
-    });
-}
-
-// A line that loses the focus as it goes must not call back. Others who want to hear of its end still do.
-BTextControl::~BTextControl() {
-    QObject::disconnect(Line(this), &QLineEdit::returnPressed, Line(this), nullptr);
-    QObject::disconnect(Line(this), &QLineEdit::editingFinished, Line(this), nullptr);
-}
-
-void BTextControl::Send() {
-    sent_ = Text();
-    Invoke();
-}
-
-void BTextControl::SetLabel(const char* label) {
-    BControl::SetLabel(label);
-    Box(this)->SetLabel(Label());
 }
 
 void BTextControl::SetText(const char* text) {
     Line(this)->setText(filter_->Fit(QString::fromUtf8(text)));
     Line(this)->setCursorPosition(0);
-    sent_ = Text();
 }
 
 const char* BTextControl::Text() const {
@@ -152,10 +126,6 @@ const char* BTextControl::Text() const {
 
 void BTextControl::SetDivider(float divider) {
     Box(this)->SetDivider(static_cast<int>(std::lround(divider)));
-}
-
-float BTextControl::Divider() const {
-    return static_cast<float>(Box(this)->Divider());
 }
 
 void BTextControl::SetMaxBytes(int32 bytes) {

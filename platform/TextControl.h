@@ -4,23 +4,19 @@
 
 class TextControlFilter;
 
-// A line of text with a label to its left. Its message, if any, goes out when the person leaves a changed
-// text or presses Enter in it.
+// A line of text with a label to its left. It sends no message.
 class BTextControl : public BControl {
   public:
     // The height is adjusted to what the line needs. The divider is half the width at first.
-    BTextControl(BRect frame, const char* name, const char* label, const char* text, BMessage* message,
+    BTextControl(BRect frame, const char* name, const char* label, const char* text,
                  uint32 resizingMode = B_FOLLOW_LEFT | B_FOLLOW_TOP,
                  uint32 flags = B_WILL_DRAW | B_NAVIGABLE);
-    ~BTextControl() override;
 
-    void SetLabel(const char* label) override;
     void SetText(const char* text);
     // UTF-8; valid until the text changes or the next call.
     [[nodiscard]] const char* Text() const;
     // Width of the label's part, from the control's left edge to the text field.
     void SetDivider(float divider);
-    [[nodiscard]] float Divider() const;
 
     // Limits the text to a number of bytes of UTF-8. What is typed, pasted or dropped and does not fit is not
     // taken, not even in part, and the person hears and reads so; the tool tip names the limit. What the
@@ -33,9 +29,6 @@ class BTextControl : public BControl {
     [[nodiscard]] bool IsFocus() const override;
 
   private:
-    void Send();
-
     TextControlFilter* filter_; // belongs to the line
     mutable std::string text_;
-    std::string sent_; // the text as of the last message or as set
 };

@@ -28,7 +28,6 @@ constexpr status_t B_WOULD_BLOCK = -6;
 constexpr status_t B_BAD_SEM_ID = -7;
 constexpr status_t B_BAD_THREAD_ID = -8;
 constexpr status_t B_NAME_NOT_FOUND = -9;
-constexpr status_t B_BAD_INDEX = -10;
 constexpr status_t B_BAD_TYPE = -11;
 
 // "Without limit", where a time-out is asked for.
@@ -43,12 +42,6 @@ struct rgb_color {
     bool operator==(const rgb_color&) const = default;
 };
 
-enum color_space { B_RGB32, B_RGBA32, B_CMAP8 };
-
-enum orientation { B_HORIZONTAL, B_VERTICAL };
-
-enum alignment { B_ALIGN_LEFT, B_ALIGN_RIGHT, B_ALIGN_CENTER };
+enum color_space { B_CMAP8 };
 
 enum border_style { B_PLAIN_BORDER, B_FANCY_BORDER, B_NO_BORDER };
-
-enum button_width { B_WIDTH_AS_USUAL, B_WIDTH_FROM_WIDEST, B_WIDTH_FROM_LABEL };

@@ -15,7 +15,6 @@
 #include "platform/Window.h"
 #include "platform/private/ApplicationPeer.h"
 #include "platform/private/Convert.h"
-#include "platform/private/Loop.h"
 #include "platform/private/ViewPeer.h"
 #include "platform/private/ViewWidget.h"
 
@@ -83,16 +82,12 @@ QRect PixelRect(const BRect& frame) {
 }
 
 // Where one pair of edges comes to lie when the parent grows by delta.
-void FollowEdges(float& low, float& high, float delta, bool followsLow, bool followsHigh,
-                 bool followsCenter) {
-    if (followsHigh) {
-        high += delta;
-        if (!followsLow)
-            low += delta;
-    } else if (followsCenter) {
-        low += delta / 2;
-        high += delta / 2;
-    }
+void FollowEdges(float& low, float& high, float delta, bool followsLow, bool followsHigh) {
+    if (!followsHigh)
+        return;
+    high += delta;
+    if (!followsLow)
+        low += delta;
 }
 
 // What lies on a view without a background of its own (labels, check boxes) stands out from the view's
@@ -155,12 +150,6 @@ BView::BView(BRect frame, const char* name, uint32 resizingMode, uint32 flags, s
 BView::~BView() {
     while (!children_.empty())
         children_.pop_back();
-}
-
-void BView::SetName(const char* name) {
-    BHandler::SetName(name);
-    if (peer_->widget)
-        peer_->widget->setObjectName(QString::fromUtf8(Name()));
 }
 
 void BView::SetAccessibleName(const char* name) {
@@ -283,17 +272,11 @@ void BView::ResizeTo(float width, float height) {
         FrameResized(frame_.Width(), frame_.Height());
 }
 
-void BView::ResizeBy(float dx, float dy) {
-    ResizeTo(frame_.Width() + dx, frame_.Height() + dy);
-}
-
 void BView::ParentResized(float dx, float dy) {
     BRect frame = frame_;
     const uint32 mode = resizingMode_;
-    FollowEdges(frame.left, frame.right, dx, mode & B_FOLLOW_LEFT, mode & B_FOLLOW_RIGHT,
-                mode & B_FOLLOW_H_CENTER);
-    FollowEdges(frame.top, frame.bottom, dy, mode & B_FOLLOW_TOP, mode & B_FOLLOW_BOTTOM,
-                mode & B_FOLLOW_V_CENTER);
+    FollowEdges(frame.left, frame.right, dx, mode & B_FOLLOW_LEFT, mode & B_FOLLOW_RIGHT);
+    FollowEdges(frame.top, frame.bottom, dy, mode & B_FOLLOW_TOP, mode & B_FOLLOW_BOTTOM);
     MoveTo(frame.left, frame.top);
     ResizeTo(frame.Width(), frame.Height());
 }
@@ -372,9 +355,4 @@ void BView::Invalidate(BRect rect) {
     const BPoint origin = Bounds().LeftTop();
     rect.OffsetBy(-origin.x, -origin.y);
     peer_->Canvas()->update(ToQt(rect).toAlignedRect());
-}
-
-void BView::Flush() {
-    if (OnInterfaceThread() && window_)
-        window_->UpdateIfNeeded();
 }

@@ -18,13 +18,9 @@ constexpr uint32 B_FOLLOW_NONE = 0;
 constexpr uint32 B_FOLLOW_LEFT = 0x0001;
 constexpr uint32 B_FOLLOW_RIGHT = 0x0002;
 constexpr uint32 B_FOLLOW_LEFT_RIGHT = 0x0003;
-constexpr uint32 B_FOLLOW_H_CENTER = 0x0004;
 constexpr uint32 B_FOLLOW_TOP = 0x0010;
 constexpr uint32 B_FOLLOW_BOTTOM = 0x0020;
-constexpr uint32 B_FOLLOW_TOP_BOTTOM = 0x0030;
-constexpr uint32 B_FOLLOW_V_CENTER = 0x0040;
 constexpr uint32 B_FOLLOW_ALL_SIDES = 0x0033;
-constexpr uint32 B_FOLLOW_ALL = B_FOLLOW_ALL_SIDES;
 
 constexpr uint32 B_WILL_DRAW = 0x01;
 constexpr uint32 B_FRAME_EVENTS = 0x02;
@@ -47,8 +43,6 @@ constexpr char B_END = 0x04;
 constexpr char B_ENTER = 0x0a;
 constexpr char B_LEFT_ARROW = 0x1c;
 constexpr char B_RIGHT_ARROW = 0x1d;
-constexpr char B_UP_ARROW = 0x1e;
-constexpr char B_DOWN_ARROW = 0x1f;
 
 // The modifier keys held down as of the last event. Any thread.
 uint32 modifiers();
@@ -67,7 +61,6 @@ class BView : public BHandler {
     BView(BRect frame, const char* name, uint32 resizingMode, uint32 flags);
     ~BView() override;
 
-    void SetName(const char* name) override;
     [[nodiscard]] BLooper* Looper() const override;
 
     // --- the tree ---
@@ -106,7 +99,6 @@ class BView : public BHandler {
     [[nodiscard]] virtual BRect Bounds() const;
     void MoveTo(float x, float y);
     void ResizeTo(float width, float height);
-    void ResizeBy(float dx, float dy);
     virtual void ScrollTo(BPoint where);
     [[nodiscard]] uint32 Flags() const { return flags_; }
 
@@ -174,9 +166,6 @@ class BView : public BHandler {
 
     virtual void Invalidate();
     virtual void Invalidate(BRect rect);
-    // Paints what waits to be painted, now. Any thread; on a worker, painting is left to follow a moment
-    // later.
-    void Flush();
 
   protected:
     // For the layer's controls, which bring a widget of their own.

@@ -20,15 +20,10 @@
 
 namespace {
 
-window_look LookOf(window_type type) {
-    return type == B_DOCUMENT_WINDOW ? B_DOCUMENT_WINDOW_LOOK : B_TITLED_WINDOW_LOOK;
-}
-
 Qt::WindowFlags ToolkitFlags(window_look look, uint32 flags) {
     Qt::WindowFlags result = look == B_FLOATING_WINDOW_LOOK ? Qt::Dialog : Qt::Window;
-    result |= Qt::CustomizeWindowHint | Qt::WindowTitleHint | Qt::WindowSystemMenuHint;
-    if (!(flags & B_NOT_CLOSABLE))
-        result |= Qt::WindowCloseButtonHint;
+    result |=
+        Qt::CustomizeWindowHint | Qt::WindowTitleHint | Qt::WindowSystemMenuHint | Qt::WindowCloseButtonHint;
     if (look != B_FLOATING_WINDOW_LOOK)
         result |= Qt::WindowMinimizeButtonHint;
     if (!(flags & (B_NOT_ZOOMABLE | B_NOT_RESIZABLE)))
@@ -82,8 +77,8 @@ void ApplicationAccess::QuitModalWindows(BApplication& application) {
     }
 }
 
-BWindow::BWindow(BRect frame, const char* title, window_type type, uint32 flags)
-    : BWindow(frame, title, LookOf(type), B_NORMAL_WINDOW_FEEL, flags) {}
+BWindow::BWindow(BRect frame, const char* title, window_type, uint32 flags)
+    : BWindow(frame, title, B_DOCUMENT_WINDOW_LOOK, B_NORMAL_WINDOW_FEEL, flags) {}
 
 BWindow::BWindow(BRect frame, const char* title, window_look look, window_feel feel, uint32 flags)
     : BLooper(title), peer_(std::make_unique<WindowPeer>(this)) {
@@ -100,7 +95,8 @@ BWindow::BWindow(BRect frame, const char* title, window_look look, window_feel f
     content_->EnterWindow(this);
     MoveTo(frame.left, frame.top);
     ResizeTo(frame.Width(), frame.Height());
-    SetTitle(title);
+    widget->setWindowTitle(QString::fromUtf8(title));
+    widget->setObjectName(QString::fromUtf8(title));
     ApplicationAccess::AddWindow(this);
 }
 
@@ -113,18 +109,8 @@ void BWindow::AddChild(BView* child) {
     content_->AddChild(child);
 }
 
-bool BWindow::RemoveChild(BView* child) {
-    return content_->RemoveChild(child);
-}
-
 BView* BWindow::FindView(const char* name) const {
     return content_->FindView(name);
-}
-
-void BWindow::SetTitle(const char* title) {
-    SetName(title);
-    peer_->widget->setWindowTitle(QString::fromUtf8(title));
-    peer_->widget->setObjectName(QString::fromUtf8(title));
 }
 
 BRect BWindow::Frame() const {
@@ -154,10 +140,6 @@ void BWindow::ResizeTo(float width, float height) {
         peer_->widget->setFixedSize(size);
     // A hidden widget hears of its new size only when it is shown; its views are laid out now.
     content_->ResizeTo(static_cast<float>(size.width() - 1), static_cast<float>(size.height() - 1));
-}
-
-void BWindow::ResizeBy(float dx, float dy) {
-    ResizeTo(Bounds().Width() + dx, Bounds().Height() + dy);
 }
 
 void BWindow::SetSizeLimits(float minWidth, float maxWidth, float minHeight, float maxHeight) {

@@ -7,13 +7,11 @@ class BButton;
 class BView;
 struct WindowPeer;
 
-enum window_look { B_TITLED_WINDOW_LOOK, B_DOCUMENT_WINDOW_LOOK, B_FLOATING_WINDOW_LOOK };
+enum window_look { B_DOCUMENT_WINDOW_LOOK, B_FLOATING_WINDOW_LOOK };
 enum window_feel { B_NORMAL_WINDOW_FEEL, B_MODAL_APP_WINDOW_FEEL };
 // A look and a feel in one.
-enum window_type { B_TITLED_WINDOW, B_DOCUMENT_WINDOW };
+enum window_type { B_DOCUMENT_WINDOW };
 
-constexpr uint32 B_NOT_MOVABLE = 0x0001;
-constexpr uint32 B_NOT_CLOSABLE = 0x0020;
 constexpr uint32 B_NOT_ZOOMABLE = 0x0040;
 constexpr uint32 B_NOT_RESIZABLE = 0x0002;
 constexpr uint32 B_WILL_ACCEPT_FIRST_CLICK = 0x0010;
@@ -34,11 +32,9 @@ class BWindow : public BLooper {
 
     // Takes ownership of the view.
     void AddChild(BView* child);
-    bool RemoveChild(BView* child);
     [[nodiscard]] BView* FindView(const char* name) const;
 
     [[nodiscard]] const char* Title() const { return Name(); }
-    void SetTitle(const char* title);
 
     // Frame is in screen coordinates; Bounds is the same size at (0, 0).
     [[nodiscard]] BRect Frame() const;
@@ -46,7 +42,6 @@ class BWindow : public BLooper {
     void MoveTo(float x, float y);
     void MoveBy(float dx, float dy);
     void ResizeTo(float width, float height);
-    void ResizeBy(float dx, float dy);
     // Limits of Width() and Height() that the person can give the window.
     void SetSizeLimits(float minWidth, float maxWidth, float minHeight, float maxHeight);
 

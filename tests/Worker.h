@@ -1,24 +1,38 @@
 #pragma once
 
+#include <atomic>
 #include <functional>
+
+#include <QTest>
 
 #include "platform/Kernel.h"
 
 // A kernel thread that does one thing. The object's end waits for it, while the interface goes on.
 class Worker {
   public:
-    explicit Worker(std::function<int32()> work) : work_(std::move(work)) {
-        id_ = spawn_thread([](void* data) { return static_cast<Worker*>(data)->work_(); }, "worker",
-                           suggest_thread_priority(), this);
+    explicit Worker(std::function<void()> work) : work_(std::move(work)) {
+        id_ = spawn_thread(
+            [](void* data) {
+                auto* worker = static_cast<Worker*>(data);
+                worker->work_();
+                worker->ended_ = true;
+                return int32{0};
+            },
+            "worker", suggest_thread_priority(), this);
         resume_thread(id_);
     }
     Worker(const Worker&) = delete;
     Worker& operator=(const Worker&) = delete;
-    ~Worker() { wait_for_thread(id_, nullptr); }
+    ~Worker() {
+        while (!ended_)
+            QTest::qWait(1);
+    }
 
     [[nodiscard]] thread_id Id() const { return id_; }
+    [[nodiscard]] bool HasEnded() const { return ended_; }
 
   private:
-    std::function<int32()> work_;
+    std::function<void()> work_;
+    std::atomic<bool> ended_{false};
     thread_id id_;
 };

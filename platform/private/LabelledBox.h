@@ -21,7 +21,6 @@ class LabelledBox : public QWidget {
     void SetLabel(const char* label);
     // Width of the label's part.
     void SetDivider(int divider);
-    [[nodiscard]] int Divider() const { return divider_; }
     // The field takes no more than its size hint's width.
     void LimitFieldToHint() { limited_ = true; }
     void LayOut();

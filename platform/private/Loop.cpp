@@ -3,6 +3,7 @@
 #include <atomic>
 #include <chrono>
 #include <condition_variable>
+#include <deque>
 #include <memory>
 #include <mutex>
 #include <thread>
@@ -12,20 +13,68 @@
 #include <QDialog>
 #include <QEventLoop>
 #include <QPointer>
+#include <QSocketNotifier>
 #include <QTimer>
+
+#include <sys/eventfd.h>
+#include <unistd.h>
 
 #include "platform/Kernel.h"
 #include "platform/private/LooperCore.h"
-#include "platform/private/PostBox.h"
 
 namespace {
 
-constexpr bigtime_t kInterfaceLockPatience = 10000;
 constexpr int kCancelPollMilliseconds = 50;
 
-// Carries work to the interface thread, while there is one.
-std::mutex gPostMutex;
-std::unique_ptr<PostBox> gPostBox;
+std::mutex gPostMutex; // guards the box and its queue
+
+// Carries work to the interface thread, in order. The queue is our own and a file descriptor wakes the
+// toolkit's loop, so that everything handed over is guarded by a lock that thread checkers can see.
+//
+// One piece of work is done per wake-up: while it waits in a loop of its own, the inner loop goes on with the
+// rest.
+class PostBox {
+  public:
+    PostBox() {
+        QObject::connect(
+            &notifier_, &QSocketNotifier::activated, &notifier_, [this] { DoOne(); });
+    }
+    ~PostBox() {
+        notifier_.setEnabled(false);
+        close(wakeFd_);
+    }
+    PostBox(const PostBox&) = delete;
+    PostBox& operator=(const PostBox&) = delete;
+
+    // With the mutex held.
+    void Post(std::function<void()> work) {
+        queue_.push_back(std::move(work));
+        eventfd_write(wakeFd_, 1);
+    }
+
+  private:
+    void DoOne() {
+        std::function<void()> work;
+        {
+            const std::lock_guard guard(gPostMutex);
+            eventfd_t wakes = 0;
+            eventfd_read(wakeFd_, &wakes);
+            if (queue_.empty())
+                return;
+            work = std::move(queue_.front());
+            queue_.pop_front();
+            if (!queue_.empty())
+                eventfd_write(wakeFd_, 1);
+        }
+        work();
+    }
+
+    std::deque<std::function<void()>> queue_;
+    const int wakeFd_ = eventfd(0, EFD_CLOEXEC | EFD_NONBLOCK);
+    QSocketNotifier notifier_{wakeFd_, QSocketNotifier::Read};
+};
+
+std::unique_ptr<PostBox> gPostBox; // while there is an interface thread
 std::atomic<std::thread::id> gInterfaceThread;
 
 // One lock for all semaphores and thread states: they are few, and waits on them rare.
@@ -88,10 +137,10 @@ bool OnInterfaceThread() {
     return std::this_thread::get_id() == gInterfaceThread.load();
 }
 
-void RunOnInterfaceThread(std::function<void()> work, QObject* context) {
+void RunOnInterfaceThread(std::function<void()> work) {
     const std::lock_guard guard(gPostMutex);
     if (gPostBox)
-        gPostBox->Post(std::move(work), context);
+        gPostBox->Post(std::move(work));
 }
 
 bool CallOnInterfaceThread(std::function<void()> work) {
@@ -125,8 +174,7 @@ void LookAtKernelState(const std::function<void()>& look) {
     look();
 }
 
-InterfaceLock::InterfaceLock(BLooper* looper)
-    : looper_(looper), held_(!looper || looper->LockWithTimeout(kInterfaceLockPatience) == B_OK) {}
+InterfaceLock::InterfaceLock(BLooper* looper) : looper_(looper), held_(!looper || looper->Lock()) {}
 
 InterfaceLock::~InterfaceLock() {
     if (looper_ && held_)

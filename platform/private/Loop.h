@@ -6,14 +6,12 @@
 #include "platform/Looper.h"
 
 class QDialog;
-class QObject;
 
 // Whether the calling thread is the interface thread.
 bool OnInterfaceThread();
 
-// Runs work on the interface thread, soon; from any thread. Dropped when context (which lives on the
-// interface thread) dies first; null context: the application.
-void RunOnInterfaceThread(std::function<void()> work, QObject* context = nullptr);
+// Runs work on the interface thread, soon; from any thread. Dropped when the application ends first.
+void RunOnInterfaceThread(std::function<void()> work);
 
 // Runs work on the interface thread and waits for its end: at once when already there. Returns false, with
 // the work left undone or still under way, when the calling thread is asked to stop; work must therefore own
@@ -32,8 +30,8 @@ void ChangeKernelState(const std::function<void()>& change);
 // Runs look with the kernel's lock held.
 void LookAtKernelState(const std::function<void()>& look);
 
-// Holds a looper's lock for a paint pass or an event if it can be had within a few milliseconds: the
-// interface thread never waits longer for a worker. A null looper counts as held.
+// Holds a looper's lock for a paint pass or an event. A null looper counts as held, one that is gone does
+// not.
 class InterfaceLock {
   public:
     explicit InterfaceLock(BLooper* looper);

@@ -29,8 +29,7 @@ class LooperCore : public std::enable_shared_from_this<LooperCore> {
     bool IsLockedByCaller() const;
     bool IsAlive() const;
 
-    // Interface thread: handles the next message, unless a handler is running already or another thread has
-    // the lock.
+    // Interface thread: handles the next message, unless a handler is running already.
     void ServeNext();
     // Interface thread: deletes the looper now or when its handler returns.
     void Destroy();
@@ -48,7 +47,6 @@ class LooperCore : public std::enable_shared_from_this<LooperCore> {
     };
 
     void Wake();
-    void RetrySoon(void (LooperCore::*step)());
     void Deliver(Queued queued);
 
     mutable std::mutex mutex_; // guards what follows, down to the blank line

@@ -10,6 +10,7 @@
 #include <QPointer>
 
 #include "platform/Menu.h"
+#include "platform/private/Mnemonics.h"
 
 // A menu's peer: the widget that shows the items, which is a toolkit menu of its own or, for the menu bar,
 // the bar's widget, which belongs to the bar's view.
@@ -41,6 +42,10 @@ struct MenuItemPeer {
     MenuItemPeer(const MenuItemPeer&) = delete;
     MenuItemPeer& operator=(const MenuItemPeer&) = delete;
 
+    void ShowLabel(const char* label) const {
+        ::ShowLabel(action.data(), label);
+        action->setObjectName(QString::fromUtf8(label));
+    }
     void SetHost(QWidget* host) {
         if (own)
             action->setParent(host);

@@ -41,37 +41,10 @@ void Assign(Shown* shown, Letters& taken) {
         shown->setText(WithMnemonic(label.toString(), taken));
 }
 
-template <class Shown>
-void Show(Shown* shown, const char* label) {
-    const QString text = QString::fromUtf8(label);
-    shown->setProperty(kLabelProperty, text);
-    shown->setText(EscapeLabel(text));
-}
-
-void Renew(const QWidget* widget) {
-    if (widget->window()->isVisible())
-        AssignMnemonics(widget->window());
-}
-
 } // namespace
 
 QString EscapeLabel(const QString& label) {
     return QString(label).replace(QLatin1Char('&'), QLatin1String("&&"));
-}
-
-void ShowLabel(QAbstractButton* button, const char* label) {
-    Show(button, label);
-    Renew(button);
-}
-
-void ShowLabel(QLabel* line, const char* label) {
-    Show(line, label);
-    Renew(line);
-}
-
-void ShowLabel(QAction* action, const char* label) {
-    Show(action, label);
-    action->setObjectName(action->property(kLabelProperty).toString());
 }
 
 void AssignMnemonics(QWidget* window) {

@@ -3,10 +3,8 @@
 #pragma once
 
 #include <QString>
+#include <QVariant>
 
-class QAbstractButton;
-class QAction;
-class QLabel;
 class QMenu;
 class QWidget;
 
@@ -17,11 +15,14 @@ constexpr const char* kLabelProperty = "quorvanLabel";
 // The label as toolkit text without any mnemonic: its own '&' doubled.
 QString EscapeLabel(const QString& label);
 
-// Makes the widget or action show the label and keeps it for the next assignment. In a window that is shown
-// already the letters are given out anew. A QLabel needs a buddy to have a mnemonic.
-void ShowLabel(QAbstractButton* button, const char* label);
-void ShowLabel(QLabel* line, const char* label);
-void ShowLabel(QAction* action, const char* label);
+// Makes the widget or action show the label and keeps it for the next assignment. A QLabel needs a buddy to
+// have a mnemonic.
+template <class Shown>
+void ShowLabel(Shown* shown, const char* label) {
+    const QString text = QString::fromUtf8(label);
+    shown->setProperty(kLabelProperty, text);
+    shown->setText(EscapeLabel(text));
+}
 
 // Gives the window's menu titles, buttons, check boxes and labelled fields different letters, menu titles
 // first, in their order; what finds no free letter has none.

@@ -4,7 +4,6 @@
 #include <QMouseEvent>
 #include <QPaintEvent>
 #include <QPainter>
-#include <QTimer>
 
 #include "platform/private/Convert.h"
 #include "platform/private/Loop.h"
@@ -12,16 +11,13 @@
 
 namespace {
 
-constexpr int kRepaintMilliseconds = 5;
-
 struct KeyCode {
     int toolkit;
     char ours;
 };
 constexpr KeyCode kKeyCodes[] = {{Qt::Key_Home, B_HOME},       {Qt::Key_End, B_END},
                                  {Qt::Key_Return, B_ENTER},    {Qt::Key_Enter, B_ENTER},
-                                 {Qt::Key_Left, B_LEFT_ARROW}, {Qt::Key_Right, B_RIGHT_ARROW},
-                                 {Qt::Key_Up, B_UP_ARROW},     {Qt::Key_Down, B_DOWN_ARROW}};
+                                 {Qt::Key_Left, B_LEFT_ARROW}, {Qt::Key_Right, B_RIGHT_ARROW}};
 
 // 0 for a key that views do not hear of.
 char OurKey(const QKeyEvent& event) {
@@ -53,10 +49,6 @@ void ViewWidget::paintEvent(QPaintEvent* event) {
     QPainter painter(this);
     painter.fillRect(event->rect(), ToQt(owner_->ViewColor()));
     const InterfaceLock lock(owner_->Looper());
-    if (!lock.IsHeld()) {
-        QTimer::singleShot(kRepaintMilliseconds, this, [this] { update(); });
-        return;
-    }
     const BPoint origin = owner_->Bounds().LeftTop();
     painter.translate(-origin.x, -origin.y);
     BRect update = FromQt(QRectF(event->rect()));
@@ -74,7 +66,7 @@ void ViewWidget::paintEvent(QPaintEvent* event) {
 void ViewWidget::keyPressEvent(QKeyEvent* event) {
     const char key = OurKey(*event);
     const InterfaceLock lock(owner_->Looper());
-    if (key == '\0' || !lock.IsHeld() || !owner_->KeyDown(key))
+    if (key == '\0' || !owner_->KeyDown(key))
         QWidget::keyPressEvent(event);
 }
 

@@ -7,11 +7,13 @@
 #include <map>
 #include <semaphore>
 
+#include <QProgressBar>
+#include <QTest>
+
 #include <dlfcn.h>
 #include <netdb.h>
 
 #include "db/FaultyFiles.h"
-#include "platform/StatusBar.h"
 #include "quotes/LoopbackServer.h"
 #include "quotes/QuoteRetrieval.h"
 #include "quotes/TlsServer.h"
@@ -196,10 +198,9 @@ TEST_F(PriceUpdate, ClosedHalfWayItGoesOnceTheFirstHalfIsOnTheDisk) {
     UpdateUpTo(
         "SAME", 3,
         [] {
-            const auto* bar = static_cast<BStatusBar*>(GetAppWindow(be_app, Title)->FindView("Status Bar"));
-            EXPECT_EQ(bar->MaxValue(), 6);
-            EXPECT_EQ(bar->CurrentValue(), 3);
-            EXPECT_EQ(bar->Text(), " SAME");
+            const auto* bar = Driver::Window(Title)->findChild<QProgressBar*>("Status Bar");
+            EXPECT_TRUE(QTest::qWaitFor([&] { return bar->accessibleName() == "Checking: SAME"; }));
+            EXPECT_EQ(bar->value() * 6, bar->maximum() * 3);
             Driver::Window(Title)->close();
         });
     When(

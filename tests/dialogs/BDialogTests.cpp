@@ -22,7 +22,7 @@ class TestDialog : public BDialog {
   public:
     explicit TestDialog(uint16 flags = DialogHasOk | DialogHasCancel)
         : BDialog({50, 50, 350, 200}, "Test", flags) {
-        auto* field = new BTextControl({10, 10, 290, 30}, "field", "Field:", "text", nullptr);
+        auto* field = new BTextControl({10, 10, 290, 30}, "field", "Field:", "text");
         TopView()->AddChild(field);
         TopView()->AddChild(new BButton({110, 50, 190, 70}, "own", "Own", new BMessage(MessageOwn)));
         field->MakeFocus();
@@ -158,10 +158,7 @@ TEST(BDialog, AWorkerCanRunOneAndItsStopEndsIt) {
     for (const bool stopped : {false, true}) {
         std::atomic<uint32> result = 0;
         auto* dialog = new TestDialog;
-        const Worker worker([&] {
-            result = dialog->DoModal();
-            return 0;
-        });
+        const Worker worker([&] { result = dialog->DoModal(); });
         Driver driver;
         driver.InField([&] { stopped ? void(kill_thread(worker.Id())) : Driver::Key(Qt::Key_Return); });
         EXPECT_TRUE(QTest::qWaitFor([&] { return result != 0; }));

@@ -16,6 +16,10 @@ namespace {
 
 constexpr bigtime_t kSecond = 1000000;
 
+status_t WaitFor(sem_id sem) {
+    return acquire_sem_etc(sem, 1, B_RELATIVE_TIMEOUT, B_INFINITE_TIMEOUT);
+}
+
 using Log = std::vector<uint32>;
 
 // Notes what it receives; then runs what a test gives it inside the handler.
@@ -50,12 +54,11 @@ class Loopers : public testing::Test {
 };
 
 TEST_F(Loopers, HandleMessagesInOrderAlsoWhenPostedFromAWorker) {
-    Log posted(200);
+    Log posted(50);
     std::iota(posted.begin(), posted.end(), 1);
     const Worker worker([&] {
         for (const uint32 code : posted)
             first_->PostMessage(code);
-        return 0;
     });
     EXPECT_TRUE(QTest::qWaitFor([&] { return log_ == posted; }));
 }
@@ -67,7 +70,7 @@ TEST_F(Loopers, AWaitingHandlerHoldsBackItsOwnMessagesOnly) {
     first_->inside = [&](uint32 code) {
         if (code != 1)
             return;
-        waited = acquire_sem(sem);
+        waited = WaitFor(sem);
         seenWhileWaiting = log_;
     };
     second_->inside = [&](uint32) { delete_sem(sem); };
@@ -98,7 +101,7 @@ TEST_F(Loopers, AskedToQuitWhileItsDestructorWaitsItIsDestroyedOnce) {
     const sem_id sem = create_sem(0, "wait");
     const auto wait = [&] {
         second_->PostMessage(1);
-        acquire_sem(sem);
+        WaitFor(sem);
     };
     int destroyed = 0;
     auto* waiting = new Waiting(wait, destroyed);
@@ -113,45 +116,18 @@ TEST_F(Loopers, AskedToQuitWhileItsDestructorWaitsItIsDestroyedOnce) {
 
 TEST_F(Loopers, LockIsRecursiveAndTimesOutForOthers) {
     ASSERT_TRUE(first_->Lock() && first_->Lock());
-    std::atomic<int> tried{0};
-    std::atomic<status_t> whileHeld{B_OK};
-    std::atomic<status_t> afterwards{B_ERROR};
+    std::atomic<status_t> whileHeld{B_OK}, afterwards{B_ERROR};
     const Worker worker([&] {
         whileHeld = first_->LockWithTimeout(2000);
-        tried = 1;
         afterwards = first_->LockWithTimeout(10 * kSecond);
         first_->Unlock();
-        tried = 2;
-        return 0;
     });
-    ASSERT_TRUE(QTest::qWaitFor([&] { return tried == 1; }));
-    EXPECT_EQ(whileHeld, B_TIMED_OUT);
+    ASSERT_TRUE(QTest::qWaitFor([&] { return whileHeld == B_TIMED_OUT; }));
     first_->Unlock();
     EXPECT_TRUE(first_->IsLocked());
     first_->Unlock();
     EXPECT_FALSE(first_->IsLocked());
-    ASSERT_TRUE(QTest::qWaitFor([&] { return tried == 2; }));
-    EXPECT_EQ(afterwards, B_OK);
-}
-
-TEST_F(Loopers, AMessageWaitsWhileAWorkerHoldsTheLockAndTheInterfaceGoesOn) {
-    const sem_id release = create_sem(0, "release");
-    std::atomic<bool> locked{false};
-    const Worker worker([&] {
-        first_->Lock();
-        locked = true;
-        acquire_sem(release);
-        first_->Unlock();
-        return 0;
-    });
-    ASSERT_TRUE(QTest::qWaitFor([&] { return locked.load(); }));
-    first_->PostMessage(1);
-    second_->PostMessage(2);
-    ASSERT_TRUE(QTest::qWaitFor([&] { return otherLog_.size() == 1; }));
-    EXPECT_TRUE(log_.empty());
-    release_sem(release);
-    EXPECT_TRUE(QTest::qWaitFor([&] { return log_.size() == 1; }));
-    delete_sem(release);
+    EXPECT_TRUE(QTest::qWaitFor([&] { return afterwards == B_OK; }));
 }
 
 TEST_F(Loopers, MessagesToWhatIsGoneAreDropped) {
@@ -173,20 +149,18 @@ TEST(Semaphores, CountTimeOutAndVanish) {
     EXPECT_EQ(acquire_sem_etc(sem, 1, B_RELATIVE_TIMEOUT, 0), B_OK);
     EXPECT_EQ(acquire_sem_etc(sem, 1, B_RELATIVE_TIMEOUT, 0), B_WOULD_BLOCK);
     EXPECT_EQ(acquire_sem_etc(sem, 1, B_RELATIVE_TIMEOUT, 5000), B_TIMED_OUT);
-    EXPECT_EQ(release_sem(sem), B_OK);
-    EXPECT_EQ(acquire_sem(sem), B_OK);
     EXPECT_EQ(delete_sem(sem), B_OK);
     EXPECT_EQ(delete_sem(sem), B_BAD_SEM_ID);
-    EXPECT_EQ(acquire_sem(sem), B_BAD_SEM_ID);
+    EXPECT_EQ(WaitFor(sem), B_BAD_SEM_ID);
     EXPECT_EQ(create_sem(-1, "bad"), B_BAD_VALUE);
 }
 
-TEST(Threads, KillEndsEveryKindOfWaitAndThreadsReturnTheirResults) {
+TEST(Threads, KillEndsEveryKindOfWait) {
     const BApplication application("test");
     const sem_id sem = create_sem(0, "never");
     const std::function<int32()> waits[] = {
         [] { return snooze(3600 * kSecond); },
-        [sem] { return acquire_sem(sem); },
+        [sem] { return WaitFor(sem); },
         [] {
             pollfd stop{thread_stop_fd(), POLLIN, 0};
             return poll(&stop, 1, -1) == 1 ? B_INTERRUPTED : B_ERROR;
@@ -198,7 +172,6 @@ TEST(Threads, KillEndsEveryKindOfWaitAndThreadsReturnTheirResults) {
         const Worker worker([&] {
             begun = true;
             result = wait();
-            return 0;
         });
         ASSERT_TRUE(QTest::qWaitFor([&] { return begun.load(); }));
         EXPECT_EQ(kill_thread(worker.Id()), B_OK);
@@ -207,16 +180,6 @@ TEST(Threads, KillEndsEveryKindOfWaitAndThreadsReturnTheirResults) {
     }
     EXPECT_FALSE(thread_stop_requested());
 
-    std::atomic<bool> go{false};
-    const Worker answer([&] {
-        while (!go)
-            snooze(1000);
-        return 42;
-    });
-    QTimer::singleShot(10, [&] { go = true; });
-    int32 result = 0;
-    EXPECT_EQ(wait_for_thread(answer.Id(), &result), B_OK);
-    EXPECT_EQ(result, 42);
     delete_sem(sem);
 }
 
@@ -228,7 +191,7 @@ TEST(Threads, RunOnceResumedEvenIfStoppedAtOnce) {
     for (int i = 0; i < all; ++i) {
         const Worker worker([&] {
             EXPECT_EQ(snooze(3600 * kSecond), B_INTERRUPTED);
-            return stopped += thread_stop_requested();
+            stopped += thread_stop_requested();
         });
         EXPECT_EQ(stop_thread(worker.Id()), B_OK);
     }

@@ -18,7 +18,7 @@ using Codes = std::vector<uint32>;
 // A window that keeps the codes of what its controls send.
 class RecordingWindow : public BWindow {
   public:
-    explicit RecordingWindow(BRect frame) : BWindow(frame, "stage", B_TITLED_WINDOW, 0) {}
+    explicit RecordingWindow(BRect frame) : BWindow(frame, "stage", B_DOCUMENT_WINDOW, 0) {}
 
     void MessageReceived(BMessage* message) override {
         received.push_back(message->what);

@@ -22,12 +22,12 @@ constexpr float UsualSampleWidth = 56;
 } // namespace
 
 void MessageBox(const char* text, alert_type type) {
-    (new BAlert("", text, "Ok", nullptr, nullptr, B_WIDTH_AS_USUAL, type))->Go();
+    (new BAlert("", text, "Ok", nullptr, nullptr, type))->Go();
 }
 
 bool YesNoBox(const char* text) {
     constexpr int32 no = 1;
-    return (new BAlert("", text, "Yes", "No", nullptr, B_WIDTH_AS_USUAL, B_WARNING_ALERT))->Go() == no;
+    return (new BAlert("", text, "Yes", "No", nullptr, B_WARNING_ALERT))->Go() == no;
 }
 
 void TellNotSaved() {
