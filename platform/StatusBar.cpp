@@ -90,9 +90,17 @@ void BStatusBar::SetText(const char* text) {
 }
 
 void BStatusBar::Refresh() {
-    const std::lock_guard guard(mutex_);
-    if (!std::exchange(changed_, false))
-        return;
-    const float part = maximum_ > 0 ? value_ / maximum_ : 1;
-    Widget(this)->Show(QString::fromStdString(label_ + text_), part);
+    std::string text;
+    float part = 1;
+    {
+        const std::lock_guard guard(mutex_);
+        if (!std::exchange(changed_, false))
+            return;
+        text = label_ + text_;
+        if (maximum_ > 0)
+            part = value_ / maximum_;
+    }
+    // Without the mutex: the toolkit paints at once, and that waits for a worker which holds the window's
+    // lock and may be about to update the bar.
+    Widget(this)->Show(QString::fromStdString(text), part);
 }
