@@ -8,25 +8,25 @@
 
 namespace {
 
-constexpr float kLabelInset = 8;
-constexpr float kExpanderWidth = 20;
-constexpr uint32 kExpanderKeeps = CLVF_FIXED_POSITION | CLVF_KEEP_FIRST | CLVF_HIDDEN | CLVF_MOVE_WITH_NEXT;
-constexpr uint32 kExpanderFlags = CLVF_EXPANDER | CLVF_FIXED_WIDTH | CLVF_JOIN_HEADER;
+constexpr float LabelInset = 8;
+constexpr float ExpanderWidth = 20;
+constexpr uint32 ExpanderKeeps = CLVF_FIXED_POSITION | CLVF_KEEP_FIRST | CLVF_HIDDEN | CLVF_MOVE_WITH_NEXT;
+constexpr uint32 ExpanderFlags = CLVF_EXPANDER | CLVF_FIXED_WIDTH | CLVF_JOIN_HEADER;
 
 // Written so that "not a number" gives the least width too.
 float Limited(float width, float least) {
-    return width > least ? std::min(width, CLVColumn::kGreatestWidth) : least;
+    return width > least ? std::min(width, CLVColumn::GreatestWidth) : least;
 }
 
 } // namespace
 
 CLVColumn::CLVColumn(const char* label, float width, uint32 flags, float minWidth)
-    : hasLabel_(label != nullptr), width_(0), minWidth_(Limited(minWidth, kLeastWidth)), flags_(flags) {
+    : hasLabel_(label != nullptr), width_(0), minWidth_(Limited(minWidth, LeastWidth)), flags_(flags) {
     if ((flags & CLVF_EXPANDER) != 0) {
-        flags_ = (flags & kExpanderKeeps) | kExpanderFlags;
+        flags_ = (flags & ExpanderKeeps) | ExpanderFlags;
         hasLabel_ = false;
-        minWidth_ = kExpanderWidth;
-        width = kExpanderWidth;
+        minWidth_ = ExpanderWidth;
+        width = ExpanderWidth;
     }
     width_ = Limited(width, minWidth_);
     if (hasLabel_)
@@ -59,14 +59,14 @@ void CLVColumn::SetShown(bool shown) {
 void CLVColumn::Truncate(const BFont& font) {
     if (hasLabel_ && (flags_ & CLVF_TRUNCATE_HEADER) != 0)
         truncatedLabel_ = TruncatedLabel(
-            label_, width_ - 2 * kLabelInset,
+            label_, width_ - 2 * LabelInset,
             [&](const std::string& text) { return font.StringWidth(text.c_str()); });
 }
 
 void CLVColumn::DrawColumnHeader(BView* view, BRect rect, bool sortKey, bool pressed, float fontAscent) {
     if (!hasLabel_)
         return;
-    const BPoint start(rect.left + kLabelInset, rect.top + 1 + fontAscent);
+    const BPoint start(rect.left + LabelInset, rect.top + 1 + fontAscent);
     const char* text = truncatedLabel_.c_str();
     view->SetHighColor(pressed ? rgb_color{0, 0, 229, 255} : rgb_color{0, 0, 0, 255});
     view->DrawString(text, start);

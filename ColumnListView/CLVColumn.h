@@ -2,12 +2,28 @@
 
 #include <string>
 
-#include "ColumnListView/ColumnFlags.h"
 #include "platform/Rect.h"
+#include "platform/Types.h"
 
 class BFont;
 class BView;
 class ColumnListView;
+
+// What a column may do and how it sorts.
+constexpr uint32 CLVF_SORTABLE = 0x001;       // can be a sort key; header clicks sort by it
+constexpr uint32 CLVF_FIXED_POSITION = 0x002; // its drag group cannot be dragged
+constexpr uint32 CLVF_FIXED_WIDTH = 0x004;    // the person cannot resize it
+constexpr uint32 CLVF_KEEP_FIRST = 0x008;     // stays before every column without this flag
+constexpr uint32 CLVF_KEEP_LAST = 0x010;      // stays after every column without this flag
+constexpr uint32 CLVF_HIDDEN = 0x020;         // not shown; takes no space
+constexpr uint32 CLVF_JOIN_HEADER = 0x040;    // no header divider between it and the next shown column
+constexpr uint32 CLVF_MOVE_WITH_NEXT = 0x080; // one drag group with the next column in display order
+constexpr uint32 CLVF_EXPANDER = 0x100;       // holds the outline's arrows; at most one in a list
+constexpr uint32 CLVF_PASS_INDENT = 0x200; // when pushed, passes the indentation on to the next shown column
+constexpr uint32 CLVF_TRUNCATE_HEADER = 0x400; // a label that does not fit is shortened, not clipped
+constexpr uint32 CLVF_WIDTH_NOTICE = 0x800;    // every row is told when this column's width changes
+
+enum class CLVSortMode : int32 { Ascending = 0, Descending = 1, None = 2 };
 
 // One column of a ColumnListView: its label, width, flags and sort mode, and where the list has placed it. It
 // draws its label in the header; it neither draws rows nor handles the pointer.
@@ -18,13 +34,13 @@ class ColumnListView;
 class CLVColumn {
   public:
     // The least width of any column, and the greatest: beyond it places would no longer be exact numbers.
-    static constexpr float kLeastWidth = 4;
-    static constexpr float kGreatestWidth = 100000;
+    static constexpr float LeastWidth = 4;
+    static constexpr float GreatestWidth = 100000;
 
-    // label is copied and may be null. A minimum width below kLeastWidth becomes kLeastWidth, a width below
+    // label is copied and may be null. A minimum width below LeastWidth becomes LeastWidth, a width below
     // the minimum becomes the minimum. A column with CLVF_EXPANDER has no label and is 20 wide; of the flags
     // given it keeps those that keep it first, hidden, at its position or with the next column.
-    CLVColumn(const char* label, float width, uint32 flags = 0, float minWidth = kLeastWidth);
+    CLVColumn(const char* label, float width, uint32 flags = 0, float minWidth = LeastWidth);
     virtual ~CLVColumn();
     CLVColumn(const CLVColumn&) = delete;
     CLVColumn& operator=(const CLVColumn&) = delete;

@@ -9,12 +9,12 @@
 
 namespace {
 
-constexpr rgb_color kBackground{216, 216, 216, 255};
-constexpr rgb_color kLight{255, 255, 255, 255};
-constexpr rgb_color kShadow{152, 152, 152, 255};
-constexpr rgb_color kHighlight{0, 0, 229, 255};
-constexpr float kDragReach = 2;  // sideways moves up to here are still a click
-constexpr float kWidthStep = 10; // of a key press
+constexpr rgb_color Background{216, 216, 216, 255};
+constexpr rgb_color Light{255, 255, 255, 255};
+constexpr rgb_color Shadow{152, 152, 152, 255};
+constexpr rgb_color Highlight{0, 0, 229, 255};
+constexpr float DragReach = 2;  // sideways moves up to here are still a click
+constexpr float WidthStep = 10; // of a key press
 
 uint32 Field(const BMessage* message, const char* name, uint32 fallback) {
     auto value = static_cast<int32>(fallback);
@@ -29,7 +29,7 @@ CLVColumnLabelView::CLVColumnLabelView(BRect frame, ColumnListView* list, const 
     : BView(frame, "column labels", B_FOLLOW_LEFT_RIGHT | B_FOLLOW_TOP, B_WILL_DRAW | B_NAVIGABLE),
       list_(list) {
     SetFont(font);
-    SetViewColor(kBackground);
+    SetViewColor(Background);
     font_height height;
     font->GetHeight(&height);
     ascent_ = std::round(height.ascent);
@@ -96,7 +96,7 @@ void CLVColumnLabelView::Begin(BPoint where, uint32 modifierKeys) {
 
 void CLVColumnLabelView::MessageReceived(BMessage* message) {
     const uint32 what = message->what;
-    if (what != kMouseWatcherUp && what != kMouseWatcherMoved && what != kMouseWatcherDown) {
+    if (what != MouseWatcherUp && what != MouseWatcherMoved && what != MouseWatcherDown) {
         BView::MessageReceived(message);
         return;
     }
@@ -117,7 +117,7 @@ void CLVColumnLabelView::MessageReceived(BMessage* message) {
 // On dense screens the pointer has fractions of a pixel; edges keep to whole ones, so that they stay sharp.
 void CLVColumnLabelView::Move(BPoint where) {
     press_.lastAt = where;
-    if (press_.action == Action::Press && std::fabs(where.x - press_.pressedAt.x) > kDragReach)
+    if (press_.action == Action::Press && std::fabs(where.x - press_.pressedAt.x) > DragReach)
         StartDrag();
     if (press_.action == Action::Resize)
         press_.column->SetWidth(std::round(where.x - press_.grabOffset - press_.column->Begin()));
@@ -200,7 +200,7 @@ bool CLVColumnLabelView::KeyDown(char key) {
     case '+':
     case '-':
         if (resizable)
-            column->SetWidth(column->Width() + (key == '+' ? kWidthStep : -kWidthStep));
+            column->SetWidth(column->Width() + (key == '+' ? WidthStep : -WidthStep));
         return true;
     default:
         return false;
@@ -226,7 +226,7 @@ void CLVColumnLabelView::StartDrag() {
 void CLVColumnLabelView::DragTo(float x) {
     // Each swap takes the group one place further the same way, so there are fewer than groups.
     for (std::size_t swaps = list_->DragGroups().size(); swaps > 0 && press_.action == Action::Drag;
-         swaps--) {
+         --swaps) {
         const int32 dragged = PressedGroup();
         const int32 target = GroupToSwapWith(list_->DragGroups(), dragged, x);
         if (target < 0)
@@ -269,21 +269,21 @@ void CLVColumnLabelView::DrawCell(CLVColumn& column, BRect cell, bool joinsPrevi
     column.headerRect_ = cell;
     column.DrawColumnHeader(this, cell, isKey, isPressed && press_.action != Action::Resize, ascent_);
     if (IsFocus() && MarkedColumn() == &column) {
-        SetHighColor(kHighlight);
+        SetHighColor(Highlight);
         StrokeRect({cell.left + 2, cell.top + 2, cell.right - 2, cell.bottom - 2});
     }
     ConstrainClippingRegion(nullptr);
 }
 
 void CLVColumnLabelView::DrawBevel(BRect cell, bool joinsPrevious, bool joinsNext, bool resizing) {
-    SetHighColor(kLight);
+    SetHighColor(Light);
     StrokeLine({cell.left, cell.top}, {cell.right, cell.top});
     if (!joinsPrevious)
         StrokeLine({cell.left, cell.top}, {cell.left, cell.bottom});
-    SetHighColor(kShadow);
+    SetHighColor(Shadow);
     StrokeLine({cell.left, cell.bottom}, {cell.right, cell.bottom});
     if (!joinsNext || resizing) {
-        SetHighColor(resizing ? kHighlight : kShadow);
+        SetHighColor(resizing ? Highlight : Shadow);
         StrokeLine({cell.right, cell.top}, {cell.right, cell.bottom});
     }
 }
@@ -292,8 +292,9 @@ void CLVColumnLabelView::DrawOutline() {
     const DragGroup& group = list_->DragGroups()[static_cast<std::size_t>(PressedGroup())];
     const BRect bounds = Bounds();
     const float width = group.end - group.begin;
-    const float left = HeldOutlineLeft(press_.lastAt.x - press_.grabOffset, width, bounds.left, bounds.right);
-    SetHighColor(kHighlight);
+    const float left =
+        std::max(bounds.left, std::min(press_.lastAt.x - press_.grabOffset, bounds.right - width));
+    SetHighColor(Highlight);
     StrokeRect({left, bounds.top, left + width, bounds.bottom});
 }
 

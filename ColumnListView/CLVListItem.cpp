@@ -50,7 +50,3 @@ void CLVListItem::Update(BView* owner, const BFont* font) {
     BListItem::Update(owner, font);
     SetHeight(std::max(Height(), minHeight_));
 }
-
-void CLVListItem::ColumnWidthChanged(int32, float, ColumnListView*) {}
-
-void CLVListItem::FrameChanged(int32, BRect, ColumnListView*) {}

@@ -26,9 +26,9 @@ class CLVListItem : public BListItem {
     // is not painted yet.
     virtual void DrawItemColumn(BView* owner, BRect columnRect, int32 column, bool complete) = 0;
     // For columns with CLVF_WIDTH_NOTICE: the new width, less what the indentation cuts off.
-    virtual void ColumnWidthChanged(int32 column, float width, ColumnListView* list);
+    virtual void ColumnWidthChanged(int32 /*column*/, float /*width*/, ColumnListView* /*list*/) {}
     // For columns with CLVF_WIDTH_NOTICE, on rows in sight: the column has moved; frame is its place.
-    virtual void FrameChanged(int32 column, BRect frame, ColumnListView* list);
+    virtual void FrameChanged(int32 /*column*/, BRect /*frame*/, ColumnListView* /*list*/) {}
 
     [[nodiscard]] bool IsSuperItem() const { return superitem_; }
     void SetSuperItem(bool superitem) { superitem_ = superitem; }
@@ -51,5 +51,5 @@ class CLVListItem : public BListItem {
     BRect expanderRect_{-1, -1, -1, -1};
     ColumnListView* list_ = nullptr;
     bool inSight_ = false; // outline lists: among the visible rows
-    int32 fullIndex_ = -1; // outline lists: place in the full list as of its last renumbering
+    int32 fullIndex_ = -1; // outline lists: place in the full list as of the last sort
 };

@@ -30,14 +30,14 @@ BRect ColumnFrameInRow(const ColumnPlace& place, const BRect& row, float indenta
 }
 
 BRect ArrowFrame(const BRect& expanderFrame) {
-    const float right = expanderFrame.right - kArrowInset;
-    const float top = expanderFrame.top + std::floor((expanderFrame.Height() + 1 - kArrowSize) / 2);
-    return {right - kArrowSize + 1, top, right, top + kArrowSize - 1};
+    const float right = expanderFrame.right - ArrowInset;
+    const float top = expanderFrame.top + std::floor((expanderFrame.Height() + 1 - ArrowSize) / 2);
+    return {right - ArrowSize + 1, top, right, top + ArrowSize - 1};
 }
 
 HeaderHit HitHeader(const std::vector<ColumnShape>& shapes, const ColumnLayout& layout, float x) {
     int32 previous = -1;
-    for (std::size_t i = 0; i < shapes.size(); i++) {
+    for (std::size_t i = 0; i < shapes.size(); ++i) {
         if (!shapes[i].IsShown())
             continue;
         const auto position = static_cast<int32>(i);
@@ -46,9 +46,9 @@ HeaderHit HitHeader(const std::vector<ColumnShape>& shapes, const ColumnLayout& 
             const auto resizable = [&](int32 at) {
                 return at >= 0 && (shapes[static_cast<std::size_t>(at)].flags & CLVF_FIXED_WIDTH) == 0;
             };
-            if (x <= begin + kBorderReach && resizable(previous))
+            if (x <= begin + BorderReach && resizable(previous))
                 return {HeaderHit::What::Border, previous};
-            if (x >= end - kBorderReach && resizable(position))
+            if (x >= end - BorderReach && resizable(position))
                 return {HeaderHit::What::Border, position};
             return {HeaderHit::What::Header, position};
         }

@@ -4,16 +4,16 @@
 
 #include <vector>
 
-#include "ColumnListView/ColumnFlags.h"
+#include "ColumnListView/CLVColumn.h"
 #include "platform/Rect.h"
 
 // How far one outline level moves the expander column and the pushed columns to the right.
-constexpr float kIndentPerLevel = 20;
+constexpr float IndentPerLevel = 20;
 // Side length of the expander arrow, and its distance from the expander column's end.
-constexpr float kArrowSize = 10;
-constexpr float kArrowInset = 3;
+constexpr float ArrowSize = 10;
+constexpr float ArrowInset = 3;
 // How near to a border a press still takes hold of the border.
-constexpr float kBorderReach = 2;
+constexpr float BorderReach = 2;
 
 // What of a column decides where it lies.
 struct ColumnShape {
@@ -56,8 +56,8 @@ struct HeaderHit {
     bool operator==(const HeaderHit&) const = default;
 };
 
-// Within kBorderReach right of a column's begin lies the border of the shown column before it, within
-// kBorderReach left of its end its own; a border of a column with CLVF_FIXED_WIDTH is part of the header
+// Within BorderReach right of a column's begin lies the border of the shown column before it, within
+// BorderReach left of its end its own; a border of a column with CLVF_FIXED_WIDTH is part of the header
 // around it.
 [[nodiscard]] HeaderHit HitHeader(const std::vector<ColumnShape>& shapes, const ColumnLayout& layout,
                                   float x);

@@ -4,7 +4,6 @@
 #include <cstdio>
 #include <cstdlib>
 
-#include "ColumnListView/BetterScrollView.h"
 #include "ColumnListView/CLVColumnLabelView.h"
 #include "platform/Window.h"
 
@@ -14,7 +13,7 @@ constexpr uint8 X = 0;                         // black in the system's colour m
 constexpr uint8 o = B_TRANSPARENT_MAGIC_CMAP8; // what lies below stays
 
 // clang-format off
-constexpr uint8 kRightArrow[] = {
+constexpr uint8 RightArrow[] = {
     o, o, o, o, o, o, o, o, o, o,
     o, o, o, X, o, o, o, o, o, o,
     o, o, o, X, X, o, o, o, o, o,
@@ -26,7 +25,7 @@ constexpr uint8 kRightArrow[] = {
     o, o, o, X, o, o, o, o, o, o,
     o, o, o, o, o, o, o, o, o, o,
 };
-constexpr uint8 kDownArrow[] = {
+constexpr uint8 DownArrow[] = {
     o, o, o, o, o, o, o, o, o, o,
     o, o, o, o, o, o, o, o, o, o,
     o, o, o, o, o, o, o, o, o, o,
@@ -41,50 +40,12 @@ constexpr uint8 kDownArrow[] = {
 // clang-format on
 
 BRect ArrowBounds() {
-    return {0, 0, kArrowSize - 1, kArrowSize - 1};
+    return {0, 0, ArrowSize - 1, ArrowSize - 1};
 }
 
 CLVListItem* Row(BListItem* item) {
     return static_cast<CLVListItem*>(item); // every row of the list was checked as it was added
 }
-
-// Rows to add to or take out of the base's list at one place, in runs, each in the cost of one change.
-class VisibleRun {
-  public:
-    VisibleRun(std::function<void(BList*, int32)> add, std::function<void(int32, int32)> remove, int32 at)
-        : add_(std::move(add)), remove_(std::move(remove)), at_(at) {}
-
-    void Add(CLVListItem* row) {
-        if (removed_ > 0)
-            Flush();
-        added_.AddItem(static_cast<BListItem*>(row));
-    }
-    void Remove() {
-        if (!added_.IsEmpty())
-            Flush();
-        removed_++;
-    }
-    void Keep() {
-        Flush();
-        at_++;
-    }
-    void Flush() {
-        if (!added_.IsEmpty())
-            add_(&added_, at_);
-        if (removed_ > 0)
-            remove_(at_, removed_);
-        at_ += added_.CountItems();
-        added_.MakeEmpty();
-        removed_ = 0;
-    }
-
-  private:
-    std::function<void(BList*, int32)> add_;
-    std::function<void(int32, int32)> remove_;
-    BList added_;
-    int32 removed_ = 0;
-    int32 at_;
-};
 
 template <class T>
 void Erase(std::vector<T>& values, const T& value) {
@@ -93,14 +54,26 @@ void Erase(std::vector<T>& values, const T& value) {
 
 } // namespace
 
+BetterScrollView::BetterScrollView(const char* name, ColumnListView* list, CLVColumnLabelView* header,
+                                   uint32 resizingMode, uint32 flags, bool horizontal, bool vertical,
+                                   border_style border)
+    : BScrollView(name, list, resizingMode, flags, horizontal, vertical, border) {
+    const float height = header->Frame().Height();
+    SetTopMargin(height + 1);
+    const BRect rows = list->Frame();
+    header->MoveTo(rows.left, rows.top - height - 1);
+    header->ResizeTo(Bounds().Width() - 2 * rows.left, height);
+    AddChild(header);
+}
+
 ColumnListView::ColumnListView(BRect frame, BetterScrollView** container, const char* name,
                                uint32 resizingMode, uint32 flags, list_view_type type, bool hierarchical,
                                bool horizontalScrollBar, bool verticalScrollBar, bool, border_style border,
                                const BFont* font)
     : BListView(frame, name, type, resizingMode, flags),
       hierarchical_(hierarchical),
-      rightArrow_(ArrowBounds(), B_CMAP8, kRightArrow, sizeof kRightArrow),
-      downArrow_(ArrowBounds(), B_CMAP8, kDownArrow, sizeof kDownArrow) {
+      rightArrow_(ArrowBounds(), B_CMAP8, RightArrow, sizeof RightArrow),
+      downArrow_(ArrowBounds(), B_CMAP8, DownArrow, sizeof DownArrow) {
     const BFont& labelFont = font ? *font : *be_plain_font;
     const BRect headerFrame(0, 0, frame.Width(), CLVColumnLabelView::HeightFor(labelFont));
     header_ = new CLVColumnLabelView(headerFrame, this, &labelFont);
@@ -110,10 +83,7 @@ ColumnListView::ColumnListView(BRect frame, BetterScrollView** container, const 
 }
 
 ColumnListView::~ColumnListView() {
-    FullListDoForEach([](CLVListItem* row) {
-        ReleaseRow(*row);
-        return false;
-    });
+    ReleaseAllRows();
     while (!columns_.empty())
         columns_.pop_back();
 }
@@ -136,14 +106,14 @@ bool ColumnListView::AddColumn(CLVColumn* column) {
 
 bool ColumnListView::AddColumnList(BList* newColumns) {
     std::vector<CLVColumn*> added;
-    for (int32 i = 0; newColumns && i < newColumns->CountItems(); i++)
+    for (int32 i = 0; newColumns && i < newColumns->CountItems(); ++i)
         added.push_back(static_cast<CLVColumn*>(newColumns->ItemAt(i)));
     return newColumns && AddColumns(added);
 }
 
 bool ColumnListView::TakesColumns(const std::vector<CLVColumn*>& added) const {
     const auto isExpander = [](const auto& column) { return (column->Flags() & CLVF_EXPANDER) != 0; };
-    for (std::size_t i = 0; i < added.size(); i++) {
+    for (std::size_t i = 0; i < added.size(); ++i) {
         const auto end = added.begin() + static_cast<std::ptrdiff_t>(i);
         if (!added[i] || added[i]->list_ || std::find(added.begin(), end, added[i]) != end)
             return false;
@@ -178,7 +148,7 @@ bool ColumnListView::RemoveColumns(CLVColumn* first, int32 count) {
     if (index < 0 || count < 1 || count > CountColumns() - index)
         return false;
     const std::size_t keys = sortKeys_.size();
-    for (int32 i = 0; i < count; i++)
+    for (int32 i = 0; i < count; ++i)
         ReleaseColumn(static_cast<std::size_t>(index));
     NumberColumns();
     ColumnsChanged();
@@ -198,7 +168,7 @@ void ColumnListView::ReleaseColumn(std::size_t index) {
 }
 
 void ColumnListView::NumberColumns() {
-    for (std::size_t i = 0; i < columns_.size(); i++)
+    for (std::size_t i = 0; i < columns_.size(); ++i)
         columns_[i]->index_ = static_cast<int32>(i);
 }
 
@@ -220,7 +190,7 @@ std::vector<int32> ColumnListView::DisplayOrder() const {
 bool ColumnListView::SetDisplayOrder(const int32* order) {
     AssertLocked();
     std::vector<CLVColumn*> ordered;
-    for (int32 i = 0; order && i < CountColumns(); i++) {
+    for (int32 i = 0; order && i < CountColumns(); ++i) {
         CLVColumn* column = ColumnAt(order[i]);
         if (!column || std::find(ordered.begin(), ordered.end(), column) != ordered.end())
             return false;
@@ -236,9 +206,8 @@ bool ColumnListView::SetDisplayOrder(const int32* order) {
 }
 
 void ColumnListView::MoveDragGroup(int32 dragged, int32 target) {
-    std::vector<int32> order;
-    for (const int32 position : MoveGroup(dragGroups_, dragged, target))
-        order.push_back(displayOrder_[static_cast<std::size_t>(position)]->index_);
+    std::vector<int32> order = DisplayOrder();
+    MoveGroup(dragGroups_, dragged, target, order);
     SetDisplayOrder(order.data());
 }
 
@@ -250,17 +219,18 @@ std::vector<ColumnShape> ColumnListView::Shapes() const {
 }
 
 void ColumnListView::KeepOrder() {
-    std::vector<CLVColumn*> kept;
-    for (const int32 position : KeepingOrder(Shapes()))
-        kept.push_back(displayOrder_[static_cast<std::size_t>(position)]);
-    displayOrder_ = std::move(kept);
+    const auto rank = [](const CLVColumn* column) {
+        return (column->flags_ & CLVF_KEEP_FIRST) != 0 ? 0 : (column->flags_ & CLVF_KEEP_LAST) != 0 ? 2 : 1;
+    };
+    std::stable_sort(displayOrder_.begin(), displayOrder_.end(),
+                     [&](const CLVColumn* a, const CLVColumn* b) { return rank(a) < rank(b); });
 }
 
 void ColumnListView::PlaceColumns() {
     const std::vector<ColumnShape> shapes = Shapes();
     layout_ = LayOutColumns(shapes);
     dragGroups_ = BuildDragGroups(shapes, layout_);
-    for (std::size_t i = 0; i < displayOrder_.size(); i++) {
+    for (std::size_t i = 0; i < displayOrder_.size(); ++i) {
         displayOrder_[i]->begin_ = layout_.places[i].begin;
         displayOrder_[i]->end_ = layout_.places[i].end;
         displayOrder_[i]->pushed_ = layout_.places[i].pushed;
@@ -317,7 +287,7 @@ void ColumnListView::TellRowsOfFrames(float from) {
     for (const CLVColumn* column : displayOrder_)
         if (column->IsShown() && (column->flags_ & CLVF_WIDTH_NOTICE) != 0 && column->begin_ >= from)
             noticed.push_back(column);
-    for (int32 i = 0; !noticed.empty() && i < CountItems(); i++) {
+    for (int32 i = 0; !noticed.empty() && i < CountItems(); ++i) {
         CLVListItem* row = Row(ItemAt(i));
         for (const CLVColumn* column : noticed)
             row->FrameChanged(column->index_, ColumnFrame(*row, *column, ItemFrame(i)), this);
@@ -337,7 +307,7 @@ void ColumnListView::ScrollToColumn(const CLVColumn& column) {
 BRect ColumnListView::ColumnFrame(const CLVListItem& row, const CLVColumn& column,
                                   const BRect& rowRect) const {
     const bool indents = column.pushed_ || (column.flags_ & CLVF_EXPANDER) != 0;
-    const float indentation = indents ? kIndentPerLevel * static_cast<float>(row.OutlineLevel()) : 0;
+    const float indentation = indents ? IndentPerLevel * static_cast<float>(row.OutlineLevel()) : 0;
     return ColumnFrameInRow({column.begin_, column.end_, column.pushed_}, rowRect, indentation,
                             layout_.pushEnd);
 }
@@ -416,7 +386,7 @@ void ColumnListView::ReverseSortMode(int32 index) {
 void ColumnListView::SetSorting(int32 count, const int32* columns, const CLVSortMode* modes) {
     AssertLocked();
     sortKeys_.clear();
-    for (int32 i = 0; i < count; i++) {
+    for (int32 i = 0; i < count; ++i) {
         CLVColumn* column = SortableColumn(columns[i]);
         if (!column || IsSortKey(columns[i]))
             continue;
@@ -428,7 +398,7 @@ void ColumnListView::SetSorting(int32 count, const int32* columns, const CLVSort
 }
 
 int32 ColumnListView::Sorting(int32* columns, CLVSortMode* modes) const {
-    for (std::size_t i = 0; i < sortKeys_.size(); i++) {
+    for (std::size_t i = 0; i < sortKeys_.size(); ++i) {
         if (columns)
             columns[i] = sortKeys_[i]->index_;
         if (modes)
@@ -444,8 +414,6 @@ bool ColumnListView::IsSortKey(int32 index) const {
 int32 ColumnListView::PrimarySortKey() const {
     return sortKeys_.empty() ? -1 : sortKeys_.front()->index_;
 }
-
-void ColumnListView::SortingChanged() {}
 
 int ColumnListView::Compare(const CLVListItem* a, const CLVListItem* b) const {
     for (const CLVColumn* key : sortKeys_) {
@@ -468,7 +436,8 @@ void ColumnListView::SortItems() {
     }
     fullList_ = SortedOutline(fullList_,
                               [this](const CLVListItem* a, const CLVListItem* b) { return Compare(a, b); });
-    NumberFullList();
+    for (std::size_t i = 0; i < fullList_.size(); ++i)
+        fullList_[i]->fullIndex_ = static_cast<int32>(i);
     BListView::SortItems([](const BListItem* a, const BListItem* b) {
         return static_cast<const CLVListItem*>(a)->fullIndex_ -
                static_cast<const CLVListItem*>(b)->fullIndex_;
@@ -482,19 +451,11 @@ bool ColumnListView::AddItem(BListItem* item) {
 }
 
 bool ColumnListView::AddItem(BListItem* item, int32 index) {
-    AssertLocked();
-    auto* row = dynamic_cast<CLVListItem*>(item);
-    if (!row || row->list_ || index < 0 || index > FullListCountItems())
+    if (!dynamic_cast<CLVListItem*>(item))
         return false;
-    row->list_ = this;
-    if (hierarchical_) {
-        AddToOutline({row}, index);
-        return true;
-    }
-    if (BListView::AddItem(item, index))
-        return true;
-    ReleaseRow(*row);
-    return false;
+    BList one;
+    one.AddItem(item);
+    return AddList(&one, index);
 }
 
 bool ColumnListView::AddList(BList* newItems) {
@@ -507,7 +468,7 @@ bool ColumnListView::AddList(BList* newItems, int32 index) {
         return false;
     OutlineSequence rows;
     rows.reserve(static_cast<std::size_t>(newItems->CountItems()));
-    for (int32 i = 0; i < newItems->CountItems(); i++) {
+    for (int32 i = 0; i < newItems->CountItems(); ++i) {
         auto* row = static_cast<CLVListItem*>(static_cast<BListItem*>(newItems->ItemAt(i)));
         if (!row || row->list_)
             break;
@@ -529,10 +490,11 @@ bool ColumnListView::AddList(BList* newItems, int32 index) {
 void ColumnListView::AddToOutline(const OutlineSequence& rows, int32 index) {
     if (rows.empty())
         return;
+    // The rows behind may stand under the new ones from now on.
     fullList_.insert(fullList_.begin() + index, rows.begin(), rows.end());
-    // The rows behind may stand under the new ones now.
-    const auto end = index + static_cast<int32>(rows.size());
-    BringInSight(index, DescendantsEnd(fullList_, index, end));
+    const int32 end = DescendantsEnd(fullList_, index, index + static_cast<int32>(rows.size()));
+    HideRows(index, end);
+    ShowRows(index, end);
 }
 
 bool ColumnListView::RemoveItem(BListItem* item) {
@@ -550,28 +512,33 @@ bool ColumnListView::RemoveItems(int32 index, int32 count) {
     if (index < 0 || count < 1 || count > FullListCountItems() - index)
         return false;
     if (!hierarchical_) {
-        for (int32 i = index; i < index + count; i++)
+        for (int32 i = index; i < index + count; ++i)
             ReleaseRow(*Row(ItemAt(i)));
         return BListView::RemoveItems(index, count);
     }
-    const auto begin = fullList_.begin() + index;
-    const auto end = fullList_.begin() + DescendantsEnd(fullList_, index, index + count);
-    const auto isInSight = [](const CLVListItem* row) { return row->inSight_; };
-    const auto firstInSight = std::find_if(begin, end, isInSight);
-    if (firstInSight != end)
-        BListView::RemoveItems(IndexOf(*firstInSight),
-                               static_cast<int32>(std::count_if(firstInSight, end, isInSight)));
-    std::for_each(begin, end, [](CLVListItem* row) { ReleaseRow(*row); });
-    fullList_.erase(begin, end);
+    const int32 end = DescendantsEnd(fullList_, index, index + count);
+    HideRows(index, end);
+    std::for_each(fullList_.begin() + index, fullList_.begin() + end,
+                  [](CLVListItem* row) { ReleaseRow(*row); });
+    fullList_.erase(fullList_.begin() + index, fullList_.begin() + end);
     return true;
+}
+
+void ColumnListView::RemoveSelected() {
+    AssertLocked();
+    for (int32 i = FullListCountItems() - 1; i >= 0; --i) {
+        CLVListItem* row = FullListItemAt(i);
+        if (row->IsSelected() && hierarchical_)
+            RemoveItems(i, 1);
+        else if (row->IsSelected())
+            ReleaseRow(*row);
+    }
+    BListView::RemoveSelected();
 }
 
 void ColumnListView::MakeEmpty() {
     AssertLocked();
-    FullListDoForEach([](CLVListItem* row) {
-        ReleaseRow(*row);
-        return false;
-    });
+    ReleaseAllRows();
     fullList_.clear();
     BListView::MakeEmpty();
 }
@@ -579,7 +546,13 @@ void ColumnListView::MakeEmpty() {
 void ColumnListView::ReleaseRow(CLVListItem& row) {
     row.list_ = nullptr;
     row.inSight_ = false;
-    row.fullIndex_ = -1;
+}
+
+void ColumnListView::ReleaseAllRows() {
+    FullListDoForEach([](CLVListItem* row) {
+        ReleaseRow(*row);
+        return false;
+    });
 }
 
 void ColumnListView::MouseDown(BPoint where) {
@@ -616,7 +589,7 @@ bool ColumnListView::AddUnder(BListItem* item, BListItem* superitem) {
         above->SetSuperItem(true);
         InvalidateItem(IndexOf(above));
     }
-    return AddItem(row, DescendantsEnd(fullList_, index));
+    return AddItem(row, DescendantsEnd(fullList_, index, index + 1));
 }
 
 void ColumnListView::Expand(CLVListItem* item) {
@@ -633,37 +606,38 @@ void ColumnListView::SetExpanded(CLVListItem* item, bool expanded) {
     if (!hierarchical_ || index < 0 || item->IsExpanded() == expanded)
         return;
     item->BListItem::SetExpanded(expanded);
-    BringInSight(index + 1, DescendantsEnd(fullList_, index));
+    const int32 end = DescendantsEnd(fullList_, index, index + 1);
+    if (expanded)
+        ShowRows(index + 1, end);
+    else
+        HideRows(index + 1, end);
     if (item->inSight_)
         InvalidateItem(IndexOf(item));
 }
 
-void ColumnListView::BringInSight(int32 fullBegin, int32 fullEnd) {
-    const auto begin = fullList_.begin() + fullBegin;
-    const auto before = std::find_if(
-        std::make_reverse_iterator(begin), fullList_.rend(),
-        [](const CLVListItem* row) { return row->inSight_; });
-    VisibleRun run([this](BList* rows, int32 at) { BListView::AddList(rows, at); },
-                   [this](int32 at, int32 count) { BListView::RemoveItems(at, count); },
-                   before == fullList_.rend() ? 0 : IndexOf(*before) + 1);
-    const std::vector<bool> inSight = RowsInSight(fullList_, fullBegin, fullEnd);
-    for (std::size_t i = 0; i < inSight.size(); i++) {
-        CLVListItem* row = begin[static_cast<std::ptrdiff_t>(i)];
-        const bool was = row->inSight_;
-        row->inSight_ = inSight[i];
-        if (was && inSight[i])
-            run.Keep();
-        else if (was)
-            run.Remove();
-        else if (inSight[i])
-            run.Add(row);
+void ColumnListView::HideRows(int32 begin, int32 end) {
+    int32 first = -1;
+    int32 count = 0;
+    for (int32 i = begin; i < end; ++i) {
+        CLVListItem* row = FullListItemAt(i);
+        if (!row->inSight_)
+            continue;
+        if (count++ == 0)
+            first = IndexOf(row);
+        row->inSight_ = false;
     }
-    run.Flush();
+    BListView::RemoveItems(first, count);
 }
 
-void ColumnListView::NumberFullList() const {
-    for (std::size_t i = 0; i < fullList_.size(); i++)
-        fullList_[i]->fullIndex_ = static_cast<int32>(i);
+void ColumnListView::ShowRows(int32 begin, int32 end) {
+    const auto before = std::find_if(std::make_reverse_iterator(fullList_.begin() + begin), fullList_.rend(),
+                                     [](const CLVListItem* row) { return row->inSight_; });
+    BList rows;
+    for (CLVListItem* row : RowsInSight(fullList_, begin, end)) {
+        row->inSight_ = true;
+        rows.AddItem(static_cast<BListItem*>(row));
+    }
+    BListView::AddList(&rows, before == fullList_.rend() ? 0 : IndexOf(*before) + 1);
 }
 
 bool ColumnListView::IsExpanded(int32 fullIndex) const {
@@ -685,14 +659,8 @@ int32 ColumnListView::FullListIndexOf(const CLVListItem* item) const {
         return -1;
     if (!hierarchical_)
         return IndexOf(item);
-    // A row's noted place is right until rows before it come or go.
-    const auto isRight = [&] {
-        return item->fullIndex_ >= 0 && item->fullIndex_ < FullListCountItems() &&
-               fullList_[static_cast<std::size_t>(item->fullIndex_)] == item;
-    };
-    if (!isRight())
-        NumberFullList();
-    return item->fullIndex_;
+    const auto found = std::find(fullList_.begin(), fullList_.end(), item);
+    return static_cast<int32>(found - fullList_.begin());
 }
 
 CLVListItem* ColumnListView::FullListItemAt(int32 fullIndex) const {
@@ -706,7 +674,7 @@ int32 ColumnListView::FullListCurrentSelection(int32 index) const {
 }
 
 void ColumnListView::FullListDoForEach(const std::function<bool(CLVListItem*)>& visit) const {
-    for (int32 i = 0; i < FullListCountItems(); i++)
+    for (int32 i = 0; i < FullListCountItems(); ++i)
         if (visit(FullListItemAt(i)))
             return;
 }

@@ -8,11 +8,33 @@
 #include "ColumnListView/CLVListItem.h"
 #include "ColumnListView/DragGroups.h"
 #include "ColumnListView/OutlineRows.h"
-#include "ColumnListView/PrefilledBitmap.h"
+#include "platform/Bitmap.h"
 #include "platform/ListView.h"
+#include "platform/ScrollView.h"
 
-class BetterScrollView;
 class CLVColumnLabelView;
+class ColumnListView;
+
+// The container of a ColumnListView: the header above the rows, the scroll bars beside them. The bars follow
+// the list's rows and columns by themselves; the list moves the header along sideways. It has no knowledge of
+// columns. Owns the list and the header; belongs to the view it is added to. Interface thread.
+class BetterScrollView : public BScrollView {
+  public:
+    // Takes ownership of list and header. Made by the list's constructor only.
+    BetterScrollView(const char* name, ColumnListView* list, CLVColumnLabelView* header, uint32 resizingMode,
+                     uint32 flags, bool horizontal, bool vertical, border_style border);
+};
+
+// A bitmap that is filled from a table of pixels as it is made, for pictures that are part of the program.
+class PrefilledBitmap : public BBitmap {
+  public:
+    // data: length bytes of pixels, rows top to bottom without padding, in the given colour space. Pixels
+    // that the table does not reach keep the colour space's first content.
+    PrefilledBitmap(BRect bounds, color_space space, const void* data, int32 length)
+        : BBitmap(bounds, space) {
+        SetBits(data, length, 0, space);
+    }
+};
 
 // A list of rows in columns, under a header in which the person resizes, reorders and sorts the columns. It
 // places the columns and keeps them, their order and the sort keys; rows draw themselves, one column at a
@@ -53,6 +75,7 @@ class ColumnListView : public BListView {
     bool RemoveItem(BListItem* item) override;
     BListItem* RemoveItem(int32 index) override;
     bool RemoveItems(int32 index, int32 count) override;
+    void RemoveSelected() override;
     void MakeEmpty() override;
 
     void MouseDown(BPoint where) override;
@@ -90,7 +113,7 @@ class ColumnListView : public BListView {
     // and a column that is no key does not become one.
     virtual void SetSortMode(int32 column, CLVSortMode mode);
     // Called when keys or modes have changed, after sorting. The base does nothing.
-    virtual void SortingChanged();
+    virtual void SortingChanged() {}
 
     // --- outline; for hierarchical lists ---
     // Adds item directly behind superitem's last descendant, one level below superitem. False in a flat list
@@ -187,9 +210,10 @@ class ColumnListView : public BListView {
 
     void AddToOutline(const OutlineSequence& rows, int32 index);
     static void ReleaseRow(CLVListItem& row);
-    void NumberFullList() const;
-    // Makes the base's rows those of this part of the full list that are to be seen.
-    void BringInSight(int32 fullBegin, int32 fullEnd);
+    void ReleaseAllRows();
+    // Take the rows of this part of the full list out of the base's, and put in those to be seen.
+    void HideRows(int32 fullBegin, int32 fullEnd);
+    void ShowRows(int32 fullBegin, int32 fullEnd);
     void SetExpanded(CLVListItem* item, bool expanded);
 
     std::vector<std::unique_ptr<CLVColumn>> columns_; // in the order of adding

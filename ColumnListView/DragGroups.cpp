@@ -1,7 +1,6 @@
 #include "ColumnListView/DragGroups.h"
 
 #include <algorithm>
-#include <numeric>
 
 namespace {
 
@@ -28,10 +27,16 @@ int32 ShownNeighbour(const std::vector<DragGroup>& groups, int32 from, int32 ste
     return -1;
 }
 
-int KeepRank(uint32 flags) {
-    if ((flags & CLVF_KEEP_FIRST) != 0)
-        return 0;
-    return (flags & CLVF_KEEP_LAST) != 0 ? 2 : 1;
+bool MayMoveBefore(const DragGroup& dragged, const DragGroup& previous) {
+    const bool passesKeepFirst = (previous.flags & CLVF_KEEP_FIRST) != 0 && !dragged.allKeepFirst;
+    const bool leavesKeepLast = (dragged.flags & CLVF_KEEP_LAST) != 0 && !previous.allKeepLast;
+    return !passesKeepFirst && !leavesKeepLast;
+}
+
+bool MayMoveAfter(const DragGroup& dragged, const DragGroup& next) {
+    const bool passesKeepLast = (next.flags & CLVF_KEEP_LAST) != 0 && !dragged.allKeepLast;
+    const bool leavesKeepFirst = (dragged.flags & CLVF_KEEP_FIRST) != 0 && !next.allKeepFirst;
+    return !passesKeepLast && !leavesKeepFirst;
 }
 
 } // namespace
@@ -39,7 +44,7 @@ int KeepRank(uint32 flags) {
 std::vector<DragGroup> BuildDragGroups(const std::vector<ColumnShape>& shapes, const ColumnLayout& layout) {
     std::vector<DragGroup> groups;
     bool joins = false;
-    for (std::size_t i = 0; i < shapes.size(); i++) {
+    for (std::size_t i = 0; i < shapes.size(); ++i) {
         const auto position = static_cast<int32>(i);
         if (!joins) {
             groups.emplace_back();
@@ -52,22 +57,10 @@ std::vector<DragGroup> BuildDragGroups(const std::vector<ColumnShape>& shapes, c
 }
 
 int32 GroupAt(const std::vector<DragGroup>& groups, int32 position) {
-    for (std::size_t i = 0; i < groups.size(); i++)
+    for (std::size_t i = 0; i < groups.size(); ++i)
         if (position >= groups[i].first && position <= groups[i].last)
             return static_cast<int32>(i);
     return -1;
-}
-
-bool MayMoveBefore(const DragGroup& dragged, const DragGroup& previous) {
-    const bool passesKeepFirst = (previous.flags & CLVF_KEEP_FIRST) != 0 && !dragged.allKeepFirst;
-    const bool leavesKeepLast = (dragged.flags & CLVF_KEEP_LAST) != 0 && !previous.allKeepLast;
-    return !passesKeepFirst && !leavesKeepLast;
-}
-
-bool MayMoveAfter(const DragGroup& dragged, const DragGroup& next) {
-    const bool passesKeepLast = (next.flags & CLVF_KEEP_LAST) != 0 && !dragged.allKeepLast;
-    const bool leavesKeepFirst = (dragged.flags & CLVF_KEEP_FIRST) != 0 && !next.allKeepFirst;
-    return !passesKeepLast && !leavesKeepFirst;
 }
 
 int32 GroupToSwapWith(const std::vector<DragGroup>& groups, int32 dragged, float x) {
@@ -86,29 +79,12 @@ int32 GroupToSwapWith(const std::vector<DragGroup>& groups, int32 dragged, float
     return -1;
 }
 
-std::vector<int32> MoveGroup(const std::vector<DragGroup>& groups, int32 dragged, int32 target) {
+void MoveGroup(const std::vector<DragGroup>& groups, int32 dragged, int32 target, std::vector<int32>& order) {
     const DragGroup& moved = groups[static_cast<std::size_t>(dragged)];
     const DragGroup& passed = groups[static_cast<std::size_t>(target)];
-    std::vector<int32> positions(static_cast<std::size_t>(groups.back().last) + 1);
-    std::iota(positions.begin(), positions.end(), 0);
-    const auto at = positions.begin();
+    const auto at = order.begin();
     if (target < dragged)
         std::rotate(at + passed.first, at + moved.first, at + moved.last + 1);
     else
         std::rotate(at + moved.first, at + moved.last + 1, at + passed.last + 1);
-    return positions;
-}
-
-std::vector<int32> KeepingOrder(const std::vector<ColumnShape>& shapes) {
-    std::vector<int32> positions(shapes.size());
-    std::iota(positions.begin(), positions.end(), 0);
-    const auto rank = [&](int32 position) {
-        return KeepRank(shapes[static_cast<std::size_t>(position)].flags);
-    };
-    std::stable_sort(positions.begin(), positions.end(), [&](int32 a, int32 b) { return rank(a) < rank(b); });
-    return positions;
-}
-
-float HeldOutlineLeft(float left, float width, float headerLeft, float headerRight) {
-    return std::max(headerLeft, std::min(left, headerRight - width));
 }

@@ -25,20 +25,9 @@ struct DragGroup {
 // The index of the group that the column at this display position belongs to; -1 when there is none.
 [[nodiscard]] int32 GroupAt(const std::vector<DragGroup>& groups, int32 position);
 
-// Whether dragged may change places with the group before it, or with the group after it.
-[[nodiscard]] bool MayMoveBefore(const DragGroup& dragged, const DragGroup& previous);
-[[nodiscard]] bool MayMoveAfter(const DragGroup& dragged, const DragGroup& next);
-
 // The next shown group that the dragged one changes places with when the pointer is at x; -1 when it stays.
 // Groups without a shown member are passed over.
 [[nodiscard]] int32 GroupToSwapWith(const std::vector<DragGroup>& groups, int32 dragged, float x);
 
-// The display positions in their new order after the dragged group has moved to the other side of target.
-[[nodiscard]] std::vector<int32> MoveGroup(const std::vector<DragGroup>& groups, int32 dragged, int32 target);
-
-// The display positions in the order that CLVF_KEEP_FIRST and CLVF_KEEP_LAST ask for; what they leave open
-// stays as it is.
-[[nodiscard]] std::vector<int32> KeepingOrder(const std::vector<ColumnShape>& shapes);
-
-// The left edge of a dragged outline of this width, held inside the header from headerLeft to headerRight.
-[[nodiscard]] float HeldOutlineLeft(float left, float width, float headerLeft, float headerRight);
+// Moves the dragged group to the other side of target; order is the display order.
+void MoveGroup(const std::vector<DragGroup>& groups, int32 dragged, int32 target, std::vector<int32>& order);

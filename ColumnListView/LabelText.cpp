@@ -1,30 +1,25 @@
 #include "ColumnListView/LabelText.h"
 
-#include <vector>
-
-namespace {
-
-bool StartsCharacter(char byte) {
-    return (static_cast<unsigned char>(byte) & 0xC0U) != 0x80U;
-}
-
-} // namespace
+#include <algorithm>
+#include <cstring>
 
 std::string TruncatedLabel(std::string_view text, float width,
                            const std::function<float(const std::string&)>& measure) {
-    std::string whole(text);
-    if (text.empty() || measure(whole) <= width)
-        return whole;
-    std::vector<std::size_t> cuts{0};
-    for (std::size_t i = 1; i < text.size(); i++)
-        if (StartsCharacter(text[i]))
-            cuts.push_back(i);
-    const auto cutAt = [&](std::size_t cut) { return whole.substr(0, cuts[cut]) + "..."; };
-    std::size_t fits = 0; // the cut known to fit, or the first one, which is taken anyway
-    std::size_t tooLong = cuts.size();
-    while (tooLong - fits > 1) {
-        const std::size_t middle = fits + (tooLong - fits) / 2;
-        (measure(cutAt(middle)) <= width ? fits : tooLong) = middle;
+    std::string shown(text);
+    while (!text.empty() && measure(shown) > width) {
+        std::size_t cut = text.size() - 1;
+        while (cut > 0 && (static_cast<unsigned char>(text[cut]) & 0xC0U) == 0x80U)
+            --cut;
+        text = text.substr(0, cut);
+        shown = std::string(text) + "...";
     }
-    return cutAt(fits);
+    return shown;
+}
+
+char* ToUpperStr(const char* text) {
+    const std::size_t size = std::strlen(text) + 1;
+    char* copy = new char[size];
+    std::transform(text, text + size, copy,
+                   [](char c) { return c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c; });
+    return copy;
 }

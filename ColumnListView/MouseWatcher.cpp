@@ -6,8 +6,8 @@
 
 namespace {
 
-constexpr bigtime_t kPollInterval = 50000; // microseconds
-constexpr int32 kPriority = 10;
+constexpr bigtime_t PollInterval = 50000; // microseconds
+constexpr int32 Priority = 10;
 
 } // namespace
 
@@ -44,7 +44,7 @@ bool MouseWatcher::Watch::Report(uint32 code, BPoint where, uint32 held) const {
 }
 
 bool MouseWatcher::Watch::Poll() {
-    const status_t locked = target.LockTargetWithTimeout(kPollInterval);
+    const status_t locked = target.LockTargetWithTimeout(PollInterval);
     if (locked == B_TIMED_OUT)
         return target.IsValid();
     if (locked != B_OK)
@@ -56,12 +56,12 @@ bool MouseWatcher::Watch::Poll() {
     if (!looked)
         return false;
     if (held == 0) {
-        [[maybe_unused]] const bool heard = Report(kMouseWatcherUp, where, held);
+        [[maybe_unused]] const bool heard = Report(MouseWatcherUp, where, held);
         return false;
     }
     if (held != buttons)
-        return Report(kMouseWatcherDown, where, held);
-    return where == pressedAt || Report(kMouseWatcherMoved, where, held);
+        return Report(MouseWatcherDown, where, held);
+    return where == pressedAt || Report(MouseWatcherMoved, where, held);
 }
 
 std::unique_ptr<MouseWatcher> MouseWatcher::Start(const BView* view, BPoint pressedAt, uint32 buttons,
@@ -73,7 +73,7 @@ std::unique_ptr<MouseWatcher> MouseWatcher::Start(const BView* view, BPoint pres
     watch->press = press;
     watch->view = view;
     auto data = std::make_unique<std::shared_ptr<Watch>>(watch);
-    const thread_id thread = spawn_thread(Run, "MouseWatcher", kPriority, data.get());
+    const thread_id thread = spawn_thread(Run, "MouseWatcher", Priority, data.get());
     if (thread <= 0 || resume_thread(thread) != B_OK)
         return nullptr;
     [[maybe_unused]] auto* handedOver = data.release(); // Run deletes it
@@ -82,7 +82,7 @@ std::unique_ptr<MouseWatcher> MouseWatcher::Start(const BView* view, BPoint pres
 
 int32 MouseWatcher::Run(void* data) {
     const std::unique_ptr<std::shared_ptr<Watch>> watch(static_cast<std::shared_ptr<Watch>*>(data));
-    while (snooze(kPollInterval) == B_OK && (*watch)->Poll()) {
+    while (snooze(PollInterval) == B_OK && (*watch)->Poll()) {
     }
     return 0;
 }

@@ -7,9 +7,9 @@
 // The codes of a watcher's messages: no button is down any more, the pointer is away from where it was
 // pressed, or other buttons are down than those pressed. Each carries "where" (a point of the view),
 // "buttons" and "modifiers" (int32), and "press" (int32), the number given at the start.
-constexpr uint32 kMouseWatcherUp = 0x4D772D55;    // 'Mw-U'
-constexpr uint32 kMouseWatcherMoved = 0x4D772D4D; // 'Mw-M'
-constexpr uint32 kMouseWatcherDown = 0x4D772D44;  // 'Mw-D'
+constexpr uint32 MouseWatcherUp = 0x4D772D55;    // 'Mw-U'
+constexpr uint32 MouseWatcherMoved = 0x4D772D4D; // 'Mw-M'
+constexpr uint32 MouseWatcherDown = 0x4D772D44;  // 'Mw-D'
 
 // Follows the pointer while a button is held on a view, and tells the view by messages: a thread of its own
 // looks every 50 ms. It does nothing with what it sees and touches nothing of the view but GetMouse, with the

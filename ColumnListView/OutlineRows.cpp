@@ -1,6 +1,7 @@
 #include "ColumnListView/OutlineRows.h"
 
 #include <algorithm>
+#include <utility>
 
 #include "ColumnListView/CLVListItem.h"
 
@@ -14,25 +15,33 @@ int32 Count(const OutlineSequence& rows) {
     return static_cast<int32>(rows.size());
 }
 
-bool InSight(const OutlineSequence& rows, int32 index) {
-    for (int32 above = SuperitemIndex(rows, index); above >= 0; above = SuperitemIndex(rows, above))
-        if (!rows[static_cast<std::size_t>(above)]->IsExpanded())
-            return false;
-    return true;
+// Sorts the rows from begin to end, which stand under one row or at the top, with what is below them.
+template <class Compare>
+void SortLevel(OutlineSequence& rows, int32 begin, int32 end, const Compare& compare) {
+    std::vector<OutlineSequence> blocks; // a row of the level and its descendants
+    for (int32 next = begin; next < end;) {
+        // What stands behind end may not be in its order yet.
+        const int32 first = std::exchange(next, std::min(end, DescendantsEnd(rows, next, next + 1)));
+        blocks.emplace_back(rows.begin() + first, rows.begin() + next);
+    }
+    std::stable_sort(blocks.begin(), blocks.end(),
+                     [&](const auto& a, const auto& b) { return compare(a.front(), b.front()) < 0; });
+    for (const OutlineSequence& block : blocks) {
+        std::copy(block.begin(), block.end(), rows.begin() + begin);
+        const int32 blockEnd = begin + Count(block);
+        SortLevel(rows, begin + 1, blockEnd, compare);
+        begin = blockEnd;
+    }
 }
 
 } // namespace
 
-int32 DescendantsEnd(const OutlineSequence& rows, int32 index) {
-    return DescendantsEnd(rows, index, index + 1);
-}
-
 int32 DescendantsEnd(const OutlineSequence& rows, int32 begin, int32 end) {
     uint32 lowest = LevelAt(rows, begin);
-    for (int32 i = begin + 1; i < end; i++)
+    for (int32 i = begin + 1; i < end; ++i)
         lowest = std::min(lowest, LevelAt(rows, i));
     while (end < Count(rows) && LevelAt(rows, end) > lowest)
-        end++;
+        ++end;
     return end;
 }
 
@@ -40,61 +49,30 @@ int32 SuperitemIndex(const OutlineSequence& rows, int32 index) {
     const uint32 level = LevelAt(rows, index);
     int32 above = level == 0 ? -1 : index - 1;
     while (above >= 0 && LevelAt(rows, above) >= level)
-        above--;
+        --above;
     return above;
 }
 
-std::vector<bool> RowsInSight(const OutlineSequence& rows, int32 begin, int32 end) {
-    std::vector<const CLVListItem*> above; // the rows that the next one may stand under, lowest level first
-    std::vector<bool> aboveSeen;
-    std::vector<bool> inSight;
-    for (int32 i = begin; i < end; i++) {
-        const CLVListItem& row = *rows[static_cast<std::size_t>(i)];
-        bool knowsSibling = false;
-        bool siblingSeen = false;
-        while (!above.empty() && above.back()->OutlineLevel() >= row.OutlineLevel()) {
-            knowsSibling = above.back()->OutlineLevel() == row.OutlineLevel();
-            siblingSeen = aboveSeen.back();
-            above.pop_back();
-            aboveSeen.pop_back();
-        }
-        bool seen = siblingSeen;
-        if (!above.empty())
-            seen = aboveSeen.back() && above.back()->IsExpanded();
-        else if (!knowsSibling)
-            seen = InSight(rows, i);
-        inSight.push_back(seen);
-        above.push_back(&row);
-        aboveSeen.push_back(seen);
+OutlineSequence RowsInSight(const OutlineSequence& rows, int32 begin, int32 end) {
+    int32 top = begin;
+    while (top > 0 && (top >= Count(rows) || LevelAt(rows, top) > 0))
+        --top;
+    OutlineSequence inSight;
+    const CLVListItem* collapsed = nullptr; // what the rows with higher levels are hidden under
+    for (int32 i = top; i < end; ++i) {
+        CLVListItem* row = rows[static_cast<std::size_t>(i)];
+        if (collapsed && row->OutlineLevel() > collapsed->OutlineLevel())
+            continue;
+        collapsed = row->IsExpanded() ? nullptr : row;
+        if (i >= begin)
+            inSight.push_back(row);
     }
     return inSight;
 }
 
 OutlineSequence SortedOutline(const OutlineSequence& rows,
                               const std::function<int(const CLVListItem*, const CLVListItem*)>& compare) {
-    // below[0] are the rows at the top, below[i + 1] the rows directly under row i.
-    std::vector<std::vector<int32>> below(rows.size() + 1);
-    std::vector<int32> above;
-    for (int32 i = 0; i < Count(rows); i++) {
-        while (!above.empty() && LevelAt(rows, above.back()) >= LevelAt(rows, i))
-            above.pop_back();
-        below[above.empty() ? 0 : static_cast<std::size_t>(above.back()) + 1].push_back(i);
-        above.push_back(i);
-    }
-    const auto rowAt = [&](int32 index) { return rows[static_cast<std::size_t>(index)]; };
-    for (std::vector<int32>& siblings : below)
-        std::stable_sort(siblings.begin(), siblings.end(),
-                         [&](int32 a, int32 b) { return compare(rowAt(a), rowAt(b)) < 0; });
-
-    OutlineSequence sorted;
-    sorted.reserve(rows.size());
-    std::vector<int32> waiting(below[0].rbegin(), below[0].rend());
-    while (!waiting.empty()) {
-        const int32 index = waiting.back();
-        waiting.pop_back();
-        sorted.push_back(rowAt(index));
-        const std::vector<int32>& under = below[static_cast<std::size_t>(index) + 1];
-        waiting.insert(waiting.end(), under.rbegin(), under.rend());
-    }
+    OutlineSequence sorted = rows;
+    SortLevel(sorted, 0, Count(sorted), compare);
     return sorted;
 }

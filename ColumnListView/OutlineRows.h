@@ -11,17 +11,14 @@ class CLVListItem;
 
 using OutlineSequence = std::vector<CLVListItem*>;
 
-// The index behind the last descendant of the row at index.
-[[nodiscard]] int32 DescendantsEnd(const OutlineSequence& rows, int32 index);
-
 // The index behind the rows from begin to end (begin < end) and all descendants of any of them.
 [[nodiscard]] int32 DescendantsEnd(const OutlineSequence& rows, int32 begin, int32 end);
 
 // The index of the row that the row at index stands under; -1 at the top.
 [[nodiscard]] int32 SuperitemIndex(const OutlineSequence& rows, int32 index);
 
-// For each row from begin to end whether every row above it in the outline is expanded.
-[[nodiscard]] std::vector<bool> RowsInSight(const OutlineSequence& rows, int32 begin, int32 end);
+// The rows from begin to end for which every row above them in the outline is expanded.
+[[nodiscard]] OutlineSequence RowsInSight(const OutlineSequence& rows, int32 begin, int32 end);
 
 // The rows with every level sorted by itself under its superitem; rows that compare equal keep their order.
 [[nodiscard]] OutlineSequence

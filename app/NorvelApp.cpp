@@ -5,9 +5,7 @@
 #include <cstring>
 #include <system_error>
 
-#include <malloc.h>
-
-#include "ColumnListView/PrefilledBitmap.h"
+#include "ColumnListView/ColumnListView.h"
 #include "app/NorvelWindow.h"
 #include "app/model/CutFile.h"
 #include "app/model/DataFileOpening.h"
@@ -55,14 +53,6 @@ bool IsFull(int error) {
 constexpr uint32 MessageBackupFailed = 1050;
 constexpr const char* ErrorField = "Error";
 
-// A portfolio's rows come and go together. Their memory is kept for the next portfolio's up to this size:
-// handing it back to the system and having it cleared anew takes longer than making the rows.
-void KeepRowMemory() {
-    constexpr int keptBytes = 64 * 1024 * 1024;
-    mallopt(M_TOP_PAD, keptBytes);
-    mallopt(M_TRIM_THRESHOLD, keptBytes);
-}
-
 // Whether the person says that the program has ended which the folder's lock names.
 bool HasEnded(const FolderLock& lock, const std::string& folder) {
     const std::string question = "The folder " + folder + " was in use by " + DescribeHolder(lock.Holder()) +
@@ -74,7 +64,6 @@ bool HasEnded(const FolderLock& lock, const std::string& folder) {
 } // namespace
 
 NorvelApp::NorvelApp() : BApplication(Signature) {
-    KeepRowMemory();
     // Without its icon the program works all the same.
     static_cast<void>(SetDesktopIdentity(DesktopId, ProgramIcon()));
     app_state = &state_;

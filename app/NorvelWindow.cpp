@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <cmath>
 
-#include "ColumnListView/BetterScrollView.h"
 #include "ColumnListView/CLVColumn.h"
 #include "ColumnListView/ColumnListView.h"
 #include "app/rows/NorvelItem.h"

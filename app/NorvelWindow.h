@@ -128,7 +128,6 @@ class NorvelWindow : public BWindow {
     static void CutIsSettled();
     // Copies the selected investments to the clipboard; true when it now holds all of them.
     bool CopySelection();
-    void RemoveSelectedRows();
     // Runs the investment form on the record; true when the person confirmed it.
     bool RunInvestmentDialog(const char* title, INVESTMENT_DATA* record);
     void OnInvestmentAdd();

@@ -24,23 +24,20 @@ constexpr const char* UnknownTotal = "Total Value: not known"; // some of the in
 // The selected rows from the top.
 std::vector<NorvelItem*> SelectedItems(const ColumnListView* list) {
     std::vector<NorvelItem*> selected;
-    int32 index = 0;
-    for (int32 i = 0; (index = list->CurrentSelection(i)) >= 0; ++i)
-        selected.push_back(static_cast<NorvelItem*>(list->ItemAt(index)));
+    for (int32 i = 0; i < list->CountItems(); ++i)
+        if (list->IsItemSelected(i))
+            selected.push_back(static_cast<NorvelItem*>(list->ItemAt(i)));
     return selected;
 }
 
 } // namespace
 
 NorvelItem* CreateNewInvestmentItem(const INVESTMENT_DATA& record, int32 recordNumber) {
-    return NorvelItem::Make(record, recordNumber).release();
+    return new NorvelItem(record, recordNumber);
 }
 
 int32 CountSelectedItems(const ColumnListView* list) {
-    int32 count = 0;
-    while (list->CurrentSelection(count) >= 0)
-        ++count;
-    return count;
+    return static_cast<int32>(SelectedItems(list).size());
 }
 
 void NorvelWindow::LoadInvestmentList() {
@@ -217,25 +214,10 @@ void NorvelWindow::OnInvestmentDelete() {
         ReloadInvestmentList();
         return;
     }
-    RemoveSelectedRows();
+    investmentList_->RemoveSelected();
+    for (const NorvelItem* row : selected)
+        delete row;
     DisplayTotalValue(-1);
-}
-
-// Takes the rows out in runs, from below so that the runs above keep their places.
-void NorvelWindow::RemoveSelectedRows() {
-    int32 end = investmentList_->CountItems();
-    while (end > 0) {
-        int32 begin = end;
-        while (begin > 0 && investmentList_->IsItemSelected(begin - 1))
-            --begin;
-        std::vector<BListItem*> run;
-        for (int32 i = begin; i < end; ++i)
-            run.push_back(investmentList_->ItemAt(i));
-        investmentList_->RemoveItems(begin, end - begin);
-        for (const BListItem* row : run)
-            delete row;
-        end = begin - 1;
-    }
 }
 
 bool NorvelWindow::MayForgetClipboard() {

@@ -1,6 +1,7 @@
 // Prints how long the main window takes to fill its list with a portfolio beside a walk of the same records,
-// and to sort it as a click on a header does beside a sort of the same texts. The window is the program's
-// own, on the toolkit's offscreen platform unless QT_QPA_PLATFORM says otherwise.
+// and to sort it as a click on a header does beside a sort of the same texts; how long it takes to select all
+// rows, to sort, show and delete every second one, and to follow a key or scroll in between. The window is
+// the program's own, on the toolkit's offscreen platform unless QT_QPA_PLATFORM says otherwise.
 //
 //   list_bench [--records N] [--rounds N] [--folder PATH]
 
@@ -15,6 +16,10 @@
 #include <string>
 #include <string_view>
 #include <vector>
+
+#include <QApplication>
+#include <QListView>
+#include <QTest>
 
 #include "BenchOptions.h"
 #include "ColumnListView/ColumnListView.h"
@@ -33,7 +38,7 @@ INVESTMENT_DATA MakeInvestment(long i, unsigned random) {
     INVESTMENT_DATA record{};
     CopyText(record.Portfolio, "Full");
     FormatInto(record.Name, sizeof record.Name, "Investment %u", random % 1'000'000);
-    FormatInto(record.Ticker, sizeof record.Ticker, "T%ld", i % 100'000);
+    FormatInto(record.Ticker, sizeof record.Ticker, "T%06ld", i % 1'000'000);
     CopyText(record.Type, i % 3 == 0 ? "Mutual Fund" : "Common Stock");
     CopyText(record.Agent, "Broker & Sons");
     CopyText(record.Risk, i % 10 == 3 ? "Med" : "Low");
@@ -42,6 +47,7 @@ INVESTMENT_DATA MakeInvestment(long i, unsigned random) {
     record.PrevPrice = record.Price;
     record.Value = record.Shares * record.Price;
     record.Date = {3, 3, 2001};
+    record.Retire = i % 2 == 0;
     return record;
 }
 
@@ -136,7 +142,7 @@ void MeasureFill(NorvelWindow& window, const OPTIONS& options) {
         fill = std::min(fill, filled);
         fillAndPaint = std::min(fillAndPaint, filled + Seconds([&] { window.UpdateIfNeeded(); }));
     }
-    Print("fill the list", "walk the records", fill, walk, options.records, " (at most 4)");
+    Print("fill the list", "walk the records", fill, walk, options.records, " (at most 10)");
     Print("fill the list", "query and walk the records", fill, queryAndWalk, options.records);
     Print("fill and paint it", "walk the records", fillAndPaint, walk, options.records);
     std::printf("(sum %.0f)\n", sum / (2 * options.rounds));
@@ -167,7 +173,76 @@ void MeasureSort(NorvelWindow& window, const OPTIONS& options, InvestmentColumn 
         std::vector<std::string> texts = Texts(*list, column);
         peer = std::min(peer, Seconds([&] { std::stable_sort(texts.begin(), texts.end()); }));
     }
-    Print(name, "sort its upper-case texts", sort, peer, options.records);
+    Print(name, "sort its upper-case texts", sort, peer, options.records, " (at most 500 ms)");
+}
+
+// The longest that one of many keys and ways to scroll takes until the window shows it.
+double LongestStep(NorvelWindow& window, ColumnListView& list) {
+    double longest = 0;
+    const auto step = [&](const auto& work) {
+        longest = std::max(longest, Seconds([&] {
+                               work();
+                               window.UpdateIfNeeded();
+                           }));
+    };
+    QWidget* rows = nullptr;
+    for (const QWidget* top : QApplication::topLevelWidgets())
+        rows = rows ? rows : top->findChild<QListView*>();
+    for (const Qt::Key key :
+         {Qt::Key_Down, Qt::Key_PageDown, Qt::Key_Down, Qt::Key_End, Qt::Key_Up, Qt::Key_Home})
+        step([&] { QTest::keyClick(rows, key); });
+    for (int32 row = 0; row < list.CountItems(); row += list.CountItems() / 10 + 1)
+        step([&] { list.ScrollToRow(row); });
+    return longest;
+}
+
+void MeasureSelection(NorvelWindow& window, const OPTIONS& options) {
+    double selectAll = 1e9;
+    double scatter = 1e9;
+    double removal = 1e9;
+    double step = 1e9;
+    double stepAfterScatter = 1e9;
+    ColumnListView* list = FindList(window.FindView("top view"));
+    list->MakeFocus();
+    for (int i = 0; i < options.rounds; ++i) {
+        Show(window, "Full");
+        list->SetSortKey(static_cast<int32>(InvestmentColumn::Retire));
+        const auto settle = [&] { window.UpdateIfNeeded(); };
+        const auto scatterAll = [&] {
+            list->Select(0, list->CountItems() / 2 - 1);
+            list->SetSortKey(static_cast<int32>(InvestmentColumn::Ticker));
+            settle();
+        };
+        selectAll = std::min(selectAll, Seconds([&] {
+                                 list->Select(0, list->CountItems() - 1);
+                                 settle();
+                             }));
+        step = std::min(step, LongestStep(window, *list));
+        scatter = std::min(scatter, Seconds(scatterAll));
+        stepAfterScatter = std::min(stepAfterScatter, LongestStep(window, *list));
+        list->SetSortKey(static_cast<int32>(InvestmentColumn::Retire));
+        scatterAll();
+        std::vector<const BListItem*> selected;
+        for (int32 row = 0; row < list->CountItems(); ++row)
+            if (list->IsItemSelected(row))
+                selected.push_back(list->ItemAt(row));
+        removal = std::min(removal, Seconds([&] {
+                               list->RemoveSelected();
+                               settle();
+                           }));
+        for (const BListItem* row : selected)
+            delete row;
+        if (list->CountItems() != options.records / 2)
+            std::puts("the wrong rows went");
+    }
+    const auto print = [](const char* what, double seconds, int limit) {
+        std::printf("%-52s %8.2f ms (at most %d)\n", what, seconds * 1e3, limit);
+    };
+    print("select all", selectAll, 500);
+    print("the longest key or scroll with all selected", step, 50);
+    print("sort with every second one selected", scatter, 500);
+    print("the longest key or scroll with these selected", stepAfterScatter, 50);
+    print("delete every second one", removal, 500);
 }
 
 int Measure(const OPTIONS& options, const std::string& folder) {
@@ -181,6 +256,7 @@ int Measure(const OPTIONS& options, const std::string& folder) {
     MeasureFill(*window, options);
     MeasureSort(*window, options, InvestmentColumn::Name, "sort by Name");
     MeasureSort(*window, options, InvestmentColumn::Value, "sort by Value");
+    MeasureSelection(*window, options);
     window->Unlock();
     application.PostMessage(B_QUIT_REQUESTED);
     application.Run();

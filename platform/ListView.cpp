@@ -15,22 +15,6 @@ int ListAccess::Pixels(const BListItem& row) {
     return std::max(1, static_cast<int>(std::ceil(row.height_)));
 }
 
-// Rows are looked up from where they came, moved as far as the last one had moved: a run of changes moves all
-// that follow alike.
-int32 ListPeer::IndexOf(const BListItem* row) const {
-    const int32 hint = ListAccess::Index(*row);
-    if (model.At(hint) == row)
-        return hint;
-    const int32 start = std::clamp(hint + drift_, 0, std::max(model.Count() - 1, 0));
-    for (int32 away = 0; away < model.Count(); away++)
-        for (const int32 index : {start - away, start + away})
-            if (model.At(index) == row) {
-                drift_ = index - hint;
-                return index;
-            }
-    return -1;
-}
-
 void ListPeer::TakeHeights(const std::vector<BListItem*>& rows) {
     if (model.Count() == 0) {
         Rows()->setUniformItemSizes(true);
@@ -102,7 +86,7 @@ bool BListView::AddList(BList* newItems, int32 index) {
         return false;
     std::vector<BListItem*> rows;
     rows.reserve(static_cast<std::size_t>(newItems->CountItems()));
-    for (int32 place = 0; place < newItems->CountItems(); place++)
+    for (int32 place = 0; place < newItems->CountItems(); ++place)
         rows.push_back(static_cast<BListItem*>(newItems->ItemAt(place)));
     return AddRows(std::move(rows), index);
 }
@@ -113,16 +97,15 @@ bool BListView::AddRows(std::vector<BListItem*> rows, int32 index) {
         return false;
     BFont font;
     GetFont(&font);
-    for (std::size_t place = 0; place < rows.size(); place++) {
+    for (std::size_t place = 0; place < rows.size(); ++place) {
         BListItem* row = rows[place];
         if (!row || ListAccess::List(*row)) {
-            for (std::size_t taken = 0; taken < place; taken++)
+            for (std::size_t taken = 0; taken < place; ++taken)
                 ListAccess::SetList(*rows[taken], nullptr);
             return false;
         }
         ListAccess::SetList(*row, this);
         ListAccess::SetSelected(*row, false);
-        ListAccess::SetIndex(*row, index + static_cast<int32>(place));
         row->Update(this, &font);
     }
     if (rows.empty())
@@ -131,7 +114,6 @@ bool BListView::AddRows(std::vector<BListItem*> rows, int32 index) {
     peer.TakeHeights(rows);
     peer.selection.Detach();
     peer.model.Insert(index, rows);
-    peer.selection.RowsMoved();
     return true;
 }
 
@@ -153,24 +135,23 @@ bool BListView::RemoveItems(int32 index, int32 count) {
     if (count == 0)
         return true;
     ListPeer& peer = ListAccess::Peer(*this);
-    std::vector<BListItem*> rows;
-    for (int32 place = index; place < index + count; place++)
-        rows.push_back(peer.model.At(place));
+    const auto first = peer.model.Rows().begin() + index;
+    const std::vector<BListItem*> rows(first, first + count);
     peer.selection.Detach();
     peer.model.Remove(index, count);
-    for (BListItem* row : rows)
-        ListAccess::SetList(*row, nullptr);
     peer.selection.RowsRemoved(index, rows);
     return true;
+}
+
+void BListView::RemoveSelected() {
+    ListAccess::Peer(*this).selection.RemoveSelected();
 }
 
 void BListView::MakeEmpty() {
     ListPeer& peer = ListAccess::Peer(*this);
     const std::vector<BListItem*> rows = peer.model.Rows();
     peer.selection.Detach();
-    peer.model.Clear();
-    for (BListItem* row : rows)
-        ListAccess::SetList(*row, nullptr);
+    peer.model.Replace({});
     peer.selection.RowsRemoved(0, rows);
 }
 
@@ -179,7 +160,7 @@ BListItem* BListView::ItemAt(int32 index) const {
 }
 
 int32 BListView::IndexOf(const BListItem* item) const {
-    return item && ListAccess::List(*item) == this ? ListAccess::Peer(*this).IndexOf(item) : -1;
+    return item && ListAccess::List(*item) == this ? ListAccess::Peer(*this).model.IndexOf(item) : -1;
 }
 
 int32 BListView::IndexOf(BPoint point) const {
@@ -235,7 +216,6 @@ void BListView::SortItems(const std::function<int(const BListItem*, const BListI
                      [&](const BListItem* a, const BListItem* b) { return compare(a, b) < 0; });
     peer.selection.Detach();
     peer.model.Reorder(std::move(rows));
-    peer.selection.RowsMoved();
 }
 
 BRect BListView::ItemFrame(int32 index) const {

@@ -42,7 +42,6 @@ class BListItem {
     BListView* list_ = nullptr; // the list that shows the row
     float height_ = 0;
     uint32 outlineLevel_;
-    int32 index_ = -1; // place in the list when the row came or was sorted; a hint, checked before use
     bool selected_ = false;
     bool expanded_;
 };
@@ -71,7 +70,8 @@ class BListView : public BView, public BInvoker {
     virtual bool RemoveItem(BListItem* item);
     virtual BListItem* RemoveItem(int32 index);
     virtual bool RemoveItems(int32 index, int32 count);
-    // Takes out every row; the rows are not deleted.
+    // Takes out the selected rows, at the cost of one change; the rows are not deleted. So for every row.
+    virtual void RemoveSelected();
     virtual void MakeEmpty();
     [[nodiscard]] BListItem* ItemAt(int32 index) const;
     [[nodiscard]] int32 IndexOf(const BListItem* item) const;
@@ -86,8 +86,8 @@ class BListView : public BView, public BInvoker {
     void Deselect(int32 index);
     void DeselectAll();
     [[nodiscard]] bool IsItemSelected(int32 index) const;
-    // The index of the index-th selected row, counted from the top; -1 when fewer are selected. Asking for
-    // one after the other costs no more than looking at each.
+    // The index of the index-th selected row, counted from the top; -1 when fewer are selected. All rows
+    // up to it are looked at; who wants them all asks every row.
     [[nodiscard]] int32 CurrentSelection(int32 index = 0) const;
     // Called after the selection has changed.
     virtual void SelectionChanged() {}

@@ -1,11 +1,9 @@
 #include "app/rows/NorvelItem.h"
 
-#include <algorithm>
-#include <array>
 #include <cmath>
 #include <cstring>
-#include <string_view>
 
+#include "ColumnListView/LabelText.h"
 #include "app/state/AppState.h"
 #include "platform/View.h"
 #include "util/interface/InterfaceHelpers.h"
@@ -15,14 +13,6 @@ namespace {
 constexpr float LeastHeight = 20;
 constexpr float Inset = 2; // of texts and picture from a column's left edge
 constexpr rgb_color SelectedBackground{178, 178, 178, 255};
-
-constexpr std::array<unsigned char, 256> MakeUpperTable() {
-    std::array<unsigned char, 256> table{};
-    for (std::size_t i = 0; i < table.size(); ++i)
-        table[i] = static_cast<unsigned char>(i >= 'a' && i <= 'z' ? i - 'a' + 'A' : i);
-    return table;
-}
-constexpr std::array<unsigned char, 256> Upper = MakeUpperTable();
 
 struct MoveLook {
     BBitmap* bitmap;
@@ -45,100 +35,45 @@ MoveLook LookOf(PriceMove movement) {
     return {EqualsSignBitmap, "price unchanged"};
 }
 
+// A field's text, which may lack its end in a foreign file.
+template <std::size_t Size>
+std::string Field(const char (&field)[Size]) {
+    return {field, strnlen(field, Size - 1)};
+}
+
+template <class Format, class... Values>
+std::string Figure(Format format, Values... values) {
+    FigureText text;
+    format(values..., text);
+    return text;
+}
+
+std::array<std::string, InvestmentColumnCount> TextsOf(const INVESTMENT_DATA& record) {
+    const std::string type = Field(record.Type);
+    return {"",
+            Field(record.Name),
+            Field(record.Ticker),
+            type,
+            Figure(FormatShares, record.Shares),
+            Figure(FormatPrice, record.Price, type.c_str()),
+            Figure(FormatValue, record.Value),
+            Figure(FormatDay, record.Date),
+            record.Retire != 0 ? "yes" : "no",
+            Field(record.Risk),
+            Field(record.Agent)};
+}
+
 } // namespace
 
-// The texts of a record's fields, which may lack their ends in a foreign file.
-struct NorvelItem::Fields {
-    explicit Fields(const INVESTMENT_DATA& record)
-        : texts{Cut(record.Name), Cut(record.Ticker), Cut(record.Type), Cut(record.Agent), Cut(record.Risk)} {
-    }
-
-    template <std::size_t Size>
-    static std::string_view Cut(const char (&field)[Size]) {
-        return {field, strnlen(field, Size - 1)};
-    }
-    [[nodiscard]] std::size_t Bytes() const {
-        std::size_t bytes = FieldCount; // the terminators
-        for (const std::string_view text : texts)
-            bytes += text.size();
-        return bytes;
-    }
-
-    std::string_view texts[FieldCount];
-};
-
-std::unique_ptr<NorvelItem> NorvelItem::Make(const INVESTMENT_DATA& record, int32 recordNumber) {
-    const Fields fields(record);
-    return std::unique_ptr<NorvelItem>(new (TextBytes{fields.Bytes()})
-                                           NorvelItem(record, recordNumber, fields));
-}
-
-NorvelItem::NorvelItem(const INVESTMENT_DATA& record, int32 recordNumber, const Fields& fields)
+NorvelItem::NorvelItem(const INVESTMENT_DATA& record, int32 recordNumber)
     : CLVListItem(0, false, false, LeastHeight),
       recordNumber_(recordNumber),
-      shares_(record.Shares),
-      price_(record.Price),
-      value_(record.Value),
-      date_(record.Date),
       movement_(MoveOf(record)),
-      retire_(record.Retire != 0) {
-    char* const first = reinterpret_cast<char*>(this + 1);
-    char* end = first;
-    for (int field = 0; field < FieldCount; ++field) {
-        const std::string_view text = fields.texts[field];
-        begins_[field] = static_cast<uint8>(end - first);
-        end = std::copy(text.begin(), text.end(), end);
-        *end++ = '\0';
-    }
-}
+      texts_(TextsOf(record)) {}
 
 const char* NorvelItem::Text(int32 column) const {
-    switch (static_cast<InvestmentColumn>(column)) {
-    case InvestmentColumn::Name:
-        return FieldText(Name);
-    case InvestmentColumn::Ticker:
-        return FieldText(Ticker);
-    case InvestmentColumn::Type:
-        return FieldText(Type);
-    case InvestmentColumn::Retire:
-        return retire_ ? "yes" : "no";
-    case InvestmentColumn::Risk:
-        return FieldText(Risk);
-    case InvestmentColumn::Agent:
-        return FieldText(Agent);
-    default:
-        return FigureOf(static_cast<InvestmentColumn>(column));
-    }
-}
-
-const char* NorvelItem::FigureOf(InvestmentColumn column) const {
-    if (column < InvestmentColumn::Shares || column > InvestmentColumn::Date)
-        return "";
-    if (!figures_)
-        figures_ = std::make_unique<Figures>();
-    const auto place = static_cast<int32>(column) - static_cast<int32>(InvestmentColumn::Shares);
-    std::unique_ptr<char[]>& figure = (*figures_)[static_cast<std::size_t>(place)];
-    if (!figure) {
-        FigureText text;
-        Format(column, text);
-        const std::size_t size = std::strlen(text) + 1;
-        figure = std::make_unique<char[]>(size);
-        std::copy_n(text, size, figure.get());
-    }
-    return figure.get();
-}
-
-void NorvelItem::Format(InvestmentColumn column, FigureText& out) const {
-    switch (column) {
-    case InvestmentColumn::Shares:
-        return FormatShares(shares_, out);
-    case InvestmentColumn::Price:
-        return FormatPrice(price_, FieldText(Type), out);
-    case InvestmentColumn::Value:
-        return FormatValue(value_, out);
-    default:
-        return FormatDay(date_, out);
-    }
+    return column > 0 && column < InvestmentColumnCount ? texts_[static_cast<std::size_t>(column)].c_str()
+                                                        : "";
 }
 
 void NorvelItem::DrawItemColumn(BView* owner, BRect columnRect, int32 column, bool complete) {
@@ -177,25 +112,19 @@ void NorvelItem::Update(BView* owner, const BFont* font) {
 std::string NorvelItem::AccessibleText() const {
     std::string all;
     for (int32 column = 1; column < InvestmentColumnCount; ++column) {
-        const char* text = Text(column);
-        if (*text == '\0')
-            continue;
-        all += text;
-        all += ", ";
+        const std::string text = Text(column);
+        if (!text.empty())
+            all += text + ", ";
     }
     return all + LookOf(movement_).words;
 }
 
 std::string NorvelItem::SearchText() const {
-    return FieldText(Name);
+    return Text(static_cast<int32>(InvestmentColumn::Name));
 }
 
 int NorvelItem::MyCompare(const CLVListItem* a, const CLVListItem* b, int32 column) {
-    const auto* x = reinterpret_cast<const unsigned char*>(static_cast<const NorvelItem*>(a)->Text(column));
-    const auto* y = reinterpret_cast<const unsigned char*>(static_cast<const NorvelItem*>(b)->Text(column));
-    while (*x != 0 && Upper[*x] == Upper[*y]) {
-        ++x;
-        ++y;
-    }
-    return Upper[*x] - Upper[*y];
+    const std::unique_ptr<char[]> x(ToUpperStr(static_cast<const NorvelItem*>(a)->Text(column)));
+    const std::unique_ptr<char[]> y(ToUpperStr(static_cast<const NorvelItem*>(b)->Text(column)));
+    return std::strcmp(x.get(), y.get());
 }

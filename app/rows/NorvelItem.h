@@ -1,7 +1,7 @@
 #pragma once
 
 #include <array>
-#include <memory>
+#include <string>
 
 #include "ColumnListView/CLVListItem.h"
 #include "app/model/InvestmentTexts.h"
@@ -30,7 +30,7 @@ inline constexpr int32 InvestmentColumnCount = 11;
 // Who takes a row out of the list deletes it. Interface thread.
 class NorvelItem : public CLVListItem {
   public:
-    [[nodiscard]] static std::unique_ptr<NorvelItem> Make(const INVESTMENT_DATA& record, int32 recordNumber);
+    NorvelItem(const INVESTMENT_DATA& record, int32 recordNumber);
 
     // The number of the investment's record in invest.db.
     [[nodiscard]] int32 RecordNumber() const { return recordNumber_; }
@@ -50,41 +50,11 @@ class NorvelItem : public CLVListItem {
     // else byte by byte: below 0 when a comes first.
     [[nodiscard]] static int MyCompare(const CLVListItem* a, const CLVListItem* b, int32 column);
 
-    // A row and its texts are one block of memory: a large portfolio has a hundred thousand of them.
-    static void operator delete(void* row) { ::operator delete(row); }
-
   private:
-    // The fields of a record that are shown as they are stored, one behind the other at the row's end.
-    enum Field { Name, Ticker, Type, Agent, Risk, FieldCount };
-    struct Fields;
-    // The texts of the columns from Shares to Date, each null until it is asked for. Formatting every figure
-    // of every row would take longer than reading the file, and most rows are never seen.
-    using Figures = std::array<std::unique_ptr<char[]>, 4>;
-
-    struct TextBytes {
-        std::size_t count;
-    };
-    static void* operator new(std::size_t size, TextBytes texts) {
-        return ::operator new(size + texts.count);
-    }
-    static void operator delete(void* row, TextBytes) { ::operator delete(row); }
-
-    NorvelItem(const INVESTMENT_DATA& record, int32 recordNumber, const Fields& fields);
-    [[nodiscard]] const char* FieldText(Field field) const {
-        return reinterpret_cast<const char*>(this + 1) + begins_[field];
-    }
-    [[nodiscard]] const char* FigureOf(InvestmentColumn column) const;
-    void Format(InvestmentColumn column, FigureText& out) const;
     void DrawStatus(BView* owner, BRect columnRect) const;
 
     int32 recordNumber_;
-    float textOffset_ = 0; // from a column's top to the baseline
-    mutable std::unique_ptr<Figures> figures_;
-    float shares_;
-    float price_;
-    float value_;
-    dbDATE date_;
     PriceMove movement_;
-    bool retire_;
-    uint8 begins_[FieldCount]; // of the texts behind the row
+    float textOffset_ = 0;                                 // from a column's top to the baseline
+    std::array<std::string, InvestmentColumnCount> texts_; // by column
 };

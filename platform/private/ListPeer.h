@@ -15,8 +15,6 @@ struct ListPeer : ViewPeer {
     [[nodiscard]] RowsWidget* Rows() const { return static_cast<RowsWidget*>(widget.data()); }
     [[nodiscard]] QWidget* Canvas() const override { return Rows()->viewport(); }
 
-    // -1 when the row is not in the list.
-    [[nodiscard]] int32 IndexOf(const BListItem* row) const;
     // Has the toolkit ask one row only for its height as long as all are alike.
     void TakeHeights(const std::vector<BListItem*>& rows);
     void LayOutAgain();
@@ -27,8 +25,7 @@ struct ListPeer : ViewPeer {
     bool frameEvents = false;
 
   private:
-    int rowHeight_ = 0;       // of every row while the sizes are uniform
-    mutable int32 drift_ = 0; // how far the row looked up last had moved from where it came
+    int rowHeight_ = 0; // of every row while the sizes are uniform
 };
 
 // The layer's own way into lists and rows.
@@ -36,8 +33,6 @@ struct ListAccess {
     static ListPeer& Peer(const BListView& list);
     static BListView* List(const BListItem& row) { return row.list_; }
     static void SetList(BListItem& row, BListView* list) { row.list_ = list; }
-    static int32 Index(const BListItem& row) { return row.index_; }
-    static void SetIndex(BListItem& row, int32 index) { row.index_ = index; }
     static void SetSelected(BListItem& row, bool selected) { row.selected_ = selected; }
     // Whole pixels; at least one, so that every row has its place.
     static int Pixels(const BListItem& row);

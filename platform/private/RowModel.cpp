@@ -1,55 +1,50 @@
 #include "platform/private/RowModel.h"
 
+#include <algorithm>
+
 #include "platform/ListView.h"
 #include "platform/private/ListPeer.h"
 
 BListItem* RowModel::At(int32 index) const {
-    return index >= 0 && index < rows_.Count() ? rows_.At(index) : nullptr;
+    return index >= 0 && index < Count() ? rows_[static_cast<std::size_t>(index)] : nullptr;
+}
+
+int32 RowModel::IndexOf(const BListItem* row) const {
+    const auto found = std::find(rows_.begin(), rows_.end(), row);
+    return found == rows_.end() ? -1 : static_cast<int32>(found - rows_.begin());
 }
 
 void RowModel::Insert(int32 index, const std::vector<BListItem*>& rows) {
     beginInsertRows(QModelIndex(), index, index + static_cast<int32>(rows.size()) - 1);
-    rows_.Insert(index, rows);
+    rows_.insert(rows_.begin() + index, rows.begin(), rows.end());
     endInsertRows();
 }
 
 void RowModel::Remove(int32 index, int32 count) {
     beginRemoveRows(QModelIndex(), index, index + count - 1);
-    rows_.Remove(index, count);
+    rows_.erase(rows_.begin() + index, rows_.begin() + index + count);
     endRemoveRows();
 }
 
-void RowModel::Clear() {
+void RowModel::Replace(std::vector<BListItem*> rows) {
     beginResetModel();
-    rows_.Clear();
+    rows_ = std::move(rows);
     endResetModel();
 }
 
 void RowModel::Reorder(std::vector<BListItem*> order) {
     emit layoutAboutToBeChanged({}, QAbstractItemModel::VerticalSortHint);
+    rows_.swap(order);
     const QModelIndexList held = persistentIndexList();
-    std::vector<const BListItem*> heldRows;
-    for (const QModelIndex& index : held)
-        heldRows.push_back(rows_.At(index.row()));
-    rows_.Assign(std::move(order));
-    for (int32 index = 0; index < rows_.Count(); index++)
-        ListAccess::SetIndex(*rows_.At(index), index);
     QModelIndexList moved;
-    for (const BListItem* row : heldRows)
-        moved.push_back(index(ListAccess::Index(*row)));
+    for (const QModelIndex& place : held)
+        moved.push_back(index(IndexOf(order[static_cast<std::size_t>(place.row())])));
     changePersistentIndexList(held, moved);
     emit layoutChanged({}, QAbstractItemModel::VerticalSortHint);
 }
 
-// To reset unheard: the rows have not changed for anyone.
-void RowModel::ForgetHeldPlaces() {
-    const QSignalBlocker silent(this);
-    beginResetModel();
-    endResetModel();
-}
-
 int RowModel::rowCount(const QModelIndex& parent) const {
-    return parent.isValid() ? 0 : rows_.Count();
+    return parent.isValid() ? 0 : Count();
 }
 
 QVariant RowModel::data(const QModelIndex& index, int role) const {

@@ -11,7 +11,7 @@
 
 namespace {
 
-constexpr int kManyRanges = 100;
+constexpr int ManyRanges = 100;
 
 // The toolkit compares every range that was selected with every range that is going to be. Emptied first, a
 // scattered selection costs no more than its ranges.
@@ -23,7 +23,7 @@ class RangeSelectionModel : public QItemSelectionModel {
     using QItemSelectionModel::select;
 
     void select(const QItemSelection& ranges, SelectionFlags command) override {
-        if (command.testFlag(Clear) && !ranges.isEmpty() && selection().size() > kManyRanges) {
+        if (command.testFlag(Clear) && !ranges.isEmpty() && selection().size() > ManyRanges) {
             QItemSelectionModel::select(QItemSelection(), Clear);
             command.setFlag(Clear, false);
         }
@@ -48,38 +48,27 @@ RowSelection::RowSelection(RowModel& model, RowsWidget& view, std::function<void
 void RowSelection::TakeOver(const QItemSelection& selected, const QItemSelection& deselected) {
     Mark(deselected, false);
     Mark(selected, true);
-    orderKnown_ = false;
     changed_();
 }
 
 void RowSelection::Mark(const QItemSelection& ranges, bool selected) {
     for (const QItemSelectionRange& range : ranges)
-        for (int32 index = range.top(); index <= range.bottom(); index++)
+        for (int32 index = range.top(); index <= range.bottom(); ++index)
             if (BListItem* row = model_.At(index))
                 ListAccess::SetSelected(*row, selected);
 }
 
-void RowSelection::Order() const {
-    order_.clear();
-    head_ = 0;
-    shift_ = 0;
-    for (int32 index = 0; index < model_.Count(); index++)
-        if (model_.At(index)->IsSelected())
-            order_.push_back(index);
-    orderKnown_ = true;
-}
-
 int32 RowSelection::Nth(int32 n) const {
-    if (!orderKnown_)
-        Order();
-    const std::size_t place = head_ + static_cast<std::size_t>(std::max(n, 0));
-    return n < 0 || place >= order_.size() ? -1 : order_[place] - shift_;
+    for (int32 index = 0; index < model_.Count() && n >= 0; ++index)
+        if (model_.At(index)->IsSelected() && n-- == 0)
+            return index;
+    return -1;
 }
 
 int32 RowSelection::Current() const {
     if (attached_)
         return view_.ChosenRow();
-    return current_ ? view_.IndexOf(current_) : -1;
+    return current_ ? model_.IndexOf(current_) : -1;
 }
 
 // The program's choosing never scrolls.
@@ -115,9 +104,6 @@ void RowSelection::Detach() {
     attached_ = false;
     current_ = model_.At(view_.currentIndex().row());
     view_.selectionModel()->reset();
-    if (manyPlacesHeld_)
-        model_.ForgetHeldPlaces();
-    manyPlacesHeld_ = false;
     QTimer::singleShot(0, view_.selectionModel(), [this] { Attach(); });
 }
 
@@ -126,40 +112,45 @@ void RowSelection::Attach() {
         return;
     attached_ = true;
     QItemSelection ranges;
-    for (int32 index = 0; index < model_.Count(); index++) {
+    for (int32 index = 0; index < model_.Count(); ++index) {
         if (!model_.At(index)->IsSelected())
             continue;
         int32 end = index;
         while (end + 1 < model_.Count() && model_.At(end + 1)->IsSelected())
-            end++;
+            ++end;
         ranges.append(QItemSelectionRange(model_.index(index), model_.index(end)));
         index = end;
     }
-    manyPlacesHeld_ = ranges.size() > kManyRanges;
     QItemSelectionModel* toolkit = view_.selectionModel();
     const QSignalBlocker silent(toolkit);
     if (current_)
-        toolkit->setCurrentIndex(model_.index(view_.IndexOf(current_)), QItemSelectionModel::NoUpdate);
+        toolkit->setCurrentIndex(model_.index(model_.IndexOf(current_)), QItemSelectionModel::NoUpdate);
     current_ = nullptr;
     toolkit->select(ranges, QItemSelectionModel::Select);
     view_.viewport()->update();
 }
 
+void RowSelection::RemoveSelected() {
+    Detach();
+    std::vector<BListItem*> kept;
+    std::vector<BListItem*> removed;
+    int32 place = 0; // of the current row among those kept
+    for (BListItem* row : model_.Rows()) {
+        if (row == current_)
+            place = static_cast<int32>(kept.size());
+        (row->IsSelected() ? removed : kept).push_back(row);
+    }
+    model_.Replace(std::move(kept));
+    RowsRemoved(place, removed);
+}
+
 void RowSelection::RowsRemoved(int32 index, const std::vector<BListItem*>& rows) {
-    const auto count = static_cast<int32>(rows.size());
     if (std::find(rows.begin(), rows.end(), current_) != rows.end())
         current_ = model_.At(std::min(index, model_.Count() - 1));
-    // Taking the first selected row, again and again, or one above it, keeps the order known.
-    if (orderKnown_ && Nth(0) >= 0 && Nth(0) < index)
-        orderKnown_ = false;
-    if (orderKnown_) {
-        while (Nth(0) >= 0 && Nth(0) < index + count)
-            head_++;
-        shift_ += count;
-    }
     bool anySelected = false;
     for (BListItem* row : rows) {
         anySelected = anySelected || row->IsSelected();
+        ListAccess::SetList(*row, nullptr);
         ListAccess::SetSelected(*row, false);
     }
     if (anySelected)

@@ -36,26 +36,17 @@ class RowSelection {
     void Detach();
     // Brings the toolkit's selection and current row in line again; nothing when it is.
     void Attach();
-    // To be called when rows have been taken out, with what they were; after Detach.
+    void RemoveSelected();
+    // To be called when rows have been taken out, with what they were; after Detach. They leave the list.
     void RowsRemoved(int32 index, const std::vector<BListItem*>& rows);
-    // To be called when rows came or changed places.
-    void RowsMoved() { orderKnown_ = false; }
 
   private:
     void TakeOver(const QItemSelection& selected, const QItemSelection& deselected);
     void Mark(const QItemSelection& ranges, bool selected);
-    void Order() const;
 
     RowModel& model_;
     RowsWidget& view_;
     std::function<void()> changed_;
     bool attached_ = true;
-    bool manyPlacesHeld_ = false;
     BListItem* current_ = nullptr; // while not attached
-
-    // The selected rows' indexes in order: those of order_ from head_ on, each less shift_.
-    mutable std::vector<int32> order_;
-    mutable std::size_t head_ = 0;
-    mutable int32 shift_ = 0;
-    mutable bool orderKnown_ = false;
 };

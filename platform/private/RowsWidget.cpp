@@ -16,7 +16,7 @@
 
 namespace {
 
-constexpr int kRetryMilliseconds = 5;
+constexpr int RetryMilliseconds = 5;
 
 class RowDelegate : public QAbstractItemDelegate {
     Q_DISABLE_COPY_MOVE(RowDelegate)
@@ -67,10 +67,6 @@ RowsWidget::RowsWidget(BListView* owner) : owner_(owner) {
 }
 
 RowsWidget::~RowsWidget() = default;
-
-int32 RowsWidget::IndexOf(const BListItem* row) const {
-    return peer_ ? peer_->IndexOf(row) : -1;
-}
 
 void RowsWidget::SetBars(bool horizontal, bool vertical) {
     mayScrollSideways_ = horizontal;
@@ -164,7 +160,7 @@ void RowsWidget::paintEvent(QPaintEvent* event) {
     if (lock.IsHeld())
         QListView::paintEvent(event);
     else
-        QTimer::singleShot(kRetryMilliseconds, viewport(), [this] { viewport()->update(); });
+        QTimer::singleShot(RetryMilliseconds, viewport(), [this] { viewport()->update(); });
 }
 
 void RowsWidget::DrawRow(QPainter& painter, int32 index, const QRect& place, bool focus) const {
@@ -224,7 +220,7 @@ void RowsWidget::Input(QInputEvent* event) {
             Handle(event);
             return;
         }
-        QTimer::singleShot(kRetryMilliseconds, this, [this] { ReplayHeldBack(); });
+        QTimer::singleShot(RetryMilliseconds, this, [this] { ReplayHeldBack(); });
     }
     heldBack_.emplace_back(static_cast<QInputEvent*>(event->clone()));
 }
@@ -232,7 +228,7 @@ void RowsWidget::Input(QInputEvent* event) {
 void RowsWidget::ReplayHeldBack() {
     const InterfaceLock lock(peer_ ? owner_->Looper() : nullptr);
     if (!lock.IsHeld()) {
-        QTimer::singleShot(kRetryMilliseconds, this, [this] { ReplayHeldBack(); });
+        QTimer::singleShot(RetryMilliseconds, this, [this] { ReplayHeldBack(); });
         return;
     }
     while (peer_ && !heldBack_.empty()) {
@@ -334,7 +330,7 @@ void RowsWidget::HandleListKey(QKeyEvent* event) {
 // What is invoked is what is selected; a row that only has the keyboard's mark is selected first.
 void RowsWidget::InvokeCurrent() {
     SelectCurrentIfNone();
-    if (peer_->selection.Nth(0) >= 0)
+    if (selectionModel()->hasSelection())
         owner_->Invoke();
 }
 

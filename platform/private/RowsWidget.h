@@ -24,7 +24,6 @@ class RowsWidget : public QListView {
     void SetPeer(ListPeer* peer) { peer_ = peer; }
     // No hook of the view is called from now on.
     void Orphan() { peer_ = nullptr; }
-    [[nodiscard]] int32 IndexOf(const BListItem* row) const;
     // The row that keys go on from; -1 for none.
     [[nodiscard]] int32 ChosenRow() const;
 
@@ -44,6 +43,10 @@ class RowsWidget : public QListView {
     void DrawRow(QPainter& painter, int32 index, const QRect& place, bool focus) const;
 
     [[nodiscard]] QRect visualRect(const QModelIndex& index) const override;
+    // All that is seen: the toolkit would go through every range of a scattered selection.
+    [[nodiscard]] QRegion visualRegionForSelection(const QItemSelection& /*selection*/) const override {
+        return viewport()->rect();
+    }
 
   protected:
     void paintEvent(QPaintEvent* event) override;

@@ -7,16 +7,28 @@
 #include <string>
 #include <vector>
 
-#include "ColumnListView/BetterScrollView.h"
 #include "ColumnListView/CLVColumnLabelView.h"
 #include "ColumnListView/ColumnListView.h"
 #include "platform/Stage.h"
 
-inline constexpr rgb_color kColumnColors[] = {{255, 0, 0, 255}, {0, 160, 0, 255}, {200, 200, 0, 255}};
-inline constexpr rgb_color kStripColor{0, 160, 160, 255};
+inline constexpr rgb_color ColumnColors[] = {{255, 0, 0, 255}, {0, 160, 0, 255}, {200, 200, 0, 255}};
+inline constexpr rgb_color StripColor{0, 160, 160, 255};
 
 using Order = std::vector<int32>;
 using Mode = CLVSortMode;
+
+// What answers there are from one place to before another: each with where it begins.
+template <class AnswerAt>
+std::string Runs(float begin, float end, float step, const AnswerAt& answerAt) {
+    std::ostringstream runs;
+    std::string last;
+    for (float x = begin; x < end; x += step)
+        if (const std::string answer = answerAt(x); answer != last) {
+            runs << x << answer << " ";
+            last = answer;
+        }
+    return runs.str();
+}
 
 // A row with a letter for each column, which fills it with the column's colour and notes what it hears.
 class TextRow : public CLVListItem {
@@ -26,7 +38,7 @@ class TextRow : public CLVListItem {
 
     void DrawItemColumn(BView* owner, BRect rect, int32 column, bool) override {
         drawn.push_back(column);
-        owner->SetHighColor(column < 0 ? kStripColor : kColumnColors[column]);
+        owner->SetHighColor(column < 0 ? StripColor : ColumnColors[column]);
         owner->FillRect(rect);
     }
     void ColumnWidthChanged(int32 column, float width, ColumnListView*) override {
@@ -41,20 +53,15 @@ class TextRow : public CLVListItem {
     std::ostringstream heard;
 };
 
-// Counts what a program would hear by overriding the list's notices.
+// Counts what a program would hear.
 class NoticedList : public ColumnListView {
   public:
     using ColumnListView::ColumnListView;
-    void SortingChanged() override { sortings++; }
-    void DisplayOrderChanged(const int32* order) override {
-        orders++;
-        ColumnListView::DisplayOrderChanged(order);
-    }
+    void SortingChanged() override { ++sortings; }
     int sortings = 0;
-    int orders = 0;
 };
 
-// A list beside the stage until ListWindow puts it there.
+// A list on the stage, whose lock the test has until the stage is shown.
 struct ListFixture : Stage {
     explicit ListFixture(bool hierarchical = false) {
         list = new NoticedList({0, 0, 285, 185}, &container, "rows", B_FOLLOW_ALL_SIDES,
@@ -64,7 +71,7 @@ struct ListFixture : Stage {
             return static_cast<const TextRow*>(a)->texts[static_cast<std::size_t>(column)] -
                    static_cast<const TextRow*>(b)->texts[static_cast<std::size_t>(column)];
         });
-        owned.reset(container);
+        Add(container);
     }
 
     TextRow* NewRow(const char* texts, uint32 level = 0, bool superitem = false, bool expanded = true) {
@@ -77,9 +84,7 @@ struct ListFixture : Stage {
     }
     // A status column that stays first, and two sortable ones: 0..20, 21..81, 82..142.
     void AddPlainColumns() const {
-        NewColumn(nullptr, 20,
-                  CLVF_FIXED_POSITION | CLVF_FIXED_WIDTH | CLVF_KEEP_FIRST | CLVF_JOIN_HEADER |
-                      CLVF_PASS_INDENT);
+        NewColumn(nullptr, 20, 0x24E); // as the program's own
         NewColumn("Name", 60, CLVF_SORTABLE);
         NewColumn("Type", 60, CLVF_SORTABLE);
     }
@@ -87,16 +92,14 @@ struct ListFixture : Stage {
     // The given column's texts of the rows in sight, one after the other.
     [[nodiscard]] std::string Shown(std::size_t column = 1) const {
         std::string all;
-        for (int32 i = 0; i < list->CountItems(); i++)
+        for (int32 i = 0; i < list->CountItems(); ++i)
             all += static_cast<TextRow*>(list->ItemAt(i))->texts[column];
         return all;
     }
     [[nodiscard]] std::string FullList() const {
         std::string all;
-        list->FullListDoForEach([&](CLVListItem* row) {
-            all += static_cast<TextRow*>(row)->texts[0];
-            return false;
-        });
+        for (int32 i = 0; i < list->FullListCountItems(); ++i)
+            all += static_cast<TextRow*>(list->FullListItemAt(i))->texts[0];
         return all;
     }
     // The columns that the list is sorted by, each with its direction.
@@ -105,7 +108,7 @@ struct ListFixture : Stage {
         Mode modes[3] = {};
         list->Sorting(columns, modes);
         std::string keys;
-        for (int32 i = 0; i < list->Sorting(nullptr, nullptr); i++)
+        for (int32 i = 0; i < list->Sorting(nullptr, nullptr); ++i)
             keys += std::to_string(columns[i]) + (modes[i] == Mode::Ascending ? "+" : "-");
         return keys;
     }
@@ -113,5 +116,4 @@ struct ListFixture : Stage {
     std::vector<std::unique_ptr<TextRow>> rows;
     BetterScrollView* container = nullptr;
     NoticedList* list = nullptr;
-    std::unique_ptr<BetterScrollView> owned; // the container, while it is in no window
 };

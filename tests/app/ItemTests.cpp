@@ -1,7 +1,7 @@
 // Rows of the investment list: their texts, pictures and order.
 #include "Program.h"
 
-#include "ColumnListView/ToUpperStr.h"
+#include "ColumnListView/LabelText.h"
 
 namespace {
 
@@ -10,22 +10,22 @@ TEST(NorvelItem, ShowsTheRecordAsItWas) {
     record.Retire = 1;
     record.Date = {25, 12, 1999};
     record.QuoteError = 1;
-    const auto item = NorvelItem::Make(record, 42);
-    const std::string first = item->AccessibleText();
+    const NorvelItem item(record, 42);
+    const std::string first = item.AccessibleText();
     EXPECT_EQ(
         first,
         "Alder, Inc., TICK, Stock, 1250.500, 12 3/8, 15,474.94, 12-25-1999, yes, Med, Bank, no price found");
     record = MakeInvestment("A", "Other");
-    EXPECT_EQ(item->AccessibleText(), first);
-    EXPECT_EQ(item->RecordNumber(), 42);
-    for (const int32 column : {-1, 0, 11})
-        EXPECT_STREQ(item->Text(column), "");
+    EXPECT_EQ(item.AccessibleText(), first);
+    EXPECT_EQ(item.RecordNumber(), 42);
+    for (const int32 column : {-1, 0, 11, 100})
+        EXPECT_STREQ(item.Text(column), "");
 }
 
 TEST(NorvelItem, FieldsWithoutAnEndAreShownToTheirs) {
     INVESTMENT_DATA record;
     std::memset(&record, 'x', sizeof record);
-    const auto item = NorvelItem::Make(record, 0);
+    const NorvelItem item(record, 0);
     using Column = InvestmentColumn;
     for (const auto& [column, length] : {std::pair{Column::Name, 31U},
                                          {Column::Ticker, 7},
@@ -33,21 +33,20 @@ TEST(NorvelItem, FieldsWithoutAnEndAreShownToTheirs) {
                                          {Column::Agent, 31},
                                          {Column::Risk, 71},
                                          {Column::Price, 38}})
-        EXPECT_EQ(std::strlen(item->Text(static_cast<int32>(column))), length);
+        EXPECT_EQ(std::strlen(item.Text(static_cast<int32>(column))), length);
 }
 
-// The order is that of upper-case copies, byte by byte.
 TEST(NorvelItem, ComparesByTextWithoutRegardToLetterCase) {
     const char* names[] = {"", "a", "aB", "B a", "[", "az", "\xC3\xA4", "\xC3\x84"};
+    // Their places among the upper-case copies, byte by byte.
+    const int ranks[] = {0, 1, 2, 4, 5, 3, 7, 6};
     const auto sign = [](int number) { return (number > 0) - (number < 0); };
-    const auto upper = [](const char* text) { return std::unique_ptr<char[]>(ToUpperStr(text)); };
-    for (const char* x : names) {
-        for (const char* y : names) {
-            const auto a = NorvelItem::Make(MakeInvestment("A", x), 0);
-            const auto b = NorvelItem::Make(MakeInvestment("A", y), 1);
-            EXPECT_EQ(sign(NorvelItem::MyCompare(a.get(), b.get(), 1)),
-                      sign(std::strcmp(upper(x).get(), upper(y).get())))
-                << x << " : " << y;
+    for (std::size_t x = 0; x < std::size(names); ++x) {
+        for (std::size_t y = 0; y < std::size(names); ++y) {
+            const NorvelItem a(MakeInvestment("A", names[x]), 0);
+            const NorvelItem b(MakeInvestment("A", names[y]), 1);
+            EXPECT_EQ(sign(NorvelItem::MyCompare(&a, &b, 1)), sign(ranks[x] - ranks[y]))
+                << names[x] << " : " << names[y];
         }
     }
 }

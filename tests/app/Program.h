@@ -5,7 +5,6 @@
 
 #include <QAbstractItemView>
 
-#include "ColumnListView/BetterScrollView.h"
 #include "ColumnListView/ColumnListView.h"
 #include "DataFolder.h"
 #include "Driver.h"

@@ -47,7 +47,7 @@ TEST_F(StartTest, TheCloseBoxSavesWidthsAndCompacts) {
           "[DISPLAY]\nColumnWidth0=7\nColumnWidth2=120\nColumnWidth4=none\nColumnWidth5=99999999\n"
           "TextSize=99999\n");
     Expect({"second"}).Then("widths", [] {
-        const float expected[] = {20, 50, 120, 50, 20, CLVColumn::kGreatestWidth, 50, 50, 50, 50, 50};
+        const float expected[] = {20, 50, 120, 50, 20, CLVColumn::GreatestWidth, 50, 50, 50, 50, 50};
         for (int32 i = 0; i < InvestmentColumnCount; ++i)
             EXPECT_EQ(List()->ColumnAt(i)->Width(), expected[i]) << i;
         Locked([] {
