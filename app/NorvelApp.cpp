@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
-#include <system_error>
 
 #include "ColumnListView/ColumnListView.h"
 #include "app/NorvelWindow.h"
@@ -39,10 +38,6 @@ constexpr StatusBitmap StatusBitmaps[] = {
 // False when the path does not fit.
 bool JoinPath(char (&out)[PathBufferSize], const char* folder, const char* file) {
     return FormatInto(out, sizeof out, "%s/%s", folder, file);
-}
-
-std::string Reason(int error) {
-    return std::generic_category().message(error);
 }
 
 bool IsFull(int error) {

@@ -1,4 +1,3 @@
-#include "db/Compaction.h"
 
 #include <cerrno>
 #include <cstring>
@@ -37,7 +36,7 @@ std::size_t PackActive(std::uint8_t* records, std::size_t count, std::size_t len
 
 } // namespace
 
-bool FindCompactionPaths(const std::string& path, COMPACTION_PATHS* paths) {
+bool FindCompactionPaths(const std::string& path, CompactionPaths* paths) {
     paths->data = FollowLinks(path);
     if (paths->data.empty() || paths->data.size() >= PathBufferSize)
         return false;
@@ -48,7 +47,7 @@ bool FindCompactionPaths(const std::string& path, COMPACTION_PATHS* paths) {
 }
 
 std::string FindCompactionLeftover(const std::string& path) {
-    COMPACTION_PATHS paths;
+    CompactionPaths paths;
     if (!FindCompactionPaths(path, &paths) || FileExists(paths.data))
         return {};
     if (FileExists(paths.backup))
@@ -57,7 +56,7 @@ std::string FindCompactionLeftover(const std::string& path) {
 }
 
 int RestoreCompactionBackup(const char* path, FileOperations& operations) {
-    COMPACTION_PATHS paths;
+    CompactionPaths paths;
     if (path == nullptr || !FindCompactionPaths(path, &paths) || FileExists(paths.data) ||
         !FileExists(paths.backup))
         return 0;
@@ -69,7 +68,7 @@ int DATABASE::Compress(int /*ignored*/) {
         return Fail(DatabaseError::CompressNoFile);
     if (IsDamaged())
         return Fail(DatabaseError::CompressDamaged);
-    COMPACTION_PATHS paths;
+    CompactionPaths paths;
     if (readOnly_ || !FindCompactionPaths(path_, &paths))
         return Fail(DatabaseError::CompressOpenTemporary);
     // After an earlier failure the data may still lie under the backup's name, from where it must not be
@@ -114,7 +113,7 @@ int DATABASE::CopyActiveRecords(File& target, std::int32_t* copied) {
     if (!reader.Resize(bufferKilobytes))
         return DatabaseError::CompressNoMemory;
     const auto length = static_cast<std::size_t>(header_.recordLength);
-    RECORD_AREA area = Area();
+    RecordArea area = Area();
     for (std::int32_t i = 0; i < header_.recordCount; i = reader.Last() + 1) {
         if (reader.FillFrom(file_, area, i) != 0)
             return DatabaseError::CompressReadFailed;
@@ -130,7 +129,7 @@ int DATABASE::CopyActiveRecords(File& target, std::int32_t* copied) {
 
 // Puts the temporary file in the place of the data file. The data file stays open until the new one has its
 // name, so that after a failure the object goes on with the old data, under whichever name that is.
-int DATABASE::SwapIn(const COMPACTION_PATHS& paths) {
+int DATABASE::SwapIn(const CompactionPaths& paths) {
     if (IsPermissionDenied(RemoveFile(operations_, paths.backup)))
         return Fail(DatabaseError::CompressRemoveBackup);
     if (RenameFile(operations_, paths.data, paths.backup) != 0)

@@ -2,10 +2,9 @@
 
 #include <array>
 #include <cstring>
-#include <functional>
 #include <string_view>
 
-#include "db/LittleEndian.h"
+#include "db/FieldValue.h"
 #include "util/Strings.h"
 
 namespace {
@@ -74,46 +73,6 @@ bool ContainsLowered(std::string_view field, std::string_view value) {
     return false;
 }
 
-std::string_view TextOf(const std::uint8_t* field, std::size_t width) {
-    const auto* text = reinterpret_cast<const char*>(field);
-    return {text, strnlen(text, width)};
-}
-
-// How a column's bytes become the value that is compared.
-struct ByteField {
-    static std::int32_t Load(const std::uint8_t* field, std::size_t width) {
-        return static_cast<std::int8_t>(LoadLittleEndian<std::uint8_t>(field, width));
-    }
-};
-struct ShortField {
-    static std::int32_t Load(const std::uint8_t* field, std::size_t width) {
-        return static_cast<std::int16_t>(LoadLittleEndian<std::uint16_t>(field, width));
-    }
-};
-struct LongField {
-    static std::int32_t Load(const std::uint8_t* field, std::size_t width) {
-        return static_cast<std::int32_t>(LoadLittleEndian<std::uint32_t>(field, width));
-    }
-};
-struct FloatField {
-    static float Load(const std::uint8_t* field, std::size_t width) {
-        return std::bit_cast<float>(LoadLittleEndian<std::uint32_t>(field, width));
-    }
-};
-struct TimeField {
-    static std::int32_t Load(const std::uint8_t* field, std::size_t width) {
-        return static_cast<std::int32_t>(
-            LoadLittleEndian<std::uint32_t>(field, std::min<std::size_t>(width, 3)));
-    }
-};
-
-template <class Word>
-Word LoadWord(const void* bytes) {
-    Word word = 0;
-    std::memcpy(&word, bytes, sizeof(Word));
-    return word;
-}
-
 constexpr std::size_t PlacesAtOnce = 16;
 
 } // namespace
@@ -122,20 +81,23 @@ constexpr std::size_t PlacesAtOnce = 16;
 struct Matchers {
     using Matcher = Condition::Matcher;
 
-    template <class Field, class Compare>
+    template <class Field, int Op>
     static void Numbers(const Condition& self, const std::uint8_t* field, std::size_t stride,
                         std::size_t count, std::uint8_t* matches) {
-        const decltype(Field::Load(field, 0)) value = Value(self, Field{});
+        const auto value = static_cast<typename Field::Value>(self.number_);
         const std::size_t width = self.width_;
         for (std::size_t i = 0; i < count; ++i, field += stride)
-            matches[i] = Compare{}(Field::Load(field, width), value);
+            matches[i] = CompareValues(Op, Field::Load(field, width), value) != 0;
     }
 
-    template <class Compare>
-    static void LoweredTexts(const Condition& self, const std::uint8_t* field, std::size_t stride,
-                             std::size_t count, std::uint8_t* matches) {
-        for (std::size_t i = 0; i < count; ++i, field += stride)
-            matches[i] = Compare{}(CompareLowered(field, self.width_, self.text_), 0);
+    template <bool Exact, int Op>
+    static void Texts(const Condition& self, const std::uint8_t* field, std::size_t stride, std::size_t count,
+                      std::uint8_t* matches) {
+        for (std::size_t i = 0; i < count; ++i, field += stride) {
+            const int order = Exact ? CompareExact(field, self.width_, self.text_)
+                                    : CompareLowered(field, self.width_, self.text_);
+            matches[i] = CompareValues(Op, order, 0) != 0;
+        }
     }
 
     // Two letters that differ in case only differ in one bit: a field equals the value when the bits that
@@ -149,18 +111,11 @@ struct Matchers {
             Word difference = tooLong ? 1 : 0;
             for (std::size_t at = 0; at < compared && difference == 0; at += sizeof(Word)) {
                 difference =
-                    static_cast<Word>((LoadWord<Word>(field + at) ^ LoadWord<Word>(self.text_ + at)) &
-                                      LoadWord<Word>(self.bits_ + at));
+                    static_cast<Word>((LoadBytes<Word>(field + at) ^ LoadBytes<Word>(self.text_ + at)) &
+                                      LoadBytes<Word>(self.bits_ + at));
             }
             matches[i] = (difference == 0) == Equal;
         }
-    }
-
-    template <class Compare>
-    static void ExactTexts(const Condition& self, const std::uint8_t* field, std::size_t stride,
-                           std::size_t count, std::uint8_t* matches) {
-        for (std::size_t i = 0; i < count; ++i, field += stride)
-            matches[i] = Compare{}(CompareExact(field, self.width_, self.text_), 0);
     }
 
     // Whether a place agrees with the value in the bits that count.
@@ -184,7 +139,7 @@ struct Matchers {
             agree[i] = static_cast<std::uint8_t>(((places[i] & firstBits) == firstByte) &
                                                  ((places[i + last] & lastBits) == lastByte));
         }
-        if ((LoadWord<std::uint64_t>(agree) | LoadWord<std::uint64_t>(agree + 8)) == 0)
+        if ((LoadBytes<std::uint64_t>(agree) | LoadBytes<std::uint64_t>(agree + 8)) == 0)
             return PlacesAtOnce;
         std::size_t i = 0;
         while (i < PlacesAtOnce && !(agree[i] != 0 && AgreesAt(self, places + i)))
@@ -225,9 +180,9 @@ struct Matchers {
     // above case counts, so that another place may be the right one.
     template <bool Exact>
     static bool IsInText(const Condition& self, const std::uint8_t* field, std::size_t end) {
-        const std::string_view before = TextOf(field, end);
+        const std::string_view before = TextIn(field, end);
         if (!Exact && before.size() == end && AsciiLength(before) < end)
-            return ContainsLowered(TextOf(field, self.width_), {self.text_, self.length_});
+            return ContainsLowered(TextIn(field, self.width_), {self.text_, self.length_});
         return before.size() == end;
     }
 
@@ -236,96 +191,38 @@ struct Matchers {
         std::memset(matches, 0, count);
     }
 
+    // By operator; that a text is the same is found otherwise.
     template <class Field>
-    static Matcher OfNumbers(int op) {
-        switch (op) {
-        case CompareOperator::Equal:
-            return Numbers<Field, std::equal_to<>>;
-        case CompareOperator::Different:
-            return Numbers<Field, std::not_equal_to<>>;
-        case CompareOperator::Less:
-            return Numbers<Field, std::less<>>;
-        case CompareOperator::LessOrEqual:
-            return Numbers<Field, std::less_equal<>>;
-        case CompareOperator::Greater:
-            return Numbers<Field, std::greater<>>;
-        case CompareOperator::GreaterOrEqual:
-            return Numbers<Field, std::greater_equal<>>;
-        default:
-            return Nothing;
-        }
-    }
+    static constexpr Matcher OfNumbers[] = {Numbers<Field, 0>, Numbers<Field, 1>, Numbers<Field, 2>,
+                                            Numbers<Field, 3>, Numbers<Field, 4>, Numbers<Field, 5>};
+    template <bool Exact>
+    static constexpr Matcher OfTexts[] = {
+        nullptr,         nullptr,         Texts<Exact, 2>,    Texts<Exact, 3>,
+        Texts<Exact, 4>, Texts<Exact, 5>, ContainsText<Exact>};
 
     template <bool Equal>
     static Matcher OfSameTexts(std::size_t width) {
         return width % sizeof(std::uint64_t) == 0 ? SameTexts<Equal, std::uint64_t>
                                                   : SameTexts<Equal, std::uint8_t>;
     }
-
-    static Matcher OfTexts(int op, bool exact, std::size_t width) {
-        switch (op) {
-        case CompareOperator::Equal:
-            return OfSameTexts<true>(width);
-        case CompareOperator::Different:
-            return OfSameTexts<false>(width);
-        case CompareOperator::Less:
-            return exact ? ExactTexts<std::less<>> : LoweredTexts<std::less<>>;
-        case CompareOperator::LessOrEqual:
-            return exact ? ExactTexts<std::less_equal<>> : LoweredTexts<std::less_equal<>>;
-        case CompareOperator::Greater:
-            return exact ? ExactTexts<std::greater<>> : LoweredTexts<std::greater<>>;
-        case CompareOperator::GreaterOrEqual:
-            return exact ? ExactTexts<std::greater_equal<>> : LoweredTexts<std::greater_equal<>>;
-        case CompareOperator::Contains:
-            return exact ? ContainsText<true> : ContainsText<false>;
-        default:
-            return Nothing;
-        }
-    }
-
-  private:
-    static float Value(const Condition& self, FloatField /*kind*/) { return self.single_; }
-    template <class Field>
-    static std::int32_t Value(const Condition& self, Field /*kind*/) {
-        return self.whole_;
-    }
 };
 
 void Condition::Prepare(const COLUMN_ENTRY& column, int op, const char* value, bool exact) {
     offset_ = static_cast<std::size_t>(column.offset);
     width_ = static_cast<std::size_t>(column.size);
-    switch (column.type) {
-    case ColumnType::String:
-        matcher_ = Matchers::OfTexts(op, exact, width_);
+    matcher_ = Matchers::Nothing;
+    if (column.type == ColumnType::String) {
+        matcher_ = exact ? Matchers::OfTexts<true>[op] : Matchers::OfTexts<false>[op];
+        if (op == CompareOperator::Equal)
+            matcher_ = Matchers::OfSameTexts<true>(width_);
+        else if (op == CompareOperator::Different)
+            matcher_ = Matchers::OfSameTexts<false>(width_);
         PrepareText(value, exact);
-        break;
-    case ColumnType::Byte:
-        whole_ = std::int32_t{static_cast<std::int8_t>(WholeNumber(value))};
-        matcher_ = Matchers::OfNumbers<ByteField>(op);
-        break;
-    case ColumnType::Short:
-        whole_ = static_cast<std::int16_t>(WholeNumber(value));
-        matcher_ = Matchers::OfNumbers<ShortField>(op);
-        break;
-    case ColumnType::Long:
-        whole_ = static_cast<std::int32_t>(WholeNumber(value));
-        matcher_ = Matchers::OfNumbers<LongField>(op);
-        break;
-    case ColumnType::Float:
-        single_ = SingleNumber(value);
-        matcher_ = Matchers::OfNumbers<FloatField>(op);
-        break;
-    case ColumnType::Date:
-        whole_ = PackedDate(value);
-        matcher_ = Matchers::OfNumbers<LongField>(op);
-        break;
-    case ColumnType::Time:
-        whole_ = PackedTime(value);
-        matcher_ = Matchers::OfNumbers<TimeField>(op);
-        break;
-    default:
-        matcher_ = Matchers::Nothing;
     }
+    VisitField(column.type, [&]<class Field>(Field) {
+        number_ = static_cast<double>(Field::Parse(value));
+        matcher_ = Matchers::OfNumbers<Field>[op];
+    });
 }
 
 void Condition::PrepareText(const char* value, bool exact) {

@@ -13,38 +13,20 @@
 
 inline constexpr std::size_t HeaderSize = 52;
 inline constexpr std::size_t ColumnEntrySize = 44;
-/// The most bytes that a record can have: the header counts them in 16 bits.
+// The most bytes that a record can have: the header counts them in 16 bits.
 inline constexpr std::size_t LongestRecord = std::numeric_limits<std::int16_t>::max();
 
-/// Where the fields of the header lie in the file, and those of a column entry in the entry.
-namespace HeaderOffset {
-inline constexpr std::size_t Version = 0;
-inline constexpr std::size_t Description = 4;
-inline constexpr std::size_t RecordCount = 36;
-inline constexpr std::size_t DeletedCount = 40;
-inline constexpr std::size_t ColumnCount = 44;
-inline constexpr std::size_t RecordLength = 46;
-inline constexpr std::size_t Reserved = 48;
-} // namespace HeaderOffset
-namespace ColumnOffset {
-inline constexpr std::size_t Name = 0;
-inline constexpr std::size_t Type = 32;
-inline constexpr std::size_t Size = 34;
-inline constexpr std::size_t Offset = 36;
-inline constexpr std::size_t Format = 40;
-} // namespace ColumnOffset
-
-/// Values of a record's first byte. Any other value (no version of the engine writes one) counts as active.
+// Values of a record's first byte. Any other value (no version of the engine writes one) counts as active.
 namespace RecordStatus {
 inline constexpr std::uint8_t Active = 0;
 inline constexpr std::uint8_t Deleted = 1;
 inline constexpr std::uint8_t Locked = 2;
 } // namespace RecordStatus
 
-/// Where the records of a file lie.
-struct RECORD_AREA {
-    std::int64_t dataStart = 0;    ///< offset of record 0
-    std::int32_t recordLength = 0; ///< bytes of a record, the status byte included
+// Where the records of a file lie.
+struct RecordArea {
+    std::int64_t dataStart = 0;    // offset of record 0
+    std::int32_t recordLength = 0; // bytes of a record, the status byte included
     std::int32_t recordCount = 0;
 
     [[nodiscard]] std::int64_t OffsetOf(std::int64_t record) const {
@@ -52,34 +34,29 @@ struct RECORD_AREA {
     }
 };
 
-/// What a file's length says about the counts in its header.
+// What a file's length says about the counts in its header.
 enum class FileCounts {
-    Agree,   ///< no more behind the counted records than an interrupted append leaves: one record, or those
-             ///< that AppendAll announced
-    TooFew,  ///< records are missing at the end; the count was lowered to the whole records that are there
-    TooMany, ///< the file goes on behind the last counted record
+    Agree,   // no more behind the counted records than an interrupted append leaves: one record, or those
+             // that AppendAll announced
+    TooFew,  // records are missing at the end; the count was lowered to the whole records that are there
+    TooMany, // the file goes on behind the last counted record
 };
 
-/// Reads a header. A description without a terminator is cut at 31 characters.
-[[nodiscard]] DATABASE_HEADER DecodeHeader(std::span<const std::uint8_t, HeaderSize> bytes);
-void EncodeHeader(const DATABASE_HEADER& header, std::span<std::uint8_t, HeaderSize> bytes);
+// Ends a column's name that was read from a file, and clears the bytes between the fields.
+void CleanColumn(COLUMN_ENTRY* column);
 
-/// Reads a column entry. A name without a terminator is cut at 31 characters; padding is ignored.
-[[nodiscard]] COLUMN_ENTRY DecodeColumn(std::span<const std::uint8_t, ColumnEntrySize> bytes);
-void EncodeColumn(const COLUMN_ENTRY& column, std::span<std::uint8_t, ColumnEntrySize> bytes);
-
-/// Offset of record 0 in a file with that many columns.
+// Offset of record 0 in a file with that many columns.
 [[nodiscard]] constexpr std::int64_t DataStart(int columnCount) {
     return static_cast<std::int64_t>(HeaderSize + ColumnEntrySize * static_cast<std::size_t>(columnCount));
 }
 
-/// Tells whether a file of that length can be the header's: no negative count, records of at least their
-/// status byte, and a column table that is there in full.
+// Tells whether a file of that length can be the header's: no negative count, records of at least their
+// status byte, and a column table that is there in full.
 [[nodiscard]] bool HeaderMakesSense(const DATABASE_HEADER& header, std::int64_t fileLength);
 
-/// Tells whether the column lies inside the data of a record of `recordLength` bytes.
+// Tells whether the column lies inside the data of a record of `recordLength` bytes.
 [[nodiscard]] bool ColumnFits(const COLUMN_ENTRY& column, int recordLength);
 
-/// Compares the record count of a header that makes sense with the file's length, lowering the count to what
-/// is there.
+// Compares the record count of a header that makes sense with the file's length, lowering the count to what
+// is there.
 [[nodiscard]] FileCounts CheckRecordCount(DATABASE_HEADER* header, std::int64_t fileLength);

@@ -5,7 +5,7 @@
 #include <limits>
 #include <utility>
 
-#include "db/Allocate.h"
+#include "db/Bytes.h"
 #include "util/CharacterBuffer.h"
 
 namespace {
@@ -90,6 +90,7 @@ bool DATABASE::LayOutColumns(const COLUMN_ENTRY* wanted, DATABASE_HEADER* header
         columns[i] = ColumnFor(wanted[i]);
         columns[i].offset = static_cast<std::int16_t>(offset);
         AdjustColumnSize(&columns[i]);
+        CleanColumn(&columns[i]);
         if (!IsWidthAllowed(columns[i]))
             return false;
         offset += columns[i].size;
@@ -138,21 +139,19 @@ int DATABASE::OpenFile(const char* path) {
 
 int DATABASE::ReadLayout(const File& file, std::int64_t length, DATABASE_HEADER* header,
                          std::unique_ptr<COLUMN_ENTRY[]>* columns) {
-    std::uint8_t bytes[HeaderSize];
-    if (file.ReadAt(0, bytes, HeaderSize) != 0)
+    if (file.ReadAt(0, header, HeaderSize) != 0)
         return DatabaseError::OpenFailed;
-    *header = DecodeHeader(bytes);
+    header->description[NameSize - 1] = '\0';
     if (!HeaderMakesSense(*header, length))
         return DatabaseError::OpenFailed;
-    *columns = TryAllocate<COLUMN_ENTRY>(static_cast<std::size_t>(header->columnCount));
+    const auto count = static_cast<std::size_t>(header->columnCount);
+    *columns = TryAllocate<COLUMN_ENTRY>(count);
     if (!*columns)
         return DatabaseError::OpenNoMemoryForColumns;
-    std::int64_t offset = HeaderSize;
-    for (int i = 0; i < header->columnCount; ++i, offset += ColumnEntrySize) {
-        std::uint8_t entry[ColumnEntrySize];
-        if (file.ReadAt(offset, entry, ColumnEntrySize) != 0)
-            return DatabaseError::OpenFailed;
-        (*columns)[i] = DecodeColumn(entry);
+    if (file.ReadAt(HeaderSize, columns->get(), count * ColumnEntrySize) != 0)
+        return DatabaseError::OpenFailed;
+    for (std::size_t i = 0; i < count; ++i) {
+        CleanColumn(&(*columns)[i]);
         if (!ColumnFits((*columns)[i], header->recordLength))
             return DatabaseError::OpenFailed;
     }

@@ -15,12 +15,12 @@ constexpr int SecondsPerMinute = 60;
 constexpr int MinutesPerHour = 60;
 constexpr int HoursPerDay = 24;
 
-struct DIVISION {
+struct Division {
     int quotient; // rounded down
     int rest;     // 0 or above
 };
 
-constexpr DIVISION DivideDown(int number, int divisor) {
+constexpr Division DivideDown(int number, int divisor) {
     const int rest = (number % divisor + divisor) % divisor;
     return {(number - rest) / divisor, rest};
 }
@@ -93,12 +93,16 @@ void DATABASE::GetFormattedTimeString(const dbTIME* time, char* out, int style) 
     std::snprintf(out, FormattedTimeSize, "%.2d:%.2d:%.2d", shown.hour, shown.minute, shown.second);
 }
 
-void DATABASE::SetToCurrentDate(dbDATE* date) const {
+dbDATE Today() {
     int year = 0;
     int month = 0;
     int day = 0;
     GetDate(&year, &month, &day);
-    *date = {static_cast<std::int8_t>(day), static_cast<std::int8_t>(month), static_cast<std::int16_t>(year)};
+    return {static_cast<std::int8_t>(day), static_cast<std::int8_t>(month), static_cast<std::int16_t>(year)};
+}
+
+void DATABASE::SetToCurrentDate(dbDATE* date) const {
+    *date = Today();
 }
 
 void DATABASE::SetToCurrentTime(dbTIME* time) const {

@@ -1,25 +1,12 @@
 #include "db/FieldChange.h"
 
-#include <algorithm>
 #include <array>
-#include <bit>
-#include <cstring>
 
-#include "db/Allocate.h"
 #include "db/DatesTimes.h"
-#include "db/LittleEndian.h"
+#include "db/FieldValue.h"
 #include "util/CharacterBuffer.h"
 
 namespace {
-
-// Changes the integer in a column that may be narrower than its type.
-template <class T>
-void ChangeInteger(int op, std::uint8_t* field, std::size_t width, std::int64_t value) {
-    using Unsigned = std::make_unsigned_t<T>;
-    auto number = static_cast<T>(LoadLittleEndian<Unsigned>(field, width));
-    ChangeNumber(op, &number, static_cast<T>(value));
-    StoreLittleEndian(field, static_cast<Unsigned>(number), width);
-}
 
 // One part of a date or time: `packed` shifted right has the value's part in its lowest bits.
 template <class T>
@@ -50,68 +37,55 @@ void ChangeTime(int op, dbTIME* time, std::int32_t packed) {
     ChangePart(op, &time->hour, packed, 16);
 }
 
+namespace {
+
+template <class Field>
+void ChangeValue(Field /*type*/, int op, typename Field::Value* number, typename Field::Value value) {
+    ChangeNumber(op, number, value);
+}
+
+void ChangeValue(DateField /*type*/, int op, std::int32_t* packed, std::int32_t value) {
+    dbDATE date = UnpackDate(*packed);
+    ChangeDate(op, &date, value);
+    NormaliseDate(&date);
+    *packed = PackDate(date);
+}
+
+void ChangeValue(TimeField /*type*/, int op, std::int32_t* packed, std::int32_t value) {
+    dbTIME time = UnpackTime(*packed);
+    ChangeTime(op, &time, value);
+    NormaliseTime(&time);
+    *packed = PackTime(time);
+}
+
+} // namespace
+
 bool FieldChange::Prepare(const COLUMN_ENTRY& column, int op, const char* value) {
     type_ = column.type;
     op_ = op;
     offset_ = static_cast<std::size_t>(column.offset);
     width_ = static_cast<std::size_t>(column.size);
-    if (type_ == ColumnType::Float) {
-        single_ = SingleNumber(value);
-    } else if (type_ != ColumnType::String) {
-        whole_ = WholeNumber(value);
-    } else if (width_ > 0) {
-        text_ = TryAllocate<std::uint8_t>(width_);
-        if (!text_)
-            return false;
+    // Dates and times are changed by packed numbers.
+    VisitField(type_, [&]<class Field>(Field) {
+        number_ = static_cast<double>(NumberField<typename Field::Value>::Parse(value));
+    });
+    if (type_ != ColumnType::String || width_ == 0)
+        return true;
+    text_ = TryAllocate<std::uint8_t>(width_);
+    if (text_) {
         std::memset(text_.get(), 0, width_);
         CopyText(reinterpret_cast<char*>(text_.get()), width_, value);
     }
-    return true;
+    return text_ != nullptr;
 }
 
 void FieldChange::Apply(std::uint8_t* data) const {
     std::uint8_t* field = data + offset_;
-    switch (type_) {
-    case ColumnType::String:
+    if (type_ == ColumnType::String)
         std::copy_n(text_.get(), width_, field);
-        break;
-    case ColumnType::Byte:
-        ChangeInteger<std::int8_t>(op_, field, width_, whole_);
-        break;
-    case ColumnType::Short:
-        ChangeInteger<std::int16_t>(op_, field, width_, whole_);
-        break;
-    case ColumnType::Long:
-        ChangeInteger<std::int32_t>(op_, field, width_, whole_);
-        break;
-    case ColumnType::Float: {
-        auto number = std::bit_cast<float>(LoadLittleEndian<std::uint32_t>(field, width_));
-        ChangeNumber(op_, &number, single_);
-        StoreLittleEndian(field, std::bit_cast<std::uint32_t>(number), width_);
-        break;
-    }
-    case ColumnType::Date:
-        ApplyDate(field);
-        break;
-    case ColumnType::Time:
-        ApplyTime(field);
-        break;
-    default:
-        break;
-    }
-}
-
-void FieldChange::ApplyDate(std::uint8_t* field) const {
-    dbDATE date = UnpackDate(static_cast<std::int32_t>(LoadLittleEndian<std::uint32_t>(field, width_)));
-    ChangeDate(op_, &date, static_cast<std::int32_t>(whole_));
-    NormaliseDate(&date);
-    StoreLittleEndian(field, static_cast<std::uint32_t>(PackDate(date)), width_);
-}
-
-void FieldChange::ApplyTime(std::uint8_t* field) const {
-    const std::size_t width = std::min<std::size_t>(width_, sizeof(dbTIME));
-    dbTIME time = UnpackTime(static_cast<std::int32_t>(LoadLittleEndian<std::uint32_t>(field, width)));
-    ChangeTime(op_, &time, static_cast<std::int32_t>(whole_));
-    NormaliseTime(&time);
-    StoreLittleEndian(field, static_cast<std::uint32_t>(PackTime(time)), width);
+    VisitField(type_, [&]<class Field>(Field type) {
+        auto value = Field::Load(field, width_);
+        ChangeValue(type, op_, &value, static_cast<typename Field::Value>(number_));
+        Field::Store(field, width_, value);
+    });
 }

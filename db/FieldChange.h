@@ -7,7 +7,7 @@
 #include "db/RecordTypes.h"
 #include "db/Statement.h"
 
-/// Operators of set statements, numbered as DATABASE::QueryUpdateFunction takes them.
+// Operators of set statements, numbered as DATABASE::QueryUpdateFunction takes them.
 namespace SetOperator {
 inline constexpr int Assign = 0;
 inline constexpr int Add = 1;
@@ -16,88 +16,71 @@ inline constexpr int Multiply = 3;
 inline constexpr int Divide = 4;
 } // namespace SetOperator
 
-/// The operator that a token spells; -1 for none.
+// The operator that a token spells; -1 for none.
 [[nodiscard]] int SetOperatorOf(const char* token);
 
-/// Changes a number in place. Integers wrap at their width, and dividing one by 0 leaves it as it is; floats
-/// follow floating-point rules. Any other `op` than the five changes nothing.
+// The quotient of two numbers; of integers the dividend when there is none, and the wrapped one.
+template <class T>
+[[nodiscard]] constexpr T Quotient(T field, T value) {
+    if constexpr (std::is_integral_v<T>) {
+        if (value == 0)
+            return field;
+        if (value == -1)
+            return static_cast<T>(0 - static_cast<std::uint64_t>(field)); // that of the smallest does not fit
+    }
+    return static_cast<T>(field / value);
+}
+
+// Changes a number in place. Integers wrap at their width, and dividing one by 0 leaves it as it is; floats
+// follow floating-point rules. Any other `op` than the five changes nothing.
 template <class T>
 constexpr void ChangeNumber(int op, T* field, T value) {
-    const auto wrapped = [](auto number) { return static_cast<T>(number); };
-    if constexpr (std::is_integral_v<T>) {
-        // Unsigned arithmetic wraps where signed arithmetic must not overflow.
-        const auto a = static_cast<std::uint64_t>(std::int64_t{*field});
-        const auto b = static_cast<std::uint64_t>(std::int64_t{value});
-        switch (op) {
-        case SetOperator::Assign:
-            *field = value;
-            break;
-        case SetOperator::Add:
-            *field = wrapped(a + b);
-            break;
-        case SetOperator::Subtract:
-            *field = wrapped(a - b);
-            break;
-        case SetOperator::Multiply:
-            *field = wrapped(a * b);
-            break;
-        case SetOperator::Divide:
-            if (value == -1)
-                *field = wrapped(0 - a); // the quotient of the smallest number does not fit
-            else if (value != 0)
-                *field = wrapped(*field / value);
-            break;
-        default:
-            break;
-        }
-    } else {
-        switch (op) {
-        case SetOperator::Assign:
-            *field = value;
-            break;
-        case SetOperator::Add:
-            *field = value + *field;
-            break;
-        case SetOperator::Subtract:
-            *field = *field - value;
-            break;
-        case SetOperator::Multiply:
-            *field = value * *field;
-            break;
-        case SetOperator::Divide:
-            *field = *field / value;
-            break;
-        default:
-            break;
-        }
+    // Unsigned arithmetic wraps where signed arithmetic must not overflow.
+    using Wrapping = std::conditional_t<std::is_integral_v<T>, std::uint64_t, T>;
+    const auto a = static_cast<Wrapping>(*field);
+    const auto b = static_cast<Wrapping>(value);
+    switch (op) {
+    case SetOperator::Assign:
+        *field = value;
+        break;
+    case SetOperator::Add:
+        *field = static_cast<T>(a + b);
+        break;
+    case SetOperator::Subtract:
+        *field = static_cast<T>(a - b);
+        break;
+    case SetOperator::Multiply:
+        *field = static_cast<T>(a * b);
+        break;
+    case SetOperator::Divide:
+        *field = Quotient(*field, value);
+        break;
+    default:
+        break;
     }
 }
 
-/// Change a date or a time part by part, without carrying from one to another; `packed` is the packed form of
-/// the value. Only the operators =, + and - do something.
+// Change a date or a time part by part, without carrying from one to another; `packed` is the packed form of
+// the value. Only the operators =, + and - do something.
 void ChangeDate(int op, dbDATE* date, std::int32_t packed);
 void ChangeTime(int op, dbTIME* time, std::int32_t packed);
 
-/// One set statement, made ready once and then applied to the field of many records. It writes no byte
-/// outside the column and knows nothing of files and result sets.
+// One set statement, made ready once and then applied to the field of many records. It writes no byte
+// outside the column and knows nothing of files and result sets.
 class FieldChange {
   public:
-    /// `op` must be a SetOperator, Assign for a string column. A column of unknown type is never changed.
-    /// False when there is no memory.
+    // `op` must be a SetOperator, Assign for a string column. A column of unknown type is never changed.
+    // False when there is no memory.
     [[nodiscard]] bool Prepare(const COLUMN_ENTRY& column, int op, const char* value);
 
-    /// Changes the column in a record's data.
+    // Changes the column in a record's data.
     void Apply(std::uint8_t* data) const;
 
   private:
-    void ApplyDate(std::uint8_t* field) const;
-    void ApplyTime(std::uint8_t* field) const;
-
     std::int8_t type_ = ColumnType::String;
     int op_ = SetOperator::Assign;
     std::size_t offset_ = 0;               // of the column in a record's data
     std::size_t width_ = 0;                // of the column
-    std::int64_t whole_ = 0;               // the value for integers, dates and times
-    float single_ = 0;                     // the value for floats
+    double number_ = 0;                    // the value for all other columns
     std::unique_ptr<std::uint8_t[]> text_; // the value for strings, as wide as the column
 };

@@ -2,29 +2,28 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <cstddef>
 #include <cstring>
 #include <limits>
 #include <set>
 #include <string_view>
 #include <utility>
 
+#include "db/ReadCache.h"
+
 namespace {
 
-constexpr std::size_t BlockBytes = 256 * 1024;
+constexpr int BlockKilobytes = 256;
 
 std::string Text(std::int64_t number) {
     return std::to_string(number);
 }
 
-std::string Counted(std::int64_t number, const char* one, const char* more) {
-    return Text(number) + " " + (number == 1 ? one : more);
+std::string Counted(std::int64_t number, const char* thing) {
+    return Text(number) + " " + thing + (number == 1 ? "" : "s");
 }
 
-std::string Records(std::int64_t number) {
-    return Counted(number, "record", "records");
-}
-
-bool HasTerminator(const std::uint8_t* name) {
+bool HasTerminator(const char* name) {
     return std::memchr(name, 0, NameSize) != nullptr;
 }
 
@@ -36,30 +35,21 @@ bool IsStatus(std::uint8_t byte) {
 
 FileCheck::FileCheck(FileOperations& operations) : operations_(operations) {}
 
-void FileCheck::Add(FILE_FINDING finding) {
+// Before the finding at `place`, or as the last one.
+void FileCheck::Add(FileFinding finding, std::size_t place) {
     problem_ = problem_ || finding.problem;
     mendable_ = mendable_ || finding.mendable;
-    if (findings_.size() + 1 < MostFindings)
-        findings_.push_back(std::move(finding));
-    else
+    findings_.insert(findings_.begin() + static_cast<std::ptrdiff_t>(std::min(place, findings_.size())),
+                     std::move(finding));
+    if (findings_.size() == MostFindings) {
+        findings_.pop_back();
         ++omitted_;
-}
-
-void FileCheck::Problem(std::int64_t offset, std::string text) {
-    Add({true, false, offset, -1, std::move(text)});
+    }
 }
 
 void FileCheck::Misplaced(std::int64_t offset, std::string text) {
     laidOut_ = false;
     Problem(offset, std::move(text));
-}
-
-void FileCheck::Mendable(std::int64_t offset, std::string text) {
-    Add({true, true, offset, -1, std::move(text)});
-}
-
-void FileCheck::Remark(std::int64_t offset, std::string text) {
-    Add({false, false, offset, -1, std::move(text)});
 }
 
 void FileCheck::Forget() {
@@ -91,8 +81,7 @@ int FileCheck::Examine(const File& file) {
     } else if (omitted_ > 0) {
         findings_.push_back(
             {problem_, false, 0, -1,
-             Counted(static_cast<std::int64_t>(omitted_), "more finding is", "more findings are") +
-                 " not listed"});
+             Counted(omitted_, "more finding") + (omitted_ == 1 ? " is" : " are") + " not listed"});
     }
     return error;
 }
@@ -102,23 +91,22 @@ int FileCheck::ExamineHeader(const File& file) {
         Problem(length_, "the file ends after " + Text(length_) + " of the header's 52 bytes");
         return 0;
     }
-    std::uint8_t bytes[HeaderSize];
-    if (const int error = file.ReadAt(0, bytes, HeaderSize); error != 0)
+    if (const int error = file.ReadAt(0, &header_, HeaderSize); error != 0)
         return error;
-    header_ = DecodeHeader(bytes);
     if (header_.version != 1.0F)
         Remark(0, "the version is not 1.0");
-    if (!HasTerminator(bytes + HeaderOffset::Description))
-        Remark(HeaderOffset::Description, "the description has no end within its 32 bytes");
+    if (!HasTerminator(header_.description))
+        Remark(offsetof(DATABASE_HEADER, description), "the description has no end within its 32 bytes");
     if (header_.columnCount < 0) {
-        Problem(HeaderOffset::ColumnCount, "the column count is " + Text(header_.columnCount));
+        Problem(offsetof(DATABASE_HEADER, columnCount), "the column count is " + Text(header_.columnCount));
     } else if (DataStart(header_.columnCount) > length_) {
-        Problem(HeaderOffset::ColumnCount, "header and " + Counted(header_.columnCount, "column", "columns") +
-                                               " need " + Text(DataStart(header_.columnCount)) +
-                                               " bytes, the file has " + Text(length_));
+        Problem(offsetof(DATABASE_HEADER, columnCount),
+                "header and " + Counted(header_.columnCount, "column") + " need " +
+                    Text(DataStart(header_.columnCount)) + " bytes, the file has " + Text(length_));
     }
     if (header_.recordLength < 1)
-        Problem(HeaderOffset::RecordLength, "the record length is " + Text(header_.recordLength));
+        Problem(offsetof(DATABASE_HEADER, recordLength),
+                "the record length is " + Text(header_.recordLength));
     laidOut_ = !problem_;
     return 0;
 }
@@ -128,28 +116,29 @@ int FileCheck::ExamineColumns(const File& file) {
     int end = 0; // of the columns so far, in a record's data
     for (int i = 0; i < header_.columnCount; ++i) {
         const std::int64_t at = DataStart(i);
-        std::uint8_t bytes[ColumnEntrySize];
-        if (const int error = file.ReadAt(at, bytes, ColumnEntrySize); error != 0)
+        COLUMN_ENTRY column{};
+        if (const int error = file.ReadAt(at, &column, ColumnEntrySize); error != 0)
             return error;
-        const COLUMN_ENTRY column = DecodeColumn(bytes);
+        const bool nameEnds = HasTerminator(column.name);
+        CleanColumn(&column);
         const std::string name = "column " + std::string(column.name);
-        ExamineColumn(column, HasTerminator(bytes), at);
+        ExamineColumn(column, nameEnds, at);
         if (!names.insert(column.name).second)
             Remark(at, name + " has the name of an earlier one, which statements mean");
         if (column.offset != end) {
             const std::string sentence = name + " begins at byte " + Text(column.offset) +
                                          " of the data, the columns before it end at " + Text(end);
             if (column.offset < end)
-                Misplaced(at + ColumnOffset::Offset, sentence);
+                Misplaced(at + offsetof(COLUMN_ENTRY, offset), sentence);
             else
-                Remark(at + ColumnOffset::Offset, sentence);
+                Remark(at + offsetof(COLUMN_ENTRY, offset), sentence);
         }
         end = std::max(end, column.offset + column.size);
     }
     const int uncovered = header_.recordLength - 1 - end;
     if (uncovered > 0) {
-        Remark(HeaderOffset::RecordLength,
-               "no column covers the last " + Counted(uncovered, "byte", "bytes") + " of a record");
+        Remark(offsetof(DATABASE_HEADER, recordLength),
+               "no column covers the last " + Counted(uncovered, "byte") + " of a record");
     }
     return 0;
 }
@@ -159,9 +148,9 @@ void FileCheck::ExamineColumn(const COLUMN_ENTRY& column, bool nameEnds, std::in
     if (!nameEnds)
         Problem(at, name + " has a name without an end within its 32 bytes");
     if (column.type < ColumnType::String || column.type > ColumnType::Time)
-        Problem(at + ColumnOffset::Type, name + " is of the unknown type " + Text(column.type));
+        Problem(at + offsetof(COLUMN_ENTRY, type), name + " is of the unknown type " + Text(column.type));
     if (!ColumnFits(column, header_.recordLength)) {
-        Misplaced(at + ColumnOffset::Offset,
+        Misplaced(at + offsetof(COLUMN_ENTRY, offset),
                   name + " has " + Text(column.size) + " bytes at " + Text(column.offset) + ", outside the " +
                       Text(header_.recordLength - 1) + " bytes of a record's data");
     }
@@ -172,24 +161,24 @@ void FileCheck::ExamineRecordCount() {
     const std::int64_t whole = (length_ - DataStart(header_.columnCount)) / header_.recordLength;
     const std::int32_t counted = header_.recordCount;
     const std::string sentence =
-        "the header counts " + Records(counted) + ", the file has room for " + Text(whole);
+        "the header counts " + Counted(counted, "record") + ", the file has room for " + Text(whole);
     if (counted >= 0 && CheckRecordCount(&header_, length_) == FileCounts::Agree) {
         const std::int64_t end = DataStart(header_.columnCount) + whole * header_.recordLength;
         const std::int64_t rest = length_ - (end - (whole - counted) * header_.recordLength);
         if (header_.reserved != 0) {
-            Remark(HeaderOffset::Reserved,
+            Remark(offsetof(DATABASE_HEADER, reserved),
                    "the reserved field is " + Text(header_.reserved) +
                        ", as when adding so many records is interrupted; the next append cuts "
                        "off what was written of them");
         } else if (rest > 0) {
-            Remark(length_ - rest, Counted(rest, "byte", "bytes") +
+            Remark(length_ - rest, Counted(rest, "byte") +
                                        " behind the last record, as an interrupted append leaves them; the "
                                        "next append overwrites them");
         }
     } else if (whole > std::numeric_limits<std::int32_t>::max()) {
-        Problem(HeaderOffset::RecordCount, sentence + ", more than can be counted");
+        Problem(offsetof(DATABASE_HEADER, recordCount), sentence + ", more than can be counted");
     } else {
-        Mendable(HeaderOffset::RecordCount, sentence);
+        Mendable(offsetof(DATABASE_HEADER, recordCount), sentence);
         header_.recordCount = static_cast<std::int32_t>(whole);
         header_.reserved = 0;
     }
@@ -198,45 +187,29 @@ void FileCheck::ExamineRecordCount() {
 // Looks at the counts and notices odd status bytes.
 int FileCheck::ExamineRecords(const File& file) {
     ExamineRecordCount();
-    const std::int64_t start = DataStart(header_.columnCount);
-    const auto length = static_cast<std::size_t>(header_.recordLength);
-    const auto perBlock = static_cast<std::int32_t>(std::max<std::size_t>(BlockBytes / length, 1));
-    std::vector<std::uint8_t> block(static_cast<std::size_t>(perBlock) * length);
+    const RecordArea area{DataStart(header_.columnCount), header_.recordLength, header_.recordCount};
+    const std::size_t behindCounts = findings_.size();
+    ReadCache reader;
+    if (!reader.Resize(BlockKilobytes))
+        return ENOMEM;
     std::int32_t deleted = 0;
-    std::vector<FILE_FINDING> odd;
-    std::size_t more = 0;
-    for (std::int32_t first = 0; first < header_.recordCount;) {
-        const std::int32_t count = std::min(perBlock, header_.recordCount - first);
-        const std::int64_t at = start + static_cast<std::int64_t>(first) * header_.recordLength;
-        const std::size_t bytes = static_cast<std::size_t>(count) * length;
-        if (const int error = file.ReadAt(at, block.data(), bytes); error != 0)
+    for (std::int32_t i = 0; i < area.recordCount; ++i) {
+        if (const int error = reader.Holds(i) ? 0 : reader.FillFrom(file, area, i); error != 0)
             return error;
-        for (std::int32_t i = 0; i < count; ++i) {
-            const std::uint8_t status = block[static_cast<std::size_t>(i) * length];
-            deleted += status == RecordStatus::Deleted ? 1 : 0;
-            if (IsStatus(status))
-                continue;
-            if (odd.size() == MostFindings) {
-                ++more;
-                continue;
-            }
-            odd.push_back({true, false, at + static_cast<std::int64_t>(i) * header_.recordLength, first + i,
-                           "the status byte is " + Text(status) + ", which counts as active"});
-        }
-        first += count;
+        const std::uint8_t status = *reader.Record(i);
+        deleted += status == RecordStatus::Deleted ? 1 : 0;
+        if (!IsStatus(status))
+            Add({true, false, area.OffsetOf(i), i,
+                 "the status byte is " + Text(status) + ", which counts as active"});
     }
-    ExamineDeletedCount(deleted);
-    std::for_each(odd.begin(), odd.end(), [this](FILE_FINDING& finding) { Add(std::move(finding)); });
-    omitted_ += more;
-    return 0;
-}
-
-void FileCheck::ExamineDeletedCount(std::int32_t deleted) {
     if (header_.deletedCount != deleted) {
-        Mendable(HeaderOffset::DeletedCount, "the header counts " + Text(header_.deletedCount) +
-                                                 " deleted, the status bytes " + Text(deleted));
+        Mendable(offsetof(DATABASE_HEADER, deletedCount),
+                 "the header counts " + Text(header_.deletedCount) + " deleted, the status bytes " +
+                     Text(deleted),
+                 behindCounts);
         header_.deletedCount = deleted;
     }
+    return 0;
 }
 
 int FileCheck::Repair(const std::string& path, std::string* backup) {
@@ -280,15 +253,12 @@ int FileCheck::WriteBackup(const File& file, const std::string& path, std::strin
 
 // Writes the counts of header_ over those in the file; the texts of the header stay as they are.
 int FileCheck::WriteCounts(File& file) const {
-    std::uint8_t mended[HeaderSize];
-    std::uint8_t before[HeaderSize];
-    if (const int error = file.ReadAt(0, before, HeaderSize); error != 0)
+    constexpr std::int64_t at = offsetof(DATABASE_HEADER, recordCount);
+    DATABASE_HEADER before{};
+    if (const int error = file.ReadAt(0, &before, HeaderSize); error != 0)
         return error;
-    EncodeHeader(header_, mended);
-    constexpr std::size_t size = HeaderSize - HeaderOffset::RecordCount;
-    if (const int error = file.WriteAt(HeaderOffset::RecordCount, mended + HeaderOffset::RecordCount, size);
-        error != 0) {
-        static_cast<void>(file.WriteAt(HeaderOffset::RecordCount, before + HeaderOffset::RecordCount, size));
+    if (const int error = file.WriteAt(at, &header_.recordCount, HeaderSize - at); error != 0) {
+        static_cast<void>(file.WriteAt(at, &before.recordCount, HeaderSize - at));
         return error;
     }
     return file.Sync();

@@ -1,35 +1,7 @@
 #include <cstring>
 
 #include "db/Database.h"
-
-namespace {
-
-// What a type occupies in a record and in a text line. A string's width is its creator's choice.
-struct TypeWidths {
-    std::int16_t record;
-    int text;
-};
-
-TypeWidths WidthsOf(std::int8_t type) {
-    switch (type) {
-    case ColumnType::Byte:
-        return {1, 1};
-    case ColumnType::Short:
-        return {2, 16};
-    case ColumnType::Long:
-        return {4, 16};
-    case ColumnType::Float:
-        return {8, 16};
-    case ColumnType::Date:
-        return {4, 8};
-    case ColumnType::Time:
-        return {3, 6};
-    default:
-        return {0, 0};
-    }
-}
-
-} // namespace
+#include "db/FieldValue.h"
 
 int DATABASE::WriteDbHeader() {
     return immediateHeaderWrite_ ? WriteHeaderBytes() : 0;
@@ -41,11 +13,7 @@ int DATABASE::SetImmediateHeaderWrite(int on) {
 }
 
 int DATABASE::WriteHeaderBytes() {
-    std::uint8_t bytes[HeaderSize];
-    EncodeHeader(header_, bytes);
-    if (!IsOpen() || file_.WriteAt(0, bytes, HeaderSize) != 0)
-        return Fail(DatabaseError::HeaderFailed);
-    return 0;
+    return IsOpen() && file_.WriteAt(0, &header_, HeaderSize) == 0 ? 0 : Fail(DatabaseError::HeaderFailed);
 }
 
 int DATABASE::Sync() {
@@ -53,21 +21,14 @@ int DATABASE::Sync() {
 }
 
 int DATABASE::WriteLayout(File& file, const DATABASE_HEADER& header, const COLUMN_ENTRY* columns) {
-    std::uint8_t bytes[HeaderSize];
-    EncodeHeader(header, bytes);
-    int error = file.WriteAt(0, bytes, HeaderSize);
-    for (int i = 0; i < header.columnCount && error == 0; ++i) {
-        std::uint8_t entry[ColumnEntrySize];
-        EncodeColumn(columns[i], entry);
-        error = file.WriteAt(DataStart(i), entry, ColumnEntrySize);
-    }
-    return error;
+    const int error = file.WriteAt(0, &header, HeaderSize);
+    const auto count = static_cast<std::size_t>(header.columnCount);
+    return error != 0 ? error : file.WriteAt(HeaderSize, columns, count * ColumnEntrySize);
 }
 
 int DATABASE::AdjustColumnSize(COLUMN_ENTRY* column) const {
-    const std::int16_t own = WidthsOf(column->type).record;
-    if (column->size < 0 && own > 0)
-        column->size = own;
+    if (column->size < 0)
+        VisitField(column->type, [column]<class Field>(Field) { column->size = Field::Width; });
     return 0;
 }
 
@@ -75,7 +36,8 @@ int DATABASE::CalculateIOBufferSize() const {
     int size = header_.columnCount;
     for (int i = 0; i < header_.columnCount; ++i) {
         const COLUMN_ENTRY& column = columns_[i];
-        size += column.type == ColumnType::String ? column.size + 2 : WidthsOf(column.type).text;
+        size += column.type == ColumnType::String ? column.size + 2 : 0;
+        VisitField(column.type, [&size]<class Field>(Field) { size += Field::LineBytes; });
     }
     return size;
 }

@@ -2,7 +2,7 @@
 #include <cstring>
 #include <numeric>
 
-#include "db/Allocate.h"
+#include "db/Bytes.h"
 #include "db/Database.h"
 #include "db/Statement.h"
 
@@ -49,7 +49,7 @@ long DATABASE::Query(const char* statement, int mode) {
 }
 
 int DATABASE::PrepareCondition(const char* statement, Condition* condition) const {
-    STATEMENT parts{};
+    Statement parts{};
     if (!SplitStatement(statement, &parts))
         return DatabaseError::QueryInvalidStatement;
     const COLUMN_ENTRY* column = FindColumn(parts.column);
@@ -122,7 +122,7 @@ void DATABASE::MergeMatches(const Condition& condition, int mode, std::int32_t f
 }
 
 int DATABASE::ParseQueryStatement(const char* statement, char* column, char* op, char* value) const {
-    STATEMENT parts{};
+    Statement parts{};
     if (!SplitStatement(statement, &parts))
         return 1;
     std::memcpy(column, parts.column, TokenSize);
@@ -177,10 +177,6 @@ void DATABASE::QueryRefresh() {
 
 int DATABASE::IsQueryActive() const {
     return slots_ && resultCount_ < GetNumberOfActiveRecords() ? 1 : 0;
-}
-
-void DATABASE::SetCaseSensitivity(int on) {
-    caseSensitive_ = on != 0;
 }
 
 int DATABASE::CompareStringVals(int op, const char* field, const char* value) const {

@@ -4,7 +4,7 @@
 #include <cerrno>
 #include <limits>
 
-#include "db/Allocate.h"
+#include "db/Bytes.h"
 
 namespace {
 constexpr std::int32_t ScatteredBytes = 4096; // read ahead of a record that does not follow the one before
@@ -46,7 +46,7 @@ std::int32_t ReadCache::Capacity(std::int32_t recordLength) const {
     return static_cast<std::int32_t>(std::max<std::int64_t>(size_ / recordLength, 1));
 }
 
-int ReadCache::Fill(const File& file, const RECORD_AREA& area, std::int32_t n) {
+int ReadCache::Fill(const File& file, const RecordArea& area, std::int32_t n) {
     const std::int32_t capacity = Capacity(area.recordLength);
     const std::int32_t scattered = std::clamp(ScatteredBytes / area.recordLength, 1, capacity);
     const bool downwards = n == first_ - 1;
@@ -63,16 +63,11 @@ int ReadCache::Fill(const File& file, const RECORD_AREA& area, std::int32_t n) {
     return ReadRange(file, area, n, std::min(window_, area.recordCount - n));
 }
 
-int ReadCache::FillFrom(const File& file, const RECORD_AREA& area, std::int32_t n) {
+int ReadCache::FillFrom(const File& file, const RecordArea& area, std::int32_t n) {
     return ReadRange(file, area, n, std::min(Capacity(area.recordLength), area.recordCount - n));
 }
 
-int ReadCache::FillSpan(const File& file, const RECORD_AREA& area, std::int32_t first, std::int32_t count) {
-    const int error = ReadRange(file, area, first, count);
-    return error == 0 && !Holds(first + count - 1) ? ENODATA : error;
-}
-
-int ReadCache::ReadRange(const File& file, const RECORD_AREA& area, std::int32_t first, std::int32_t count) {
+int ReadCache::ReadRange(const File& file, const RecordArea& area, std::int32_t first, std::int32_t count) {
     const auto length = static_cast<std::size_t>(area.recordLength);
     std::size_t got = 0;
     int error =

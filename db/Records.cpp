@@ -2,7 +2,7 @@
 #include <cstring>
 #include <limits>
 
-#include "db/Allocate.h"
+#include "db/Bytes.h"
 #include "db/Database.h"
 
 int DATABASE::PrepareAppend(std::int32_t count) {
@@ -33,8 +33,8 @@ long DATABASE::AppendAll(const void* data, std::size_t stride, std::int32_t coun
     if (code == DatabaseError::None &&
         WriteNewRecords(static_cast<const std::uint8_t*>(data), stride, count) != 0)
         code = DatabaseError::AppendFailed;
-    if (code == DatabaseError::None)
-        code = CountNewRecords(count);
+    if (code == DatabaseError::None && ChangeCounts(number + count, header_.deletedCount, 0) != 0)
+        code = DatabaseError::HeaderFailed;
     if (code != DatabaseError::None) {
         // While the header still announces them. What cannot be cut off now stays announced, for the next
         // append to cut it.
@@ -46,17 +46,6 @@ long DATABASE::AppendAll(const void* data, std::size_t stride, std::int32_t coun
     }
     currentRecord_ = number + count - 1;
     return number;
-}
-
-int DATABASE::CountNewRecords(std::int32_t count) {
-    const DATABASE_HEADER before = header_;
-    header_.recordCount += count;
-    header_.reserved = 0;
-    if (WriteDbHeader() == 0)
-        return DatabaseError::None;
-    header_ = before;
-    static_cast<void>(WriteHeaderBytes()); // part of the new header may have been written
-    return DatabaseError::HeaderFailed;
 }
 
 int DATABASE::WriteNewRecords(const std::uint8_t* data, std::size_t stride, std::int32_t count) {
@@ -93,7 +82,7 @@ long DATABASE::Append(const void* data) {
         static_cast<void>(file_.Truncate(end)); // bytes behind the last record do no harm if this fails too
         return Fail(DatabaseError::AppendFailed);
     }
-    if (ChangeCounts(number + 1, header_.deletedCount) != 0)
+    if (ChangeCounts(number + 1, header_.deletedCount, 0) != 0)
         return Fail(DatabaseError::HeaderFailed);
     currentRecord_ = number;
     return number;
@@ -167,10 +156,11 @@ int DATABASE::WriteStatus(long n, std::uint8_t status) {
 }
 
 // Changes the counts in memory and, while that is on, in the file; a failure leaves both as they were.
-int DATABASE::ChangeCounts(std::int32_t recordCount, std::int32_t deletedCount) {
+int DATABASE::ChangeCounts(std::int32_t recordCount, std::int32_t deletedCount, std::int32_t reserved) {
     const DATABASE_HEADER before = header_;
     header_.recordCount = recordCount;
     header_.deletedCount = deletedCount;
+    header_.reserved = reserved;
     if (WriteDbHeader() == 0)
         return 0;
     header_ = before;
@@ -213,7 +203,7 @@ int DATABASE::ChangeStatus(long n, std::uint8_t from, std::uint8_t to, int failu
     const std::int32_t deleted = to == RecordStatus::Deleted
                                      ? std::min(header_.deletedCount + 1, header_.recordCount)
                                      : std::max(header_.deletedCount - 1, 0);
-    if (ChangeCounts(header_.recordCount, deleted) != 0) {
+    if (ChangeCounts(header_.recordCount, deleted, header_.reserved) != 0) {
         static_cast<void>(WriteStatus(n, from));
         return DatabaseError::HeaderFailed;
     }
@@ -234,15 +224,27 @@ void DATABASE::RemoveFromResultSet(long n) {
 }
 
 int DATABASE::Lock(long n) {
+    return ChangeLock(n, RecordStatus::Locked,
+                      {DatabaseError::LockInvalidRecord, DatabaseError::LockDeleted,
+                       DatabaseError::LockLocked, DatabaseError::LockFailed});
+}
+
+int DATABASE::UnLock(long n) {
+    return ChangeLock(n, RecordStatus::Active,
+                      {DatabaseError::UnLockInvalidRecord, DatabaseError::UnLockDeleted,
+                       DatabaseError::UnLockNotLocked, DatabaseError::UnLockFailed});
+}
+
+int DATABASE::ChangeLock(long n, std::uint8_t to, const LockCodes& codes) {
     std::uint8_t status = 0;
-    if (LookUpStatus(n, DatabaseError::LockInvalidRecord, DatabaseError::LockFailed, &status) != 0)
+    if (LookUpStatus(n, codes.invalidRecord, codes.failed, &status) != 0)
         return -1;
     if (status == RecordStatus::Deleted)
-        return Fail(DatabaseError::LockDeleted);
-    if (status == RecordStatus::Locked)
-        return Fail(DatabaseError::LockLocked);
-    if (WriteStatus(n, RecordStatus::Locked) != 0)
-        return Fail(DatabaseError::LockFailed);
+        return Fail(codes.deleted);
+    if ((status == RecordStatus::Locked) == (to == RecordStatus::Locked))
+        return Fail(codes.unchanged);
+    if (WriteStatus(n, to) != 0)
+        return Fail(codes.failed);
     currentRecord_ = static_cast<std::int32_t>(n);
     return 0;
 }
@@ -256,26 +258,8 @@ int DATABASE::IsLocked(long n) {
     return status == RecordStatus::Locked ? 1 : 0;
 }
 
-int DATABASE::UnLock(long n) {
-    std::uint8_t status = 0;
-    if (LookUpStatus(n, DatabaseError::UnLockInvalidRecord, DatabaseError::UnLockFailed, &status) != 0)
-        return -1;
-    if (status == RecordStatus::Deleted)
-        return Fail(DatabaseError::UnLockDeleted);
-    if (status != RecordStatus::Locked)
-        return Fail(DatabaseError::UnLockNotLocked);
-    if (WriteStatus(n, RecordStatus::Active) != 0)
-        return Fail(DatabaseError::UnLockFailed);
-    currentRecord_ = static_cast<std::int32_t>(n);
-    return 0;
-}
-
 int DATABASE::SetReadCache(int kilobytes) {
     return cache_.Resize(kilobytes) ? 0 : Fail(DatabaseError::CacheNoMemory);
-}
-
-long DATABASE::GetNumberOfActiveRecords() const {
-    return static_cast<long>(header_.recordCount) - header_.deletedCount;
 }
 
 int DATABASE::GetLastError(char* message) {

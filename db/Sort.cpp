@@ -32,7 +32,7 @@ int DATABASE::ReadSortKeys(SortKeys* keys) {
             keys->Add(i, slots_[i]);
     if (sorted_)
         keys->OrderByRecord();
-    for (SortKeys::ENTRY& entry : keys->Entries()) {
+    for (SortKeys::Entry& entry : keys->Entries()) {
         const std::int32_t number = slots_[entry.slot];
         if (!reader->Holds(number) && reader->Fill(file_, Area(), number) != 0)
             return DatabaseError::SortReadFailed;
@@ -48,12 +48,12 @@ int DATABASE::ReadSortKeys(SortKeys* keys) {
 // Puts the records into the slots that the set uses, in the order of their keys; those that are gone leave
 // it.
 void DATABASE::TakeSortOrder(const SortKeys& keys) {
-    for (const SortKeys::ENTRY& gone : keys.Gone()) {
+    for (const SortKeys::Entry& gone : keys.Gone()) {
         slots_[gone.slot] = NotInSet;
         --resultCount_;
     }
-    const std::span<SortKeys::ENTRY> sorted = keys.Sorted();
-    for (SortKeys::ENTRY& entry : sorted)
+    const std::span<SortKeys::Entry> sorted = keys.Sorted();
+    for (SortKeys::Entry& entry : sorted)
         entry.word = static_cast<std::uint32_t>(slots_[entry.slot]); // the record, before its slot is taken
     auto entry = sorted.begin();
     for (std::int32_t i = 0; i < slotCount_; ++i)

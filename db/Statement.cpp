@@ -35,7 +35,7 @@ std::array<std::int32_t, 3> DigitGroups(const char* digits, std::array<int, 3> w
 
 } // namespace
 
-bool SplitStatement(const char* statement, STATEMENT* result) {
+bool SplitStatement(const char* statement, Statement* result) {
     if (statement == nullptr)
         return false;
     std::string_view rest(statement, strnlen(statement, LongestStatement + 1));

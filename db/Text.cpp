@@ -1,6 +1,6 @@
 #include <algorithm>
 
-#include "db/Allocate.h"
+#include "db/Bytes.h"
 #include "db/Database.h"
 #include "db/RecordText.h"
 #include "db/TextFile.h"
@@ -16,31 +16,26 @@ std::string_view TextOrNone(const char* text) {
 } // namespace
 
 // What Export writes, record by record.
-struct DATABASE::EXPORT {
+struct DATABASE::Exporting {
     const RecordText& text;
     TextWriter& writer;
     std::string_view separator;
     long lines = 0;
 
-    // Both are false when the text file could not be written.
-    [[nodiscard]] bool WriteHeading() {
-        char* line = writer.Room();
-        if (line != nullptr)
-            writer.Take(text.FormatHeading(separator, line));
-        return line != nullptr;
-    }
+    // A record's line, or the heading without data. False when the text file could not be written.
     [[nodiscard]] bool Write(const std::uint8_t* data) {
         char* line = writer.Room();
-        if (line != nullptr) {
-            writer.Take(text.Format(data, separator, line));
-            ++lines;
-        }
-        return line != nullptr;
+        if (line == nullptr)
+            return false;
+        writer.Take(data != nullptr ? text.Format(data, separator, line)
+                                    : text.FormatHeading(separator, line));
+        lines += data != nullptr ? 1 : 0;
+        return true;
     }
 };
 
 // What Load reads, line by line.
-struct DATABASE::LOAD {
+struct DATABASE::Loading {
     const RecordText& text;
     LineReader& reader;
     FieldSplitter& fields;
@@ -67,7 +62,7 @@ long DATABASE::Export(const char* path, int all, const char* separator) {
     const RecordText text = Text(byteOutputFormat_);
     File file(operations_);
     TextWriter writer(file);
-    EXPORT work{text, writer, TextOrNone(separator)};
+    Exporting work{text, writer, TextOrNone(separator)};
     if (!writer.Prepare(text.LongestLine(work.separator.size())))
         return Fail(DatabaseError::ExportNoMemoryForLine);
     // The file's old text goes when nothing but reading and writing can fail any more.
@@ -76,7 +71,7 @@ long DATABASE::Export(const char* path, int all, const char* separator) {
     if (!OpenForExport(path, &file))
         return Fail(DatabaseError::ExportOpenFailed);
     int code = DatabaseError::ExportWriteFailed;
-    if (!headingLine_ || work.WriteHeading())
+    if (!headingLine_ || work.Write(nullptr))
         code = all != 0 ? ExportAll(work) : ExportResultSet(work);
     if (code == DatabaseError::None && writer.Flush() != 0)
         code = DatabaseError::ExportWriteFailed;
@@ -89,7 +84,7 @@ bool DATABASE::OpenForExport(const char* path, File* file) const {
            file->Truncate(0) == 0;
 }
 
-int DATABASE::ExportAll(EXPORT& work) {
+int DATABASE::ExportAll(Exporting& work) {
     ReadCache own;
     ReadCache* reader = ScanCache(&own);
     if (reader == nullptr)
@@ -104,7 +99,7 @@ int DATABASE::ExportAll(EXPORT& work) {
     return DatabaseError::None;
 }
 
-int DATABASE::ExportResultSet(EXPORT& work) {
+int DATABASE::ExportResultSet(Exporting& work) {
     bool found = false;
     for (long start = 0;; start = -1) {
         if (MoveWalk(start, 1, &found) != DatabaseError::None)
@@ -142,7 +137,7 @@ long DATABASE::Load(const char* path, const char* separators) {
         return Fail(DatabaseError::LoadNoMemoryForRecord);
     std::fill_n(batch.get(), static_cast<std::size_t>(batchRecords) * DataSize(), std::uint8_t{0});
     FieldSplitter fields(separators);
-    LOAD work{text, reader, fields, batch.get(), batchRecords};
+    Loading work{text, reader, fields, batch.get(), batchRecords};
     int code = CheckFirstLine(work);
     if (code == DatabaseError::None)
         code = LoadLines(work);
@@ -150,14 +145,14 @@ long DATABASE::Load(const char* path, const char* separators) {
 }
 
 // Goes to the first line of a record. False when the text cannot be read.
-bool DATABASE::BeginLines(LOAD& work) const {
+bool DATABASE::BeginLines(Loading& work) const {
     work.reader.Rewind();
     std::span<char> heading;
     return !headingLine_ || work.reader.Next(&heading) == 0;
 }
 
 // The first line that is not blank must have as many fields as there are columns.
-int DATABASE::CheckFirstLine(LOAD& work) const {
+int DATABASE::CheckFirstLine(Loading& work) const {
     if (!BeginLines(work))
         return DatabaseError::LoadReadFailed;
     for (;;) {
@@ -174,7 +169,7 @@ int DATABASE::CheckFirstLine(LOAD& work) const {
     }
 }
 
-int DATABASE::LoadLines(LOAD& work) {
+int DATABASE::LoadLines(Loading& work) {
     if (!BeginLines(work))
         return DatabaseError::LoadReadFailed;
     std::int32_t waiting = 0; // records in the batch

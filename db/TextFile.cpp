@@ -4,7 +4,7 @@
 #include <cstring>
 #include <string_view>
 
-#include "db/Allocate.h"
+#include "db/Bytes.h"
 
 namespace {
 constexpr std::size_t BlockSize = 256 * 1024;

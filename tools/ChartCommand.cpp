@@ -64,7 +64,7 @@ int Write(const std::string& path, const std::string& bytes) {
     if (error == 0)
         error = WriteWholeFile(target, target + ".part" + std::to_string(getpid()), bytes, 0666 & ~mask,
                                ExistingFile::Replace);
-    return error == 0 ? 0 : Fail(path + " cannot be written: " + std::strerror(error));
+    return error == 0 ? 0 : Fail(path + " cannot be written: " + Reason(error));
 }
 
 int DrawChart(const ChartOptions& options, const ChartInfo& chart, PictureFormat format,

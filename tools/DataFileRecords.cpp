@@ -76,7 +76,7 @@ int DataFileTool::PrintSet() {
 int DataFileTool::Set(const std::string& statement, const Selection& selection) {
     if (!Open(Access::Change))
         return 1;
-    STATEMENT parts{};
+    Statement parts{};
     if (SplitStatement(statement.c_str(), &parts) && std::strcmp(parts.op, "=") == 0) {
         for (const COLUMN_ENTRY& column : AllColumns())
             if (std::string_view(column.name) == parts.column)

@@ -5,14 +5,14 @@
 #include <cstring>
 #include <filesystem>
 #include <ostream>
-#include <system_error>
 
 #include "app/model/DailyBackup.h"
 #include "app/model/DataFolders.h"
-#include "db/Compaction.h"
+#include "db/Database.h"
 #include "db/FileCheck.h"
 #include "tools/RecordFields.h"
 #include "tools/Sentences.h"
+#include "util/Strings.h"
 
 DataFileTool::DataFileTool(std::string file, OutputFormat format, TextOutput& output, std::ostream& errors,
                            FileOperations& operations)
@@ -51,7 +51,7 @@ const char* DataFileTool::Hint(int code) {
 int DataFileTool::FailWithCode(int code, const std::string& about) {
     const int reason = IsFileFailure(code) ? errno : 0;
     return Fail(about + std::to_string(code) + " " + ErrorMessage(code) +
-                (reason != 0 ? " (" + std::generic_category().message(reason) + ")" : "") + Hint(code));
+                (reason != 0 ? " (" + Reason(reason) + ")" : "") + Hint(code));
 }
 
 bool DataFileTool::IsFileFailure(int code) {
@@ -84,9 +84,7 @@ bool DataFileTool::TakeFolders() {
         const bool failed = outcome == FolderLock::Outcome::Failed && lock.Error() != ENOENT;
         if (failed)
             Warn("other programs cannot be kept out of the folder: " + folder + "/" + FolderLock::FileName +
-                 (lock.Error() == EINVAL
-                      ? " is in the way"
-                      : " cannot be made: " + std::generic_category().message(lock.Error())));
+                 (lock.Error() == EINVAL ? " is in the way" : " cannot be made: " + Reason(lock.Error())));
         return use.empty() && !failed;
     };
     return ::TakeFolders(locks_, FolderOf(real), DailyBackup::FilesKeptWith(real.filename()), ToolName,
@@ -98,7 +96,7 @@ bool DataFileTool::KeepBackup() {
     const int error = DailyBackup(FolderOf(real), DailyBackup::FilesKeptWith(real.filename())).Keep();
     if (error != 0)
         Warn(std::string("the day's backup cannot be made in the folder ") + DailyBackup::FolderName +
-             " beside it: " + std::generic_category().message(error) + "; nothing is changed");
+             " beside it: " + Reason(error) + "; nothing is changed");
     errno = 0;
     return error == 0;
 }
@@ -136,7 +134,7 @@ std::string DataFileTool::WhyNotOpened() const {
     if (error == EINVAL)
         return "this is no regular file";
     if (error != 0)
-        return std::generic_category().message(error);
+        return Reason(error);
     return file_.size() >= PathBufferSize ? "the path is longer than 127 bytes" : "there is no memory for it";
 }
 
@@ -164,8 +162,7 @@ int DataFileTool::Finish(int status) {
     const int error = output_.Flush();
     if (error == 0 || error == EPIPE)
         return status;
-    errors_ << "quorvan-cli: the output cannot be written: " << std::generic_category().message(error)
-            << '\n';
+    errors_ << "quorvan-cli: the output cannot be written: " << Reason(error) << '\n';
     return 1;
 }
 

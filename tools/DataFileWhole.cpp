@@ -1,12 +1,12 @@
 // What DataFileTool does with whole files: text files, compaction, new files, the check.
 #include <cerrno>
-#include <system_error>
 
-#include "db/Compaction.h"
+#include "db/Database.h"
 #include "db/FileCheck.h"
 #include "tools/DataFileTool.h"
 #include "tools/RecordFields.h"
 #include "tools/Sentences.h"
+#include "util/Strings.h"
 
 namespace {
 
@@ -116,16 +116,15 @@ bool DataFileTool::RestoreLeftover() {
     if (leftover.empty())
         return true;
     if (const int restored = RestoreCompactionBackup(file_.c_str(), operations_); restored != 0) {
-        Warn(restored > 0
-                 ? "the backup of an interrupted compaction was given back its name"
-                 : leftover + " cannot be given back its name: " + std::generic_category().message(errno));
+        Warn(restored > 0 ? "the backup of an interrupted compaction was given back its name"
+                          : leftover + " cannot be given back its name: " + Reason(errno));
         return restored > 0;
     }
     // Without a backup there is nothing better than the other file, which may have been written in part only.
     const int error = RenameFile(operations_, leftover, FollowLinks(file_));
     Warn(leftover + (error == 0
                          ? ", of an interrupted compaction, was given the file's name; it may lack records"
-                         : " cannot be given the file's name: " + std::generic_category().message(error)));
+                         : " cannot be given the file's name: " + Reason(error)));
     return error == 0;
 }
 
@@ -134,12 +133,12 @@ int DataFileTool::Check(bool repair) {
         return 1;
     FileCheck check;
     if (const int error = check.Run(file_); error != 0)
-        return Fail(error == ENOENT ? WhyNotOpened() : std::generic_category().message(error));
+        return Fail(error == ENOENT ? WhyNotOpened() : Reason(error));
     if (repair && check.CanRepair()) {
         PrintFindings(check);
         std::string backup;
         if (const int error = check.Repair(file_, &backup); error != 0)
-            return Fail("the counts cannot be mended: " + std::generic_category().message(error));
+            return Fail("the counts cannot be mended: " + Reason(error));
         Warn("the counts are mended; the file as it was is " + backup);
         return check.IsSound() ? 0 : Fail("what is no count is left as it is");
     }
@@ -153,7 +152,7 @@ void DataFileTool::PrintFindings(const FileCheck& check) {
         return;
     }
     std::vector<std::vector<Cell>> rows;
-    for (const FILE_FINDING& finding : check.Findings())
+    for (const FileFinding& finding : check.Findings())
         rows.push_back({TextCell(finding.problem ? "problem" : "remark"), NumberCell(finding.offset),
                         finding.record >= 0 ? NumberCell(finding.record) : Cell(), TextCell(finding.text)});
     Print({"kind", "offset", "record", "finding"}, rows);

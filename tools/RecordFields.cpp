@@ -1,29 +1,25 @@
 #include "tools/RecordFields.h"
 
 #include <algorithm>
-#include <array>
-#include <bit>
 #include <charconv>
 #include <cmath>
-#include <cstring>
-#include <iterator>
 #include <limits>
 #include <optional>
 #include <type_traits>
 #include <vector>
 
-#include "db/DatesTimes.h"
-#include "db/LittleEndian.h"
-#include "db/Statement.h"
+#include "db/FieldValue.h"
 #include "util/CharacterBuffer.h"
 #include "util/Dates.h"
 
 namespace {
 
-constexpr std::array<const char*, 7> TypeNames = {"string", "byte", "short", "long", "float", "date", "time"};
-constexpr std::array<int, 7> TypeBytes = {1, 1, 2, 4, 4, 4, 3}; // that a value takes
+constexpr std::string_view Unknown = "unknown";
 constexpr std::size_t DateDigits = 8;
 constexpr std::size_t TimeDigits = 6;
+
+template <class Field>
+constexpr bool IsWhole = std::is_base_of_v<WholeField<typename Field::Value>, Field>;
 
 std::size_t WidthOf(const COLUMN_ENTRY& column) {
     return static_cast<std::size_t>(column.size);
@@ -68,24 +64,38 @@ std::optional<std::int32_t> PackedTimeIn(std::string_view text) {
     return PackedTime(std::string(text).c_str());
 }
 
-template <class Whole>
-std::string StoreWhole(const COLUMN_ENTRY& column, std::string_view text, std::uint8_t* field) {
-    using Bits = std::make_unsigned_t<Whole>;
-    const std::optional<Whole> number = NumberIn<Whole>(text);
-    if (number)
-        StoreLittleEndian(field, static_cast<Bits>(*number), WidthOf(column));
-    if (!number || static_cast<Whole>(LoadLittleEndian<Bits>(field, WidthOf(column))) != *number)
-        return "is no whole number from " + std::to_string(std::numeric_limits<Whole>::min()) + " to " +
-               std::to_string(std::numeric_limits<Whole>::max());
-    return {};
+template <class Field>
+std::optional<typename Field::Value> ValueIn(std::string_view text) {
+    if constexpr (std::is_same_v<Field, DateField>)
+        return PackedDateIn(text);
+    else if constexpr (std::is_same_v<Field, TimeField>)
+        return PackedTimeIn(text);
+    else
+        return NumberIn<typename Field::Value>(text);
 }
 
-std::string StorePacked(const COLUMN_ENTRY& column, std::optional<std::int32_t> packed, std::size_t bytes,
-                        std::uint8_t* field) {
-    if (!packed)
-        return column.type == ColumnType::Date ? "is no date of the form YYYYMMDD"
-                                               : "is no time of the form HHMMSS";
-    StoreLittleEndian(field, static_cast<std::uint32_t>(*packed), std::min(bytes, WidthOf(column)));
+template <class Field>
+std::string WhatItIsNot() {
+    using Value = typename Field::Value;
+    if constexpr (std::is_same_v<Field, DateField>)
+        return "is no date of the form YYYYMMDD";
+    else if constexpr (std::is_same_v<Field, TimeField>)
+        return "is no time of the form HHMMSS";
+    else if constexpr (std::is_same_v<Field, FloatField>)
+        return "is no number, or too large or too small for a float";
+    else
+        return "is no whole number from " + std::to_string(std::numeric_limits<Value>::min()) + " to " +
+               std::to_string(std::numeric_limits<Value>::max());
+}
+
+// A whole number must fit a column narrower than its type, too.
+template <class Field>
+std::string StoreValue(const COLUMN_ENTRY& column, std::string_view text, std::uint8_t* field) {
+    const std::optional<typename Field::Value> value = ValueIn<Field>(text);
+    if (value)
+        Field::Store(field, WidthOf(column), *value);
+    if (!value || (IsWhole<Field> && Field::Load(field, WidthOf(column)) != *value))
+        return WhatItIsNot<Field>();
     return {};
 }
 
@@ -96,14 +106,6 @@ std::string StoreText(const COLUMN_ENTRY& column, std::string_view text, std::ui
     if (text.find('\0') != text.npos)
         return "has a byte 0 in it, where it would end";
     std::copy(text.begin(), text.end(), field);
-    return {};
-}
-
-std::string StoreFloat(const COLUMN_ENTRY& column, std::string_view text, std::uint8_t* field) {
-    const std::optional<float> number = NumberIn<float>(text);
-    if (!number)
-        return "is no number, or too large or too small for a float";
-    StoreLittleEndian(field, std::bit_cast<std::uint32_t>(*number), WidthOf(column));
     return {};
 }
 
@@ -118,7 +120,8 @@ std::vector<std::string_view> SplitAtColons(std::string_view text) {
 }
 
 std::string ReadWidth(std::string_view text, COLUMN_ENTRY* column) {
-    const int least = TypeBytes[static_cast<std::uint8_t>(column->type)];
+    int least = 1;
+    VisitField(column->type, [&least]<class Field>(Field) { least = static_cast<int>(Field::Bytes); });
     const std::optional<std::int16_t> width = NumberIn<std::int16_t>(text);
     if (!width || *width < least)
         return std::string("a ") + ColumnTypeName(column->type) + "'s width is a number of bytes from " +
@@ -138,72 +141,37 @@ std::string ReadDecimals(std::string_view text, COLUMN_ENTRY* column) {
 } // namespace
 
 const char* ColumnTypeName(std::int8_t type) {
-    const auto code = static_cast<std::uint8_t>(type);
-    return code < TypeNames.size() ? TypeNames[code] : "unknown";
+    const char* name = type == ColumnType::String ? "string" : Unknown.data();
+    VisitField(type, [&name]<class Field>(Field) { name = Field::Name; });
+    return name;
 }
 
 void FillCell(const COLUMN_ENTRY& column, const std::uint8_t* data, Cell* cell) {
     const std::uint8_t* field = data + column.offset;
-    const std::size_t width = WidthOf(column);
-    const auto bits = [field, width](std::size_t most) {
-        return LoadLittleEndian<std::uint32_t>(field, std::min(width, most));
-    };
-    char text[32];
-    switch (column.type) {
-    case ColumnType::String:
-        cell->SetText(
-            {reinterpret_cast<const char*>(field), strnlen(reinterpret_cast<const char*>(field), width)});
-        break;
-    case ColumnType::Byte:
-        cell->SetNumber(static_cast<std::int8_t>(bits(1)));
-        break;
-    case ColumnType::Short:
-        cell->SetNumber(static_cast<std::int16_t>(bits(2)));
-        break;
-    case ColumnType::Long:
-        cell->SetNumber(static_cast<std::int32_t>(bits(4)));
-        break;
-    case ColumnType::Float:
-        cell->SetFloat(std::bit_cast<float>(bits(4)), column.format & DecimalsMask);
-        break;
-    case ColumnType::Date: {
-        const dbDATE date = UnpackDate(static_cast<std::int32_t>(bits(4)));
-        FormatInto(text, sizeof(text), "%04d%02d%02d", date.year, date.month, date.day);
-        cell->SetText(text);
-        break;
-    }
-    case ColumnType::Time: {
-        const dbTIME time = UnpackTime(static_cast<std::int32_t>(bits(3)));
-        FormatInto(text, sizeof(text), "%02d%02d%02d", time.hour, time.minute, time.second);
-        cell->SetText(text);
-        break;
-    }
-    default:
-        cell->kind = Cell::Kind::Nothing;
-    }
+    cell->kind = Cell::Kind::Nothing;
+    if (column.type == ColumnType::String)
+        cell->SetText(TextIn(field, WidthOf(column)));
+    VisitField(column.type, [&]<class Field>(Field) {
+        const auto value = Field::Load(field, WidthOf(column));
+        char text[Field::LongestText];
+        if constexpr (std::is_same_v<Field, FloatField>)
+            cell->SetFloat(value, column.format & DecimalsMask);
+        else if constexpr (IsWhole<Field>)
+            cell->SetNumber(value);
+        else
+            cell->SetText({text, static_cast<std::size_t>(Field::Put(value, 0, text) - text)});
+    });
 }
 
 std::string StoreField(const COLUMN_ENTRY& column, std::string_view text, std::uint8_t* data) {
     std::uint8_t* field = data + column.offset;
-    switch (column.type) {
-    case ColumnType::String:
+    if (column.type == ColumnType::String)
         return StoreText(column, text, field);
-    case ColumnType::Byte:
-        return StoreWhole<std::int8_t>(column, text, field);
-    case ColumnType::Short:
-        return StoreWhole<std::int16_t>(column, text, field);
-    case ColumnType::Long:
-        return StoreWhole<std::int32_t>(column, text, field);
-    case ColumnType::Float:
-        return StoreFloat(column, text, field);
-    case ColumnType::Date:
-        return text.empty() || text == "00000000" ? std::string()
-                                                  : StorePacked(column, PackedDateIn(text), 4, field);
-    case ColumnType::Time:
-        return StorePacked(column, PackedTimeIn(text), 3, field);
-    default:
-        return "cannot be stored: the column's type is unknown";
-    }
+    if (column.type == ColumnType::Date && (text.empty() || text == "00000000"))
+        return {};
+    std::string wrong = "cannot be stored: the column's type is unknown";
+    VisitField(column.type, [&]<class Field>(Field) { wrong = StoreValue<Field>(column, text, field); });
+    return wrong;
 }
 
 std::string ParseColumn(std::string_view text, COLUMN_ENTRY* column) {
@@ -214,11 +182,11 @@ std::string ParseColumn(std::string_view text, COLUMN_ENTRY* column) {
     if (parts[0].empty() || parts[0].find_first_of(" \t\r\n") != parts[0].npos ||
         !CopyTextZeroed(column->name, parts[0]))
         return "a column's name has 1 to 31 bytes without blanks, unlike '" + std::string(parts[0]) + "'";
-    const auto* const type = std::find(TypeNames.begin(), TypeNames.end(), parts[1]);
-    if (type == TypeNames.end())
+    while (ColumnTypeName(column->type) != parts[1] && ColumnTypeName(column->type) != Unknown)
+        ++column->type;
+    if (ColumnTypeName(column->type) == Unknown)
         return std::string("'").append(parts[1]).append(
             "' is none of the types string, byte, short, long, float, date, time");
-    column->type = static_cast<std::int8_t>(type - TypeNames.begin());
     column->size = -1;
     const bool hasWidth = parts.size() > 2 && !parts[2].empty();
     if (!hasWidth && column->type == ColumnType::String)

@@ -9,6 +9,7 @@
 #include "platform/PrintJob.h"
 #include "print/Report.h"
 #include "tools/Commands.h"
+#include "util/Strings.h"
 
 namespace {
 
@@ -39,9 +40,8 @@ int RunReport(ReportOptions& options) {
     const ReportResult result = WriteReport(options, *investments, error);
     if (result == ReportResult::NotRead)
         return Fail("the investments in " + options.home + " could not all be read");
-    return result == ReportResult::Printed
-               ? 0
-               : Fail(options.output + " cannot be written: " + std::strerror(error));
+    return result == ReportResult::Printed ? 0
+                                           : Fail(options.output + " cannot be written: " + Reason(error));
 }
 
 } // namespace

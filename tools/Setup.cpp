@@ -13,22 +13,18 @@
 
 #include "app/model/DataFolders.h"
 #include "app/model/RecordLayouts.h"
-#include "db/Compaction.h"
 #include "db/Database.h"
 #include "tools/DesktopFiles.h"
 #include "tools/FirstFiles.h"
 #include "tools/Sentences.h"
 #include "util/File.h"
+#include "util/Strings.h"
 
 namespace {
 
 namespace fs = std::filesystem;
 
 constexpr std::size_t MaxProgramSize = std::size_t{1} << 30U;
-
-std::string Reason(int error) {
-    return std::generic_category().message(error);
-}
 
 // What is made here is the person's alone, whatever the mask: it tells what the person owns.
 constexpr mode_t PrivateFile = 0600;

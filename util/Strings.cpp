@@ -1,5 +1,7 @@
 #include "util/Strings.h"
 
+#include <system_error>
+
 namespace {
 
 bool IsAscii(char c) {
@@ -44,4 +46,8 @@ std::string Lowered(std::string_view text) {
 
 int strcmpi(const char* a, const char* b) {
     return Lowered(a).compare(Lowered(b));
+}
+
+std::string Reason(int error) {
+    return std::generic_category().message(error);
 }

@@ -74,3 +74,6 @@ void strupr(char* text);
     text.remove_prefix(std::min(end + 1, text.size()));
     return token;
 }
+
+// What the system says of an errno number.
+[[nodiscard]] std::string Reason(int error);

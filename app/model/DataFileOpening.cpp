@@ -2,15 +2,11 @@
 
 #include <cerrno>
 #include <fcntl.h>
-#include <system_error>
 
-#include "db/Compaction.h"
+#include "db/Database.h"
+#include "util/Strings.h"
 
 namespace {
-
-std::string Reason(int error) {
-    return std::generic_category().message(error);
-}
 
 std::string WhyNotOpened(const std::string& folder, const std::string& name, FileOperations& operations) {
     const std::string path = folder + "/" + name;

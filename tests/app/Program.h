@@ -20,12 +20,6 @@
 
 using Texts = std::vector<std::string>;
 
-inline dbDATE Today() {
-    dbDATE date{};
-    DATABASE(nullptr).SetToCurrentDate(&date);
-    return date;
-}
-
 // The program in a folder of the test's own: fill the folder, give the driver its steps, and Run.
 class Program : public DataFolder, public Driver {
   public:

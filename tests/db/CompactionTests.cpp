@@ -3,7 +3,7 @@
 
 #include "FaultyFiles.h"
 #include "SampleFile.h"
-#include "db/Compaction.h"
+#include "db/Database.h"
 
 namespace {
 
@@ -33,7 +33,7 @@ TEST_F(CompactionTest, DropsDeletedRecordsAndLocks) {
     bytes.replace(36, 8, std::string("\x27\x23\0\0\0\0\0\0", 8)); // the counts
     bytes[DataStartOfRows + RowLength] = RecordStatus::Active;
     EXPECT_TRUE(folder_.Read("rows.db") == bytes);
-    EXPECT_EQ(files_.Order(), "x" + std::string(18, 'w') + "ssxrrsx") << "on the disk before the swap";
+    EXPECT_EQ(files_.Order(), "x" + std::string(6, 'w') + "ssxrrsx") << "on the disk before the swap";
     folder_.Write("precious", "untouched");
     std::filesystem::create_symlink("precious", folder_.File("rows.new"));
     EXPECT_EQ(database.Compress(0), 0);
@@ -60,7 +60,7 @@ TEST_F(CompactionTest, KeepsOwnerAndPermissions) {
 // What each failing step leaves on disk. Whatever it is, the object goes on working with complete data.
 TEST_F(CompactionTest, OutcomesOfFailingSteps) {
     const struct {
-        int call; // 0 removes a leftover, then open, header and 7 columns, records, header and columns, mode,
+        int call; // 0 removes a leftover, then open, header, columns, records, header and columns, mode,
                   // sync, sync of the folder, remove, rename, rename, sync of the folder, remove
         int error;
         int code;
@@ -69,22 +69,22 @@ TEST_F(CompactionTest, OutcomesOfFailingSteps) {
     } cases[] = {
         {1, EACCES, 2705, {"rows.db"}, 3},
         {2, ENOSPC, 2706, {"rows.db"}, 3},
-        {20, EIO, 2706, {"rows.db"}, 3},
-        {21, EIO, 2706, {"rows.db"}, 3},
-        {22, EACCES, 2704, {"rows.bak", "rows.db", "rows.new"}, 3},
-        {22, EPERM, 2704, {"rows.bak", "rows.db", "rows.new"}, 3},
-        {22, ENOENT, 0, {"rows.db"}, 2},
-        {23, EACCES, 2702, {"rows.db", "rows.new"}, 3},
-        {24, EIO, 2703, {"rows.bak", "rows.new"}, 3},
-        {25, EIO, 0, {"rows.bak", "rows.db"}, 2},
-        {26, EACCES, 2704, {"rows.bak", "rows.db"}, 2},
-        {26, EIO, 0, {"rows.bak", "rows.db"}, 2},
+        {8, EIO, 2706, {"rows.db"}, 3},
+        {9, EIO, 2706, {"rows.db"}, 3},
+        {10, EACCES, 2704, {"rows.bak", "rows.db", "rows.new"}, 3},
+        {10, EPERM, 2704, {"rows.bak", "rows.db", "rows.new"}, 3},
+        {10, ENOENT, 0, {"rows.db"}, 2},
+        {11, EACCES, 2702, {"rows.db", "rows.new"}, 3},
+        {12, EIO, 2703, {"rows.bak", "rows.new"}, 3},
+        {13, EIO, 0, {"rows.bak", "rows.db"}, 2},
+        {14, EACCES, 2704, {"rows.bak", "rows.db"}, 2},
+        {14, EIO, 0, {"rows.bak", "rows.db"}, 2},
     };
     for (const auto& failure : cases) {
         SCOPED_TRACE("call " + std::to_string(failure.call) + " error " + std::to_string(failure.error));
         folder_.Clear();
         MakeRows(path_, 3);
-        if (failure.call == 22)
+        if (failure.call == 10)
             folder_.Write("rows.bak", "left over");
         DATABASE database(path_.c_str(), files_);
         files_.Arm(Fault::Error, failure.call, failure.error);
@@ -107,10 +107,6 @@ TEST_F(CompactionTest, WorksOnTheTargetOfALink) {
     ASSERT_EQ(std::make_unique<DATABASE>(path_.c_str())->Compress(0), 0);
     EXPECT_TRUE(std::filesystem::is_symlink(path_));
     EXPECT_FALSE(folder_.Has("home/rows.bak") || folder_.Has("home/rows.new"));
-    std::filesystem::rename(folder_.File("home/rows.db"), folder_.File("home/rows.bak"));
-    EXPECT_EQ(RestoreCompactionBackup(path_.c_str()), 1);
-    DATABASE database(path_.c_str());
-    EXPECT_EQ(ContentOf(database).size(), 2U);
 }
 
 TEST_F(CompactionTest, RefusesWhereItWouldLoseData) {
@@ -134,7 +130,6 @@ TEST_F(CompactionTest, RefusesWhereItWouldLoseData) {
 }
 
 TEST_F(CompactionTest, BackupIsRestoredOnlyInPlaceOfNothing) {
-    EXPECT_EQ(RestoreCompactionBackup(path_.c_str()), 0);
     folder_.Write("rows.bak", "older");
     EXPECT_EQ(RestoreCompactionBackup(path_.c_str()), 0);
     EXPECT_EQ(folder_.Read("rows.bak"), "older");
@@ -142,7 +137,6 @@ TEST_F(CompactionTest, BackupIsRestoredOnlyInPlaceOfNothing) {
     EXPECT_EQ(RestoreCompactionBackup(path_.c_str()), 1);
     EXPECT_EQ(folder_.Names(), Names{"rows.db"});
     EXPECT_EQ(RestoreCompactionBackup(folder_.File("nowhere/rows.db").c_str()), 0);
-    EXPECT_EQ(FollowLinks(folder_.File("nowhere/rows.db")), "");
     EXPECT_EQ(RestoreCompactionBackup(nullptr), 0);
     std::filesystem::rename(path_, folder_.File("rows.bak"));
     files_.Arm(Fault::Error, 0, EACCES);

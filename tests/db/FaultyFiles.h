@@ -19,8 +19,7 @@ enum class Fault {
     Error,         // the call does nothing and fails
     HalfThenError, // a write takes half of its bytes, then fails
     ShortWrite,    // a write takes half of its bytes and says so
-    Twice,         // half, then an error, and the next call fails as well
-    Broken,        // the same, and every later call fails
+    Broken,        // half, then an error, and every later call fails
     Interrupted,   // the call is to be made again
     NoRead,        // a read fails; the reads are counted and nothing else
     NoReads,       // the same, and every later read fails
@@ -120,7 +119,7 @@ class FaultyFiles : public FileOperations {
     auto Meet(const Call& call, char letter = 0) -> decltype(call()) {
         order_ += letter == 0 ? "" : std::string(1, letter);
         const int after = IsOfReads() ? -1 : calls_++ - at_;
-        const int met = fault_ == Fault::Broken ? INT_MAX : fault_ == Fault::Twice ? 1 : 0;
+        const int met = fault_ == Fault::Broken ? INT_MAX : 0;
         if (at_ < 0 || after < 0 || after > met)
             return call();
         if (fault_ == Fault::KilledAfter)
