@@ -174,10 +174,13 @@ void LookAtKernelState(const std::function<void()>& look) {
     look();
 }
 
-InterfaceLock::InterfaceLock(BLooper* looper) : looper_(looper), held_(!looper || looper->Lock()) {}
+InterfaceLock::InterfaceLock(BLooper* looper) : looper_(looper) {
+    if (looper_)
+        looper_->Lock();
+}
 
 InterfaceLock::~InterfaceLock() {
-    if (looper_ && held_)
+    if (looper_)
         looper_->Unlock();
 }
 

@@ -30,19 +30,16 @@ void ChangeKernelState(const std::function<void()>& change);
 // Runs look with the kernel's lock held.
 void LookAtKernelState(const std::function<void()>& look);
 
-// Holds a looper's lock for a paint pass or an event. A null looper counts as held, one that is gone does
-// not.
+// Holds a looper's lock for a paint pass or an event; null for none.
 class InterfaceLock {
   public:
     explicit InterfaceLock(BLooper* looper);
     ~InterfaceLock();
     InterfaceLock(const InterfaceLock&) = delete;
     InterfaceLock& operator=(const InterfaceLock&) = delete;
-    [[nodiscard]] bool IsHeld() const { return held_; }
 
   private:
     BLooper* looper_;
-    bool held_;
 };
 
 // Makes message the looper's current one while it lives, for hooks that are called straight from an event.

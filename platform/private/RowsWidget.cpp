@@ -7,7 +7,6 @@
 #include <QMouseEvent>
 #include <QPainter>
 #include <QScrollBar>
-#include <QTimer>
 
 #include "platform/private/Convert.h"
 #include "platform/private/ListPeer.h"
@@ -15,8 +14,6 @@
 #include "platform/private/ViewWidget.h"
 
 namespace {
-
-constexpr int RetryMilliseconds = 5;
 
 class RowDelegate : public QAbstractItemDelegate {
     Q_DISABLE_COPY_MOVE(RowDelegate)
@@ -157,10 +154,7 @@ void RowsWidget::paintEvent(QPaintEvent* event) {
     peer_->selection.Attach();
     QPainter(viewport()).fillRect(event->rect(), ToQt(owner_->ViewColor()));
     const InterfaceLock lock(owner_->Looper());
-    if (lock.IsHeld())
-        QListView::paintEvent(event);
-    else
-        QTimer::singleShot(RetryMilliseconds, viewport(), [this] { viewport()->update(); });
+    QListView::paintEvent(event);
 }
 
 void RowsWidget::DrawRow(QPainter& painter, int32 index, const QRect& place, bool focus) const {
@@ -214,31 +208,7 @@ QModelIndex RowsWidget::moveCursor(CursorAction action, Qt::KeyboardModifiers mo
 void RowsWidget::Input(QInputEvent* event) {
     if (!peer_)
         return;
-    if (heldBack_.empty()) {
-        const InterfaceLock lock(owner_->Looper());
-        if (lock.IsHeld()) {
-            Handle(event);
-            return;
-        }
-        QTimer::singleShot(RetryMilliseconds, this, [this] { ReplayHeldBack(); });
-    }
-    heldBack_.emplace_back(static_cast<QInputEvent*>(event->clone()));
-}
-
-void RowsWidget::ReplayHeldBack() {
-    const InterfaceLock lock(peer_ ? owner_->Looper() : nullptr);
-    if (!lock.IsHeld()) {
-        QTimer::singleShot(RetryMilliseconds, this, [this] { ReplayHeldBack(); });
-        return;
-    }
-    while (peer_ && !heldBack_.empty()) {
-        const std::unique_ptr<QInputEvent> event = std::move(heldBack_.front());
-        heldBack_.pop_front();
-        Handle(event.get());
-    }
-}
-
-void RowsWidget::Handle(QInputEvent* event) {
+    const InterfaceLock lock(owner_->Looper());
     peer_->selection.Attach();
     if (event->type() == QEvent::KeyPress) {
         HandleKey(static_cast<QKeyEvent*>(event));

@@ -1,7 +1,6 @@
 // The widget of a list view. Only for the layer's own sources.
 #pragma once
 
-#include <deque>
 #include <memory>
 
 #include <QInputEvent>
@@ -64,8 +63,6 @@ class RowsWidget : public QListView {
 
   private:
     void Input(QInputEvent* event);
-    void ReplayHeldBack();
-    void Handle(QInputEvent* event);
     void HandlePress(QMouseEvent* event);
     void HandleKey(QKeyEvent* event);
     void HandleListKey(QKeyEvent* event);
@@ -77,7 +74,6 @@ class RowsWidget : public QListView {
 
     BListView* owner_;
     ListPeer* peer_ = nullptr;
-    std::deque<std::unique_ptr<QInputEvent>> heldBack_;
     QMouseEvent* press_ = nullptr;     // while MouseDown runs
     QPersistentModelIndex pressedRow_; // by the last press that was forwarded
     QPersistentModelIndex focusMark_;  // the row that the toolkit made current as the focus came
