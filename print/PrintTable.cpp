@@ -120,7 +120,7 @@ BRect PRINT_TABLE::TextFrame(int column) const {
     BRect frame(0, rowPosition_, 0, rowPosition_ + fontHeight_);
     static_cast<void>(GetColumnXCoords(column, &frame));
     const bool right = (columns_[column].alignment & DrawTextRight) != 0;
-    frame.left += right ? LineWidth : CellInset;
+    frame.left += right ? 2 * LineWidth : CellInset;
     frame.right -= right ? CellInset : LineWidth + RightSlack;
     return frame;
 }
