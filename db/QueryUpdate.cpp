@@ -42,6 +42,7 @@ int DATABASE::ChangeRecords(const FieldChange& change, long* changed) {
     const auto sorted = TryAllocate<std::int32_t>(sorted_ ? count : 0);
     if (reader == nullptr || !sorted)
         return DatabaseError::SetNoMemory;
+    reader->Reset(); // what is written back must be what the file holds now
     if (sorted_)
         std::partial_sort_copy(&slots_[0], &slots_[count], &sorted[0], &sorted[count]);
     for (const std::int32_t number : std::span(sorted_ ? sorted.get() : slots_.get(), count)) {

@@ -259,12 +259,13 @@ bool BPrintJob::CommitJob() {
     if (!peer_->painter.isActive())
         return false;
     const bool usable = peer_->IsUsable();
-    if (!peer_->painter.end() || !usable) {
+    const bool ended = peer_->painter.end();
+    peer_->printer.setOutputFileName(peer_->wantedFile);
+    if (!ended || !usable) {
         peer_->file.Drop();
         errno = EIO;
         return false;
     }
-    peer_->printer.setOutputFileName(peer_->wantedFile);
     return peer_->file.Commit();
 }
 

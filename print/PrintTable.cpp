@@ -34,6 +34,7 @@ float FontHeightOf(const BView* view) {
 } // namespace
 
 BFont FittingFont(BFont font, const std::string& text, float width, float leastSize) {
+    leastSize = std::min(leastSize, font.Size()); // which may be smaller already
     const float wanted = font.StringWidth(text.c_str());
     if (wanted > width)
         font.SetSize(std::max(font.Size() * width / wanted, leastSize));

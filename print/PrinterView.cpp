@@ -51,6 +51,7 @@ void PrinterView::Draw(BRect page) {
     const BRect place(page.left, page.top + TableTop, page.right, page.bottom - BarHeight);
     BFont least(*be_fixed_font);
     least.SetSize(std::min(least.Size(), LeastTableFont));
+    least = FittingFont(least, std::string(TableCharacters(), 'm'), place.Width(), 1);
     std::vector<Row> rows;
     const long all = ReadRows(PRINT_TABLE::RowsWithin(place.Height(), least), rows);
     DrawTable(place, rows);

@@ -11,8 +11,7 @@
 struct ListPeer;
 
 // The toolkit's list over our rows: it lays out, scrolls and selects; a row draws itself, when visible,
-// through the delegate. Presses go through the view's MouseDown. Input that comes while another thread has
-// the window's lock is held back, in its order, until the lock is free. Belongs to its view's peer.
+// through the delegate. Presses go through the view's MouseDown. Belongs to its view's peer.
 class RowsWidget : public QListView {
     Q_DISABLE_COPY_MOVE(RowsWidget)
 
