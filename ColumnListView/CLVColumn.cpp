@@ -3,8 +3,8 @@
 #include <algorithm>
 
 #include "ColumnListView/ColumnListView.h"
-#include "ColumnListView/LabelText.h"
 #include "platform/View.h"
+#include "util/Utf8.h"
 
 namespace {
 

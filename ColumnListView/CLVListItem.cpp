@@ -1,6 +1,7 @@
 #include "ColumnListView/CLVListItem.h"
 
 #include <algorithm>
+#include <cstring>
 
 #include "ColumnListView/CLVColumn.h"
 #include "ColumnListView/ColumnListView.h"
@@ -49,4 +50,12 @@ void CLVListItem::DrawExpander(BView* owner, BRect frame) {
 void CLVListItem::Update(BView* owner, const BFont* font) {
     BListItem::Update(owner, font);
     SetHeight(std::max(Height(), minHeight_));
+}
+
+char* ToUpperStr(const char* text) {
+    const std::size_t size = std::strlen(text) + 1;
+    char* copy = new char[size];
+    std::transform(text, text + size, copy,
+                   [](char c) { return c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c; });
+    return copy;
 }

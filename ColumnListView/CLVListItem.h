@@ -53,3 +53,7 @@ class CLVListItem : public BListItem {
     bool inSight_ = false; // outline lists: among the visible rows
     int32 fullIndex_ = -1; // outline lists: place in the full list as of the last sort
 };
+
+// A copy of text with the ASCII letters a to z turned to upper case and every other byte unchanged. The copy
+// takes the text's length plus 1 bytes, allocated with new[]; the caller deletes it.
+[[nodiscard]] char* ToUpperStr(const char* text);

@@ -1,5 +1,6 @@
-// Where columns lie: arithmetic without a window. All measures are logical pixels; a column from begin to end
-// covers both edges, so that its width is end minus begin and the next column begins at end plus 1.
+// Where columns lie, and which move together and where to when a header is dragged: arithmetic without a
+// window. All measures are logical pixels; a column from begin to end covers both edges, so that its width is
+// end minus begin and the next column begins at end plus 1.
 #pragma once
 
 #include <vector>
@@ -61,3 +62,30 @@ struct HeaderHit {
 // around it.
 [[nodiscard]] HeaderHit HitHeader(const std::vector<ColumnShape>& shapes, const ColumnLayout& layout,
                                   float x);
+
+// A run of columns in display order that moves as one: a column with CLVF_MOVE_WITH_NEXT and the next.
+// Positions are places in display order; begin, end and lastShown have meaning only when a member is shown.
+struct DragGroup {
+    int32 first = 0;
+    int32 last = 0;
+    int32 lastShown = -1;
+    float begin = 0;
+    float end = 0;
+    bool isShown = false;
+    bool allKeepFirst = true;
+    bool allKeepLast = true;
+    uint32 flags = 0; // the members' fixed-position, keep-first and keep-last flags together
+};
+
+[[nodiscard]] std::vector<DragGroup> BuildDragGroups(const std::vector<ColumnShape>& shapes,
+                                                     const ColumnLayout& layout);
+
+// The index of the group that the column at this display position belongs to; -1 when there is none.
+[[nodiscard]] int32 GroupAt(const std::vector<DragGroup>& groups, int32 position);
+
+// The next shown group that the dragged one changes places with when the pointer is at x; -1 when it stays.
+// Groups without a shown member are passed over.
+[[nodiscard]] int32 GroupToSwapWith(const std::vector<DragGroup>& groups, int32 dragged, float x);
+
+// Moves the dragged group to the other side of target; order is the display order.
+void MoveGroup(const std::vector<DragGroup>& groups, int32 dragged, int32 target, std::vector<int32>& order);

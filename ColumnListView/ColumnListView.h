@@ -6,7 +6,7 @@
 
 #include "ColumnListView/CLVColumn.h"
 #include "ColumnListView/CLVListItem.h"
-#include "ColumnListView/DragGroups.h"
+#include "ColumnListView/ColumnGeometry.h"
 #include "ColumnListView/OutlineRows.h"
 #include "platform/Bitmap.h"
 #include "platform/ListView.h"

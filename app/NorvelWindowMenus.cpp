@@ -11,7 +11,6 @@
 #include "dialogs/PasswordDialogs.h"
 #include "platform/Application.h"
 #include "platform/MenuBar.h"
-#include "platform/Roster.h"
 #include "util/interface/InterfaceHelpers.h"
 
 namespace {

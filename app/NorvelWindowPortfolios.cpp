@@ -13,7 +13,7 @@
 #include "print/Report.h"
 #include "quotes/update/UpdateWindow.h"
 #include "util/CharacterBuffer.h"
-#include "util/DebugLog.h"
+#include "util/File.h"
 #include "util/interface/InterfaceHelpers.h"
 
 void NorvelWindow::LoadPortfolioList() {

@@ -3,8 +3,8 @@
 #include <algorithm>
 #include <cmath>
 
-#include "ColumnListView/LabelText.h"
 #include "util/Numbers.h"
+#include "util/Utf8.h"
 
 namespace {
 

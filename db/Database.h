@@ -13,7 +13,7 @@
 #include "db/ReadCache.h"
 #include "db/RecordTypes.h"
 #include "util/File.h"
-#include "util/Paths.h"
+#include "util/Strings.h"
 
 // How a query works on the result set that is there.
 namespace QueryMode {

@@ -6,17 +6,19 @@
 #include <mutex>
 
 #include <QApplication>
+#include <QDesktopServices>
+#include <QFileInfo>
 #include <QIcon>
 #include <QPainter>
 #include <QPixmap>
 #include <QSvgRenderer>
 #include <QTimer>
+#include <QUrl>
 
 #include "platform/Window.h"
 #include "platform/private/AccessibleRoles.h"
 #include "platform/private/ApplicationPeer.h"
 #include "platform/private/Convert.h"
-#include "platform/private/KernelThreads.h"
 #include "platform/private/Loop.h"
 #include "platform/private/ViewPeer.h"
 
@@ -41,6 +43,13 @@ std::string RunningExecutable() {
     const auto path = std::filesystem::read_symlink("/proc/self/exe", error);
     return error ? std::string() : path.string();
 }
+
+bool OpenWithDesktop(const char* path) {
+    return QDesktopServices::openUrl(QUrl::fromLocalFile(QString::fromUtf8(path)));
+}
+
+bool (*gLauncher)(const char*) = OpenWithDesktop;
+const BRoster kRoster;
 
 } // namespace
 
@@ -164,4 +173,16 @@ void ApplicationAccess::QuitWhenNothingWaits(BApplication& application) {
         return;
     }
     QApplication::quit();
+}
+
+const BRoster* be_roster = &kRoster;
+
+status_t BRoster::Launch(const entry_ref* ref) const {
+    if (!QFileInfo::exists(QString::fromUtf8(ref->path.c_str())))
+        return B_NAME_NOT_FOUND;
+    return gLauncher(ref->path.c_str()) ? B_OK : B_ERROR;
+}
+
+void BRoster::SetLauncher(bool (*launcher)(const char*)) {
+    gLauncher = launcher ? launcher : OpenWithDesktop;
 }

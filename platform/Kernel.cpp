@@ -12,7 +12,7 @@
 #include <sys/eventfd.h>
 #include <unistd.h>
 
-#include "platform/private/KernelThreads.h"
+#include "platform/private/ApplicationPeer.h"
 #include "platform/private/Loop.h"
 
 namespace {

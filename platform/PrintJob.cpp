@@ -18,7 +18,7 @@
 #include "platform/private/Convert.h"
 #include "platform/private/Loop.h"
 #include "platform/private/OutputFile.h"
-#include "platform/private/ViewTree.h"
+#include "platform/private/ViewWidget.h"
 
 namespace {
 

@@ -7,7 +7,6 @@
 #include "platform/Font.h"
 #include "platform/Handler.h"
 #include "platform/Rect.h"
-#include "platform/Region.h"
 
 class BWindow;
 struct ViewPeer;

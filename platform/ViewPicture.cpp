@@ -12,7 +12,7 @@
 
 #include "platform/View.h"
 #include "platform/private/Convert.h"
-#include "platform/private/ViewTree.h"
+#include "platform/private/ViewWidget.h"
 
 namespace {
 

@@ -5,7 +5,6 @@
 
 #include "app/model/InvestmentTexts.h"
 #include "app/model/PortfolioRules.h"
-#include "print/Banner.h"
 #include "print/PrintTable.h"
 #include "util/Dates.h"
 #include "util/interface/InterfaceHelpers.h"
@@ -19,6 +18,7 @@ constexpr float LeastTableFont = 8; // before rows are left out
 constexpr float LeastBarFont = 5;   // before the middle text is left out
 constexpr float SizeStep = 0.25F;
 constexpr float Gap = 6; // between two texts of a bar
+constexpr float CornerRadius = 20;
 
 constexpr std::array<TABLE_COLUMN_ENTRY, ReportColumnCount> ReportColumns = {{
     {24, "Name", DrawTextLeft},
@@ -35,6 +35,14 @@ constexpr std::size_t TableCharacters() {
     for (const TABLE_COLUMN_ENTRY& column : ReportColumns)
         all += static_cast<std::size_t>(column.characters);
     return all;
+}
+
+uint8 Placement(short flags) {
+    if (flags & BannerRight)
+        return DrawTextRight;
+    if (flags & BannerLeft)
+        return DrawTextLeft;
+    return flags & BannerCenter ? DrawTextCenter : DrawTextLeft;
 }
 
 } // namespace
@@ -130,4 +138,15 @@ void PrinterView::DrawBar(BRect frame, const Bar& bar) {
         SetHighColor(colors::black);
     DrawText(this, &frame, bar.left.c_str(), DrawTextLeft | DrawTextMiddle);
     DrawText(this, &frame, bar.right.c_str(), DrawTextRight | DrawTextMiddle);
+}
+
+void Banner(BView* view, const char* text, const BRect* rect, short flags) {
+    const bool inverse = (flags & BannerInverse) != 0;
+    view->SetHighColor(inverse ? colors::black : colors::white);
+    if (flags & BannerRounded)
+        view->FillRoundRect(*rect, CornerRadius, CornerRadius);
+    else
+        view->FillRect(*rect);
+    view->SetHighColor(inverse ? colors::white : colors::black);
+    DrawText(view, rect, text, static_cast<uint8>(Placement(flags) | DrawTextMiddle));
 }

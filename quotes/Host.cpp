@@ -9,7 +9,7 @@
 #include <thread>
 #include <unistd.h>
 
-#include "quotes/StopSignal.h"
+#include "quotes/QuoteRetrieval.h"
 #include "util/Strings.h"
 
 namespace {

@@ -13,7 +13,6 @@
 #include "quotes/QuoteReport.h"
 #include "quotes/QuoteRetrieval.h"
 #include "quotes/QuoteScanner.h"
-#include "quotes/StopSignal.h"
 #include "util/CharacterBuffer.h"
 
 namespace {

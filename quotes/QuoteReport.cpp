@@ -1,7 +1,7 @@
 #include "quotes/QuoteReport.h"
 
 #include "util/CharacterBuffer.h"
-#include "util/DebugLog.h"
+#include "util/File.h"
 #include "util/Numbers.h"
 
 namespace {

@@ -7,7 +7,6 @@
 #include "quotes/QuoteReport.h"
 #include "quotes/QuoteScanner.h"
 #include "quotes/QuoteSource.h"
-#include "quotes/StopSignal.h"
 #include "util/File.h"
 
 namespace {

@@ -9,7 +9,6 @@
 #include "quotes/QuoteReport.h"
 #include "quotes/QuoteRetrieval.h"
 #include "quotes/QuoteScanner.h"
-#include "quotes/StopSignal.h"
 
 namespace {
 

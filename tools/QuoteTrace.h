@@ -5,7 +5,7 @@
 #include <string>
 #include <string_view>
 
-#include "quotes/QuoteObserver.h"
+#include "quotes/QuoteReport.h"
 
 // Writes down what a look-up of a price does and finds, line by line, for a person who wants to know why a
 // quote source works or does not. Page text is cut to what stands around the place in question, and all that

@@ -4,6 +4,7 @@
 #include <cerrno>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <filesystem>
 #include <memory>
 #include <utility>
@@ -365,4 +366,17 @@ int TryWritingIn(const std::string& folder) {
     if (close(file) != 0 && error == 0)
         error = errno;
     return error;
+}
+
+void PrintDebugStatement(const char* text, const char* logPath) {
+    const bool clear = std::strcmp(text, "CLEAR") == 0;
+    const int mode = clear ? O_TRUNC : O_APPEND;
+    // Never waits for a reader, should the path name a pipe.
+    const int file = open(logPath, O_WRONLY | O_CREAT | O_CLOEXEC | O_NONBLOCK | mode, 0600);
+    if (file < 0)
+        return;
+    // A log that cannot take the text loses it: there is nobody to tell.
+    if (!clear)
+        static_cast<void>(!write(file, text, std::strlen(text)));
+    close(file);
 }

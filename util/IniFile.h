@@ -4,7 +4,7 @@
 #include <string>
 #include <string_view>
 
-#include "util/Paths.h"
+#include "util/Strings.h"
 
 // Reads and changes the plain-text settings file. The object holds a path and no content: every call opens
 // the file, does its work and closes it, so that every reader sees every earlier write. The format is

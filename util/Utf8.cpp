@@ -111,3 +111,16 @@ std::size_t DisplayWidth(std::string_view text) {
     }
     return width;
 }
+
+std::string TruncatedLabel(std::string_view text, float width,
+                           const std::function<float(const std::string&)>& measure) {
+    std::string shown(text);
+    while (!text.empty() && measure(shown) > width) {
+        std::size_t cut = text.size() - 1;
+        while (cut > 0 && (static_cast<unsigned char>(text[cut]) & 0xC0U) == 0x80U)
+            --cut;
+        text = text.substr(0, cut);
+        shown = std::string(text) + "...";
+    }
+    return shown;
+}

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstddef>
+#include <functional>
 #include <string>
 #include <string_view>
 
@@ -28,3 +29,8 @@ void AppendEscaped(std::string& out, std::string_view text, Letters letters = Le
 // How many cells of a terminal a text of AppendEscaped takes: none for a combining mark, two for a wide
 // character.
 [[nodiscard]] std::size_t DisplayWidth(std::string_view text);
+
+// The text itself when it fits into width, else its longest beginning of whole UTF-8 characters that fits
+// with three dots behind it; the dots alone when nothing else fits. measure gives a text's width.
+[[nodiscard]] std::string TruncatedLabel(std::string_view text, float width,
+                                         const std::function<float(const std::string&)>& measure);

@@ -3,7 +3,7 @@
 #include <cmath>
 #include <cstring>
 
-#include "ColumnListView/LabelText.h"
+#include "ColumnListView/CLVListItem.h"
 #include "app/state/AppState.h"
 #include "platform/View.h"
 #include "util/interface/InterfaceHelpers.h"

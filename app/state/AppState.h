@@ -5,7 +5,7 @@
 
 #include "app/model/RecordLayouts.h"
 #include "platform/Types.h"
-#include "util/Paths.h"
+#include "util/Strings.h"
 
 class BBitmap;
 class DATABASE;

@@ -25,3 +25,7 @@ struct ApplicationAccess {
     // Looks at every event: keeps modifiers() true, and the repeats of a held key from pressing buttons.
     static void WatchInput(QApplication& toolkit);
 };
+
+// Asks every thread that spawn_thread made to stop and waits for their ends, at most patience microseconds in
+// all.
+void StopAllThreads(bigtime_t patience);

@@ -5,6 +5,7 @@
 #include <QPaintEvent>
 #include <QPainter>
 
+#include "platform/View.h"
 #include "platform/private/Convert.h"
 #include "platform/private/Loop.h"
 #include "platform/private/ViewPeer.h"
@@ -96,4 +97,32 @@ void ViewWidget::PostPointerMessage(const QMouseEvent& event, uint32 code, int c
     message.AddInt32("modifiers", static_cast<int32>(ModifierBits(event.modifiers())));
     message.AddInt32("clicks", clicks);
     BMessenger(owner_).SendMessage(message);
+}
+
+void DrawTree(BView* view, QPainter& painter, const BRect& part) {
+    auto* plain = dynamic_cast<ViewWidget*>(ViewAccess::Widget(view));
+    if (!plain) {
+        const BPoint origin = view->Bounds().LeftTop();
+        ViewAccess::Widget(view)->render(&painter,
+                                         QPoint(static_cast<int>(origin.x), static_cast<int>(origin.y)),
+                                         QRegion(), QWidget::DrawChildren);
+        return;
+    }
+    painter.fillRect(ToQt(part), ToQt(view->ViewColor()));
+    {
+        const PaintPass pass(view, &painter);
+        view->Draw(part);
+    }
+    for (int32 index = 0; BView* child = view->ChildAt(index); index++) {
+        const BPoint shift = child->Frame().LeftTop() - child->Bounds().LeftTop();
+        BRect inner = part & child->Frame();
+        if (child->IsHidden() || !inner.IsValid())
+            continue;
+        painter.save();
+        painter.setClipRect(ToQt(inner), Qt::IntersectClip);
+        painter.translate(ToQt(shift));
+        inner.OffsetBy(-shift.x, -shift.y);
+        DrawTree(child, painter, inner);
+        painter.restore();
+    }
 }

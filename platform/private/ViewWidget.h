@@ -5,6 +5,7 @@
 #include "platform/Message.h"
 
 class BView;
+struct BRect;
 
 // The widget of a plain view: it paints by calling the view's Draw, and hands presses to the view's window as
 // messages, so that they wait their turn like everything else.
@@ -32,3 +33,7 @@ class ViewWidget : public QWidget {
 // What pointer hooks are called by.
 constexpr uint32 kMouseDownCode = message_code("_MDN");
 constexpr uint32 kMouseUpCode = message_code("_MUP");
+
+// Draws that part of view, whose (0, 0) is the painter's origin, and of the views in it that are not hidden.
+// Controls draw themselves.
+void DrawTree(BView* view, QPainter& painter, const BRect& part);

@@ -4,7 +4,7 @@
 
 #include "app/model/PortfolioRules.h"
 #include "db/Database.h"
-#include "quotes/StopSignal.h"
+#include "quotes/QuoteRetrieval.h"
 #include "util/Strings.h"
 
 namespace {

@@ -2,9 +2,9 @@
 #include <cmath>
 #include <limits>
 
-#include "ColumnListView/DragGroups.h"
-#include "ColumnListView/LabelText.h"
+#include "ColumnListView/ColumnGeometry.h"
 #include "ColumnListView/ListFixture.h"
+#include "util/Utf8.h"
 
 namespace {
 

@@ -1,7 +1,7 @@
 // Rows of the investment list: their texts, pictures and order.
 #include "Program.h"
 
-#include "ColumnListView/LabelText.h"
+#include "util/Utf8.h"
 
 namespace {
 

@@ -4,8 +4,8 @@
 #include <map>
 
 #include "db/FaultyFiles.h"
+#include "platform/Application.h"
 #include "platform/MenuItem.h"
-#include "platform/Roster.h"
 
 namespace {
 

@@ -12,7 +12,6 @@
 #include "Pdf.h"
 #include "platform/Message.h"
 #include "platform/ViewPicture.h"
-#include "print/Banner.h"
 #include "print/PrintTable.h"
 #include "print/PrinterView.h"
 #include "print/Report.h"

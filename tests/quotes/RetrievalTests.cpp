@@ -10,7 +10,7 @@
 #include "QuoteTest.h"
 #include "TlsServer.h"
 #include "quotes/Host.h"
-#include "quotes/QuoteObserver.h"
+#include "quotes/QuoteReport.h"
 
 namespace {
 

@@ -7,9 +7,8 @@
 #include "TemporaryFolder.h"
 #include "util/CharacterBuffer.h"
 #include "util/Dates.h"
-#include "util/DebugLog.h"
+#include "util/File.h"
 #include "util/Numbers.h"
-#include "util/Paths.h"
 #include "util/Strings.h"
 #include "util/Utf8.h"
 

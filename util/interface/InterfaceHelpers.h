@@ -2,7 +2,7 @@
 
 #include "platform/Alert.h"
 #include "platform/Types.h"
-#include "util/Paths.h"
+#include "util/Strings.h"
 
 class BApplication;
 class BFont;
