@@ -6,6 +6,7 @@
 #include "quotes/QuoteRetrieval.h"
 #include "quotes/QuoteSource.h"
 #include "util/Numbers.h"
+#include "util/Strings.h"
 #include "util/Utf8.h"
 
 namespace {
@@ -27,6 +28,15 @@ bool HasCommaBehindNumber(std::string_view token) {
     return rest != text.c_str() && *rest == ',';
 }
 
+// Whether the text of the price, or of its fraction, goes on to the end of what lies behind the price in its
+// piece of the page, so that more of it may be in the next piece.
+bool ReachesEnd(std::string_view following, double fraction) {
+    const std::string text = Lowered(following);
+    if (text.find("sup") != text.npos)
+        return fraction < 0 || (text.back() >= '0' && text.back() <= '9');
+    return text.find_first_not_of("0123456789/ ") == text.npos || std::string_view("sup").starts_with(text);
+}
+
 std::string Number(double value, int decimals) {
     char text[64];
     FormatFixed(value, text, sizeof text, decimals);
@@ -41,6 +51,7 @@ void QuoteTrace::SourceTried(const QuoteSource& source) {
     beginning_.clear();
     lastBytes_.clear();
     received_ = 0;
+    inPieces_ = !std::string_view(source.host).starts_with("https://");
     connected_ = failed_ = markerFound_ = markerDivided_ = priceRead_ = false;
     output_ << "source " << Printable(source.label) << ": asking " << Printable(source.host) << " for "
             << Printable(source.path) << ", marker '" << Printable(source.tag) << "', skip " << source.skip
@@ -106,6 +117,9 @@ void QuoteTrace::PriceRead(std::string_view token, std::string_view following, d
     if (HasCommaBehindNumber(token))
         output_ << "  careful: the price text is read only up to its comma; a price is written with a "
                    "decimal point and without other separators\n";
+    if (inPieces_ && ReachesEnd(following, fraction))
+        output_ << "  careful: what was read as the price ends where a received piece of the page ends; what "
+                   "follows in the next piece is not read, and the price may be another one another time\n";
 }
 
 void QuoteTrace::SourceAnswered(float result) {

@@ -39,6 +39,7 @@ class QuoteTrace : public QuoteObserver {
     std::string beginning_;    // of the page
     std::string lastBytes_;    // of the page so far, fewer than the marker has
     std::size_t received_ = 0; // bytes
+    bool inPieces_ = false;    // the page comes so; over TLS it comes whole
     bool connected_ = false;
     bool failed_ = false;        // and the reason was told
     bool markerFound_ = false;   // in one piece

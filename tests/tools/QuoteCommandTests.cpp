@@ -17,6 +17,8 @@ class QuoteCommandTest : public CommandTest {
             return Reply{{"HTTP/1.0 301 Moved\r\nLocation: https://\x1B[2J\xFF\r\n\r\n"}};
         if (request.find("/closes") != std::string::npos)
             return Reply{};
+        if (request.find("/cut") != std::string::npos)
+            return Reply{{"Last>12 3"}};
         if (request.find("/comma") != std::string::npos)
             return Reply{{"Last>202,45<"}};
         return Reply{{std::string(100, 'a') + "\x1B[2JLast\\\n</td><b>45 3/8</b>" + std::string(100, 'z')}};
@@ -58,6 +60,7 @@ TEST_F(QuoteCommandTest, SaysWhyThereIsNoPrice) {
         {Source("/q?s= Last 0"), 1, "ABC\t0.00\n", "  price text 'Last\\\\' read as 0.0000\n"},
         {Source("/q?s= Last 1"), 0, "ABC\t15.00\n", "  careful: the price text is no number"},
         {Source("/closes Last 1"), 1, "ABC\t-4.00\n", "  the server closed the connection without"},
+        {Source("/cut Last 1"), 0, "ABC\t12.00\n", "  careful: what was read as the price ends where a"},
         {Source("/comma Last 1"), 0, "ABC\t202.00\n", "  careful: the price text is read only up to its"},
     };
     for (const auto& [from, status, output, trace] : cases) {
