@@ -41,7 +41,10 @@ void CLVListItem::DrawExpander(BView* owner, BRect frame) {
     expanderRect_ = frame;
     if (!superitem_)
         return;
-    arrowRect_ = ArrowFrame(frame);
+    // Indented out of its column there is no arrow to be seen, nor to be pressed.
+    arrowRect_ = frame.IsValid() ? ArrowFrame(frame) : BRect(-1, -1, -1, -1);
+    if (!frame.IsValid())
+        return;
     owner->SetDrawingMode(B_OP_OVER);
     owner->DrawBitmap(list_->Arrow(IsExpanded()), arrowRect_.LeftTop());
     owner->SetDrawingMode(B_OP_COPY);

@@ -442,6 +442,22 @@ void ColumnListView::SortItems() {
         return static_cast<const CLVListItem*>(a)->fullIndex_ -
                static_cast<const CLVListItem*>(b)->fullIndex_;
     });
+    UpdateSight();
+}
+
+// Where levels are left out, a sort can bring a row under another one than before.
+void ColumnListView::UpdateSight() {
+    const OutlineSequence inSight = RowsInSight(fullList_, 0, FullListCountItems());
+    auto next = inSight.begin();
+    for (int32 i = 0; i < FullListCountItems(); ++i) {
+        const bool seen = next != inSight.end() && *next == FullListItemAt(i);
+        if (seen)
+            ++next;
+        if (seen && !FullListItemAt(i)->inSight_)
+            ShowRows(i, i + 1);
+        else if (!seen)
+            HideRows(i, i + 1);
+    }
 }
 
 // --- rows ---

@@ -214,6 +214,7 @@ class ColumnListView : public BListView {
     // Take the rows of this part of the full list out of the base's, and put in those to be seen.
     void HideRows(int32 fullBegin, int32 fullEnd);
     void ShowRows(int32 fullBegin, int32 fullEnd);
+    void UpdateSight();
     void SetExpanded(CLVListItem* item, bool expanded);
 
     std::vector<std::unique_ptr<CLVColumn>> columns_; // in the order of adding

@@ -187,6 +187,15 @@ TEST_F(Outline, SortsLevelsAndKeepsTheSelection) {
     EXPECT_EQ(FullList() + " " + Shown(0), "mzc mzc");
     list->MakeEmpty();
     EXPECT_EQ(list->CountItems() + list->FullListCountItems(), 0);
+    // A row whose level leaves one out goes under what comes before it then.
+    for (const auto& [text, level, expanded] : {std::tuple{"a", 0U, true}, {"b", 2, true}, {"c", 1, false}})
+        EXPECT_TRUE(list->AddItem(NewRow(text, level, false, expanded)));
+    list->SetSortMode(0, Mode::Ascending);
+    EXPECT_EQ(Shown(0), "abc");
+    list->SetSortMode(0, Mode::Descending);
+    EXPECT_EQ(FullList() + " " + Shown(0), "acb ac");
+    list->SetSortMode(0, Mode::Ascending);
+    EXPECT_EQ(Shown(0), "ac"); // "b" is below "c" from then on
 }
 
 } // namespace

@@ -271,15 +271,17 @@ TEST(OutlineArrows, OpenAndCloseTheRowsBelow) {
     w.NewColumn(nullptr, 20, CLVF_EXPANDER);
     w.NewColumn("Name", 60);
     TextRow* middle = w.NewRow("m", 1, true, false);
-    for (TextRow* row : {w.NewRow("t", 0, true), middle, w.NewRow("e", 2), w.NewRow("n", 1)})
+    TextRow* deep = w.NewRow("d", 9, true);
+    for (TextRow* row : {w.NewRow("t", 0, true), middle, w.NewRow("e", 2), w.NewRow("n", 1), deep})
         w.list->AddItem(row);
     w.ShowList();
     // Pointing down in the row that has the keyboard's frame, and right.
     EXPECT_EQ(w.RowColors(8), "0L 1a 9K 17a 21b 82- 299L ");
     EXPECT_EQ(w.RowColors(26), "0L 20a 31K 32a 41b 82- ");
     EXPECT_EQ(middle->ExpanderArrowRect(), BRect(28, 25, 37, 34));
+    EXPECT_EQ(deep->ExpanderArrowRect(), BRect(-1, -1, -1, -1)); // beyond its column
     const std::tuple<QPoint, const char*, int32> clicks[] = {
-        {{32, 30}, "tmen", -1}, {{60, 30}, "tmen", 1}, {{12, 9}, "t", -1}, {{12, 9}, "tmen", -1}};
+        {{32, 30}, "tmend", -1}, {{60, 30}, "tmend", 1}, {{12, 9}, "t", -1}, {{12, 9}, "tmend", -1}};
     for (const auto& [place, shown, selected] : clicks) {
         QTest::mouseClick(w.view->viewport(), Qt::LeftButton, {}, place);
         static_cast<void>(w.RowColors()); // draws what the click has brought
