@@ -198,6 +198,20 @@ void RowsWidget::focusInEvent(QFocusEvent* event) {
         focusMark_ = currentIndex();
 }
 
+// The toolkit would let only rows that can be edited have letters that are composed: a search wants them too.
+void RowsWidget::currentChanged(const QModelIndex& current, const QModelIndex& previous) {
+    QListView::currentChanged(current, previous);
+    setAttribute(Qt::WA_InputMethodEnabled);
+}
+
+void RowsWidget::inputMethodEvent(QInputMethodEvent* event) {
+    if (!peer_)
+        return;
+    const InterfaceLock lock(owner_->Looper());
+    peer_->selection.Attach();
+    QListView::inputMethodEvent(event);
+}
+
 // Without a row to go on from, the toolkit would take End to the first one, too.
 QModelIndex RowsWidget::moveCursor(CursorAction action, Qt::KeyboardModifiers modifiers) {
     if (action == MoveEnd && !currentIndex().isValid())
@@ -291,9 +305,11 @@ void RowsWidget::HandleListKey(QKeyEvent* event) {
     if (moves && ChosenRow() < 0)
         selectionModel()->clearCurrentIndex();
     QListView::keyPressEvent(event);
-    if (!moves || (event->modifiers() & Qt::ControlModifier) || selectionModel()->hasSelection())
+    if (!moves)
         return;
-    SelectCurrentIfNone();
+    if (!(event->modifiers() & Qt::ControlModifier))
+        SelectCurrentIfNone();
+    // The toolkit does so only when another row became the current one.
     owner_->ScrollToRow(currentIndex().row());
 }
 

@@ -53,6 +53,8 @@ class RowsWidget : public QListView {
     void updateGeometries() override;
     void changeEvent(QEvent* event) override;
     void focusInEvent(QFocusEvent* event) override;
+    void currentChanged(const QModelIndex& current, const QModelIndex& previous) override;
+    void inputMethodEvent(QInputMethodEvent* event) override;
     QModelIndex moveCursor(CursorAction action, Qt::KeyboardModifiers modifiers) override;
     void keyPressEvent(QKeyEvent* event) override { Input(event); }
     void mousePressEvent(QMouseEvent* event) override { Input(event); }
