@@ -298,17 +298,41 @@ void CLVColumnLabelView::DrawOutline() {
     StrokeRect({left, bounds.top, left + width, bounds.bottom});
 }
 
-std::string CLVColumnLabelView::Describe(const CLVColumn& column) const {
-    std::string text = column.GetLabel();
-    if (list_->IsSortKey(list_->IndexOfColumn(&column)))
-        text += column.SortMode() == CLVSortMode::Ascending ? " (sorted ascending)" : " (sorted descending)";
-    return text;
+// --- assistive technology ---
+
+std::string CLVColumnLabelView::Sorting(const CLVColumn& column) const {
+    std::vector<int32> keys(static_cast<std::size_t>(list_->CountColumns()));
+    keys.resize(static_cast<std::size_t>(list_->Sorting(keys.data(), nullptr)));
+    const auto found = std::find(keys.begin(), keys.end(), list_->IndexOfColumn(&column));
+    if (found == keys.end())
+        return {};
+    const std::string direction = column.SortMode() == CLVSortMode::Ascending ? "ascending" : "descending";
+    const std::string place = keys.size() > 1 ? ", key " + std::to_string(found - keys.begin() + 1) : "";
+    return "sorted " + direction + place;
 }
 
 std::string CLVColumnLabelView::AccessibleDescription() const {
     std::string description;
+    for (const CLVColumn* column : MarkableColumns()) {
+        description += (description.empty() ? "Columns: " : ", ") + std::string(column->GetLabel());
+        if (const std::string sorting = Sorting(*column); !sorting.empty())
+            description += " (" + sorting + ")";
+    }
+    return description;
+}
+
+std::vector<AccessiblePart> CLVColumnLabelView::AccessibleParts() const {
+    std::vector<AccessiblePart> cells;
+    const BRect bounds = Bounds();
     for (const CLVColumn* column : MarkableColumns())
-        description += (description.empty() ? "Columns: " : ", ") + Describe(*column);
-    const CLVColumn* marked = IsFocus() ? MarkedColumn() : nullptr;
-    return marked ? Describe(*marked) + ". " + description : description;
+        cells.push_back({column->GetLabel(),
+                         Sorting(*column),
+                         {column->Begin(), bounds.top, column->End(), bounds.bottom},
+                         column == MarkedColumn()});
+    return cells;
+}
+
+void CLVColumnLabelView::PressPart(int32 index) {
+    Sort(list_->IndexOfColumn(MarkableColumns()[static_cast<std::size_t>(index)]), 0);
+    Invalidate();
 }

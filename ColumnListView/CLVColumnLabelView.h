@@ -35,9 +35,12 @@ class CLVColumnLabelView : public BView {
     bool KeyDown(char key) override;
     void MessageReceived(BMessage* message) override;
     void DetachedFromWindow() override;
-    // The shown columns' labels from left to right, each sort key with its direction; before them the marked
-    // one while the keyboard is here.
+    // The shown columns' labels from left to right, each sort key with its direction.
     [[nodiscard]] std::string AccessibleDescription() const override;
+    // The cells of the shown columns that have a label; a sort key's says its place and direction. A press
+    // sorts like a click.
+    [[nodiscard]] std::vector<AccessiblePart> AccessibleParts() const override;
+    void PressPart(int32 index) override;
 
   private:
     enum class Action { None, Press, Resize, Drag };
@@ -65,7 +68,8 @@ class CLVColumnLabelView : public BView {
     // Null while there is none to mark.
     [[nodiscard]] CLVColumn* MarkedColumn() const;
     void MoveMark(char key);
-    [[nodiscard]] std::string Describe(const CLVColumn& column) const;
+    // "sorted ascending", "sorted descending, key 2"; empty for a column that is no sort key.
+    [[nodiscard]] std::string Sorting(const CLVColumn& column) const;
 
     [[nodiscard]] int32 PressedGroup() const;
     void DrawCell(CLVColumn& column, BRect cell, bool joinsPrevious, bool joinsNext);

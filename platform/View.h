@@ -43,6 +43,14 @@ constexpr char B_ENTER = 0x0a;
 constexpr char B_LEFT_ARROW = 0x1c;
 constexpr char B_RIGHT_ARROW = 0x1d;
 
+// A part of a view that a person takes for a small control, as assistive technology tells of it.
+struct AccessiblePart {
+    std::string name;
+    std::string state; // beside the name
+    BRect frame;       // in the view's coordinates
+    bool marked;       // has the keyboard's mark
+};
+
 // The modifier keys held down as of the last event. Any thread.
 uint32 modifiers();
 
@@ -91,6 +99,11 @@ class BView : public BHandler {
     void SetAccessibleName(const char* name);
     // The text that assistive technology reads for this view beside its name; UTF-8. The base has none.
     [[nodiscard]] virtual std::string AccessibleDescription() const { return {}; }
+    // What the view draws instead of child views, for assistive technology to go through, from left to right.
+    // The base has no such parts.
+    [[nodiscard]] virtual std::vector<AccessiblePart> AccessibleParts() const { return {}; }
+    // Assistive technology presses that part.
+    virtual void PressPart(int32 /*index*/) {}
 
     // --- place and size ---
     [[nodiscard]] BRect Frame() const;

@@ -3,7 +3,7 @@
 #include <cmath>
 #include <cstring>
 
-#include "ColumnListView/CLVListItem.h"
+#include "ColumnListView/ColumnListView.h"
 #include "app/state/AppState.h"
 #include "platform/View.h"
 #include "util/interface/InterfaceHelpers.h"
@@ -113,8 +113,11 @@ std::string NorvelItem::AccessibleText() const {
     std::string all;
     for (int32 column = 1; column < InvestmentColumnCount; ++column) {
         const std::string text = Text(column);
-        if (!text.empty())
-            all += text + ", ";
+        if (text.empty())
+            continue;
+        // The name needs no title to be understood.
+        const CLVColumn* shown = List() && column > 1 ? List()->ColumnAt(column) : nullptr;
+        all += (shown ? shown->GetLabel() + std::string(" ") : "") + text + ", ";
     }
     return all + LookOf(movement_).words;
 }

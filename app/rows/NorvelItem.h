@@ -41,7 +41,7 @@ class NorvelItem : public CLVListItem {
 
     void DrawItemColumn(BView* owner, BRect columnRect, int32 column, bool complete) override;
     void Update(BView* owner, const BFont* font) override;
-    // Every column's text in the order of the columns, and what the picture tells in words.
+    // Every column's title, in a list, and its text, in the order of the columns, and what the picture tells.
     [[nodiscard]] std::string AccessibleText() const override;
     // The name.
     [[nodiscard]] std::string SearchText() const override;

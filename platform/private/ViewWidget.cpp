@@ -1,5 +1,9 @@
 #include "platform/private/ViewWidget.h"
 
+#include <algorithm>
+#include <utility>
+
+#include <QAccessible>
 #include <QKeyEvent>
 #include <QMouseEvent>
 #include <QPaintEvent>
@@ -58,9 +62,25 @@ void ViewWidget::paintEvent(QPaintEvent* event) {
         const PaintPass pass(owner_, &painter);
         owner_->Draw(update);
     }
+    TellAccessibility();
+}
+
+// What is read of a view follows what it shows.
+void ViewWidget::TellAccessibility() {
     const QString description = QString::fromStdString(owner_->AccessibleDescription());
     if (description != accessibleDescription())
         setAccessibleDescription(description);
+    if (!QAccessible::isActive())
+        return;
+    const std::vector<AccessiblePart> parts = owner_->AccessibleParts();
+    const auto marked =
+        std::find_if(parts.begin(), parts.end(), [](const auto& part) { return part.marked; });
+    const int index = hasFocus() && marked != parts.end() ? static_cast<int>(marked - parts.begin()) : -1;
+    if (std::exchange(markedPart_, index) == index || index < 0)
+        return;
+    QAccessibleEvent focus(this, QAccessible::Focus);
+    focus.setChild(index);
+    QAccessible::updateAccessibility(&focus);
 }
 
 // At once and not by message, since the answer decides who gets the key.

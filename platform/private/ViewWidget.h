@@ -15,6 +15,8 @@ class ViewWidget : public QWidget {
   public:
     explicit ViewWidget(BView* owner) : owner_(owner) {}
 
+    [[nodiscard]] BView* Owner() const { return owner_; }
+
   protected:
     bool event(QEvent* event) override;
     void paintEvent(QPaintEvent* event) override;
@@ -24,10 +26,12 @@ class ViewWidget : public QWidget {
     void mouseReleaseEvent(QMouseEvent* event) override;
 
   private:
+    void TellAccessibility();
     void NotePointer(const QMouseEvent& event);
     void PostPointerMessage(const QMouseEvent& event, uint32 code, int clicks);
 
     BView* owner_;
+    int markedPart_ = -1; // of the view's parts, as far as assistive technology knows
 };
 
 // What pointer hooks are called by.

@@ -4,6 +4,7 @@
 #include <thread>
 #include <unistd.h>
 
+#include <QAccessible>
 #include <QImage>
 #include <QScrollArea>
 #include <QScrollBar>
@@ -150,7 +151,8 @@ TEST_F(Header, SortsByClicks) {
         Drag(x, x, shift ? Qt::ShiftModifier : Qt::NoModifier);
         EXPECT_EQ(Shown() + " " + Keys(), shown) << x;
     }
-    EXPECT_EQ(header->accessibleDescription(), "Columns: Name (sorted descending), Type (sorted ascending)");
+    EXPECT_EQ(header->accessibleDescription(),
+              "Columns: Name (sorted descending, key 2), Type (sorted ascending, key 1)");
 }
 
 TEST_F(Header, IsWorkedByKeys) {
@@ -159,7 +161,16 @@ TEST_F(Header, IsWorkedByKeys) {
     ASSERT_EQ(QApplication::focusWidget(), header);
     // The status column has nothing to be worked.
     EXPECT_EQ(HeaderColors(), "0L 1N 23B 80N 81S 82L 83N 142S 143L 144N ");
-    EXPECT_EQ(header->accessibleDescription(), "Name. Columns: Name, Type");
+    EXPECT_EQ(header->accessibleDescription(), "Columns: Name, Type");
+    QAccessibleInterface* cells = QAccessible::queryAccessibleInterface(header);
+    ASSERT_EQ(cells->childCount(), 2);
+    EXPECT_EQ(cells->focusChild(), cells->child(0));
+    for (const char* sorting :
+         {"sorted ascending", "sorted descending", ""}) { // "Name", by assistive technology
+        cells->child(0)->actionInterface()->doAction(QAccessibleActionInterface::pressAction());
+        EXPECT_EQ(cells->child(0)->text(QAccessible::Name) + cells->child(0)->text(QAccessible::Description),
+                  QLatin1String("Name") + QLatin1String(sorting));
+    }
     for (const Qt::Key key : {Qt::Key_Right, Qt::Key_Right, Qt::Key_Space, Qt::Key_Home}) // two are all
         StepDriver::Key(key);
     EXPECT_EQ(Shown() + Keys(), "cba2+");

@@ -71,7 +71,8 @@ void ExpectWindow(QWidget* window, Role windowRole, Role role, const char* name,
 void ExpectList(QAccessibleInterface* list) {
     ASSERT_TRUE(list && list->childCount() == 16);
     EXPECT_EQ(list->child(1)->text(QAccessible::Name).toStdString(),
-              "Birch & Sons, BRCH, Stock, 45.500, 88 1/2, 4026.75, 03-03-2025, yes, Med, Broker, price down");
+              "Birch & Sons, Ticker BRCH, Type Stock, Shares 45.500, Price 88 1/2, Value 4026.75, "
+              "Date 03-03-2025, Retire yes, Risk Med, Agent Broker, price down");
     BFont font;
     Program::List()->GetFont(&font);
     EXPECT_GT(font.Size(), 17);
@@ -95,7 +96,7 @@ TEST(EveryWindow, SaysWhatItIsAndHasRoomForLargeLetters) {
         QWidget* main = Program::Main();
         ExpectWindow(main, Role::Window, Role::ButtonMenu, "Portfolio:", "My Retirement Fund");
         ExpectWindow(main, Role::Window, Role::StaticText, "Total Value: $166,851.94", "");
-        ExpectWindow(main, Role::Window, Role::Graphic, "column labels",
+        ExpectWindow(main, Role::Window, Role::Grouping, "column labels",
                      "Columns: Name, Ticker, Type, Shares, Price, Value, Date, Retire, Risk, Agent");
         ExpectList(FindElement(QAccessible::queryAccessibleInterface(main), Role::List, "Investments"));
         Program::ClickRow(9); // the longest type and many shares
