@@ -1,72 +1,51 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include "FaultyFiles.h"
 #include "SampleFile.h"
-#include "db/Database.h"
 
 namespace {
 
 using Names = std::vector<std::string>;
 
-class CompactionTest : public testing::Test {
+class CompactionTest : public RowsTest {
   protected:
-    CompactionTest() { MakeRows(path_, 3); }
-
-    TemporaryFolder folder_;
-    std::string path_ = folder_.File("rows.db");
-    FaultyFiles files_;
+    CompactionTest() { MakeRows(3); }
 };
 
 TEST_F(CompactionTest, DropsDeletedRecordsAndLocks) {
-    folder_.Clear();
-    MakeRows(path_, 9000); // more than are read at once
+    MakeRows(9000);                                                // more than are read at once
+    std::string bytes = With(folder_.Read("rows.db"), 48, "\x07"); // the reserved field
+    ASSERT_EQ(Open(bytes), 0);
     folder_.Write("rows.bak", "left over");
     folder_.Write("rows.new", std::string(400'000, 'x'));
-    std::string bytes = With(folder_.Read("rows.db"), 48, "\x07"); // the reserved field
-    folder_.Write("rows.db", bytes);
-    DATABASE database(path_.c_str(), files_);
-    ASSERT_EQ(database.Query("Name contains row", QueryMode::New), 8999);
-    ASSERT_EQ(database.Compress(1), 0);
+    Play("new Name contains row: 8999; compress: 0");
     EXPECT_EQ(folder_.Names(), Names{"rows.db"});
     bytes.erase(DataStartOfRows + RowLength, RowLength);
     bytes.replace(36, 8, std::string("\x27\x23\0\0\0\0\0\0", 8)); // the counts
     bytes[DataStartOfRows + RowLength] = RecordStatus::Active;
     EXPECT_TRUE(folder_.Read("rows.db") == bytes);
-    EXPECT_EQ(files_.Order(), "x" + std::string(6, 'w') + "ssxrrsx") << "on the disk before the swap";
-    folder_.Write("precious", "untouched");
-    std::filesystem::create_symlink("precious", folder_.File("rows.new"));
-    EXPECT_EQ(database.Compress(0), 0);
-    EXPECT_TRUE(folder_.Read("rows.db") == bytes);
-    EXPECT_EQ(folder_.Read("precious"), "untouched") << "a leftover link is not written through";
+    EXPECT_TRUE(files_.Order().ends_with("xnwwwwwwmssxrrsx")) << "on the disk before the swap";
 }
 
-// Where the test may give files away.
 TEST_F(CompactionTest, KeepsOwnerAndPermissions) {
-    for (const auto& [user, group] : {std::pair(uid_t{12345}, getgid()), {getuid(), gid_t{12346}}}) {
-        static_cast<void>(!chown(path_.c_str(), user, group));
-        ASSERT_EQ(chmod(path_.c_str(), 0640), 0);
-        struct stat before {};
-        struct stat after {};
-        ASSERT_EQ(stat(path_.c_str(), &before), 0);
-        ASSERT_EQ(std::make_unique<DATABASE>(path_.c_str(), files_)->Compress(0), 0);
-        ASSERT_EQ(stat(path_.c_str(), &after), 0);
-        EXPECT_EQ(std::tuple(after.st_uid, after.st_gid, after.st_mode),
-                  std::tuple(before.st_uid, before.st_gid, before.st_mode));
-        EXPECT_EQ(files_.FirstMode(), 0600U) << "nobody else looks into it before";
-    }
+    const auto theirs = [this] {
+        struct stat status {};
+        EXPECT_EQ(stat(path_.c_str(), &status), 0);
+        return std::tuple(status.st_uid, status.st_gid, status.st_mode);
+    };
+    static_cast<void>(!chown(path_.c_str(), getuid(), 12346)); // where the test may give files away
+    ASSERT_EQ(chmod(path_.c_str(), 0640), 0);
+    const auto before = theirs();
+    Play("compress: 0");
+    EXPECT_EQ(theirs(), before);
+    EXPECT_EQ(files_.firstMode, 0600U) << "nobody else looks into it before";
 }
 
 // What each failing step leaves on disk. Whatever it is, the object goes on working with complete data.
 TEST_F(CompactionTest, OutcomesOfFailingSteps) {
-    const struct {
-        int call; // 0 removes a leftover, then open, header, columns, records, header and columns, mode,
-                  // sync, sync of the folder, remove, rename, rename, sync of the folder, remove
-        int error;
-        int code;
-        Names files; // in alphabetical order
-        std::size_t records;
-    } cases[] = {
+    // Call 0 removes a leftover; then come open, header, columns, records, header and columns, mode, sync,
+    // sync of the folder, remove, rename, rename, sync of the folder, remove.
+    const std::tuple<int, int, int, Names, long> cases[] = {
         {1, EACCES, 2705, {"rows.db"}, 3},
         {2, ENOSPC, 2706, {"rows.db"}, 3},
         {8, EIO, 2706, {"rows.db"}, 3},
@@ -80,23 +59,19 @@ TEST_F(CompactionTest, OutcomesOfFailingSteps) {
         {14, EACCES, 2704, {"rows.bak", "rows.db"}, 2},
         {14, EIO, 0, {"rows.bak", "rows.db"}, 2},
     };
-    for (const auto& failure : cases) {
-        SCOPED_TRACE("call " + std::to_string(failure.call) + " error " + std::to_string(failure.error));
-        folder_.Clear();
-        MakeRows(path_, 3);
-        if (failure.call == 10)
+    for (const auto& [call, error, code, left, records] : cases) {
+        SCOPED_TRACE("call " + std::to_string(call) + " error " + std::to_string(error));
+        MakeRows(3);
+        if (call == 10)
             folder_.Write("rows.bak", "left over");
-        DATABASE database(path_.c_str(), files_);
-        files_.Arm(Fault::Error, failure.call, failure.error);
-        EXPECT_EQ(Code(database, database.Compress(0)), failure.code);
+        files_.Arm(Fault::Error, call, error);
+        EXPECT_EQ(Run("compress"), code);
         EXPECT_TRUE(files_.Disarm());
-        EXPECT_EQ(folder_.Names(), failure.files);
-        EXPECT_EQ(ContentOf(database).size(), failure.records);
-        const ROW row = Row("later");
-        EXPECT_EQ(database.Append(&row), static_cast<long>(failure.records));
-        EXPECT_EQ(database.Compress(0), 0) << "the next run mends what the failed one left";
+        EXPECT_EQ(folder_.Names(), left);
+        EXPECT_EQ(Run("append"), records);
+        Play("compress: 0; reset: 3"); // which mends what the failed one left
         EXPECT_EQ(folder_.Names(), Names{"rows.db"});
-        EXPECT_EQ(ContentOf(database).size(), 3U);
+        EXPECT_EQ(ContentOf(database_).size(), 3U);
     }
 }
 
@@ -104,7 +79,7 @@ TEST_F(CompactionTest, WorksOnTheTargetOfALink) {
     std::filesystem::create_directory(folder_.File("home"));
     std::filesystem::rename(path_, folder_.File("home/rows.db"));
     std::filesystem::create_symlink("home/rows.db", path_);
-    ASSERT_EQ(std::make_unique<DATABASE>(path_.c_str())->Compress(0), 0);
+    Play("open: 0; compress: 0");
     EXPECT_TRUE(std::filesystem::is_symlink(path_));
     EXPECT_FALSE(folder_.Has("home/rows.bak") || folder_.Has("home/rows.new"));
 }
@@ -112,20 +87,20 @@ TEST_F(CompactionTest, WorksOnTheTargetOfALink) {
 TEST_F(CompactionTest, RefusesWhereItWouldLoseData) {
     // Their derived names would be their own, or one byte too long.
     const std::string longest = std::string(PathBufferSize - 1 - folder_.File(".db").size(), 'x') + ".db";
+    const std::string before = folder_.Read("rows.db");
     for (const std::string& name : {std::string("rows.new"), std::string("rows.bak"), longest}) {
         const std::string path = folder_.File(name);
         std::filesystem::rename(path_, path);
-        const std::string before = folder_.Read(name);
-        DATABASE database(path.c_str());
-        EXPECT_EQ(Code(database, database.Compress(0)), 2705);
+        ASSERT_EQ(database_.Open(path.c_str()), 0);
+        Play("compress: 2705");
         EXPECT_EQ(folder_.Read(name), before);
         EXPECT_EQ(folder_.Names(), Names{name});
         std::filesystem::rename(path, path_);
     }
-    DATABASE database(path_.c_str());
+    Play("open: 0");
     std::filesystem::remove(path_);
-    MakeRows(path_, 3); // another file in its place
-    EXPECT_EQ(Code(database, database.Compress(0)), 2702);
+    folder_.Write("rows.db", before); // another file in its place
+    Play("compress: 2702");
     EXPECT_EQ(folder_.Names(), Names{"rows.db"});
 }
 
@@ -134,13 +109,12 @@ TEST_F(CompactionTest, BackupIsRestoredOnlyInPlaceOfNothing) {
     EXPECT_EQ(RestoreCompactionBackup(path_.c_str()), 0);
     EXPECT_EQ(folder_.Read("rows.bak"), "older");
     std::filesystem::rename(path_, folder_.File("rows.bak"));
+    files_.Arm(Fault::Error, 0, EACCES);
+    EXPECT_EQ(RestoreCompactionBackup(path_.c_str(), files_), -1);
     EXPECT_EQ(RestoreCompactionBackup(path_.c_str()), 1);
     EXPECT_EQ(folder_.Names(), Names{"rows.db"});
     EXPECT_EQ(RestoreCompactionBackup(folder_.File("nowhere/rows.db").c_str()), 0);
     EXPECT_EQ(RestoreCompactionBackup(nullptr), 0);
-    std::filesystem::rename(path_, folder_.File("rows.bak"));
-    files_.Arm(Fault::Error, 0, EACCES);
-    EXPECT_EQ(RestoreCompactionBackup(path_.c_str(), files_), -1);
 }
 
 } // namespace

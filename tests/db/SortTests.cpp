@@ -29,24 +29,12 @@ ROW RandomRow(std::mt19937& random) {
     return row;
 }
 
-bool IsGreater(const ROW& a, const ROW& b, int column) {
-    static const DATABASE rules(nullptr);
-    return column == 0
-               ? rules.CompareStringVals(CompareOperator::Greater, NameOf(a).c_str(), NameOf(b).c_str()) != 0
-               : KeyOf(a, column) > KeyOf(b, column);
-}
-
 void BubbleSort(const std::vector<ROW>& rows, int column, std::vector<long>* order) {
     const auto row = [&](std::size_t i) { return rows[static_cast<std::size_t>((*order)[i])]; };
-    for (bool swapped = true; swapped;) {
-        swapped = false;
-        for (std::size_t i = 1; i < order->size(); ++i) {
-            if (IsGreater(row(i - 1), row(i), column)) {
+    for (std::size_t end = order->size(); end > 1; --end)
+        for (std::size_t i = 1; i < end; ++i)
+            if (Holds(CompareOperator::Greater, row(i - 1), row(i), column))
                 std::swap((*order)[i - 1], (*order)[i]);
-                swapped = true;
-            }
-        }
-    }
 }
 
 // Of few records, and of so many that they are sorted without comparing them. One after the other, each sort
@@ -54,7 +42,7 @@ void BubbleSort(const std::vector<ROW>& rows, int column, std::vector<long>* ord
 TEST_F(SortTest, OrderIsThatOfABubbleSort) {
     std::mt19937 random(20260101);
     for (const auto& [count, rounds] : {std::pair(60, 200), {1500, 14}}) {
-        ASSERT_EQ(CreateRows(database_, folder_.File(std::to_string(count))), 0);
+        Create(std::to_string(count));
         std::vector<ROW> rows;
         std::vector<long> order;
         for (int i = 0; i < count; ++i) {
@@ -64,40 +52,35 @@ TEST_F(SortTest, OrderIsThatOfABubbleSort) {
                 order.push_back(i);
         }
         Append(rows);
-        ASSERT_EQ(database_.Query("Small != 1", QueryMode::New), static_cast<long>(order.size()));
+        ASSERT_EQ(Run("new Small != 1"), std::ssize(order));
         for (int round = 0; round < rounds; ++round) {
             const int column = count < 100 ? static_cast<int>(random() % 7) : round % 7;
             SCOPED_TRACE(std::to_string(count) + " by column " + std::to_string(column));
             database_.SetReadCache(round % 3);
-            ASSERT_EQ(database_.SortBy(RowColumns()[static_cast<std::size_t>(column)].name, 0), 0);
+            ASSERT_EQ(database_.SortBy(RowColumns[static_cast<std::size_t>(column)].name, 0), 0);
             BubbleSort(rows, column, &order);
-            ASSERT_EQ(Walked(database_), order);
+            ASSERT_EQ(Walked(), order);
         }
     }
 }
 
 TEST_F(SortTest, LongTextsThatDifferLate) {
-    const std::string head(5000, 'x');
-    DATABASE database(nullptr);
-    const COLUMN_ENTRY column = Column("Text", ColumnType::String, 5003); // no multiple of a word
-    ASSERT_EQ(database.Create(folder_.File("long.db").c_str(), "", 1, &column), 0);
-    for (const char* tail : {"c", "B", "", "bb", "b", "abc"}) { // the last one fills its column
-        std::string text = head + tail;
+    Create("long.db", {Column("Text", ColumnType::String, 5003)});    // no multiple of a word
+    for (const std::string tail : {"c", "B", "", "bb", "b", "abc"}) { // the last one fills its column
+        std::string text = std::string(5000, 'x') + tail;
         text.resize(5003);
-        ASSERT_GE(database.Append(text.data()), 0);
+        ASSERT_GE(database_.Append(text.data()), 0);
     }
-    EXPECT_EQ(database.SortBy("Text", 0), 0);
-    EXPECT_EQ(Walked(database), (std::vector<long>{2, 5, 1, 4, 3, 0}));
+    Play("sort Text: 0");
+    EXPECT_EQ(Walked(), (std::vector<long>{2, 5, 1, 4, 3, 0}));
 }
 
 TEST_F(SortTest, NextSortSlots) {
-    Append({Row("a", 1), Row("b"), Row("c", 1), Row("d", 1)});
-    EXPECT_EQ(database_.Query("Tag = 1", QueryMode::New), 3);
-    Append({Row("e", 1)}); // has no slot
+    Append({newRow_, Row("b"), newRow_, newRow_});
+    Play("new Tag = 1: 3; append: 4"); // which has no slot
     const std::tuple<long, long, long> cases[] = {{-7, 0, 2}, {0, 2, 3}, {3, 5, 5}, {LONG_MAX, 5, 5}};
     for (const auto& [from, first, second] : cases) {
-        long next = from;
-        long afterNext = 0;
+        long next = from, afterNext = 0;
         database_.GetNextSortSlots(&next, &afterNext);
         EXPECT_EQ(std::pair(next, afterNext), std::pair(first, second)) << from;
     }

@@ -6,16 +6,6 @@ namespace {
 
 class TextTest : public RowsTest {
   protected:
-    long Load(const std::string& text, const char* separators = "\t\n") {
-        folder_.Write("rows.txt", text);
-        return database_.Load(text_.c_str(), separators);
-    }
-    // Makes a file of other columns and loads a text into it.
-    long LoadInto(const std::vector<COLUMN_ENTRY>& columns, const std::string& text, const char* separators) {
-        const auto count = static_cast<int>(columns.size());
-        EXPECT_EQ(database_.Create(folder_.File("other.db").c_str(), "", count, columns.data()), 0);
-        return Load(text, separators);
-    }
     std::string LineOf(const ROW& row, const char* separator = "|") const {
         std::string line;
         database_.FormatRecordData(&line, &row, separator);
@@ -43,14 +33,15 @@ TEST_F(TextTest, FieldsAsText) {
 }
 
 TEST_F(TextTest, ExportsAllOrTheSetInItsOrder) {
-    ASSERT_EQ(LoadInto({Column("A", ColumnType::String, 8)}, "cherry\ngone\napple\nbread\n", "\n"), 4);
-    ASSERT_EQ(database_.Delete(1), 0);
+    Create("other.db", {Column("A", ColumnType::String, 8)});
+    texts_.Write("load.txt", "cherry\ngone\napple\nbread\n");
+    Play("load \n: 4; delete 1: 0");
     const auto exported = [this](int all) {
         const long lines = database_.Export(text_.c_str(), all, "|");
         return std::to_string(lines) + " " + folder_.Read("rows.txt");
     };
     EXPECT_EQ(exported(0), "3 cherry|\napple|\nbread|\n") << "without a set, all";
-    ASSERT_EQ(database_.Query("A != bread", QueryMode::New) + database_.SortBy("A", 0), 2);
+    Play("new A != bread: 2; sort A: 0");
     EXPECT_EQ(exported(0), "2 apple|\ncherry|\n");
     EXPECT_EQ(exported(1), "3 cherry|\napple|\nbread|\n");
 }
@@ -58,10 +49,9 @@ TEST_F(TextTest, ExportsAllOrTheSetInItsOrder) {
 // Several blocks, batches and lines across them.
 TEST_F(TextTest, WhatIsExportedLoadsBack) {
     std::vector<ROW> rows = {Row("big", 1, 0, 0, -std::numeric_limits<float>::max())};
-    for (int i = 0; i < 20'000; ++i) {
-        rows.push_back(Row("row " + std::string(static_cast<std::size_t>(i % 11), 'x'), i % 7, i % 1000 - 500,
-                           i * 1'000, static_cast<float>(i) / 4));
-    }
+    for (int i = 0; i < 20'000; ++i)
+        rows.push_back(
+            Row("row " + std::string(i % 11U, 'x'), i % 7, i % 1000 - 500, i * 1'000, static_cast<float>(i)));
     Append(rows);
     const auto count = static_cast<long>(rows.size());
     EXPECT_EQ(database_.Export(text_.c_str(), 1, "\t"), count);
@@ -74,16 +64,13 @@ TEST_F(TextTest, WhatIsExportedLoadsBack) {
     }
 }
 
-// A text that is loaded into a new file, how many records it has (from 1000 on, an error code), and their
-// text.
+// A text that is loaded into a new file, and the records' text or the error's code.
 TEST_F(TextTest, LinesThatAreLoaded) {
-    const std::vector<COLUMN_ENTRY> rows = RowColumns();
     const std::vector<COLUMN_ENTRY> one = {Column("A", ColumnType::String, 8)};
     const std::vector<COLUMN_ENTRY> two(2, Column("A", ColumnType::String, 4));
-    const std::vector<COLUMN_ENTRY> bytes(2,
-                                          Column("TagOfThirteen", ColumnType::Byte)); // wider than its text
+    const std::vector<COLUMN_ENTRY> bytes(2, Column("WiderThanText", ColumnType::Byte));
     const std::vector<COLUMN_ENTRY> number = {Column("A", ColumnType::Float)};
-    const std::string heading = "TagOfThirteen|TagOfThirteen|\n";
+    const std::string heading = "WiderThanText|WiderThanText|\n";
     const std::string lowest = "-340282346638528859811704183484516925440.00|\n";
     const std::string line = "a|1|1|1|1|1|1";
     const std::string out = "a|49|1|1|1.00|00010000|010000|\n";
@@ -92,55 +79,55 @@ TEST_F(TextTest, LinesThatAreLoaded) {
         const std::vector<COLUMN_ENTRY>& columns;
         const char* separators;
         std::string text;
-        long loaded;
-        std::string exported;
+        std::string outcome;
         int byteFormat = 1;
         bool hasHeading = false;
     } cases[] = {
-        {rows, "|\n", line + "\nb|c|1|2|3|19990105|091530\n", 2, full},
-        {rows, "|\n", line + "\n||b||c|1|2|3|19990105|091530|||more\n", 2, full},
-        {rows, "|\n", line + "\nseventeen letters|65|65537|4294967297|-1.5|1999|1",
-         2, // no newline at the end
+        {RowColumns, "|\n", line + "\nb|c|1|2|3|19990105|091530\n", full},
+        {RowColumns, "|\n", line + "\n||b||c|1|2|3|19990105|091530|||more\n", full},
+        {RowColumns, "|\n",
+         line + "\nseventeen letters|65|65537|4294967297|-1.5|1999|1", // no newline at the end
          out + "seventeen lette|54|1|1|-1.50|19990000|010000|\n"},
-        {rows, "|\n", line + "\nshort|-\n", 2, out + "short|45|0|0|0.00|00000000|000000|\n"},
-        {rows, "|\n", line + "\na|-|0|0|-nan\n", 2, out + "a|45|0|0|nan|00000000|000000|\n"},
-        {rows, "|\n", line + "\n||\n", 2, out + " |0|0|0|0.00|00000000|000000|\n"},
-        {rows, "|\n", "", 0, ""},
-        {rows, "|\n", "\n" + line + "\n\n\n" + line + "\n\n", 2, out + out},
-        {rows, "|\r\n", "\r\n" + line + "\r\n\r\n" + line + "\r\n\r", 2, out + out},
-        {rows, "|\n", line + "|1\n", 1802, ""},
-        {rows, "|", line + "|\n", 1802, ""}, // the newline is a field when it does not separate
-        {rows, "", line, 1802, ""},
-        {two, ",", "a,b\nc,d", 2, "a|b\n|\nc|d|\n"},
-        {one, "\n", "abcdefghijklmnopqrstuvwxy\nz\n0123456789\n", 5, // in pieces of ten characters
+        {RowColumns, "|\n", line + "\nshort|-\n", out + "short|45|0|0|0.00|00000000|000000|\n"},
+        {RowColumns, "|\n", line + "\na|-|0|0|-nan\n", out + "a|45|0|0|nan|00000000|000000|\n"},
+        {RowColumns, "|\n", line + "\n||\n", out + " |0|0|0|0.00|00000000|000000|\n"},
+        {RowColumns, "|\n", "", ""},
+        {RowColumns, "|\n", "\n" + line + "\n\n\n" + line + "\n\n", out + out},
+        {RowColumns, "|\r\n", "\r\n" + line + "\r\n\r\n" + line + "\r\n\r", out + out},
+        {RowColumns, "|\n", line + "|1\n", "1802"},
+        {RowColumns, "|", line + "|\n", "1802"}, // the newline is a field when it does not separate
+        {RowColumns, "", line, "1802"},
+        {two, ",", "a,b\nc,d", "a|b\n|\nc|d|\n"},
+        {one, "\n", "abcdefghijklmnopqrstuvwxy\nz\n0123456789\n", // in pieces of ten characters
          "abcdefg|\nklmnopq|\nuvwxy|\nz|\n0123456|\n"},
-        {number, "|\n", lowest, 1, lowest}, // what Export wrote is not read in pieces
-        {bytes, "|\n", "-7|300\nx|65|\n", 2, "45|51|\n120|54|\n"},
-        {bytes, "|\n", "-7|300\nx|65|\n", 2, "-7|44|\n0|65|\n", 2},
-        {bytes, "|\n", "one field\n-7|300\nx|65|\n", 2, heading + "-7|44|\n0|65|\n", 2, true},
-        {bytes, "|\n", "", 0, heading, 2, true},
-        {bytes, "|\n", "one field\n\n", 0, heading, 2, true},
-        {bytes, "|\n", "a|b\n1\n", 1802, heading, 2, true},
+        {number, "|\n", lowest, lowest}, // what Export wrote is not read in pieces
+        {bytes, "|\n", "-7|300\nx|65|\n", "45|51|\n120|54|\n"},
+        {bytes, "|\n", "-7|300\nx|65|\n", "-7|44|\n0|65|\n", 2},
+        {bytes, "|\n", "one field\n-7|300\nx|65|\n", heading + "-7|44|\n0|65|\n", 2, true},
+        {bytes, "|\n", "", heading, 2, true},
+        {bytes, "|\n", "one field\n\n", heading, 2, true},
+        {bytes, "|\n", "a|b\n1\n", "1802", 2, true},
     };
     for (const auto& lines : cases) {
         std::filesystem::remove(folder_.File("other.db"));
         database_.SetByteInputFormat(lines.byteFormat);
         database_.SetHeadingLine(lines.hasHeading);
-        const long loaded = LoadInto(lines.columns, lines.text, lines.separators);
-        const long code = CodeOf(loaded);
-        EXPECT_EQ(code != 0 ? code : loaded, lines.loaded) << lines.text;
-        ASSERT_EQ(database_.Export(text_.c_str(), 1, "|"), std::max(loaded, 0L));
-        EXPECT_EQ(folder_.Read("rows.txt"), lines.exported) << lines.text;
+        Create("other.db", lines.columns);
+        texts_.Write("load.txt", lines.text);
+        const long loaded = Run(std::string("load ") + lines.separators);
+        const bool refused = loaded > 1000;
+        EXPECT_EQ(database_.Export(text_.c_str(), 1, "|"), refused ? 0 : loaded);
+        EXPECT_EQ(refused ? std::to_string(loaded) : folder_.Read("rows.txt"), lines.outcome) << lines.text;
     }
 }
 
 TEST_F(TextTest, PathsThatAreRefused) {
-    EXPECT_EQ(Load("a|1|1|1|1|1|1\n", "|\n"), 1);
+    Append({newRow_});
     std::filesystem::create_symlink(path_, folder_.File("link"));
     const CONTENT content = ContentOf(database_);
     for (const std::string& path : {path_, folder_.File("link"), folder_.File(""), folder_.File("no/file")}) {
-        EXPECT_EQ(CodeOf(database_.Load(path.c_str(), "|\n")), 1801) << path;
-        EXPECT_EQ(CodeOf(database_.Export(path.c_str(), 1, "|")), 1901) << path;
+        EXPECT_EQ(Code(database_.Load(path.c_str(), "|\n")), 1801) << path;
+        EXPECT_EQ(Code(database_.Export(path.c_str(), 1, "|")), 1901) << path;
     }
     EXPECT_EQ(ContentOf(database_), content);
 }
