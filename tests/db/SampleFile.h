@@ -135,8 +135,7 @@ class RowsTest : public testing::Test {
         const long n = std::atol(text);
         ROW row = newRow_;
         const ROW three[] = {newRow_, Row("newer", 5, 6, 7, 8), newRow_};
-        const std::string load = texts_.File("load.txt"), save = texts_.File("export.txt"),
-                          separator(300, '-');
+        const std::string separator(300, '-');
         const std::map<std::string, std::function<long()>> operations = {
             {"new", [&] { return database_.Query(text, QueryMode::New); }},
             {"and", [&] { return database_.Query(text, QueryMode::And); }},
@@ -150,7 +149,6 @@ class RowsTest : public testing::Test {
             {"read", [&] { return database_.Read(n, &row); }},
             {"read-file", [&] { return database_.UnBufferedRead(n, &row); }},
             {"write", [&] { return database_.Write(n, &row); }},
-            {"update", [&] { return database_.Update(&row); }},
             {"delete", [&] { return database_.Delete(n); }},
             {"undelete", [&] { return database_.UnDelete(n); }},
             {"lose", [&] { return DATABASE(path_.c_str()).Delete(n); }}, // another deletes it
@@ -162,8 +160,8 @@ class RowsTest : public testing::Test {
             {"open", [&] { return database_.Open(path_.c_str()); }},
             {"sync", [&] { return database_.Sync(); }},
             {"compress", [&] { return database_.Compress(0); }},
-            {"load", [&] { return database_.Load(load.c_str(), text); }}, // separated by these
-            {"export", [&] { return database_.Export(save.c_str(), n != 0, separator.c_str()); }}};
+            {"load", [&] { return database_.Load(text_.c_str(), text); }}, // separated by these
+            {"export", [&] { return database_.Export(text_.c_str(), n != 0, separator.c_str()); }}};
         const long result = operations.at(operation)();
         const int code = Code(result);
         return code != 0 ? code : result;
@@ -192,7 +190,7 @@ class RowsTest : public testing::Test {
 
     const ROW newRow_ = Row("new", 1, 9, 1);
     TemporaryFolder folder_, texts_; // what is loaded and exported lies elsewhere
-    std::string path_ = folder_.File("rows.db");
+    std::string path_ = folder_.File("rows.db"), text_ = texts_.File("text");
     FaultyFiles files_;
     DATABASE database_{nullptr, files_};
 };

@@ -4,16 +4,7 @@
 
 namespace {
 
-class TextTest : public RowsTest {
-  protected:
-    std::string LineOf(const ROW& row, const char* separator = "|") const {
-        std::string line;
-        database_.FormatRecordData(&line, &row, separator);
-        return line;
-    }
-
-    std::string text_ = folder_.File("rows.txt");
-};
+using TextTest = RowsTest;
 
 TEST_F(TextTest, FieldsAsText) {
     using Limits = std::numeric_limits<float>;
@@ -24,21 +15,26 @@ TEST_F(TextTest, FieldsAsText) {
         {Row("sixteen letters!", 0, 0, 0, Limits::infinity(), {-128, -1, -32768}, {-1, -10, -128}),
          "sixteen letters!|0|0|0|inf|-32768-1-128|-128-10-1|\n"},
         {Row("x", 0, 0, 0, -Limits::quiet_NaN(), {1, 1, -5}), "x|0|0|0|nan|-0050101|120000|\n"}};
-    for (const auto& [row, line] : cases)
-        EXPECT_EQ(LineOf(row), line);
+    std::string line;
+    for (const auto& [row, expected] : cases) {
+        database_.FormatRecordData(&line, &row, "|");
+        EXPECT_EQ(line, expected);
+    }
     database_.SetByteOutputFormat(1);
-    EXPECT_EQ(LineOf(Row("a", 65), ", "), "a, A, 0, 0, 0.00, 20000101, 120000, \n");
+    database_.FormatRecordData(&line, &newRow_, ", ");
+    EXPECT_EQ(line, "new, \1, 9, 1, 0.00, 20000101, 120000, \n");
     database_.SetByteOutputFormat(3);
-    EXPECT_EQ(LineOf(Row("a", 65), nullptr), "a65000.0020000101120000\n");
+    database_.FormatRecordData(&line, &newRow_, nullptr);
+    EXPECT_EQ(line, "new1910.0020000101120000\n");
 }
 
 TEST_F(TextTest, ExportsAllOrTheSetInItsOrder) {
     Create("other.db", {Column("A", ColumnType::String, 8)});
-    texts_.Write("load.txt", "cherry\ngone\napple\nbread\n");
+    texts_.Write("text", "cherry\ngone\napple\nbread\n");
     Play("load \n: 4; delete 1: 0");
     const auto exported = [this](int all) {
         const long lines = database_.Export(text_.c_str(), all, "|");
-        return std::to_string(lines) + " " + folder_.Read("rows.txt");
+        return std::to_string(lines) + " " + texts_.Read("text");
     };
     EXPECT_EQ(exported(0), "3 cherry|\napple|\nbread|\n") << "without a set, all";
     Play("new A != bread: 2; sort A: 0");
@@ -53,9 +49,8 @@ TEST_F(TextTest, WhatIsExportedLoadsBack) {
         rows.push_back(
             Row("row " + std::string(i % 11U, 'x'), i % 7, i % 1000 - 500, i * 1'000, static_cast<float>(i)));
     Append(rows);
-    const auto count = static_cast<long>(rows.size());
-    EXPECT_EQ(database_.Export(text_.c_str(), 1, "\t"), count);
-    EXPECT_EQ(database_.Load(text_.c_str(), "\t\n"), count);
+    EXPECT_EQ(database_.Export(text_.c_str(), 1, "\t"), std::ssize(rows));
+    EXPECT_EQ(database_.Load(text_.c_str(), "\t\n"), std::ssize(rows));
     const CONTENT content = ContentOf(database_);
     EXPECT_EQ(database_.Update(&rows.back()), 0) << "the last one is current";
     for (std::size_t i = 0; i < rows.size(); ++i) {
@@ -113,11 +108,11 @@ TEST_F(TextTest, LinesThatAreLoaded) {
         database_.SetByteInputFormat(lines.byteFormat);
         database_.SetHeadingLine(lines.hasHeading);
         Create("other.db", lines.columns);
-        texts_.Write("load.txt", lines.text);
+        texts_.Write("text", lines.text);
         const long loaded = Run(std::string("load ") + lines.separators);
         const bool refused = loaded > 1000;
         EXPECT_EQ(database_.Export(text_.c_str(), 1, "|"), refused ? 0 : loaded);
-        EXPECT_EQ(refused ? std::to_string(loaded) : folder_.Read("rows.txt"), lines.outcome) << lines.text;
+        EXPECT_EQ(refused ? std::to_string(loaded) : texts_.Read("text"), lines.outcome) << lines.text;
     }
 }
 
