@@ -28,16 +28,15 @@ TEST(Strings, AreChangedInPlace) {
 }
 
 TEST(Strings, CompareWithoutLetterCase) {
-    const std::string longText(200, 'x');
-    EXPECT_EQ(strcmpi((longText + "A\xC3\xA4").c_str(), (longText + "a\xC3\xA4").c_str()), 0);
+    const std::string start(200, 'x');
+    EXPECT_EQ(strcmpi((start + "A\xC3\xA4").c_str(), (start + "a\xC3\xA4").c_str()), 0);
     // As lower case, not as upper case, and as unsigned bytes.
-    for (const auto& [a, b] : {std::pair(longText + "a", longText + "b"),
-                               {"ab", "ABC"},
-                               {"_", "Z"},
-                               {"a", "\xC3\xA4"},
-                               {"\xC3\xA4X", "\xC3\xA4x"}}) {
-        EXPECT_LT(strcmpi(a.c_str(), b.c_str()), 0) << a << " " << b;
-        EXPECT_GT(strcmpi(b.c_str(), a.c_str()), 0) << a << " " << b;
+    std::string before = start;
+    for (const char* end : {"_", "a", "ab", "ABC", "b", "Z", "\xC3\xA4X", "\xC3\xA4x"}) {
+        const std::string next = start + end;
+        EXPECT_LT(strcmpi(before.c_str(), next.c_str()), 0) << end;
+        EXPECT_GT(strcmpi(next.c_str(), before.c_str()), 0) << end;
+        before = next;
     }
 }
 
@@ -109,8 +108,8 @@ TEST(Paths, SplitAndJoin) {
 TEST(DebugLog, AppendsAsGivenAndClears) {
     const TemporaryFolder folder;
     const std::string log = folder.File("log");
-    for (const char* text : {"100% %s\n", "CLEARX"})
-        PrintDebugStatement(text, log.c_str());
+    PrintDebugStatement("100% %s\n", log.c_str());
+    PrintDebugStatement("CLEARX", log.c_str());
     EXPECT_EQ(std::filesystem::status(log).permissions(), std::filesystem::perms{0600});
     EXPECT_EQ(folder.Read("log"), "100% %s\nCLEARX");
     PrintDebugStatement("CLEAR", log.c_str());
@@ -154,12 +153,13 @@ TEST(Numbers, ReadsTheNumberAtTheStart) {
 }
 
 TEST(Dates, KnowTheCalendar) {
-    const std::tuple<int, int, int, int> cases[] = {{1900, 2, 29, 1},  {2000, 2, 29, 0},  {2004, 2, 29, 0},
-                                                    {2001, 2, 29, 1},  {2001, 4, 31, 1},  {2001, 4, 30, 0},
-                                                    {2001, 12, 31, 0}, {2001, 12, 32, 1}, {2001, 13, 1, 1},
-                                                    {2001, 0, 1, 1},   {2001, 1, 0, 1}};
-    for (const auto& [year, month, day, missing] : cases)
-        EXPECT_EQ(CheckDate(year, month, day), missing) << year << "-" << month << "-" << day;
+    EXPECT_EQ(CheckDate(2000, 2, 29) + CheckDate(2004, 2, 29) + CheckDate(2001, 4, 30) +
+                  CheckDate(2001, 12, 31),
+              0);
+    EXPECT_EQ(CheckDate(1900, 2, 29) + CheckDate(2001, 2, 29) + CheckDate(2001, 4, 31) +
+                  CheckDate(2001, 12, 32) + CheckDate(2001, 13, 1) + CheckDate(2001, 0, 1) +
+                  CheckDate(2001, 1, 0),
+              7);
     const auto written = [](std::string text, int style) {
         text.resize(FormatDateSize);
         EXPECT_EQ(FormatDate(text.data(), text.data(), style), 0);
@@ -172,10 +172,9 @@ TEST(Dates, KnowTheCalendar) {
               "; 13 05, 2024; 00 05, 2024; 00-00-0; ");
 }
 
-TEST(Dates, TellTheDayAndTheTimeOnATwelveHourClock) {
-    const std::pair<int, int> cases[] = {{0, 0}, {12, 12}, {13, 1}};
-    for (const auto& [clock, shown] : cases) {
-        int year = 0, month = 0, day = 0, hour = -1, minute = -1, second = -1;
+TEST(Dates, TellTheTimeOnATwelveHourClock) {
+    for (const auto& [clock, shown] : {std::pair(0, 0), {12, 12}, {13, 1}}) {
+        int hour = -1, minute = -1, second = -1;
         std::time_t before = 0;
         do { // again should the clock strike in between
             before = std::time(nullptr);
@@ -183,11 +182,8 @@ TEST(Dates, TellTheDayAndTheTimeOnATwelveHourClock) {
             setenv("TZ", ("TST" + std::to_string((before / 3600 - clock) % 24)).c_str(), 1);
             tzset();
             GetTime(&hour, &minute, &second);
-            GetDate(&year, &month, &day);
         } while (std::time(nullptr) != before);
-        const std::tm now = *std::localtime(&before);
-        EXPECT_EQ(std::tuple(year - 1900, month - 1, day, hour, minute, second),
-                  std::tuple(now.tm_year, now.tm_mon, now.tm_mday, shown, now.tm_min, now.tm_sec));
+        EXPECT_EQ(std::tuple(hour, minute, second), std::tuple(shown, before / 60 % 60, before % 60));
     }
     GetDate(nullptr, nullptr, nullptr);
 }
