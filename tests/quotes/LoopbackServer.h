@@ -8,7 +8,6 @@
 #include <functional>
 #include <memory>
 #include <mutex>
-#include <netinet/in.h>
 #include <string>
 #include <sys/socket.h>
 #include <thread>
@@ -31,46 +30,41 @@ struct Reply {
 // A listening or merely reserved TCP socket on 127.0.0.1.
 class LoopbackSocket {
   public:
-    LoopbackSocket() : fd_(socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0)) {
-        sockaddr_in address{};
-        address.sin_family = AF_INET;
-        address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
-        socklen_t size = sizeof address;
-        if (bind(fd_, reinterpret_cast<sockaddr*>(&address), size) == 0)
-            getsockname(fd_, reinterpret_cast<sockaddr*>(&address), &size);
-        port_ = ntohs(address.sin_port);
+    LoopbackSocket() {
+        auto* const address = reinterpret_cast<sockaddr*>(&address_);
+        socklen_t size = sizeof address_;
+        bind(fd_, address, size);
+        getsockname(fd_, address, &size);
     }
     LoopbackSocket(const LoopbackSocket&) = delete;
     LoopbackSocket& operator=(const LoopbackSocket&) = delete;
     ~LoopbackSocket() { close(fd_); }
 
     [[nodiscard]] int Fd() const { return fd_; }
-    [[nodiscard]] std::uint16_t Port() const { return port_; }
+    [[nodiscard]] std::uint16_t Port() const { return ntohs(address_.sin_port); }
     // As a quote source's host field. Nobody listens unless listen was called: a connection is refused.
-    [[nodiscard]] std::string Host() const { return "127.0.0.1:" + std::to_string(port_); }
+    [[nodiscard]] std::string Host() const { return "127.0.0.1:" + std::to_string(Port()); }
 
   private:
-    int fd_;
-    std::uint16_t port_ = 0;
+    int fd_ = socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0);
+    sockaddr_in address_{AF_INET, 0, {htonl(INADDR_LOOPBACK)}, {}};
 };
 
 // How the bytes of one connection go in and out: -1 or 0 when it is over. The socket is the server's.
-class ServerStream {
-  public:
-    explicit ServerStream(int fd) : fd_(fd) {}
+struct ServerStream {
+    explicit ServerStream(int socket) : fd(socket) {}
     virtual ~ServerStream() = default;
-    virtual long Read(char* bytes, std::size_t size) { return read(fd_, bytes, size); }
-    virtual long Write(const std::string& bytes) { return write(fd_, bytes.data(), bytes.size()); }
+    virtual long Read(char* bytes, std::size_t size) { return read(fd, bytes, size); }
+    virtual long Write(const std::string& bytes) { return write(fd, bytes.data(), bytes.size()); }
     virtual void Finish() {}
 
-  private:
-    int fd_;
+    const int fd;
 };
 
 // An HTTP server on 127.0.0.1 with a thread of its own. It serves one connection after another, reads the
 // request up to its empty line, records it and does what the test says. It is there from construction to
 // destruction, which never waits for a client: it shuts down what the thread is blocked on.
-class LoopbackServer {
+class LoopbackServer : public LoopbackSocket {
   public:
     using Answer = std::function<Reply(const std::string& request)>; // called on the server's thread
     using StreamMaker = std::function<std::unique_ptr<ServerStream>(int fd)>;
@@ -79,8 +73,8 @@ class LoopbackServer {
     explicit LoopbackServer(
         Answer answer, StreamMaker makeStream = [](int fd) { return std::make_unique<ServerStream>(fd); })
         : answer_(std::move(answer)), makeStream_(std::move(makeStream)) {
-        listen(socket_.Fd(), 64);
-        thread_ = std::thread([this] { Run(); });
+        listen(Fd(), 64);
+        thread_ = std::jthread([this] { Run(); });
     }
     // The same reply for every connection.
     explicit LoopbackServer(const Reply& reply)
@@ -88,14 +82,10 @@ class LoopbackServer {
     ~LoopbackServer() {
         Change([this] {
             stopping_ = true;
-            shutdown(socket_.Fd(), SHUT_RDWR);
+            shutdown(Fd(), SHUT_RDWR);
             shutdown(connection_, SHUT_RDWR);
         });
-        thread_.join();
     }
-
-    [[nodiscard]] std::uint16_t Port() const { return socket_.Port(); }
-    [[nodiscard]] std::string Host() const { return socket_.Host(); }
 
     [[nodiscard]] std::vector<std::string> Requests() const {
         const std::lock_guard lock(mutex_);
@@ -124,7 +114,7 @@ class LoopbackServer {
         sigfillset(&all);
         pthread_sigmask(SIG_BLOCK, &all, nullptr);
         for (bool stopped = false; !stopped;) {
-            const int fd = accept4(socket_.Fd(), nullptr, nullptr, SOCK_CLOEXEC);
+            const int fd = accept4(Fd(), nullptr, nullptr, SOCK_CLOEXEC);
             Change([&] {
                 connection_ = fd;
                 stopped = stopping_;
@@ -162,11 +152,10 @@ class LoopbackServer {
 
     Answer answer_;
     StreamMaker makeStream_;
-    LoopbackSocket socket_;
     mutable std::mutex mutex_;
     mutable std::condition_variable changed_;
     std::vector<std::string> requests_;
     int connection_ = -1;
     bool stopping_ = false;
-    std::thread thread_; // last, since it uses all of the above
+    std::jthread thread_; // last, since it uses all of the above
 };

@@ -19,15 +19,14 @@ class TlsIdentity {
         X509_set_version(certificate.get(), 2);
         X509_gmtime_adj(X509_getm_notBefore(certificate.get()), -3600);
         X509_gmtime_adj(X509_getm_notAfter(certificate.get()), 3600);
+        const unsigned char text[] = "test";
         X509_NAME* name = X509_get_subject_name(certificate.get());
-        X509_NAME_add_entry_by_txt(name, "CN", MBSTRING_ASC, reinterpret_cast<const unsigned char*>("test"),
-                                   -1, -1, 0);
+        X509_NAME_add_entry_by_NID(name, NID_commonName, MBSTRING_ASC, text, 4, -1, 0);
         X509_set_issuer_name(certificate.get(), name);
         X509_set_pubkey(certificate.get(), key.get());
-        X509_EXTENSION* extension =
-            X509V3_EXT_conf_nid(nullptr, nullptr, NID_subject_alt_name, names.c_str());
-        X509_add_ext(certificate.get(), extension, -1);
-        X509_EXTENSION_free(extension);
+        const std::unique_ptr<X509_EXTENSION, decltype(&X509_EXTENSION_free)> alternatives(
+            X509V3_EXT_conf_nid(nullptr, nullptr, NID_subject_alt_name, names.c_str()), X509_EXTENSION_free);
+        X509_add_ext(certificate.get(), alternatives.get(), -1);
         X509_sign(certificate.get(), key.get(), EVP_sha256());
         SSL_CTX_use_certificate(context_.get(), certificate.get());
         SSL_CTX_use_PrivateKey(context_.get(), key.get());
@@ -45,22 +44,20 @@ class TlsIdentity {
     std::shared_ptr<SSL_CTX> context_{SSL_CTX_new(TLS_server_method()), SSL_CTX_free};
 };
 
-class TlsStream : public ServerStream {
-  public:
-    TlsStream(int fd, SSL_CTX* context) : ServerStream(fd), ssl_(SSL_new(context), SSL_free) {
-        SSL_set_fd(ssl_.get(), fd);
-        SSL_set_accept_state(ssl_.get());
+struct TlsStream : ServerStream {
+    TlsStream(int socket, SSL_CTX* context) : ServerStream(socket), ssl(SSL_new(context), SSL_free) {
+        SSL_set_fd(ssl.get(), fd);
+        SSL_set_accept_state(ssl.get());
     }
     long Read(char* bytes, std::size_t size) override {
-        return SSL_read(ssl_.get(), bytes, static_cast<int>(size));
+        return SSL_read(ssl.get(), bytes, static_cast<int>(size));
     }
     long Write(const std::string& bytes) override {
-        return SSL_write(ssl_.get(), bytes.data(), static_cast<int>(bytes.size()));
+        return SSL_write(ssl.get(), bytes.data(), static_cast<int>(bytes.size()));
     }
-    void Finish() override { SSL_shutdown(ssl_.get()); }
+    void Finish() override { SSL_shutdown(ssl.get()); }
 
-  private:
-    std::unique_ptr<SSL, decltype(&SSL_free)> ssl_;
+    const std::unique_ptr<SSL, decltype(&SSL_free)> ssl;
 };
 
 // A loopback server behind TLS.
