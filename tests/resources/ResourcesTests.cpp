@@ -2,7 +2,6 @@
 
 #include <QApplication>
 #include <QIcon>
-#include <QImage>
 
 #include "platform/Application.h"
 #include "resources/DesktopFiles.h"
@@ -24,14 +23,11 @@ TEST(DesktopFiles, AreWhatDesktopsExpect) {
     Shell files;
     files.Write("a.desktop", std::string(DesktopEntryTemplate()));
     files.Write(id + ".metainfo.xml", std::string(ProgramMetainfo()));
-    EXPECT_EQ(files.Run("desktop-file-validate --warn-kde a.desktop 2>&1"), 0);
-    EXPECT_EQ(files.Output(), "");
-    EXPECT_EQ(files.Run("appstreamcli validate --no-net --pedantic *.xml 2>&1"), 0) << files.Output();
-    EXPECT_FALSE(files.Says("pedantic:"));
-    EXPECT_EQ(files.Run("cat * | grep -c -e '^Icon=" + id + "$' -e '<id>" + id +
-                        "</id>' -e '<release version=\"" QUORVAN_VERSION "\"'"),
-              0);
-    EXPECT_EQ(files.Output(), "3\n");
+    files.Run("desktop-file-validate --warn-kde a.desktop; appstreamcli validate --no-net --pedantic *.xml "
+              ">said || "
+              "cat said; grep pedantic: said; cat *.* | grep -c -e '^Icon=" +
+              id + "$' -e '<id>" + id + "</id>' -e '<release version=\"" QUORVAN_VERSION "\"'");
+    EXPECT_EQ(files.Output() + files.Errors(), "3\n");
 }
 
 TEST(DesktopFiles, WindowsShowTheIconSharpAtEverySize) {

@@ -176,8 +176,9 @@ TEST_F(FolderLockTest, IsHeldByOneAndNamesItUntilReleased) {
     FolderLock second;
     EXPECT_EQ(second.Take(folder_.Path(), "quorvan-cli", FolderLock::Doubt::PassOver), Outcome::Held);
     const FolderHolder& holder = second.Holder();
-    EXPECT_EQ(std::tuple(holder.program, holder.process, holder.host, holder.since.size()),
-              std::tuple("quorvan", getpid(), OwnHost, 19U));
+    EXPECT_EQ(DescribeHolder(holder), "quorvan (process " + std::to_string(getpid()) + " on the computer " +
+                                          OwnHost + ", since " + holder.since + ")");
+    EXPECT_EQ(holder.since.size(), 19U);
     second.Release();
     EXPECT_EQ(folder_.Read(LockName), text);
     lock_.Release();
@@ -206,19 +207,15 @@ TEST_F(FolderLockTest, DoubtsWhatTheSystemsLockDoesNotTell) {
         FolderLock lock(call);
         EXPECT_EQ(lock.Take(folder_.Path(), "quorvan"), outcome);
         EXPECT_EQ(lock.IsTaken(), outcome == Outcome::Taken);
-        if (outcome == Outcome::Doubtful) {
-            EXPECT_EQ(folder_.Read(LockName), text);
-            EXPECT_EQ(lock.Take(folder_.Path(), "quorvan", FolderLock::Doubt::PassOver), Outcome::Taken);
-        }
-        EXPECT_EQ(folder_.Read(LockName).find(LockText(OwnHost, getpid()) + "since: "), 0U);
-        EXPECT_LT(folder_.Read(LockName).size(), 400U);
+        EXPECT_EQ(folder_.Read(LockName) == text, outcome == Outcome::Doubtful);
+        EXPECT_EQ(lock.Take(folder_.Path(), "quorvan", FolderLock::Doubt::PassOver), Outcome::Taken);
+        const std::string taken = folder_.Read(LockName); // 20 bytes of it are the time
+        EXPECT_EQ(taken.substr(0, taken.size() - 20), LockText(OwnHost, getpid()) + "since: ");
     }
 }
 
 TEST_F(FolderLockTest, DescribesItsHolderInOneLine) {
     EXPECT_EQ(DescribeHolder({}), "another program");
-    EXPECT_EQ(DescribeHolder({"quorvan", 4711, "desk", "2026-11-22 14:03:07"}),
-              "quorvan (process 4711 on the computer desk, since 2026-11-22 14:03:07)");
     folder_.Write(LockName, "program: " + std::string(500, 'x') + "\nhost: a\rb\nprocess: 5\n");
     ASSERT_EQ(Take(), Outcome::Doubtful);
     EXPECT_EQ(DescribeHolder(lock_.Holder()), std::string(100, 'x') + " (process 5 on the computer a?b)");
@@ -258,8 +255,8 @@ TEST_F(FolderLockTest, LetsOneOfManyInAtATime) {
             FolderLock lock;
             if (lock.Take(folder_.Path(), "quorvan") != Outcome::Taken)
                 continue;
-            met += mkdir(inside.c_str(), 0700) == 0 ? 0 : 1;
-            rmdir(inside.c_str());
+            met += symlink("nowhere", inside.c_str()) == 0 ? 0 : 1;
+            unlink(inside.c_str());
             ++done;
         }
     };

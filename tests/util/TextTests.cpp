@@ -14,17 +14,20 @@
 
 namespace {
 
+// The text that is left of one in a long buffer.
+template <class Change>
+std::string Left(const Change& change, std::string text = "") {
+    text.resize(128);
+    change(text.data());
+    return text.c_str() + std::string("|");
+}
+
 TEST(Strings, AreChangedInPlace) {
-    const auto changed = [](void (*change)(char*), std::string text) {
-        change(text.data());
-        return text.c_str() + std::string("|");
-    };
-    EXPECT_EQ(changed(Trim, "  a b \n \n") + changed(Trim, "   ") + changed(Trim, "abc\t\r\n"),
-              "  a b||abc\t\r|");
+    EXPECT_EQ(Left(Trim, "  a b \n \n") + Left(Trim, "   ") + Left(Trim, "abc\t\r\n"), "  a b||abc\t\r|");
     // The first byte beyond ASCII ends the changing of letters.
-    EXPECT_EQ(changed(strlwr, "ABC[Z@`{") + changed(strlwr, "A\xC3\x84Z"), "abc[z@`{|a\xC3\x84Z|");
-    EXPECT_EQ(changed(strupr, "abc`z{@[") + changed(strupr, "a\xC3\xA4z"), "ABC`Z{@[|A\xC3\xA4z|");
-    EXPECT_EQ(changed([](char* text) { ReplaceCharacter(text, '/', '_'); }, "a/b/"), "a_b_|");
+    EXPECT_EQ(Left(strlwr, "ABC[Z@`{") + Left(strlwr, "A\xC3\x84Z"), "abc[z@`{|a\xC3\x84Z|");
+    EXPECT_EQ(Left(strupr, "abc`z{@[") + Left(strupr, "a\xC3\xA4z"), "ABC`Z{@[|A\xC3\xA4z|");
+    EXPECT_EQ(Left([](char* text) { ReplaceCharacter(text, '/', '_'); }, "a/b/"), "a_b_|");
 }
 
 TEST(Strings, CompareWithoutLetterCase) {
@@ -116,26 +119,22 @@ TEST(DebugLog, AppendsAsGivenAndClears) {
     EXPECT_EQ(folder.Read("log"), "");
 }
 
-// The values as FormatNumber writes them, a blank behind each.
 std::string Grouped(std::initializer_list<float> values, int decimals) {
     std::string all;
-    for (const float value : values) {
-        char text[FormatNumberSize];
-        FormatNumber(value, text, decimals);
-        all.append(text).append(" ");
-    }
+    for (const float value : values)
+        all += Left([&](char* text) { FormatNumber(value, text, decimals); });
     return all;
 }
 
 TEST(Numbers, GroupsThousands) {
     constexpr float infinity = std::numeric_limits<float>::infinity();
     EXPECT_EQ(Grouped({1234567.0F, -1234.0F, 1234.5F, 12345.5F, -123.0F, 999.999F, -0.001F}, 2),
-              "1,234,567.00 -1,234.00 1234.50 12,345.50 -123.00 1000.00 -0.00 ");
-    EXPECT_EQ(Grouped({0.125F, 0.375F, infinity, -infinity, -std::nanf("")}, 2), "0.12 0.38 inf -inf nan ");
-    EXPECT_EQ(Grouped({-123456792.0F, 1e13F}, 0), "-123,456,792 9999,999,827,968 ");
+              "1,234,567.00|-1,234.00|1234.50|12,345.50|-123.00|1000.00|-0.00|");
+    EXPECT_EQ(Grouped({0.125F, 0.375F, infinity, -infinity, -std::nanf("")}, 2), "0.12|0.38|inf|-inf|nan|");
+    EXPECT_EQ(Grouped({-123456792.0F, 1e13F}, 0), "-123,456,792|9999,999,827,968|");
     EXPECT_EQ(Grouped({1e27F, 1e29F, -std::numeric_limits<float>::max()}, 2),
-              "999999988484154753,734,934,528.00 1.00e+29 -3.40e+38 "); // from 32 characters on
-    EXPECT_EQ(Grouped({1.0F}, 1000), "1.00000000000000000000e+00 ");
+              "999999988484154753,734,934,528.00|1.00e+29|-3.40e+38|"); // from 32 characters on
+    EXPECT_EQ(Grouped({1.0F}, 1000), "1.00000000000000000000e+00|");
     char text[8];
     EXPECT_TRUE(FormatFixed(-12.3456, text, sizeof text, 3));
     EXPECT_STREQ(text, "-12.346");
@@ -160,16 +159,14 @@ TEST(Dates, KnowTheCalendar) {
                   CheckDate(2001, 12, 32) + CheckDate(2001, 13, 1) + CheckDate(2001, 0, 1) +
                   CheckDate(2001, 1, 0),
               7);
-    const auto written = [](std::string text, int style) {
-        text.resize(FormatDateSize);
-        EXPECT_EQ(FormatDate(text.data(), text.data(), style), 0);
-        return text.c_str() + std::string("; ");
+    const auto written = [](const char* date, int style) {
+        return Left([style](char* text) { EXPECT_EQ(FormatDate(text, text, style), 0); }, date);
     };
     EXPECT_EQ(written("19991231", 0) + written("19991231", 1) + written("20240905", 2) +
                   written("20240905", 3),
-              "Dec 31, 1999; 12-31-1999; September 05, 2024; 20240905; ");
+              "Dec 31, 1999|12-31-1999|September 05, 2024|20240905|");
     EXPECT_EQ(written("", 0) + written("20241305", 0) + written("20240005", 2) + written("abc", 1),
-              "; 13 05, 2024; 00 05, 2024; 00-00-0; ");
+              "|13 05, 2024|00 05, 2024|00-00-0|");
 }
 
 TEST(Dates, TellTheTimeOnATwelveHourClock) {
