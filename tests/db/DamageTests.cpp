@@ -5,8 +5,7 @@ namespace {
 
 enum Kind { Sound, Broken, Mended }; // by a repair, which sets counts right
 
-// A file of four records of which one is deleted and one locked, whose bytes are damaged, checked and
-// repaired.
+// A file of four records whose bytes are damaged, checked and repaired.
 class DamageTest : public RowsTest {
   protected:
     DamageTest() {

@@ -28,8 +28,7 @@ const OPERATION Operations[] = {
     {"export 1", 149, {1901, 1901, 1909, 1909}, false, false, false},      // in more than one block
 };
 
-// Tells whether the content is the old one or, where an operation works record by record, that of some moment
-// between.
+// Whether the content is the old one or, where an operation works by record, that of a moment between.
 bool IsUnfinished(const CONTENT& found, const CONTENT& old, const CONTENT& changed, bool byRecord) {
     bool whole = byRecord && found.size() >= old.size() && found.size() <= changed.size();
     for (std::size_t i = 0; whole && i < found.size(); ++i)
@@ -37,8 +36,7 @@ bool IsUnfinished(const CONTENT& found, const CONTENT& old, const CONTENT& chang
     return whole || found == old;
 }
 
-// On a file of 150 records of which 1 is deleted and 3 locked, and behind which lie three more of an append
-// that was interrupted.
+// Behind 150 records, of which 1 is deleted and 3 locked, lie three of an interrupted append.
 class FaultTest : public RowsTest {
   protected:
     FaultTest() {
@@ -72,8 +70,7 @@ class FaultTest : public RowsTest {
         return code;
     }
 
-    // What the file holds for whoever opens it next. The check finds nothing but counts to mend, and mending
-    // them changes no record.
+    // What the file holds for whoever opens it next. The check mends counts at most, and changes no record.
     CONTENT Reopened() {
         EXPECT_GE(RestoreCompactionBackup(path_.c_str()), 0);
         DATABASE database(path_.c_str());
@@ -130,8 +127,7 @@ TEST_F(FaultTest, FailedOrKilledLeavesTheOldContentOrTheNew) {
                 if (reopened)
                     ASSERT_GE(RestoreCompactionBackup(path_.c_str()) + Run("open"), 0);
                 const CONTENT found = ContentOf(database_);
-                // A disk that takes nothing any more cannot be given back the old bytes, but never is
-                // anything shown that it does not hold.
+                // A broken disk cannot be given back the old bytes, but nothing is shown that it lacks.
                 EXPECT_TRUE(fault == Fault::Broken || ((code == 0 || reopened) && found == changed) ||
                             (code != 0 && IsUnfinished(found, old, changed, operation.byRecord)));
                 EXPECT_EQ(Reopened(), found);

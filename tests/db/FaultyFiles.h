@@ -25,8 +25,7 @@ enum class Fault {
     KilledAfter,   // the process ends after the call
 };
 
-// The system's file operations, of which one call that changes something meets a fault. A read gives half of
-// what is asked for. At the end no file may be open.
+// The system's files, of which one call meets a fault. A read gives half. At the end no file may be open.
 class FaultyFiles : public FileOperations {
     using System = FileOperations;
 
@@ -42,8 +41,8 @@ class FaultyFiles : public FileOperations {
     }
     // Tells whether that call was reached, and lets nothing fail from now on.
     bool Disarm() { return std::exchange(at_, -1) < calls_; }
-    // A letter for each change so far: of a new file (n), write, truncation, sync, owner, mode, rename and
-    // removal (x); - for one that `may` forbade.
+    // A letter for each change: new file, write, truncate, sync, owner, mode, rename, x to remove, - if
+    // forbidden.
     [[nodiscard]] const std::string& Order() const { return order_; }
     // Whether changes reached the disk since this was last asked, and all of them.
     [[nodiscard]] bool HaveSynced() { return std::exchange(order_, "").ends_with('s'); }

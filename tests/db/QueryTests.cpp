@@ -80,8 +80,7 @@ TEST_F(QueryTest, RefusesAndKeepsTheSetAndTheFile) {
     Play("new Name = " + token31 + ": 0; new Name = x" + std::string(119, '\t') + ": 0");
 }
 
-// Step by step: what an operation answers or its error code, the set in its order, and * when it lacks any of
-// the active records.
+// Each step's outcome, the set in its order, and * when it lacks any of the active records.
 TEST_F(QueryTest, SetsFromStepToStep) {
     for (const auto& [step, outcome] :
          Cases("and Tag > 0: 1607 -; or: 1607 -; new: 5 01234; and Tag > 0: 3 124*; and Small >= 0: 2 24*; "
@@ -131,8 +130,7 @@ TEST_F(QueryTest, WalkKeepsWithinTheSetOfTheMoment) {
         EXPECT_EQ(database_.QueryGetXXX(start, step, nullptr), nullptr) << start << " " << step;
 }
 
-// Every way to compare texts agrees with the comparison of two plain strings, whatever the column's width and
-// wherever letters beyond ASCII stand.
+// Whatever the column's width and wherever letters beyond ASCII stand.
 TEST_F(RowsTest, TextQueriesAgreeWithPlainComparison) {
     std::mt19937 random(20260101);
     const auto text = [&](std::size_t longest) {

@@ -37,8 +37,7 @@ void BubbleSort(const std::vector<ROW>& rows, int column, std::vector<long>* ord
                 std::swap((*order)[i - 1], (*order)[i]);
 }
 
-// Of few records, and of so many that they are sorted without comparing them. One after the other, each sort
-// begins with the order that the one before has left.
+// Of few records, and of so many that they are sorted without comparing them; each from the order before.
 TEST_F(SortTest, OrderIsThatOfABubbleSort) {
     std::mt19937 random(20260101);
     for (const auto& [count, rounds] : {std::pair(60, 200), {1500, 14}}) {

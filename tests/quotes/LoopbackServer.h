@@ -61,9 +61,8 @@ struct ServerStream {
     const int fd;
 };
 
-// An HTTP server on 127.0.0.1 with a thread of its own. It serves one connection after another, reads the
-// request up to its empty line, records it and does what the test says. It is there from construction to
-// destruction, which never waits for a client: it shuts down what the thread is blocked on.
+// An HTTP server on 127.0.0.1 with a thread of its own. It serves one connection after another: it records
+// the request up to its empty line and does what the test says. Its end never waits for a client.
 class LoopbackServer : public LoopbackSocket {
   public:
     using Answer = std::function<Reply(const std::string& request)>; // called on the server's thread

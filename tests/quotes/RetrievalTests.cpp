@@ -1,11 +1,8 @@
 #include <gtest/gtest.h>
 
-#include <cstdlib>
 #include <future>
 #include <poll.h>
 #include <semaphore>
-#include <string>
-#include <vector>
 
 #include "QuoteTest.h"
 #include "TlsServer.h"
@@ -70,17 +67,10 @@ const std::string Page = "HTTP/1.0 200 OK\r\n\r\n<td>Last</td><td><b>45 3/8</b><
 const std::string Asked = "In GetQuote\n";
 const std::string Created = Asked + "gethostname() ok\nsocket created ok\n";
 
-struct Answered {
-    Reply reply;
-    std::string log;
-    float price;
-    int redirects = 0;
-};
-
 TEST_F(Retrieval, AsksByABareRequestAndLogsEveryStep) {
     const std::string request = "GET /q?s=ABC HTTP/1.0\n\n";
     const std::string found = "found tag\nskipped ok\nvalue string is '", start(1022, 'x');
-    const Answered cases[] = {
+    const std::tuple<Reply, std::string, float> cases[] = {
         {{{Page}, End::Hold}, found + "45'\nReturning price = 45.38\nPrice = 45.38\n", 45.375F},
         // Of each receive of 1024 bytes for itself.
         {{{start + "Last>>>7 Last>>>8"}}, found + "8'\nReturning price = 8.00\nPrice = 8.00\n", 8},
@@ -88,10 +78,10 @@ TEST_F(Retrieval, AsksByABareRequestAndLogsEveryStep) {
         {{{}, End::Reset}, "recv() error\nReturning price = -4.00\n", NoQuote},
     };
     const std::string asked = "/q?s=ABC'\n" + Created + "connected ok\n" + request;
-    for (const auto& c : cases) {
-        LoopbackServer server(c.reply);
-        EXPECT_EQ(Ask(server.Host()), c.price) << c.log;
-        EXPECT_EQ(Log(), "Checking '" + server.Host() + asked + c.log);
+    for (const auto& [reply, log, price] : cases) {
+        LoopbackServer server(reply);
+        EXPECT_EQ(Ask(server.Host()), price) << log;
+        EXPECT_EQ(Log(), "Checking '" + server.Host() + asked + log);
         EXPECT_EQ(server.Requests(), std::vector{request});
     }
 }
@@ -112,23 +102,24 @@ TEST_F(Retrieval, ScansAPageBehindTlsInOnePiece) {
 
 TEST_F(Retrieval, OnceAskedTheAnswerBehindTlsCountsWhateverItsEnd) {
     LoopbackServer plain(Reply{{Page}});
-    const Answered cases[] = {
-        {{{Page}}, "value string is '45'\n", 45.375F, 5},
-        {{{Page}}, "https error: Maximum (5) redirects followed\n", NoQuote, 6},
-        {Redirect("http://" + plain.Host()), "https error: Protocol \"http\" not supported", NoQuote},
-        {{{"HTTP/1.0 404 Not Found\r\n\r\n" + Page}}, "value string is '45'\n", 45.375F},
-        {{{Page, std::string(100'000, 'x')}, End::Endless}, "the page has more than 10 MB\n", 45.375F},
-        {{}, "https error: ", NoQuote},
-        {{{Page.substr(0, 30)}, End::Reset}, "https error: ", NoQuote},
-        {{{"HTTP/1.0 200 OK\r\nContent-Length: 999\r\n\r\n" + Page}}, "https error: ", 45.375F},
+    const std::tuple<int, Reply, std::string, float> cases[] = {
+        // after so many redirects
+        {5, {{Page}}, "value string is '45'\n", 45.375F},
+        {6, {{Page}}, "https error: Maximum (5) redirects followed\n", NoQuote},
+        {0, Redirect("http://" + plain.Host()), "https error: Protocol \"http\" not supported", NoQuote},
+        {0, {{"HTTP/1.0 404 Not Found\r\n\r\n" + Page}}, "value string is '45'\n", 45.375F},
+        {0, {{Page, std::string(100'000, 'x')}, End::Endless}, "the page has more than 10 MB\n", 45.375F},
+        {0, {}, "https error: ", NoQuote},
+        {0, {{Page.substr(0, 30)}, End::Reset}, "https error: ", NoQuote},
+        {0, {{"HTTP/1.0 200 OK\r\nContent-Length: 999\r\n\r\n" + Page}}, "https error: ", 45.375F},
     };
-    for (const auto& c : cases) {
-        int redirects = c.redirects;
-        TlsServer server(identity_,
-                         [&](const std::string&) { return redirects-- > 0 ? Redirect("/") : c.reply; });
-        EXPECT_EQ(Ask(server.Host()), c.price) << c.log;
-        const std::string log = Log();
-        EXPECT_NE(log.find(c.log), std::string::npos) << log;
+    for (auto [redirects, reply, log, price] : cases) {
+        TlsServer server(identity_, [&left = redirects, &then = reply](const std::string&) {
+            return left-- > 0 ? Redirect("/") : then;
+        });
+        EXPECT_EQ(Ask(server.Host()), price) << log;
+        const std::string found = Log();
+        EXPECT_NE(found.find(log), found.npos) << found;
     }
     EXPECT_TRUE(plain.Requests().empty());
 }

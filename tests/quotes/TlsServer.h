@@ -8,8 +8,7 @@
 
 #include "LoopbackServer.h"
 
-// A key and a certificate for it, made anew, that vouches for itself: a client that trusts it trusts the
-// server that shows it.
+// A new key and a certificate that vouches for itself: who trusts it trusts the server that shows it.
 class TlsIdentity {
   public:
     // `names` as in "IP:127.0.0.1,DNS:localhost".

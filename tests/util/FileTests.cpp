@@ -104,8 +104,7 @@ TEST_F(IniFileTest, CutsAtTheBufferAndLongLinesIntoSeveral) {
 }
 
 TEST_F(IniFileTest, WritesInPlace) {
-    // The first occurrence of the key changes and nothing else. A new key goes before the next header, or to
-    // the end of the file, which may lack its line feed; a new section goes to the end.
+    // The key's first occurrence alone changes. A new key ends its section, a new section the file.
     const std::pair<std::string, std::string> cases[] = {
         {"; top\n[G]\n;K=c\n\nK = 1\nK=1  \nK=2\n[D]\nK=3\n",
          "; top\n[G]\n;K=c\n\nK = 1\nK=v\nK=2\n[D]\nK=3\n"},
