@@ -1,22 +1,26 @@
-// Controls as a person finds them: worked with the mouse and the keys, read by their names.
+// Controls, menus and alerts as a person finds them: worked with the mouse and the keys, read by their names.
+#include <atomic>
 #include <cmath>
 #include <set>
 
 #include <QCheckBox>
 #include <QClipboard>
 #include <QLabel>
-#include <QLineEdit>
 #include <QListView>
 #include <QProgressBar>
 #include <QPushButton>
+#include <QScreen>
 #include <QScrollBar>
 #include <QToolTip>
 
+#include "Driver.h"
 #include "Stage.h"
 #include "Worker.h"
+#include "platform/Alert.h"
 #include "platform/Button.h"
 #include "platform/CheckBox.h"
 #include "platform/ListView.h"
+#include "platform/MenuBar.h"
 #include "platform/MenuField.h"
 #include "platform/ScrollView.h"
 #include "platform/StatusBar.h"
@@ -26,56 +30,53 @@
 using Controls = StageTest;
 using TextControls = StageTest;
 using StatusBars = StageTest;
+using MenuBars = StageTest;
+using MenuFields = StageTest;
+using Alerts = StageTest;
 
 TEST_F(Controls, SendTheirMessagesWhenWorked) {
     auto* ok = Add(new BButton(BRect(10, 10, 90, 39), "ok", "Ok", new BMessage(1)));
     Add(new BButton(BRect(100, 10, 190, 39), "other", "Other", new BMessage(2)));
     auto* box = Add(new BCheckBox(BRect(10, 50, 200, 70), "box", "Box", new BMessage(3)));
-    auto* text = Add(new BTextControl(BRect(10, 90, 300, 110), "text", "Text", ""));
+    Add(new BTextControl(BRect(10, 90, 300, 110), "text", "Text", ""));
     window->SetDefaultButton(ok);
     Show();
-
     QTest::mouseClick(Find<QPushButton>("ok"), Qt::LeftButton);
-    QTest::keyClick(Find<QPushButton>("other"), Qt::Key_Space);
-    text->MakeFocus();
-    QTest::keyClick(QApplication::focusWidget(), Qt::Key_Return);
-    Find<QPushButton>("other")->setFocus();
-    QTest::keyClick(QApplication::focusWidget(), Qt::Key_Enter);
-    EXPECT_EQ(Received(4), (Codes{1, 2, 1, 2}));
-
     QTest::mouseClick(Find<QCheckBox>("box"), Qt::LeftButton, {}, QPoint(8, 10));
     EXPECT_EQ(box->Value(), B_CONTROL_ON);
     box->SetValue(B_CONTROL_OFF); // the program's own change sends nothing
-    QTest::keyClick(Find<QCheckBox>("box"), Qt::Key_Space);
-    EXPECT_EQ(Received(2), (Codes{3, 3}));
+    for (const auto& [name, key] : {std::pair{"other", Qt::Key_Space},
+                                    {"other", Qt::Key_Enter},
+                                    {"box", Qt::Key_Space},
+                                    {"text", Qt::Key_Return}}) {
+        Find<QWidget>(name)->setFocus();
+        QTest::keyClick(QApplication::focusWidget(), key);
+    }
+    EXPECT_EQ(Received(6), (Codes{1, 3, 2, 2, 3, 1}));
     EXPECT_EQ(box->Value(), B_CONTROL_ON);
 }
 
 TEST_F(Controls, HaveNamesLabelsAndLettersOfTheirOwn) {
-    Add(new BButton(BRect(10, 10, 90, 39), "save", "Save & go", new BMessage(1)));
-    Add(new BButton(BRect(100, 10, 190, 39), "search", "Search", new BMessage(2)));
-    Add(new BCheckBox(BRect(10, 50, 200, 70), "sell", "Sell", new BMessage(3)));
+    const std::pair<const char*, const char*> labels[] = {
+        // and what is shown of them: a word's beginning before any other letter
+        {"Save & go", "&Save && go"}, {"Search", "S&earch"}, {"Ss", "Ss"},
+        {"Sales tax", "Sales &tax"},  {"Sell", "Se&ll"},
+    };
+    for (const auto& [label, shown] : labels)
+        if (label != std::string("Sell"))
+            Add(new BButton(BRect(10, 10, 90, 39), label, label, nullptr));
+    Add(new BCheckBox(BRect(10, 50, 200, 70), "Sell", "Sell", nullptr));
     Add(new BTextControl(BRect(10, 90, 300, 110), "shares", "Shares", ""));
-    Add(new BButton(BRect(200, 10, 230, 39), "ss", "Ss", new BMessage(4)));
-    Add(new BButton(BRect(10, 130, 190, 159), "next", "Sales tax", new BMessage(5)));
     Show();
+    for (const auto& [label, shown] : labels) {
+        EXPECT_EQ(Find<QAbstractButton>(label)->text(), shown);
+        EXPECT_EQ(Find<QAbstractButton>(label)->accessibleName(), label);
+    }
     const auto* line = Find<QLineEdit>("shares");
     EXPECT_EQ(line->accessibleName(), "Shares");
-    EXPECT_EQ(Find<QPushButton>("save")->accessibleName(), "Save & go");
-    EXPECT_EQ(Find<QPushButton>("save")->text(), "&Save && go");
-    EXPECT_EQ(Find<QPushButton>("search")->text(), "S&earch");
-    EXPECT_EQ(Find<QCheckBox>("sell")->text(), "Se&ll");
-    EXPECT_EQ(Find<QPushButton>("ss")->text(), "Ss");
-    EXPECT_EQ(Find<QPushButton>("next")->text(), "Sales &tax"); // a word's beginning before any other letter
-    const auto* label = qobject_cast<QLabel*>(line->parentWidget()->children().first());
-    EXPECT_EQ(label->text(), "S&hares");
+    EXPECT_EQ(qobject_cast<QLabel*>(line->parentWidget()->children().first())->text(), "S&hares");
     QTest::keyClick(Toolkit(), Qt::Key_H, Qt::AltModifier);
     EXPECT_EQ(QApplication::focusWidget(), line);
-}
-
-double Luminance(QRgb color) {
-    const auto part = [](int value) { return std::pow(value / 255.0, 2.2); };
-    return 0.2126 * part(qRed(color)) + 0.7152 * part(qGreen(color)) + 0.0722 * part(qBlue(color));
 }
 
 // The contrast ratio between the lightest and the darkest pixel that a widget shows inside its frame.
@@ -84,17 +85,12 @@ double Contrast(const QWidget* widget) {
     const QPoint place = widget->mapTo(widget->window(), QPoint(0, 0));
     const QImage shown =
         widget->window()->grab(QRect(place, widget->size()).adjusted(frame, frame, -frame, -frame)).toImage();
-    std::set<double> found;
+    std::set<double> luminances;
     for (int y = 0; y < shown.height(); y++)
         for (int x = 0; x < shown.width(); x++)
-            found.insert(Luminance(shown.pixel(x, y)));
-    return (*found.rbegin() + 0.05) / (*found.begin() + 0.05);
+            luminances.insert(std::pow(qGray(shown.pixel(x, y)) / 255.0, 2.2));
+    return (*luminances.rbegin() + 0.05) / (*luminances.begin() + 0.05);
 }
-
-class BlankRow : public BListItem {
-  public:
-    void DrawItem(BView*, BRect, bool) override {}
-};
 
 // Labels, check boxes and arrows bring no background of their own, or only half of one: they must stand out
 // from what they are drawn on, be it the view's colour or the theme's.
@@ -103,16 +99,16 @@ TEST_F(Controls, AreReadableWhateverTheTheme) {
     ground->AddChild(new BCheckBox(BRect(10, 10, 200, 40), "box", "Box", nullptr));
     ground->AddChild(new BTextControl(BRect(10, 50, 300, 80), "line", "Line", "typed"));
     ground->AddChild(new BButton(BRect(10, 90, 100, 120), "button", "Button", nullptr));
-    auto* menu = new BPopUpMenu("");
-    menu->AddItem(new BMenuItem("One", nullptr));
-    ground->AddChild(new BMenuField(BRect(10, 130, 32, 150), "arrow", "", menu));
+    ground->AddChild(new BMenuField(BRect(10, 130, 32, 150), "arrow", "", new BPopUpMenu("")));
     ground->AddChild(new BStatusBar(BRect(10, 160, 300, 200), "bar", "Working"));
     auto* total = new BStringView(BRect(10, 210, 200, 240), "total", "Total");
     ground->AddChild(total);
-    BlankRow rows[30];
+    struct HighRow : BListItem {
+        void DrawItem(BView*, BRect, bool) override {}
+        void Update(BView*, const BFont*) override { SetHeight(1000); }
+    } row;
     auto* list = new BListView(BRect(310, 10, 370, 60), "list");
-    for (BlankRow& row : rows)
-        list->AddItem(&row);
+    list->AddItem(&row);
     ground->AddChild(new BScrollView("around", list, B_FOLLOW_NONE, 0, false, true, B_NO_BORDER));
     Show();
     Find<QListView>("list")->verticalScrollBar()->setObjectName("scroll bar");
@@ -125,7 +121,7 @@ TEST_F(Controls, AreReadableWhateverTheTheme) {
         ASSERT_TRUE(QTest::qWaitFor([&] {
             return Find<QWidget>("line")->palette().color(QPalette::Base) == palette.color(QPalette::Base);
         }));
-        for (const rgb_color color : {rgb_color{216, 216, 216, 255}, rgb_color{30, 30, 30, 255}}) {
+        for (const rgb_color color : {rgb_color{216, 216, 216}, rgb_color{30, 30, 30}}) {
             ground->SetViewColor(color);
             for (const char* name :
                  {"box", "line", "line container", "button", "arrow", "bar text", "scroll bar"})
@@ -133,7 +129,7 @@ TEST_F(Controls, AreReadableWhateverTheTheme) {
                     << name << " on " << int{color.red} << " with a window of "
                     << palette.color(QPalette::Window).lightness();
         }
-        total->SetHighColor(0, 128, 0);
+        total->SetHighColor({0, 128, 0});
         EXPECT_EQ(Find<QLabel>("total")->palette().color(QPalette::WindowText), QColor(0, 128, 0));
     }
 }
@@ -144,50 +140,41 @@ TEST_F(TextControls, AreLaidOutByTheirDividerAndHeardOfAtTheirEnd) {
     text->SetDivider(80);
     text->ResizeTo(319, text->Frame().Height());
     Show();
-    const QRect line = Find<QLineEdit>("text")->geometry();
-    EXPECT_EQ(line.left(), 80);
-    EXPECT_EQ(line.width(), 240);
-    EXPECT_GE(line.height(), QFontMetrics(QApplication::font()).height());
-    EXPECT_EQ(text->Frame().Height() + 1, static_cast<float>(line.height()));
+    auto* line = Find<QLineEdit>("text");
+    EXPECT_EQ(line->geometry(), QRect(80, 0, 240, static_cast<int>(text->Frame().Height()) + 1));
+    EXPECT_GE(line->height(), QFontMetrics(QApplication::font()).height());
     // The toolkit's own record of what assistive technology was told would keep a line that goes unheard.
     bool heard = false;
-    QObject::connect(Find<QLineEdit>("text"), &QObject::destroyed, [&] { heard = true; });
+    QObject::connect(line, &QObject::destroyed, [&] { heard = true; });
     ASSERT_TRUE(text->RemoveSelf());
     delete text;
     EXPECT_TRUE(heard);
 }
 
 TEST_F(TextControls, KeepToTheirBytesWhateverIsPutIn) {
-    const struct {
-        const char* name;
-        const char* before;
-        int cursor;
-        int selected; // characters from the cursor on that are replaced
-        const char* pasted;
-        const char* after;
-        int cursorAfter;
-        int32 limit; // in bytes
-    } cases[] = {
-        {"all of it fits", "abcd", 4, 0, "efgh", "abcdefgh", 8, 8},
-        {"what does not fit is not taken in part", "abcd", 1, 0, "xyz", "abcd", 1, 6},
-        {"a replaced part makes room", "abcd", 1, 2, "xy", "axyd", 3, 4},
-        {"no room at all", "abcd", 2, 0, "x", "abcd", 2, 4},
-        {"two-byte letters are kept whole", "abcd", 4, 0, "\xC3\xA9", "abcd", 4, 5},
-        {"line ends and tabs become blanks", "a", 1, 0, "b\nc\td\r", "ab c d", 6, 6},
+    // The limit in bytes, the text with the cursor behind its first letters, how many from there are
+    // replaced, what is pasted, and what is there then.
+    const std::tuple<int32, const char*, int, int, const char*, const char*, int> cases[] = {
+        {8, "abcd", 4, 0, "efgh", "abcdefgh", 8},
+        {6, "abcd", 1, 0, "xyz", "abcd", 1}, // what does not fit is not taken in part
+        {4, "abcd", 1, 2, "xy", "axyd", 3},
+        {4, "abcd", 2, 0, "x", "abcd", 2},
+        {5, "abcd", 4, 0, "\xC3\xA9", "abcd", 4},
+        {8, "a", 1, 0, "b\nc\td\r", "ab c d", 6}, // line ends and tabs become blanks
     };
     auto* text = Add(new BTextControl(BRect(10, 90, 300, 110), "text", "Text", ""));
     Show();
     auto* line = Find<QLineEdit>("text");
-    for (const auto& each : cases) {
-        SCOPED_TRACE(each.name);
-        text->SetMaxBytes(each.limit);
-        text->SetText(each.before);
-        line->setCursorPosition(each.cursor);
-        line->setSelection(each.cursor, each.selected);
-        QApplication::clipboard()->setText(QString::fromUtf8(each.pasted));
+    for (const auto& [limit, before, cursor, replaced, pasted, after, cursorAfter] : cases) {
+        text->SetMaxBytes(limit);
+        text->SetText(before);
+        line->setSelection(cursor, replaced);
+        if (replaced == 0)
+            line->setCursorPosition(cursor);
+        QApplication::clipboard()->setText(QString::fromUtf8(pasted));
         line->paste();
-        EXPECT_STREQ(text->Text(), each.after);
-        EXPECT_EQ(line->cursorPosition(), each.cursorAfter);
+        EXPECT_EQ(std::pair(std::string(text->Text()), line->cursorPosition()),
+                  std::pair(std::string(after), cursorAfter));
     }
     text->SetMaxBytes(3);
     EXPECT_STREQ(text->Text(), "ab ");
@@ -222,4 +209,190 @@ TEST_F(StatusBars, ShowWhatAWorkerTellsThem) {
     EXPECT_EQ(widget->value() * 4, widget->maximum() * 3);
     bar->Update(100);
     EXPECT_TRUE(QTest::qWaitFor([&] { return widget->value() == widget->maximum(); }));
+}
+
+QMenu* OpenMenu() {
+    EXPECT_TRUE(QTest::qWaitFor([] { return Driver::OpenMenu() != nullptr; }));
+    return Driver::OpenMenu();
+}
+
+// A field of two items, the second one marked.
+BMenuField* Portfolios(BRect frame, const char* label) {
+    auto* menu = new BPopUpMenu("        ");
+    menu->AddItem(new BMenuItem("First", new BMessage(1)));
+    menu->AddItem(new BMenuItem("Second & last", new BMessage(2)));
+    menu->ItemAt(1)->SetMarked(true);
+    return new BMenuField(frame, "portfolio", label, menu);
+}
+
+TEST_F(MenuBars, AskTheirWindowAndSendToTheItemsTarget) {
+    auto* other = new RecordingWindow({}, "other");
+    other->Show();
+    auto* file = new BMenu("File");
+    file->AddItem(new BMenuItem("Save & <b>go</b>", new BMessage(1)));
+    file->AddItem(new BSeparatorItem);
+    auto* quit = new BMenuItem("Quit", new BMessage(2), 'Q');
+    quit->SetTarget(other);
+    file->AddItem(quit);
+    auto* more = new BMenu("More");
+    more->AddItem(new BMenuItem("Deep", new BMessage(3)));
+    file->AddItem(more);
+    auto* bar = Add(new BMenuBar(BRect(0, 0, 0, 0), "menu bar"));
+    const float emptyHeight = bar->Frame().Height();
+    bar->AddItem(file);
+    EXPECT_GT(bar->Frame().Height(), emptyHeight);
+    EXPECT_EQ(bar->Frame().Width(), 399);
+    EXPECT_EQ(bar->FindItem(3), more->ItemAt(0));
+    EXPECT_FALSE(file->AddItem(quit)); // is in a menu
+    Show();
+
+    QTest::keyClick(Toolkit(), Qt::Key_F, Qt::AltModifier);
+    QMenu* open = OpenMenu();
+    EXPECT_EQ(window->menusBegun, 1);
+    EXPECT_EQ(Find<QMenuBar>("menu bar")->actions().first()->text(), "&File");
+    const auto* first = open->findChild<QAction*>("Save & <b>go</b>");
+    EXPECT_EQ(first->text(), "&Save && <b>go</b>");
+    QTest::simulateEvent(open, true, Qt::Key_S, Qt::AltModifier, "s", true);
+    EXPECT_TRUE(open->isVisible());
+    Driver::ClickItem("Save & <b>go</b>");
+    EXPECT_EQ(Received(1), Codes{1});
+
+    Activate(); // the test platform takes the menu for the active window
+    QTest::keyClick(Toolkit(), Qt::Key_Q, Qt::ControlModifier);
+    file->SetTargetForItems(other);
+    open->actions().last()->menu()->actions().first()->trigger();
+    EXPECT_TRUE(QTest::qWaitFor([&] { return other->received == Codes{2, 3}; }));
+    file->ItemAt(0)->SetEnabled(false);
+    EXPECT_FALSE(first->isEnabled());
+    const std::unique_ptr<BMenuItem> removed(file->ItemAt(0));
+    EXPECT_TRUE(file->RemoveItem(removed.get()));
+    EXPECT_FALSE(file->RemoveItem(removed.get()));
+    EXPECT_EQ(open->actions().size(), 3);
+}
+
+TEST_F(MenuFields, ShowTheMarkedItem) {
+    auto* field = Add(Portfolios(BRect(0, 20, 300, 22), "Portfolio:"));
+    BMenu* menu = field->Menu();
+    field->SetDivider(80);
+    int changes = 0;
+    field->SetTextChangedHook([&] { changes++; });
+    Show();
+    const auto* button = Find<QPushButton>("portfolio");
+    EXPECT_EQ(button->text(), "Second && last");
+    EXPECT_LT(field->VisibleRight(), 300);
+    EXPECT_GT(field->VisibleRight(), 80 + field->StringWidth("Second & last"));
+    EXPECT_GE(field->Frame().Height(), QFontMetrics(QApplication::font()).height());
+
+    auto* longer = new BMenuItem("A portfolio that has a rather long name of its own", nullptr);
+    longer->SetMarked(true);
+    menu->AddItem(longer); // a marked item unmarks the others as it comes
+    EXPECT_FALSE(menu->ItemAt(1)->IsMarked());
+    EXPECT_EQ(field->VisibleRight(), 300);
+    EXPECT_TRUE(button->text().startsWith("A p") && button->text().endsWith("own"))
+        << button->text().toStdString();
+    EXPECT_EQ(button->toolTip(), longer->Label());
+    menu->ItemAt(0)->SetMarked(true);
+    EXPECT_EQ(button->text() + '|' + button->toolTip(), "First|");
+    EXPECT_EQ(button->accessibleName() + button->accessibleDescription(), "Portfolio:First");
+    menu->ItemAt(0)->SetMarked(false);
+    EXPECT_EQ(button->text(), "        "); // nothing is marked
+    EXPECT_EQ(changes, 3);
+}
+
+TEST_F(MenuFields, AreOpenedAndChosenFromByKeyAndPointer) {
+    auto* field = Add(Portfolios(BRect(0, 20, 300, 22), "Portfolio:"));
+    BMenu* menu = field->Menu();
+    field->MakeFocus();
+    Show();
+    EXPECT_TRUE(field->IsFocus());
+    auto* button = Find<QPushButton>("portfolio");
+    // The keyboard begins at the marked item, or at the first.
+    for (const auto& [key, marked] : {std::pair{Qt::Key_Down, false},
+                                      {Qt::Key_Down, true},
+                                      {Qt::Key_Up, true},
+                                      {Qt::Key_Space, true},
+                                      {Qt::Key_Return, true}}) {
+        menu->ItemAt(1)->SetMarked(marked);
+        QTest::keyClick(button, key);
+        QMenu* open = OpenMenu();
+        EXPECT_TRUE(QTest::qWaitFor([&] { return open->activeAction() == open->actions()[marked]; })) << key;
+        if (marked)
+            QTest::keyClick(open, Qt::Key_Up);
+        QTest::keyClick(open, Qt::Key_Return);
+        EXPECT_TRUE(menu->ItemAt(0)->IsMarked());
+        EXPECT_EQ(button->text(), "First");
+        EXPECT_EQ(Received(1), Codes{1});
+    }
+    QTest::mousePress(button, Qt::LeftButton);
+    OpenMenu();
+    Driver::ClickItem("First");
+    EXPECT_EQ(Received(1), Codes{1}); // choosing the marked one again
+}
+
+TEST_F(MenuFields, OfManyLongItemsStayOnTheScreenInOneColumn) {
+    BMenu* menu = Add(Portfolios(BRect(0, 20, 300, 22), "Portfolio:"))->Menu();
+    for (int number = 0; number < 200; number++)
+        menu->AddItem(new BMenuItem((std::string(28, 'W') + std::to_string(number)).c_str(), nullptr));
+    menu->ItemAt(150)->SetMarked(true);
+    Show();
+    QTest::keyClick(Find<QPushButton>("portfolio"), Qt::Key_Down);
+    const QMenu* open = OpenMenu();
+    QAction* marked = open->actions()[150];
+    EXPECT_TRUE(QTest::qWaitFor([&] { return open->rect().contains(open->actionGeometry(marked)); }));
+    EXPECT_LE(open->height(), open->screen()->availableGeometry().height());
+}
+
+TEST_F(MenuFields, WithoutRoomForATextShowAnArrowAndAreCalledAfterTheirNeighbour) {
+    Add(new BTextControl(BRect(10, 50, 279, 60), "type", "Type", ""));
+    Add(Portfolios(BRect(280, 48, 300, 60), ""));
+    Show();
+    const auto* button = Find<QPushButton>("portfolio");
+    EXPECT_EQ(button->geometry().left(), 0);
+    EXPECT_LE(button->width(), 21);
+    EXPECT_EQ(button->text(), "");
+    EXPECT_EQ(button->accessibleName(), "Type choices");
+}
+
+TEST_F(Alerts, AnswerWithTheButtonPressed) {
+    for (const auto& [button, answer] : {std::pair{"Yes", 0}, {"Perhaps", 1}, {"No", 2}, {"Escape", 2}}) {
+        auto* alert = new BAlert("", "Go <b>on</b> & on?", "Yes", "Perhaps", "No", B_STOP_ALERT);
+        Driver driver;
+        driver.When("alert", Driver::Alert, [&, button = button] {
+            QMessageBox* box = Driver::Alert();
+            EXPECT_EQ(box->objectName(), "alert");
+            EXPECT_EQ(box->icon(), QMessageBox::Critical);
+            EXPECT_EQ(box->textFormat(), Qt::PlainText);
+            const auto place = [&](const char* name) { return box->findChild<QPushButton*>(name)->x(); };
+            EXPECT_LT(place("Yes"), place("Perhaps"));
+            EXPECT_LT(place("Perhaps"), place("No"));
+            EXPECT_TRUE(box->findChild<QPushButton*>("No")->isDefault());
+            QTest::simulateEvent(box, true, Qt::Key_Y, {}, "y", true);
+            EXPECT_FALSE(box->findChild<QPushButton*>("Yes")->isDown());
+            if (std::string("Escape") == button)
+                QTest::keyClick(box, Qt::Key_Escape);
+            else
+                Driver::Press(box, button);
+        });
+        EXPECT_EQ(alert->Go(), answer) << button;
+    }
+}
+
+TEST_F(Alerts, BlockTheirCallerAloneAndEndWithItsStop) {
+    Show();
+    std::atomic<int32> answer{-1};
+    const auto ask = [&] { answer = (new BAlert("", "From a worker", "Yes", "No"))->Go(); };
+    const auto shown = [] { return Driver::Alert() != nullptr; };
+    Driver driver;
+    driver.When(
+        "alert", shown, [&] { window->PostMessage(5); });
+    driver.When(
+        "message", [&] { return !window->received.empty(); }, [] { Driver::Press(Driver::Alert(), "Yes"); });
+    const Worker answered(ask);
+    EXPECT_TRUE(QTest::qWaitFor([&] { return answer == 0; }));
+    EXPECT_EQ(Received(1), Codes{5});
+    const Worker stopped(ask);
+    bool ended = false;
+    driver.When(
+        "alert", shown, [&] { ended = kill_thread(stopped.Id()) == B_OK; });
+    EXPECT_TRUE(QTest::qWaitFor([&] { return ended && !shown(); }));
 }

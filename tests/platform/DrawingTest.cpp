@@ -1,76 +1,67 @@
-// Views: where they lie, and what their drawing calls leave on the picture.
-#include <cmath>
+// Views: where they lie, what their drawing leaves on a picture, and print jobs, read back from their files.
+#include <cerrno>
+#include <csignal>
+#include <filesystem>
+#include <memory>
+#include <sys/resource.h>
 
-#include <QApplication>
 #include <QImage>
-#include <QTest>
-#include <QWidget>
-#include <gtest/gtest.h>
 
-#include "platform/Application.h"
-#include "platform/View.h"
-#include "platform/Window.h"
+#include "Pdf.h"
+#include "Stage.h"
+#include "TemporaryFolder.h"
+#include "platform/PrintJob.h"
+#include "platform/StringView.h"
 #include "util/interface/InterfaceHelpers.h"
 
 namespace {
 
-constexpr rgb_color kRed{255, 0, 0, 255};
-constexpr rgb_color kBlue{0, 0, 255, 255};
+constexpr rgb_color kRed{255, 0, 0};
+constexpr rgb_color kBlue{0, 0, 255};
+
+using Work = std::function<void(BView*)>;
 
 // A view that draws what a test says.
 class Canvas : public BView {
   public:
-    explicit Canvas(std::function<void(BView*)> draw)
-        : BView(BRect(0, 0, 99, 99), "canvas", B_FOLLOW_ALL_SIDES, B_WILL_DRAW), draw_(std::move(draw)) {}
+    Canvas(BRect frame, Work draw)
+        : BView(frame, "canvas", B_FOLLOW_NONE, B_WILL_DRAW), draw_(std::move(draw)) {}
     void Draw(BRect) override { draw_(this); }
 
   private:
-    std::function<void(BView*)> draw_;
+    Work draw_;
 };
 
-struct Shown {
-    BApplication application{"test"};
-
-    explicit Shown(std::function<void(BView*)> draw)
-        : window(new BWindow(BRect(0, 0, 99, 99), "picture", B_DOCUMENT_WINDOW, 0)),
-          canvas(new Canvas(std::move(draw))) {
-        window->AddChild(canvas);
-        window->Show();
-    }
-    // On a screen with this many pixels to a logical one, each way.
-    QImage Picture(double density = 1) const {
-        QImage image((QSizeF(100, 100) * density).toSize(), QImage::Format_RGB32);
-        image.setDevicePixelRatio(density);
-        Toolkit()->render(&image);
-        return image;
-    }
-    static QWidget* Toolkit() {
-        for (QWidget* widget : QApplication::topLevelWidgets())
-            if (widget->objectName() == QLatin1String("picture"))
-                return widget;
-        return nullptr;
-    }
-
-    BWindow* window;
-    Canvas* canvas;
-};
-
-// That all these pixels have the colour.
-void ExpectColor(QRgb color, const QImage& picture, std::initializer_list<QPoint> pixels) {
-    ASSERT_FALSE(picture.isNull());
-    for (const QPoint pixel : pixels)
-        EXPECT_EQ(picture.pixel(pixel), 0xFF000000 | color) << "at " << pixel.x() << ", " << pixel.y();
+// What is drawn on a screen with this many pixels to a logical one, each way.
+QImage Drawn(const Work& draw, double density = 1) {
+    Stage stage;
+    stage.Add(new Canvas({0, 0, 99, 99}, draw));
+    stage.window->Show();
+    QImage image((QSizeF(100, 100) * density).toSize(), QImage::Format_RGB32);
+    image.setDevicePixelRatio(density);
+    stage.Toolkit()->render(&image, {}, QRect(0, 0, 100, 100));
+    return image;
 }
 
-constexpr QRgb kRedPixel = 0xFF0000;
-constexpr QRgb kBluePixel = 0x0000FF;
-constexpr QRgb kBlackPixel = 0x000000;
-constexpr QRgb kWhitePixel = 0xFFFFFF;
+// The colours at these places: Red, Blue, blacK, White or the bevels' Dark.
+std::string Colors(const QImage& picture, std::initializer_list<QPoint> places) {
+    const QRgb known[] = {
+        qRgb(255, 0, 0),
+        qRgb(0, 0, 255),
+        qRgb(0, 0, 0),
+        qRgb(255, 255, 255),
+        qRgb(colors::dark_gray.red, colors::dark_gray.green, colors::dark_gray.blue),
+    };
+    std::string found;
+    for (const QPoint place : places)
+        found += "RBKWD?"[std::find(std::begin(known), std::end(known), picture.pixel(place)) - known];
+    return found;
+}
 
 } // namespace
 
 TEST(Drawing, ShapesCoverTheirInclusiveRectangles) {
-    const Shown shown([](BView* view) {
+    const QImage picture = Drawn([](BView* view) {
         view->SetHighColor(kRed);
         view->FillRect({10, 10, 19, 19});
         view->StrokeRect({30, 10, 39, 19});
@@ -83,13 +74,12 @@ TEST(Drawing, ShapesCoverTheirInclusiveRectangles) {
         view->ConstrainClippingRegion(nullptr);
         view->FillRect({98, 0, 99, 1});
     });
-    const QImage picture = shown.Picture();
-    ExpectColor(kRedPixel, picture, {{10, 10}, {19, 19}, {30, 10}, {39, 19}, {50, 10}, {59, 10}});
-    ExpectColor(kWhitePixel, picture,
-                {{20, 19}, {9, 10}, {31, 11}, {40, 10}, {60, 10}, {50, 11}, {85, 84}, {79, 80}});
+    EXPECT_EQ(Colors(picture, {{10, 10}, {19, 19}, {20, 19}, {9, 10}}), "RRWW");
+    EXPECT_EQ(Colors(picture, {{30, 10}, {39, 19}, {31, 11}, {40, 10}}), "RRWW");
+    EXPECT_EQ(Colors(picture, {{50, 10}, {59, 10}, {60, 10}, {50, 11}}), "RRWW");
     // The first quarter lies right of and above the centre.
-    ExpectColor(kBluePixel, picture, {{58, 52}, {80, 80}, {84, 84}, {98, 0}});
-    ExpectColor(kWhitePixel, picture, {{42, 52}, {58, 68}, {42, 68}});
+    EXPECT_EQ(Colors(picture, {{58, 52}, {42, 52}, {58, 68}, {42, 68}}), "BWWW");
+    EXPECT_EQ(Colors(picture, {{80, 80}, {84, 84}, {85, 84}, {79, 80}, {98, 0}}), "BBWWB");
 }
 
 TEST(Drawing, BitmapsKeepTheirTransparentPixels) {
@@ -98,7 +88,7 @@ TEST(Drawing, BitmapsKeepTheirTransparentPixels) {
     bitmap.SetBits(pixels, 2, 0, B_CMAP8);
     bitmap.SetBits(pixels, 2, 1, B_CMAP8); // beyond the end: left out but for the first byte
     bitmap.SetBits(pixels + 1, 1, 1, B_CMAP8);
-    const Shown shown([&](BView* view) {
+    const QImage picture = Drawn([&](BView* view) {
         view->SetLowColor(kBlue);
         view->FillRectLow({0, 0, 99, 99});
         view->SetDrawingMode(B_OP_OVER);
@@ -107,66 +97,41 @@ TEST(Drawing, BitmapsKeepTheirTransparentPixels) {
         view->SetLowColor(kRed);
         view->DrawBitmap(&bitmap, BPoint(20, 10));
     });
-    ExpectColor(kBlackPixel, shown.Picture(), {{10, 10}, {20, 10}});
-    ExpectColor(kBluePixel, shown.Picture(), {{11, 10}});
-    ExpectColor(kRedPixel, shown.Picture(), {{21, 10}});
+    EXPECT_EQ(Colors(picture, {{10, 10}, {11, 10}, {20, 10}, {21, 10}}), "KBKR");
 }
 
 TEST(Drawing, BitmapsStaySharpOnDenseScreens) {
     BBitmap bitmap(BRect(0, 0, 2, 0), B_CMAP8);
     const uint8 pixels[] = {0, B_TRANSPARENT_MAGIC_CMAP8, 0};
     bitmap.SetBits(pixels, 3, 0, B_CMAP8);
-    const Shown shown([&](BView* view) {
+    const auto draw = [&](BView* view) {
         view->SetDrawingMode(B_OP_OVER);
         view->DrawBitmap(&bitmap, BPoint(10, 10));
-    });
-    const QImage dense = shown.Picture(2);
-    ExpectColor(kBlackPixel, dense, {{20, 20}, {21, 21}, {24, 20}, {25, 21}});
-    ExpectColor(kWhitePixel, dense, {{19, 20}, {22, 20}, {23, 21}, {26, 20}});
+    };
+    EXPECT_EQ(Colors(Drawn(draw, 2),
+                     {{19, 20}, {20, 20}, {21, 21}, {22, 20}, {23, 21}, {24, 20}, {25, 21}, {26, 20}}),
+              "WKKWWKKW");
     // Between two whole densities only the pixels that two share are mixed: here there is one such at each
     // side of the middle.
-    ExpectColor(kBlackPixel, shown.Picture(1.5), {{15, 15}, {18, 15}});
-    ExpectColor(kWhitePixel, shown.Picture(1.5), {{14, 15}});
+    EXPECT_EQ(Colors(Drawn(draw, 1.5), {{14, 15}, {15, 15}, {18, 15}}), "WKK");
 }
 
-// The part of the picture that is not white.
-QRect Inked(const QImage& picture) {
-    QRegion found;
-    for (int y = 0; y < picture.height(); ++y)
-        for (int x = 0; x < picture.width(); ++x)
-            if (picture.pixel(x, y) != (0xFF000000 | kWhitePixel))
-                found += QRect(x, y, 1, 1);
-    return found.boundingRect();
-}
-
-TEST(Drawing, TextKeepsToItsPlaceInARectangle) {
-    constexpr uint8 centered = DrawTextCenter | DrawTextMiddle;
-    int width = 0;
-    const Shown shown([&](BView* view) {
-        const BRect rooms[] = {{0, 0, 39, 39}, {60, 0, 99, 39}, {0, 60, 39, 99}, {60, 60, 99, 99}};
-        view->SetFontSize(12);
-        width = static_cast<int>(std::ceil(view->StringWidth("H")));
-        DrawText(view, &rooms[0], "H", DrawTextLeft | DrawTextTop);
-        DrawText(view, &rooms[1], "H", centered);
-        DrawText(view, &rooms[2], "H", DrawTextRight | DrawTextBottom);
-        DrawText(view, &rooms[3], "HHHHHHHHHHHHHHHH", centered);
-    });
-    const QImage picture = shown.Picture();
-    const QRect leftTop = Inked(picture.copy(0, 0, 50, 50));
-    const QRect center = Inked(picture.copy(60, 0, 40, 40));
-    const QRect rightBottom = Inked(picture.copy(0, 60, 40, 40));
-    EXPECT_TRUE(leftTop.left() <= 3 && leftTop.top() <= 6) << leftTop.left() << ", " << leftTop.top();
-    EXPECT_NEAR(center.left() + center.right(), 39, 3);
-    EXPECT_NEAR(center.top() + center.bottom(), 39, 5);
-    EXPECT_EQ(rightBottom.left(), 39 - 2 - width + leftTop.left());
-    EXPECT_TRUE(rightBottom.bottom() >= 33 && rightBottom.bottom() <= 37) << rightBottom.bottom();
-    const QRect tooWide = Inked(picture.copy(50, 50, 50, 50)); // cut on the right only, and within its room
-    EXPECT_EQ(tooWide.left() - 10, leftTop.left());
-    EXPECT_GE(tooWide.right(), 47);
+TEST(Drawing, TextTooWideBeginsAtTheLeftAndLowTextEndsAtTheBottom) {
+    const auto drawn = [](const char* text, uint8 flags) {
+        return Drawn([=](BView* view) {
+            font_height height;
+            view->GetFontHeight(&height);
+            const BRect room(10, 20, 59, 20 + height.ascent + height.descent);
+            DrawText(view, &room, text, flags);
+        });
+    };
+    EXPECT_EQ(drawn("HHHHHHHHHHHHHHHH", DrawTextCenter), drawn("HHHHHHHHHHHHHHHH", DrawTextLeft));
+    EXPECT_EQ(drawn("H", DrawTextBottom), drawn("H", DrawTextTop));
+    EXPECT_NE(drawn("H", DrawTextTop), drawn("", DrawTextTop));
 }
 
 TEST(Drawing, BevelsAreLitFromTheLeftTop) {
-    const Shown shown([](BView* view) {
+    const QImage picture = Drawn([](BView* view) {
         view->SetLowColor(kBlue);
         view->FillRectLow({0, 0, 99, 99});
         const BRect raised(5, 5, 44, 44);
@@ -175,11 +140,9 @@ TEST(Drawing, BevelsAreLitFromTheLeftTop) {
         ThreeDRectangle(view, &sunken, 1);
         EXPECT_EQ(view->PenSize(), 1);
     });
-    const QRgb dark = qRgb(colors::dark_gray.red, colors::dark_gray.green, colors::dark_gray.blue);
-    ExpectColor(kWhitePixel, shown.Picture(), {{20, 5}, {5, 20}, {70, 44}, {94, 20}});
-    ExpectColor(dark, shown.Picture(), {{20, 44}, {44, 20}, {70, 5}, {55, 20}});
-    ExpectColor(kBluePixel, shown.Picture(), {{20, 20}, {20, 8}, {70, 41}});
-    ExpectColor(kBluePixel, shown.Picture(), {{20, 3}, {20, 7}});
+    EXPECT_EQ(Colors(picture, {{20, 5}, {5, 20}, {20, 44}, {44, 20}, {20, 20}}), "WWDDB");
+    EXPECT_EQ(Colors(picture, {{70, 5}, {55, 20}, {70, 44}, {94, 20}, {70, 41}}), "DDWWB");
+    EXPECT_EQ(Colors(picture, {{20, 3}, {20, 7}, {20, 8}}), "BBB");
 }
 
 TEST(Views, FollowTheirParentsEdges) {
@@ -196,6 +159,154 @@ TEST(Views, FollowTheirParentsEdges) {
         window->AddChild(view);
         window->ResizeTo(139, 119);
         EXPECT_EQ(view->Frame(), after) << std::hex << mode;
-        window->Quit();
     }
+}
+
+class PrintJobs : public testing::Test {
+  protected:
+    // What the job's settings say.
+    static std::string Told(const BPrintJob& job) {
+        const std::unique_ptr<BMessage> settings(job.Settings());
+        const char* file = "";
+        int32 copies = 0, resolution = 0;
+        bool landscape = false, colour = true;
+        float margin = 0;
+        settings->FindString("output file", &file);
+        settings->FindInt32("copies", &copies);
+        settings->FindInt32("resolution", &resolution);
+        settings->FindBool("landscape", &landscape);
+        settings->FindBool("colour", &colour);
+        settings->FindFloat("left margin", &margin);
+        return (QString(file) + ": %1 at %2, %3%4, %5")
+            .arg(copies)
+            .arg(resolution)
+            .arg(landscape)
+            .arg(colour)
+            .arg(std::lround(margin))
+            .toStdString();
+    }
+    void Configure(BPrintJob& job, const char* file) const {
+        BMessage settings;
+        settings.AddString("page size", "A4");
+        settings.AddString("output file", folder_.File(file).c_str());
+        for (const char* margin : {"left margin", "top margin", "right margin", "bottom margin"})
+            settings.AddFloat(margin, 36);
+        job.SetSettings(&settings);
+    }
+
+    BApplication application_{"test"};
+    TemporaryFolder folder_;
+    Canvas page_{BRect(0, 0, 522, 769), [](BView* view) {
+                     view->SetHighColor(kRed);
+                     view->FillRect({10, 20, 29, 39});
+                     view->FillRect({10, 700, 29, 719});
+                 }};
+};
+
+TEST_F(PrintJobs, DrawViewsAndControlsInPoints) {
+    const auto draw = [](BView* view) { view->FillRect(view->Bounds()); };
+    auto* hidden = new Canvas({100, 300, 199, 399}, draw);
+    hidden->Hide();
+    page_.Hide();
+    page_.AddChild(hidden);
+    page_.AddChild(new Canvas({100, 200, 199, 299}, draw));
+    page_.AddChild(new BStringView(BRect(100, 500, 300, 520), "control", "Control"));
+    BPrintJob job("Quorvan");
+    Configure(job, "report.pdf");
+    ASSERT_TRUE(job.BeginJob());
+    EXPECT_EQ(job.PrintableRect().LeftTop(), BPoint(0, 0));
+    EXPECT_NEAR(job.PrintableRect().Width() + 1, 595 - 72, 1);
+    job.DrawView(&page_, BRect(0, 0, 522, 600), BPoint(0, 0));
+    job.SpoolPage();
+    job.DrawView(&page_, BRect(0, 5, 522, 600), BPoint(0, 100));
+    job.SpoolPage();
+    ASSERT_TRUE(job.CommitJob());
+
+    const std::string file = folder_.File("report.pdf");
+    EXPECT_EQ(PdfPages(file), 2);
+    EXPECT_NE(Output("pdfimages -f 1 -l 1 -list " + file).find("image"), std::string::npos); // the control
+    Output("pdftoppm -r 72 -png " + file + " " + folder_.File("page"));
+    const QImage first(QString::fromStdString(folder_.File("page-1.png")));
+    const QImage second(QString::fromStdString(folder_.File("page-2.png")));
+    // The margins are 36; nothing is drawn that was not to be.
+    EXPECT_EQ(Colors(first, {{44, 60}, {48, 60}, {64, 60}, {68, 60}, {55, 53}, {55, 58}, {55, 740}}),
+              "WRRWWRW");
+    EXPECT_EQ(Colors(first, {{134, 240}, {138, 240}, {234, 334}, {234, 340}}), "WKKW");
+    EXPECT_EQ(Colors(second, {{55, 149}, {55, 153}, {55, 168}, {55, 173}}), "WRRW");
+}
+
+TEST_F(PrintJobs, KeepTheirSetUpInAMessageAndRefuseNonsense) {
+    BMessage wanted;
+    wanted.AddString("page size", "A5");
+    wanted.AddString("output file", "/tmp/x.pdf");
+    wanted.AddBool("landscape", true);
+    wanted.AddFloat("left margin", 50);
+    wanted.AddInt32("copies", 3);
+    wanted.AddInt32("resolution", 300);
+    wanted.AddBool("colour", false);
+    BPrintJob first("first");
+    first.SetSettings(&wanted);
+    BPrintJob second("second");
+    second.SetSettings(std::unique_ptr<BMessage>(first.Settings()).get());
+    EXPECT_EQ(Told(second), "/tmp/x.pdf: 3 at 300, 10, 50");
+    EXPECT_NEAR(second.PrintableRect().Height(), 420 - 2 * 12, 40); // A5 on its side
+
+    BMessage nonsense;
+    nonsense.AddString("page size", "elephant");
+    nonsense.AddFloat("page width", -5);
+    nonsense.AddFloat("left margin", 1e9F);
+    nonsense.AddInt32("copies", -1);
+    nonsense.AddInt32("resolution", 1 << 30);
+    second.SetSettings(&nonsense);
+    second.SetSettings(nullptr);
+    EXPECT_NEAR(second.PrintableRect().Width(), first.PrintableRect().Width(), 1);
+}
+
+TEST_F(PrintJobs, LeaveFilesAsTheyWereUnlessAllIsWritten) {
+    const auto begin = [&](BPrintJob& job, const char* name) {
+        Configure(job, name);
+        const bool begun = job.BeginJob();
+        job.DrawView(&page_, page_.Bounds(), BPoint(0, 0));
+        job.SpoolPage();
+        return begun;
+    };
+    const auto files = [&] { return std::distance(std::filesystem::directory_iterator(folder_.Path()), {}); };
+    folder_.Write("old.pdf", "old");
+    std::filesystem::permissions(folder_.File("old.pdf"), std::filesystem::perms{0640});
+    std::filesystem::create_symlink("old.pdf", folder_.File("link.pdf"));
+    std::filesystem::create_directory(folder_.File("folder.pdf"));
+    for (const auto& [name, reason] : {std::pair{"missing/report.pdf", ENOENT}, {"folder.pdf", EISDIR}}) {
+        BPrintJob nowhere("nowhere");
+        EXPECT_FALSE(begin(nowhere, name)) << name;
+        EXPECT_EQ(errno, reason) << name;
+        EXPECT_FALSE(nowhere.CommitJob()) << name;
+    }
+    for (const char* name : {"new.pdf", "link.pdf"}) {
+        BPrintJob dropped("dropped");
+        ASSERT_TRUE(begin(dropped, name));
+        EXPECT_FALSE(dropped.BeginJob());
+    }
+    {
+        BPrintJob full("full");
+        ASSERT_TRUE(begin(full, "old.pdf"));
+        std::signal(SIGXFSZ, SIG_IGN);
+        rlimit before{};
+        getrlimit(RLIMIT_FSIZE, &before);
+        const rlimit little{500, before.rlim_max};
+        setrlimit(RLIMIT_FSIZE, &little);
+        EXPECT_FALSE(full.CommitJob());
+        EXPECT_EQ(errno, EIO);
+        setrlimit(RLIMIT_FSIZE, &before);
+    }
+    EXPECT_EQ(folder_.Read("old.pdf"), "old");
+    EXPECT_EQ(files(), 3);
+    // A link's target is replaced, and keeps its permissions; the job still tells the name that it was given.
+    BPrintJob good("good");
+    ASSERT_TRUE(begin(good, "link.pdf"));
+    EXPECT_TRUE(Told(good).starts_with(folder_.File("link.pdf")));
+    EXPECT_TRUE(good.CommitJob());
+    EXPECT_TRUE(Told(good).starts_with(folder_.File("link.pdf")));
+    EXPECT_TRUE(folder_.Read("old.pdf").starts_with("%PDF"));
+    EXPECT_EQ(std::filesystem::status(folder_.File("old.pdf")).permissions(), std::filesystem::perms{0640});
+    EXPECT_EQ(files(), 3);
 }

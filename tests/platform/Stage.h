@@ -18,7 +18,7 @@ using Codes = std::vector<uint32>;
 // A window that keeps the codes of what its controls send.
 class RecordingWindow : public BWindow {
   public:
-    explicit RecordingWindow(BRect frame) : BWindow(frame, "stage", B_DOCUMENT_WINDOW, 0) {}
+    RecordingWindow(BRect frame, const char* title) : BWindow(frame, title, B_DOCUMENT_WINDOW, 0) {}
 
     void MessageReceived(BMessage* message) override {
         received.push_back(message->what);
@@ -35,7 +35,7 @@ class RecordingWindow : public BWindow {
 
 // An application with one window, in which a test puts its controls before Show.
 struct Stage {
-    Stage() : window(new RecordingWindow(BRect(50, 50, 449, 349))) {}
+    Stage() : window(new RecordingWindow(BRect(50, 50, 449, 349), "stage")) {}
 
     template <class View>
     View* Add(View* view) {
