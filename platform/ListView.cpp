@@ -222,8 +222,9 @@ BRect BListView::ItemFrame(int32 index) const {
     const ListPeer& peer = ListAccess::Peer(*this);
     if (!peer.model.At(index))
         return {};
-    const BPoint offset = peer.Rows()->Offset();
+    // First, as it lays out rows that have come or gone, whereby the list may scroll.
     BRect frame = FromQt(QRectF(peer.Rows()->visualRect(peer.model.index(index))));
+    const BPoint offset = peer.Rows()->Offset();
     frame.OffsetBy(offset.x, offset.y);
     return frame;
 }

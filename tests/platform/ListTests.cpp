@@ -15,32 +15,26 @@ namespace {
 
 constexpr uint32 kInvoked = 77;
 
-class Row : public BListItem {
-  public:
-    explicit Row(int32 n, float least = 20) : number(n), least_(least) {}
+struct Row : BListItem {
+    explicit Row(int32 n, float l = 20) : number(n), least(l) {}
 
     void DrawItem(BView* owner, BRect rect, bool) override {
-        drawn++;
         where = rect;
         owner->SetLowColor(IsSelected() ? rgb_color{178, 178, 178} : rgb_color{255, 255, 255});
         owner->FillRectLow(rect);
     }
     void Update(BView* owner, const BFont* font) override {
         BListItem::Update(owner, font);
-        SetHeight(std::max(Height(), least_));
+        SetHeight(std::max(Height(), least));
     }
     std::string AccessibleText() const override { return "row " + std::to_string(number); }
 
     int32 number;
-    int drawn = 0;
     BRect where;
-
-  private:
-    float least_;
+    float least;
 };
 
-class List : public BListView {
-  public:
+struct List : BListView {
     explicit List(list_view_type type) : BListView(BRect(10, 10, 209, 109), "list", type) {
         SetInvocationMessage(new BMessage(kInvoked));
     }
@@ -232,30 +226,24 @@ TEST(Lists, ScrollByWhateverMeansAndTellOnce) {
     EXPECT_EQ(list.Bounds().Width(), outer);
 }
 
-TEST(Lists, DrawVisibleRowsWhereTheyLie) {
+TEST(Lists, DrawRowsWhereTheyLieWhateverTheirHeight) {
     ListStage stage(1000);
     List& list = *stage.list;
     list.SetViewColor({1, 2, 3, 255});
     list.SetDataWidth(500);
     list.ScrollTo(BPoint(250, 10));
-    for (Row& row : stage.rows)
-        row.drawn = 0;
     list.Select(2);
     const auto color = [&](int y) { return stage.Widget()->viewport()->grab().toImage().pixel(20, y); };
     EXPECT_EQ(color(15), qRgb(255, 255, 255));
     EXPECT_EQ(color(40), qRgb(178, 178, 178));
-    EXPECT_EQ(std::ranges::count_if(stage.rows, [](const Row& row) { return row.drawn > 0; }),
-              std::ceil((list.Bounds().Height() + 1 + 10) / 20));
     EXPECT_EQ(stage.rows[1].where, BRect(0, 20, 499, 39));
     list.RemoveItems(1, 999);
     EXPECT_EQ(color(60), qRgb(1, 2, 3));
-}
 
-TEST(Lists, LayOutRowsOfDifferentHeightsAndFollowTheFont) {
-    ListStage stage(3);
+    // Rows of different heights, asked for before the list has scrolled to what is left.
     Row tall(3, 50.5F);
-    List& list = *stage.list;
-    list.AddItem(&tall, 1);
+    list.AddItem(&tall);
+    list.AddItem(&stage.rows[1]);
     EXPECT_EQ(list.ItemFrame(1).top, 20);
     EXPECT_EQ(list.ItemFrame(2).top, 71);
     EXPECT_EQ(list.IndexOf(BPoint(5, 70)), 1);
