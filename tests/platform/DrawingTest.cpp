@@ -58,6 +58,8 @@ std::string Colors(const QImage& picture, std::initializer_list<QPoint> places) 
 
 TEST(Drawing, ShapesCoverTheirInclusiveRectangles) {
     const QImage picture = Drawn([](BView* view) {
+        view->SetHighColor(kBlue);
+        view->FillRect({0, 70, 60, 99});
         view->SetHighColor(kRed);
         view->FillRect({10, 10, 19, 19});
         view->StrokeRect({30, 10, 39, 19});
@@ -69,13 +71,21 @@ TEST(Drawing, ShapesCoverTheirInclusiveRectangles) {
         view->FillRect({70, 70, 99, 99});
         view->ConstrainClippingRegion(nullptr);
         view->FillRect({98, 0, 99, 1});
+        const BRect raised(5, 75, 24, 94);
+        const BRect sunken(35, 75, 54, 94);
+        ThreeDRectangle(view, &raised, 0);
+        ThreeDRectangle(view, &sunken, 1);
+        EXPECT_EQ(view->PenSize(), 1);
     });
     EXPECT_EQ(Colors(picture, {{10, 10}, {19, 19}, {20, 19}, {9, 10}}), "RRWW");
     EXPECT_EQ(Colors(picture, {{30, 10}, {39, 19}, {31, 11}, {40, 10}}), "RRWW");
     EXPECT_EQ(Colors(picture, {{50, 10}, {59, 10}, {60, 10}, {50, 11}}), "RRWW");
     // The first quarter lies right of and above the centre.
-    EXPECT_EQ(Colors(picture, {{58, 52}, {42, 52}, {58, 68}, {42, 68}}), "BWWW");
+    EXPECT_EQ(Colors(picture, {{58, 52}, {42, 52}, {58, 65}, {42, 65}}), "BWWW");
     EXPECT_EQ(Colors(picture, {{80, 80}, {84, 84}, {85, 84}, {79, 80}, {98, 0}}), "BBWWB");
+    // Bevels are lit from the left top.
+    EXPECT_EQ(Colors(picture, {{15, 94}, {24, 85}, {15, 91}, {15, 75}, {5, 85}, {15, 73}}), "DDBWWB");
+    EXPECT_EQ(Colors(picture, {{45, 75}, {35, 85}, {45, 73}, {45, 78}, {45, 94}, {54, 85}}), "DDBBWW");
 }
 
 TEST(Drawing, BitmapsKeepTheirTransparentPixelsAndStaySharpOnDenseScreens) {
@@ -110,36 +120,16 @@ TEST(Drawing, TextTooWideBeginsAtTheLeftAndLowTextEndsAtTheBottom) {
     EXPECT_NE(drawn("H", DrawTextTop), drawn("", DrawTextTop));
 }
 
-TEST(Drawing, BevelsAreLitFromTheLeftTop) {
-    const QImage picture = Drawn([](BView* view) {
-        view->SetLowColor(kBlue);
-        view->FillRectLow({0, 0, 99, 99});
-        const BRect raised(5, 5, 44, 44);
-        const BRect sunken(55, 5, 94, 44);
-        ThreeDRectangle(view, &raised, 0);
-        ThreeDRectangle(view, &sunken, 1);
-        EXPECT_EQ(view->PenSize(), 1);
-    });
-    EXPECT_EQ(Colors(picture, {{20, 5}, {5, 20}, {20, 44}, {44, 20}, {20, 20}}), "WWDDB");
-    EXPECT_EQ(Colors(picture, {{70, 5}, {55, 20}, {70, 44}, {94, 20}, {70, 41}}), "DDWWB");
-    EXPECT_EQ(Colors(picture, {{20, 3}, {20, 7}, {20, 8}}), "BBB");
-}
-
-TEST(Views, FollowTheirParentsEdges) {
-    const BApplication application("test");
-    const std::pair<uint32, BRect> cases[] = {
-        // and where the view is then
-        {B_FOLLOW_LEFT | B_FOLLOW_TOP, {10, 10, 29, 29}},
-        {B_FOLLOW_RIGHT | B_FOLLOW_BOTTOM, {50, 30, 69, 49}},
-        {B_FOLLOW_ALL_SIDES, {10, 10, 69, 49}},
+TEST_F(StageTest, ViewsFollowTheirParentsEdges) {
+    const std::pair<BView*, BRect> views[] = {
+        // and where each is then
+        {Add(new BView({10, 10, 29, 29}, "", B_FOLLOW_LEFT | B_FOLLOW_TOP, 0)), {10, 10, 29, 29}},
+        {Add(new BView({10, 10, 29, 29}, "", B_FOLLOW_RIGHT | B_FOLLOW_BOTTOM, 0)), {50, 30, 69, 49}},
+        {Add(new BView({10, 10, 29, 29}, "", B_FOLLOW_ALL_SIDES, 0)), {10, 10, 69, 49}},
     };
-    for (const auto& [mode, after] : cases) {
-        auto* window = new BWindow(BRect(0, 0, 99, 99), "edges", B_DOCUMENT_WINDOW, 0);
-        auto* view = new BView(BRect(10, 10, 29, 29), "", mode, 0);
-        window->AddChild(view);
-        window->ResizeTo(139, 119);
-        EXPECT_EQ(view->Frame(), after) << std::hex << mode;
-    }
+    window->ResizeTo(439, 319);
+    for (const auto& [view, frame] : views)
+        EXPECT_EQ(view->Frame(), frame);
 }
 
 class PrintJobs : public testing::Test {
