@@ -41,21 +41,11 @@ TEST_F(List, OwnsItsColumnsAndKeepsThemInOrder) {
     EXPECT_FALSE(list->RemoveColumns(c, 2));
     EXPECT_TRUE(list->RemoveColumns(last, 3)); // last, b and first
     EXPECT_EQ(list->DisplayOrder(), (Order{1, 0}));
-    EXPECT_EQ(list->IndexOfColumn(c), 1);
     EXPECT_EQ(list->IndexOfColumn(b), -1);
-    EXPECT_EQ(list->ColumnAt(2), nullptr);
+    EXPECT_EQ(std::pair(list->ColumnAt(1), list->ColumnAt(2)),
+              std::pair(c, static_cast<CLVColumn*>(nullptr)));
     for (const CLVColumn* mine : {last, b, first})
         delete mine;
-}
-
-TEST_F(List, ClosesTheGapOfAHiddenColumn) {
-    AddPlainColumns();
-    list->ColumnAt(1)->SetShown(false);
-    list->ColumnAt(1)->SetWidth(100);
-    EXPECT_EQ(list->ColumnAt(2)->Begin(), 21);
-    list->ColumnAt(1)->SetShown(true);
-    EXPECT_EQ(list->ColumnAt(2)->Begin(), 122);
-    EXPECT_EQ(list->DataWidth(), 183);
 }
 
 TEST_F(List, SortsByItsKeys) {
@@ -96,25 +86,27 @@ TEST_F(List, BorrowsItsRows) {
     EXPECT_FALSE(list->AddList(&both) || list->AddItem(a) || list->AddItem(nullptr) ||
                  list->AddItem(NewRow(""), 3) || list->AddItem(elsewhere));
     EXPECT_EQ(elsewhere->List(), nullptr);
-    EXPECT_EQ(Shown(), "ba");
     EXPECT_EQ(list->FullListIndexOf(a), 1);
-    EXPECT_TRUE(list->RemoveItem(b));
-    EXPECT_FALSE(list->RemoveItem(b) || list->RemoveItems(0, 2));
-    EXPECT_TRUE(list->AddItem(b, 0));
+    EXPECT_TRUE(list->RemoveItem(b) && list->AddItem(b, 0));
     EXPECT_EQ(list->RemoveItem(1), a);
-    EXPECT_EQ(list->RemoveItem(1), nullptr);
+    EXPECT_FALSE(list->RemoveItem(a) || list->RemoveItem(1) || list->RemoveItems(0, 2));
     list->MakeEmpty();
-    EXPECT_TRUE(list->FullListIsEmpty());
-    EXPECT_TRUE(list->AddList(&both, 0));
+    EXPECT_TRUE(list->FullListIsEmpty() && list->AddList(&both, 0));
     rows.erase(rows.begin()); // a row that dies leaves its list
     EXPECT_EQ(Shown(), "b");
 }
 
-TEST_F(Outline, TellsRowsOfWidthsOnlyWhenAsked) {
+TEST_F(Outline, HidesColumnsAndTellsRowsOfWidthsWhenAsked) {
     NewColumn(nullptr, 20, CLVF_EXPANDER);
     NewColumn("b", 30, CLVF_PASS_INDENT | CLVF_WIDTH_NOTICE);
     NewColumn("c", 30, CLVF_WIDTH_NOTICE);
     NewColumn("d", 30);
+    list->ColumnAt(1)->SetShown(false);
+    list->ColumnAt(1)->SetWidth(100);
+    EXPECT_EQ(list->ColumnAt(2)->Begin(), 21);
+    list->ColumnAt(1)->SetShown(true);
+    EXPECT_EQ(list->ColumnAt(2)->Begin(), 122);
+    list->ColumnAt(1)->SetWidth(30);
     TextRow* top = NewRow("t", 0, true, false);
     TextRow* below = NewRow("b", 1);
     EXPECT_TRUE(list->AddItem(top) && list->AddUnder(below, top));
@@ -135,9 +127,7 @@ TEST_F(Outline, ShowsWhatIsExpanded) {
     EXPECT_TRUE(list->AddItem(a) && list->AddItem(b) && list->AddUnder(c, a) && list->AddUnder(d, c) &&
                 list->AddUnder(NewRow("e"), a) && list->AddUnder(NewRow("f"), b));
     EXPECT_FALSE(list->AddUnder(d, a) || list->AddUnder(NewRow("x"), nullptr));
-    EXPECT_TRUE(c->IsSuperItem());
-    EXPECT_EQ(list->Superitem(d), c);
-    EXPECT_EQ(list->Superitem(a), nullptr);
+    EXPECT_TRUE(c->IsSuperItem() && list->Superitem(d) == c && !list->Superitem(a));
 
     list->Select(3);
     list->Expand(c);
@@ -164,15 +154,8 @@ TEST_F(Outline, ShowsWhatIsExpanded) {
 TEST_F(Outline, SortsLevelsAndKeepsTheSelection) {
     NewColumn("x", 20, CLVF_SORTABLE);
     // Each with its level, and whether what is below it is shown.
-    for (const auto& [text, level, expanded] : {std::tuple{"m", 0U, true},
-                                                {"z", 1, false},
-                                                {"y", 1, true},
-                                                {"q", 2, true},
-                                                {"p", 2, true},
-                                                {"c", 0, false},
-                                                {"k", 1, true},
-                                                {"c", 0, true}})
-        EXPECT_TRUE(list->AddItem(NewRow(text, level, false, expanded)));
+    for (const char* row : {"m0+", "z1-", "y1+", "q2+", "p2+", "c0-", "k1+", "c0+"})
+        EXPECT_TRUE(list->AddItem(NewRow(row, static_cast<uint32>(row[1] - '0'), false, row[2] == '+')));
     list->Select(1);
     list->SetSortKey(0);
     EXPECT_EQ(FullList() + " " + Shown(0), "ckcmypqz ccmypqz");
