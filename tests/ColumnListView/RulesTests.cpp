@@ -72,6 +72,7 @@ TEST(Dragging, JoinsColumnsThatMoveTogether) {
             << group.flags << "; ";
     EXPECT_EQ(all.str(), "0-1 last shown 1, 0..51 keeps 10 flags 10; 2-3 last shown 3, 52..92 keeps 00 flags "
                          "16; 4-4 last shown -1, 0..0 keeps 00 flags 0; ");
+    EXPECT_EQ(GroupAt(groups, 0), 0);
     EXPECT_EQ(GroupAt(groups, 3), 1);
     EXPECT_EQ(GroupAt(groups, 5), -1);
     Order order{5, 6, 7, 8, 9};

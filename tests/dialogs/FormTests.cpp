@@ -15,6 +15,7 @@
 #include "dialogs/PasswordDialogs.h"
 #include "dialogs/PortfolioDialog.h"
 #include "platform/Font.h"
+#include "util/Dates.h"
 #include "util/interface/InterfaceHelpers.h"
 
 namespace {
@@ -187,6 +188,10 @@ TEST(InvestmentInput, AmountsLeftAsShownStayWhatTheyWere) {
         EXPECT_EQ(FillInvestment(Amounts("2", "45.37"), &record), InvestmentCheck::Accepted);
         // No risk was chosen, and the name is cut between whole characters.
         EXPECT_EQ(Fields(record), "P|" + std::string(30, 'n') + "|||Med||00|2|45.37|90.74|-1");
+        int year = 0, month = 0, day = 0;
+        GetDate(&year, &month, &day);
+        EXPECT_EQ((std::array{+record.Date.year, +record.Date.month, +record.Date.day}),
+                  (std::array{year, month, day}));
     }
 }
 

@@ -26,11 +26,9 @@ class RecordingWindow : public BWindow {
             inside(message->what);
         BWindow::MessageReceived(message);
     }
-    void MenusBeginning() override { menusBegun++; }
 
     Codes received;
     std::function<void(uint32)> inside; // what a test wants done in the handler
-    int menusBegun = 0;
 };
 
 // An application with one window, in which a test puts its controls before Show.
