@@ -64,8 +64,7 @@ constexpr MenuInfo Menus[] = {
 BMenuItem* NewItem(const ItemInfo& info) {
     if (!info.label)
         return new BSeparatorItem;
-    auto* item =
-        new BMenuItem(info.label, new BMessage(info.code), info.shortcut, info.shortcut ? B_COMMAND_KEY : 0);
+    auto* item = new BMenuItem(info.label, new BMessage(info.code), info.shortcut);
     if (info.goes == Goes::ToApplication)
         item->SetTarget(be_app);
     return item;

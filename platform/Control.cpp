@@ -16,11 +16,8 @@ status_t BInvoker::SetTarget(const BHandler* target) {
     return !target || target_.IsValid() ? B_OK : B_BAD_VALUE;
 }
 
-status_t BInvoker::Invoke(BMessage* message) {
-    const BMessage* sent = message ? message : message_.get();
-    if (!sent)
-        return B_BAD_VALUE;
-    return (hasTarget_ ? target_ : DefaultTarget()).SendMessage(*sent);
+status_t BInvoker::Invoke() {
+    return message_ ? (hasTarget_ ? target_ : DefaultTarget()).SendMessage(*message_) : B_BAD_VALUE;
 }
 
 BControl::BControl(BRect frame, const char* name, const char* label, BMessage* message, uint32 resizingMode,

@@ -16,9 +16,8 @@ class BInvoker {
     // Where messages go from now on; null goes back to the default (a control's window). B_BAD_VALUE, with
     // nothing to send to, when target belongs to no looper yet.
     virtual status_t SetTarget(const BHandler* target);
-    // Queues a copy of message, or of the invoker's own when null. B_BAD_VALUE when there is no message or no
-    // target.
-    virtual status_t Invoke(BMessage* message = nullptr);
+    // Queues a copy of the message. B_BAD_VALUE when there is no message or no target.
+    status_t Invoke();
 
   protected:
     // Where messages go while no target was set.

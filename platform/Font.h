@@ -11,10 +11,6 @@ struct font_height {
     float leading = 0;
 };
 
-// Which properties BView::SetFont takes over.
-constexpr uint32 B_FONT_SIZE = 1;
-constexpr uint32 B_FONT_ALL = 0xFF;
-
 struct FontFace;
 
 // A font: a face and a size in logical pixels. A value; copies are cheap. It measures text, it does not draw.

@@ -17,7 +17,6 @@ class BList {
         return index >= 0 && index < CountItems() ? items_[static_cast<std::size_t>(index)] : nullptr;
     }
     [[nodiscard]] int32 CountItems() const { return static_cast<int32>(items_.size()); }
-    [[nodiscard]] bool IsEmpty() const { return items_.empty(); }
 
   private:
     std::vector<void*> items_;

@@ -48,8 +48,7 @@ void BListItem::Update(BView*, const BFont* font) {
 
 // Resizing tells the size of what is seen of the rows, so the view's own telling stays out of it.
 BListView::BListView(BRect frame, const char* name, list_view_type type, uint32 resizingMode, uint32 flags)
-    : BView(frame, name, resizingMode, flags & ~B_FRAME_EVENTS,
-            std::make_unique<ListPeer>(this, [this] { SelectionChanged(); })),
+    : BView(frame, name, resizingMode, flags & ~B_FRAME_EVENTS, std::make_unique<ListPeer>(this)),
       BInvoker(nullptr, nullptr) {
     ListPeer& peer = ListAccess::Peer(*this);
     peer.frameEvents = flags & B_FRAME_EVENTS;
@@ -183,11 +182,6 @@ void BListView::Select(int32 from, int32 to, bool extend) {
         ListAccess::Peer(*this).selection.Select(first, last, extend);
 }
 
-void BListView::Deselect(int32 index) {
-    if (IsItemSelected(index))
-        ListAccess::Peer(*this).selection.Deselect(index);
-}
-
 void BListView::DeselectAll() {
     ListAccess::Peer(*this).selection.Clear();
 }
@@ -241,10 +235,6 @@ void BListView::SetDataWidth(float width) {
     peer.Rows()->DataWidthChanged();
 }
 
-float BListView::DataWidth() const {
-    return ListAccess::Peer(*this).dataWidth;
-}
-
 void BListView::MouseDown(BPoint where) {
     if (ListAccess::Peer(*this).Rows()->ForwardPress())
         return;
@@ -276,14 +266,12 @@ BRect BListView::Bounds() const {
             offset.y + static_cast<float>(size.height() - 1)};
 }
 
-void BListView::SetFont(const BFont* font, uint32 properties) {
-    BView::SetFont(font, properties);
-    BFont whole;
-    GetFont(&whole);
+void BListView::SetFont(const BFont* font) {
+    BView::SetFont(font);
     ListPeer& peer = ListAccess::Peer(*this);
-    peer.Rows()->setFont(FontAccess::ToQt(whole));
+    peer.Rows()->setFont(FontAccess::ToQt(*font));
     for (BListItem* row : peer.model.Rows())
-        row->Update(this, &whole);
+        row->Update(this, font);
     peer.LayOutAgain();
 }
 

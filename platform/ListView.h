@@ -78,19 +78,15 @@ class BListView : public BView, public BInvoker {
     // The row at this point of the view's coordinates; -1 when there is none.
     [[nodiscard]] int32 IndexOf(BPoint point) const;
     [[nodiscard]] int32 CountItems() const;
-    [[nodiscard]] bool IsEmpty() const { return CountItems() == 0; }
 
     // --- selection ---
     void Select(int32 index, bool extend = false);
     void Select(int32 from, int32 to, bool extend = false);
-    void Deselect(int32 index);
     void DeselectAll();
     [[nodiscard]] bool IsItemSelected(int32 index) const;
     // The index of the index-th selected row, counted from the top; -1 when fewer are selected. All rows
     // up to it are looked at; who wants them all asks every row.
     [[nodiscard]] int32 CurrentSelection(int32 index = 0) const;
-    // Called after the selection has changed.
-    virtual void SelectionChanged() {}
     // The row that keys go on from, selected or not; -1 when there is none.
     [[nodiscard]] int32 CurrentRow() const;
     // Makes it this one, without selecting it and without scrolling.
@@ -98,7 +94,6 @@ class BListView : public BView, public BInvoker {
 
     // Takes ownership of message.
     void SetInvocationMessage(BMessage* message) { SetMessage(message); }
-    [[nodiscard]] BMessage* InvocationMessage() const { return Message(); }
 
     // Orders the rows by the comparison (below 0: first before second); equal rows keep their order, and the
     // selection stays with its rows.
@@ -108,7 +103,6 @@ class BListView : public BView, public BInvoker {
     void InvalidateItem(int32 index);
     // How far the content reaches to the right; the horizontal scroll bar's range follows.
     void SetDataWidth(float width);
-    [[nodiscard]] float DataWidth() const;
 
     // Called for a press on the rows; the base selects. Press details are in the window's CurrentMessage.
     void MouseDown(BPoint where) override;
@@ -117,7 +111,7 @@ class BListView : public BView, public BInvoker {
     // Scrolls up or down, no further than needed, until the row is seen.
     void ScrollToRow(int32 index);
     [[nodiscard]] BRect Bounds() const override;
-    void SetFont(const BFont* font, uint32 properties = B_FONT_ALL) override;
+    void SetFont(const BFont* font) override;
 
   protected:
     [[nodiscard]] BMessenger DefaultTarget() const override;

@@ -29,7 +29,7 @@ class BLooper : public BHandler {
     [[nodiscard]] bool IsLocked() const;
 
     // The message being handled; null outside a handler. In a mouse hook it is the press, with the fields
-    // "where" (point), "buttons", "modifiers" and "clicks" (int32).
+    // "where" (point), "buttons" and "modifiers" (int32).
     [[nodiscard]] BMessage* CurrentMessage() const;
 
     // Handles a message that no override took: B_QUIT_REQUESTED asks QuitRequested and then calls Quit.

@@ -5,24 +5,10 @@
 #include "platform/View.h"
 #include "platform/private/MenuPeer.h"
 
-namespace {
-
-QKeySequence Shortcut(char letter, uint32 modifierKeys) {
-    if (!letter)
-        return {};
-    QString keys = QStringLiteral("Ctrl+");
-    if (modifierKeys & B_CONTROL_KEY)
-        keys += QStringLiteral("Alt+");
-    if (modifierKeys & B_SHIFT_KEY)
-        keys += QStringLiteral("Shift+");
-    return QKeySequence(keys + QLatin1Char(letter));
-}
-
-} // namespace
-
-BMenuItem::BMenuItem(const char* label, BMessage* message, char shortcut, uint32 modifierKeys)
+BMenuItem::BMenuItem(const char* label, BMessage* message, char shortcut)
     : BInvoker(message, nullptr), label_(label), peer_(std::make_unique<MenuItemPeer>()) {
-    peer_->action->setShortcut(Shortcut(shortcut, modifierKeys));
+    if (shortcut)
+        peer_->action->setShortcut(QKeySequence(QStringLiteral("Ctrl+") + QLatin1Char(shortcut)));
     peer_->action->setMenuRole(QAction::NoRole);
     peer_->ShowLabel(label);
     QObject::connect(peer_->action, &QAction::triggered, peer_->action,

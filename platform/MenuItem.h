@@ -9,9 +9,9 @@ struct MenuItemPeer;
 // the menu bar or menu field that shows the menu.
 class BMenuItem : public BInvoker {
   public:
-    // Takes ownership of message. shortcut is the letter that, with the command key, chooses the item; 0 for
+    // Takes ownership of message. shortcut is the letter that, with the Control key, chooses the item; 0 for
     // none.
-    BMenuItem(const char* label, BMessage* message, char shortcut = 0, uint32 modifierKeys = 0);
+    BMenuItem(const char* label, BMessage* message, char shortcut = 0);
     // A line that opens a submenu; takes ownership of it.
     explicit BMenuItem(BMenu* submenu);
     ~BMenuItem() override;

@@ -60,11 +60,6 @@ struct BRect {
         return {left > other.left ? left : other.left, top > other.top ? top : other.top,
                 right < other.right ? right : other.right, bottom < other.bottom ? bottom : other.bottom};
     }
-    // The smallest rectangle that holds both.
-    BRect operator|(const BRect& other) const {
-        return {left < other.left ? left : other.left, top < other.top ? top : other.top,
-                right > other.right ? right : other.right, bottom > other.bottom ? bottom : other.bottom};
-    }
 };
 
 // An area, used to say where a view may draw: one rectangle. A plain value.

@@ -11,7 +11,6 @@ class BStringView : public BView {
     void SetText(const char* text);
     [[nodiscard]] const char* Text() const { return text_.c_str(); }
     void SetHighColor(rgb_color color) override;
-    using BView::SetHighColor;
 
   private:
     std::string text_;

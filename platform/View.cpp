@@ -117,8 +117,7 @@ uint32 ButtonBits(Qt::MouseButtons buttons) {
 }
 
 uint32 ModifierBits(Qt::KeyboardModifiers keys) {
-    return (keys & Qt::ShiftModifier ? B_SHIFT_KEY : 0) | (keys & Qt::ControlModifier ? B_COMMAND_KEY : 0) |
-           (keys & Qt::AltModifier ? B_CONTROL_KEY : 0);
+    return keys & Qt::ShiftModifier ? B_SHIFT_KEY : 0;
 }
 
 void ViewAccess::SetFrame(BView* view, const BRect& frame) {
@@ -314,7 +313,7 @@ bool BView::IsFocus() const {
     return peer_->widget->hasFocus();
 }
 
-void BView::GetMouse(BPoint* where, uint32* buttons, bool) const {
+void BView::GetMouse(BPoint* where, uint32* buttons) const {
     const std::lock_guard guard(peer_->pointerMutex);
     *where = peer_->pointer;
     *buttons = peer_->buttons;
@@ -331,11 +330,8 @@ void BView::SetHighColor(rgb_color color) {
     highColor_ = color;
 }
 
-void BView::SetFont(const BFont* font, uint32 properties) {
-    if (properties == B_FONT_SIZE)
-        font_.SetSize(font->Size());
-    else
-        font_ = *font;
+void BView::SetFont(const BFont* font) {
+    font_ = *font;
 }
 
 void BView::SetFontSize(float size) {

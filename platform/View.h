@@ -33,8 +33,6 @@ constexpr uint32 B_PRIMARY_MOUSE_BUTTON = 1;
 constexpr uint32 B_SECONDARY_MOUSE_BUTTON = 2;
 constexpr uint32 B_TERTIARY_MOUSE_BUTTON = 4;
 constexpr uint32 B_SHIFT_KEY = 1;
-constexpr uint32 B_COMMAND_KEY = 2;
-constexpr uint32 B_CONTROL_KEY = 4;
 
 // The keys that a view hears of beside printable ASCII characters.
 constexpr char B_HOME = 0x01;
@@ -112,7 +110,6 @@ class BView : public BHandler {
     void MoveTo(float x, float y);
     void ResizeTo(float width, float height);
     virtual void ScrollTo(BPoint where);
-    [[nodiscard]] uint32 Flags() const { return flags_; }
 
     // Hiding nests: a view hidden twice must be shown twice.
     void Show();
@@ -124,25 +121,22 @@ class BView : public BHandler {
 
     // The pointer's place in this view and the buttons held, as of the last event that reached the view.
     // While a button that was pressed in the view is held, all pointer events reach it. Any thread.
-    void GetMouse(BPoint* where, uint32* buttons, bool checkQueue = true) const;
+    void GetMouse(BPoint* where, uint32* buttons) const;
 
     // --- drawing state ---
     // The background, painted before Draw.
     void SetViewColor(rgb_color color);
     [[nodiscard]] rgb_color ViewColor() const { return viewColor_; }
     virtual void SetHighColor(rgb_color color);
-    void SetHighColor(uint8 red, uint8 green, uint8 blue) { SetHighColor({red, green, blue, 255}); }
     [[nodiscard]] rgb_color HighColor() const { return highColor_; }
     void SetLowColor(rgb_color color) { lowColor_ = color; }
-    void SetLowColor(uint8 red, uint8 green, uint8 blue) { lowColor_ = {red, green, blue, 255}; }
     void SetDrawingMode(drawing_mode mode) { drawingMode_ = mode; }
     // Width of lines and outlines; 1 at first.
     void SetPenSize(float size) { penSize_ = size; }
     [[nodiscard]] float PenSize() const { return penSize_; }
-    void MovePenTo(BPoint point) { pen_ = point; }
     void MovePenTo(float x, float y) { pen_ = {x, y}; }
 
-    virtual void SetFont(const BFont* font, uint32 properties = B_FONT_ALL);
+    virtual void SetFont(const BFont* font);
     void SetFontSize(float size);
     void GetFont(BFont* font) const { *font = font_; }
     [[nodiscard]] float StringWidth(const char* text) const { return font_.StringWidth(text); }

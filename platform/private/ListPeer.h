@@ -7,8 +7,7 @@
 #include "platform/private/ViewPeer.h"
 
 struct ListPeer : ViewPeer {
-    ListPeer(BListView* owner, std::function<void()> selectionChanged)
-        : ViewPeer(new RowsWidget(owner)), selection(model, *Rows(), std::move(selectionChanged)) {}
+    explicit ListPeer(BListView* owner) : ViewPeer(new RowsWidget(owner)), selection(model, *Rows()) {}
     // The widget looks at the model to its end.
     ~ListPeer() override { delete widget; }
 

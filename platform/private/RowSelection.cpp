@@ -33,22 +33,16 @@ class RangeSelectionModel : public QItemSelectionModel {
 
 } // namespace
 
-RowSelection::RowSelection(RowModel& model, RowsWidget& view, std::function<void()> changed)
-    : model_(model), view_(view), changed_(std::move(changed)) {
+RowSelection::RowSelection(RowModel& model, RowsWidget& view) : model_(model), view_(view) {
     view.setModel(&model);
     delete view.selectionModel();
     auto* toolkit = new RangeSelectionModel(&model, &view);
     view.setSelectionModel(toolkit);
     QObject::connect(toolkit, &QItemSelectionModel::selectionChanged, toolkit,
                      [this](const QItemSelection& selected, const QItemSelection& deselected) {
-                         TakeOver(selected, deselected);
+                         Mark(deselected, false);
+                         Mark(selected, true);
                      });
-}
-
-void RowSelection::TakeOver(const QItemSelection& selected, const QItemSelection& deselected) {
-    Mark(deselected, false);
-    Mark(selected, true);
-    changed_();
 }
 
 void RowSelection::Mark(const QItemSelection& ranges, bool selected) {
@@ -86,11 +80,6 @@ void RowSelection::Select(int32 first, int32 last, bool extend) {
     view_.selectionModel()->select(QItemSelection(model_.index(first), model_.index(last)),
                                    extend ? QItemSelectionModel::Select
                                           : QItemSelectionModel::ClearAndSelect);
-}
-
-void RowSelection::Deselect(int32 index) {
-    Attach();
-    view_.selectionModel()->select(model_.index(index), QItemSelectionModel::Deselect);
 }
 
 void RowSelection::Clear() {
@@ -147,12 +136,8 @@ void RowSelection::RemoveSelected() {
 void RowSelection::RowsRemoved(int32 index, const std::vector<BListItem*>& rows) {
     if (std::find(rows.begin(), rows.end(), current_) != rows.end())
         current_ = model_.At(std::min(index, model_.Count() - 1));
-    bool anySelected = false;
     for (BListItem* row : rows) {
-        anySelected = anySelected || row->IsSelected();
         ListAccess::SetList(*row, nullptr);
         ListAccess::SetSelected(*row, false);
     }
-    if (anySelected)
-        changed_();
 }

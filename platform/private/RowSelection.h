@@ -1,8 +1,6 @@
 // Which rows of a list are selected. Only for the layer's own sources.
 #pragma once
 
-#include <functional>
-
 #include <QItemSelectionModel>
 
 #include "platform/ListView.h"
@@ -16,7 +14,7 @@ class RowsWidget;
 // filled again from the marks before anything uses it. Belongs to its list; interface thread.
 class RowSelection {
   public:
-    RowSelection(RowModel& model, RowsWidget& view, std::function<void()> changed);
+    RowSelection(RowModel& model, RowsWidget& view);
     RowSelection(const RowSelection&) = delete;
     RowSelection& operator=(const RowSelection&) = delete;
 
@@ -25,7 +23,6 @@ class RowSelection {
 
     // Rows from first to last, both inside.
     void Select(int32 first, int32 last, bool extend);
-    void Deselect(int32 index);
     void Clear();
 
     // The index of the row that keys go on from, or -1.
@@ -41,12 +38,10 @@ class RowSelection {
     void RowsRemoved(int32 index, const std::vector<BListItem*>& rows);
 
   private:
-    void TakeOver(const QItemSelection& selected, const QItemSelection& deselected);
     void Mark(const QItemSelection& ranges, bool selected);
 
     RowModel& model_;
     RowsWidget& view_;
-    std::function<void()> changed_;
     bool attached_ = true;
     BListItem* current_ = nullptr; // while not attached
 };

@@ -251,7 +251,6 @@ void RowsWidget::HandlePress(QMouseEvent* event) {
     message.AddPoint("where", Where(*event));
     message.AddInt32("buttons", static_cast<int32>(ButtonBits(event->buttons())));
     message.AddInt32("modifiers", static_cast<int32>(ModifierBits(event->modifiers())));
-    message.AddInt32("clicks", event->type() == QEvent::MouseButtonDblClick ? 2 : 1);
     const CurrentMessageScope scope(owner_->Looper(), &message);
     pressForwarded_ = false;
     press_ = event;
@@ -284,7 +283,7 @@ void RowsWidget::HandleKey(QKeyEvent* event) {
         horizontalScrollBar()->triggerAction(key == Qt::Key_Left ? QScrollBar::SliderSingleStepSub
                                                                  : QScrollBar::SliderSingleStepAdd);
     } else if (plain && (key == Qt::Key_Return || key == Qt::Key_Enter)) {
-        event->setAccepted(owner_->InvocationMessage() != nullptr);
+        event->setAccepted(owner_->Message() != nullptr);
         if (event->isAccepted())
             InvokeCurrent();
     } else {

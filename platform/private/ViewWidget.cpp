@@ -93,7 +93,7 @@ void ViewWidget::keyPressEvent(QKeyEvent* event) {
 
 void ViewWidget::mousePressEvent(QMouseEvent* event) {
     NotePointer(*event);
-    PostPointerMessage(*event, kMouseDownCode, event->type() == QEvent::MouseButtonDblClick ? 2 : 1);
+    PostPointerMessage(*event, kMouseDownCode);
 }
 
 void ViewWidget::mouseMoveEvent(QMouseEvent* event) {
@@ -102,7 +102,7 @@ void ViewWidget::mouseMoveEvent(QMouseEvent* event) {
 
 void ViewWidget::mouseReleaseEvent(QMouseEvent* event) {
     NotePointer(*event);
-    PostPointerMessage(*event, kMouseUpCode, 1);
+    PostPointerMessage(*event, kMouseUpCode);
 }
 
 void ViewWidget::NotePointer(const QMouseEvent& event) {
@@ -110,12 +110,11 @@ void ViewWidget::NotePointer(const QMouseEvent& event) {
                             ButtonBits(event.buttons()));
 }
 
-void ViewWidget::PostPointerMessage(const QMouseEvent& event, uint32 code, int clicks) {
+void ViewWidget::PostPointerMessage(const QMouseEvent& event, uint32 code) {
     BMessage message(code);
     message.AddPoint("where", FromQt(event.position()) + owner_->Bounds().LeftTop());
     message.AddInt32("buttons", static_cast<int32>(ButtonBits(event.buttons())));
     message.AddInt32("modifiers", static_cast<int32>(ModifierBits(event.modifiers())));
-    message.AddInt32("clicks", clicks);
     BMessenger(owner_).SendMessage(message);
 }
 

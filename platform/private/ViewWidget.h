@@ -28,7 +28,7 @@ class ViewWidget : public QWidget {
   private:
     void TellAccessibility();
     void NotePointer(const QMouseEvent& event);
-    void PostPointerMessage(const QMouseEvent& event, uint32 code, int clicks);
+    void PostPointerMessage(const QMouseEvent& event, uint32 code);
 
     BView* owner_;
     int markedPart_ = -1; // of the view's parts, as far as assistive technology knows
