@@ -1,5 +1,6 @@
 #pragma once
 
+#include <span>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -46,34 +47,21 @@ class DataFolder : public TemporaryFolder {
         return DATABASE(File("invest.db").c_str()).Append(&record);
     }
     // "portfolio/name" of every investment in the file, or the names of the portfolios, in record order.
-    std::vector<std::string> Investments() const {
-        return All<INVESTMENT_DATA>(
-            "invest.db",
-            [](const INVESTMENT_DATA& record) { return std::string(record.Portfolio) + "/" + record.Name; });
-    }
-    std::vector<std::string> Portfolios() const {
-        return All<PORTFOLIO_DATA>(
-            "portfol.db", [](const PORTFOLIO_DATA& record) { return record.Name; });
-    }
-    // Records in the file, deleted ones included.
-    std::int32_t RecordSlots(const std::string& file) const {
-        DATABASE_HEADER header{};
-        DATABASE(File(file).c_str()).GetHeaderInfo(&header);
-        return header.recordCount;
-    }
+    std::vector<std::string> Investments() const { return All("invest.db", 2); }
+    std::vector<std::string> Portfolios() const { return All("portfol.db", 1); }
 
   private:
-    template <class Record, class ToText>
-    std::vector<std::string> All(const char* name, ToText text) const {
+    // The names that each record begins with.
+    std::vector<std::string> All(const char* name, int names) const {
         std::vector<std::string> all;
         DATABASE file(File(name).c_str());
-        for (const void* data = file.QueryGetFirst(nullptr); data; data = file.QueryGetNext(nullptr))
-            all.emplace_back(text(*static_cast<const Record*>(data)));
+        for (const void* data = file.QueryGetFirst(nullptr); data; data = file.QueryGetNext(nullptr)) {
+            const auto* first = static_cast<const char*>(data);
+            all.push_back(names == 1 ? first : first + ("/" + std::string(first + NameSize)));
+        }
         return all;
     }
-    template <std::size_t Count>
-    void Create(const char* name, const std::array<COLUMN_ENTRY, Count>& columns) const {
-        if (DATABASE(nullptr).Create(File(name).c_str(), name, Count, columns.data()) != 0)
-            throw std::runtime_error(name);
+    void Create(const char* name, std::span<const COLUMN_ENTRY> columns) const {
+        DATABASE(nullptr).Create(File(name).c_str(), name, static_cast<int>(columns.size()), columns.data());
     }
 };

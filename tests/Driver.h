@@ -10,10 +10,7 @@ class Driver : public StepDriver {
     ~Driver() override { FailForStepsLeft(); }
 
     // A step as soon as the keyboard is in a field.
-    void InField(Action action) {
-        const auto ready = [] { return Field() != nullptr; };
-        When("a field", ready, std::move(action));
-    }
+    void InField(Action action) { When("a field", Field, std::move(action)); }
 
   protected:
     void Fail(const std::string& sentence) override { ADD_FAILURE() << sentence; }

@@ -1,6 +1,5 @@
 #pragma once
 
-#include <csignal>
 #include <functional>
 
 #include <sys/wait.h>
@@ -24,30 +23,3 @@ inline int ResultAsOrdinaryUser(const std::function<int()>& work) {
         return ordinary ? work() : 255;
     });
 }
-
-// A process that does some work and then waits to be killed.
-class WaitingChild {
-  public:
-    // The work is done when the constructor returns; it should not end the process.
-    explicit WaitingChild(const std::function<void()>& work) : id_(fork()) {
-        if (id_ == 0) {
-            work();
-            for (;;)
-                raise(SIGSTOP);
-        }
-        waitpid(id_, nullptr, WUNTRACED);
-    }
-    WaitingChild(const WaitingChild&) = delete;
-    WaitingChild& operator=(const WaitingChild&) = delete;
-    ~WaitingChild() { Kill(); }
-
-    [[nodiscard]] pid_t Id() const { return id_; }
-    // It has no chance to clear up.
-    void Kill() const {
-        if (kill(id_, SIGKILL) == 0)
-            waitpid(id_, nullptr, 0);
-    }
-
-  private:
-    pid_t id_;
-};

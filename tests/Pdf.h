@@ -1,10 +1,11 @@
 #pragma once
 
+#include <algorithm>
 #include <cstdio>
 #include <string>
 #include <vector>
 
-#include "Output.h"
+#include "Shell.h"
 
 // PDF files read back with a PDF reader's programs.
 
@@ -21,22 +22,19 @@ inline std::vector<PdfWord> PdfWords(const std::string& file, int page = 1) {
     std::vector<PdfWord> words;
     std::size_t place = 0;
     while ((place = list.find("<word", place)) != std::string::npos) {
-        PdfWord word;
+        PdfWord& word = words.emplace_back();
         std::sscanf(list.c_str() + place, "<word xMin=\"%f\" yMin=\"%f\" xMax=\"%f\" yMax=\"%f\"", &word.left,
                     &word.top, &word.right, &word.bottom);
         place = list.find('>', place) + 1;
         word.text = list.substr(place, list.find("</word>", place) - place);
-        words.push_back(word);
     }
     return words;
 }
 
 // The first such word; one at -1 when there is none.
 inline PdfWord FindWord(const std::vector<PdfWord>& words, const std::string& text) {
-    for (const PdfWord& word : words)
-        if (word.text == text)
-            return word;
-    return {};
+    const auto found = std::ranges::find(words, text, &PdfWord::text);
+    return found == words.end() ? PdfWord() : *found;
 }
 
 inline int PdfPages(const std::string& file) {

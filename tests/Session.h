@@ -1,22 +1,17 @@
 #pragma once
 
-#include <array>
 #include <chrono>
 #include <csignal>
 #include <cstdlib>
 #include <functional>
-#include <memory>
-#include <stdexcept>
 #include <string>
 #include <thread>
-#include <vector>
 
-#include <fcntl.h>
 #include <sys/prctl.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
-#include "Output.h"
+#include "Shell.h"
 
 // Programs that a test starts, and a display of the test's own for them.
 
@@ -31,22 +26,15 @@ inline bool WaitUntil(const std::function<bool()>& condition) {
     return true;
 }
 
-// A child process, ended with the object.
+// What a shell runs, as a child process that ends with the object. A single program is to take the shell's
+// place, by exec.
 class Process {
   public:
-    // kept is a descriptor that the child keeps; -1 for none.
-    explicit Process(const std::vector<std::string>& command, int kept = -1) : id_(fork()) {
+    explicit Process(const std::string& command) : id_(fork()) {
         if (id_ != 0)
             return;
         prctl(PR_SET_PDEATHSIG, SIGTERM); // should the test crash
-        std::vector<char*> arguments;
-        arguments.reserve(command.size() + 1);
-        for (const std::string& each : command)
-            arguments.push_back(const_cast<char*>(each.c_str()));
-        arguments.push_back(nullptr);
-        if (kept >= 0)
-            fcntl(kept, F_SETFD, 0);
-        execvp(arguments[0], arguments.data());
+        execlp("sh", "sh", "-c", command.c_str(), nullptr);
         _exit(127);
     }
     Process(const Process&) = delete;
@@ -69,41 +57,19 @@ class Process {
     bool ended_ = false;
 };
 
-// A program that serves others and says where, in one line, as soon as it does.
-class Server {
-  public:
-    // The last word of the command is completed with the number of the descriptor for that line.
-    explicit Server(std::vector<std::string> command) {
-        std::array<int, 2> ends{};
-        if (pipe2(ends.data(), O_CLOEXEC) != 0)
-            throw std::runtime_error("no pipe");
-        command.back() += std::to_string(ends[1]);
-        process_ = std::make_unique<Process>(command, ends[1]);
-        close(ends[1]);
-        char letter = '\0';
-        while (read(ends[0], &letter, 1) == 1 && letter != '\n')
-            place_ += letter;
-        close(ends[0]);
-    }
-    // Empty when it did not come to serve.
-    [[nodiscard]] const std::string& Place() const { return place_; }
-
-  private:
-    std::unique_ptr<Process> process_;
-    std::string place_;
-};
-
 // A display server that chooses a free display by itself; it is the test's display from then on. It does not
 // start afresh when a client is the last to go, just as the next one comes.
 class Display {
   public:
-    Display()
-        : server_({"Xvfb", "-screen", "0", "1024x768x24", "-nolisten", "tcp", "-noreset", "-displayfd", ""}) {
-        setenv("DISPLAY", (":" + server_.Place()).c_str(), 1);
+    Display() {
+        WaitUntil([this] { return folder_.Read("number").ends_with('\n') || server_.HasEnded(); });
+        setenv("DISPLAY", (":" + Output("cat " + folder_.File("number"))).c_str(), 1);
         setenv("QT_QPA_PLATFORM", "xcb", 1);
     }
-    [[nodiscard]] bool IsReady() const { return !server_.Place().empty(); }
+    [[nodiscard]] bool IsReady() { return !server_.HasEnded(); }
 
   private:
-    Server server_;
+    const TemporaryFolder folder_;
+    Process server_{"exec Xvfb -screen 0 1024x768x24 -nolisten tcp -noreset -displayfd 3 3>" +
+                    folder_.File("number")};
 };

@@ -2,11 +2,24 @@
 
 #include <gtest/gtest.h>
 
+#include <cstdio>
 #include <cstdlib>
 #include <string>
 #include <sys/wait.h>
 
 #include "TemporaryFolder.h"
+
+// What a shell command writes, without the last line's end.
+inline std::string Output(const std::string& command) {
+    FILE* pipe = popen(command.c_str(), "r");
+    std::string output;
+    for (int byte = 0; (byte = std::fgetc(pipe)) != EOF;)
+        output += static_cast<char>(byte);
+    pclose(pipe);
+    if (output.ends_with('\n'))
+        output.pop_back();
+    return output;
+}
 
 // A folder of the test's own in which a person works at a shell, and what the last command said. What it said
 // is kept elsewhere, so that the folder holds nothing but the person's files.
@@ -23,26 +36,19 @@ class Shell : public TemporaryFolder {
     }
     [[nodiscard]] const std::string& Output() const { return output_; }
     [[nodiscard]] const std::string& Errors() const { return errors_; }
-    [[nodiscard]] testing::AssertionResult Says(const std::string& text) const { return In(output_, text); }
-    [[nodiscard]] testing::AssertionResult Complains(const std::string& text) const {
-        return In(errors_, text);
-    }
+    testing::AssertionResult Says(const std::string& text) const { return In(output_, text); }
+    testing::AssertionResult Complains(const std::string& text) const { return In(errors_, text); }
     // Whether a command fails with this status and this reason: in one line, unless the usage was wrong.
     testing::AssertionResult Fails(const std::string& command, int status, const std::string& reason) {
         const int found = Run(command);
         const bool oneLine = errors_.find('\n') + 1 == errors_.size();
-        if (found == status && (status == 2 || oneLine) && Complains(reason))
-            return testing::AssertionSuccess();
-        return testing::AssertionFailure() << command << "\nends with " << found << ", not " << status
-                                           << " in one line with \"" << reason << "\":\n"
-                                           << errors_;
+        return testing::AssertionResult(found == status && (status == 2 || oneLine) && Complains(reason))
+               << command + " ended with " << found << ", not in one line with " + reason + ":\n" + errors_;
     }
 
   private:
     static testing::AssertionResult In(const std::string& all, const std::string& text) {
-        if (all.find(text) != all.npos)
-            return testing::AssertionSuccess();
-        return testing::AssertionFailure() << '"' << text << "\" is not in:\n" << all;
+        return testing::AssertionResult(all.find(text) != all.npos) << text + " is not in:\n" + all;
     }
 
     TemporaryFolder said_;

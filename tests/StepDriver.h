@@ -13,6 +13,7 @@
 #include <QMessageBox>
 #include <QPointer>
 #include <QTest>
+#include <QTimer>
 
 #include "platform/Application.h"
 
@@ -43,19 +44,17 @@ class StepDriver : public QObject {
 
     // Waits until it is so.
     StepDriver& Await(std::string what, Condition condition) {
-        return When(
-            std::move(what), std::move(condition), [] {});
+        return When(std::move(what), std::move(condition), Action([] {}));
     }
 
     // Waits for an alert with this text and presses one of its buttons. The next step comes when the code
     // that showed it has gone on.
     StepDriver& Answer(const std::string& text, const char* button) {
-        return When(
-            "alert: " + text, [text] { return Alert() && Alert()->text() == QString::fromStdString(text); },
-            [this, button] {
-                answered_ = Alert();
-                Press(answered_, button);
-            });
+        const auto shown = [text] { return Alert() && Alert()->text() == QString::fromStdString(text); };
+        return When("alert: " + text, shown, [this, button] {
+            answered_ = Alert();
+            Press(answered_, button);
+        });
     }
 
     // The alert that is shown; null when there is none.
@@ -98,18 +97,10 @@ class StepDriver : public QObject {
     }
     // Clicks a menu's title in the window's menu bar.
     static void ClickTitle(const QWidget* window, const char* title) {
-        auto* bar = window->findChild<QMenuBar*>();
-        for (QAction* action : bar->actions())
-            if (action->menu()->objectName() == title)
-                QTest::mouseClick(bar, Qt::LeftButton, {}, bar->actionGeometry(action).center());
+        Click(window->findChild<QMenuBar*>(), title);
     }
     // Clicks an item of the open menu.
-    static void ClickItem(const char* label) {
-        QMenu* menu = OpenMenu();
-        for (QAction* item : menu->actions())
-            if (item->objectName() == label)
-                QTest::mouseClick(menu, Qt::LeftButton, {}, menu->actionGeometry(item).center());
-    }
+    static void ClickItem(const char* label) { Click(OpenMenu(), label); }
     // Clicks a button found by its name; without such a button the step after it will wait in vain.
     static void Press(QWidget* window, const char* button) {
         if (auto* found = window->findChild<QAbstractButton*>(QString::fromUtf8(button)))
@@ -137,31 +128,36 @@ class StepDriver : public QObject {
     static constexpr int PollMilliseconds = 5;
     static constexpr int PatienceMilliseconds = 60000;
 
+    template <class Menu>
+    static void Click(Menu* menu, const char* name) {
+        for (QAction* item : menu->actions())
+            if ((item->menu() ? item->menu()->objectName() : item->objectName()) == name)
+                QTest::mouseClick(menu, Qt::LeftButton, {}, menu->actionGeometry(item).center());
+    }
     void Begin() {
         deadline_.setRemainingTime(PatienceMilliseconds);
-        timer_ = startTimer(PollMilliseconds);
+        QTimer::singleShot(PollMilliseconds, Qt::CoarseTimer, this, &StepDriver::Poll);
     }
-    void timerEvent(QTimerEvent*) override {
-        // A timer of its own for each poll: the toolkit holds one back while its event is handled, and an
-        // action may wait in a loop of its own.
-        killTimer(timer_);
-        timer_ = startTimer(PollMilliseconds);
-        if (!answered_ && !steps_.empty() && steps_.front().condition()) {
-            const Action action = std::move(steps_.front().action);
-            steps_.pop_front();
-            deadline_.setRemainingTime(PatienceMilliseconds);
-            action();
-        } else if (deadline_.hasExpired()) {
+    void Poll() {
+        const bool ready = !answered_ && !steps_.empty() && steps_.front().condition();
+        if (!ready && deadline_.hasExpired()) {
             Fail("waited in vain for: " + (steps_.empty() ? "the end" : steps_.front().what));
             steps_.clear();
-            killTimer(timer_);
             be_app->PostMessage(B_QUIT_REQUESTED);
+            return;
         }
+        // Before the action, which may wait in a loop of its own.
+        QTimer::singleShot(PollMilliseconds, Qt::CoarseTimer, this, &StepDriver::Poll);
+        if (!ready)
+            return;
+        const Action action = std::move(steps_.front().action);
+        steps_.pop_front();
+        deadline_.setRemainingTime(PatienceMilliseconds);
+        action();
     }
 
     static inline StepDriver* self_ = nullptr;
     std::deque<Step> steps_;
     QPointer<QMessageBox> answered_;
     QDeadlineTimer deadline_;
-    int timer_ = 0;
 };

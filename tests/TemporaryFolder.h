@@ -12,11 +12,9 @@
 // A folder of the test's own, removed with everything in it at the end.
 class TemporaryFolder {
   public:
-    TemporaryFolder() {
-        std::string name = (std::filesystem::temp_directory_path() / "quorvan-test-XXXXXX").string();
-        if (mkdtemp(name.data()) == nullptr)
+    TemporaryFolder() : path_(std::filesystem::temp_directory_path() / "quorvan-test-XXXXXX") {
+        if (mkdtemp(path_.data()) == nullptr)
             throw std::runtime_error("no temporary folder");
-        path_ = name;
     }
     TemporaryFolder(const TemporaryFolder&) = delete;
     TemporaryFolder& operator=(const TemporaryFolder&) = delete;
@@ -36,10 +34,11 @@ class TemporaryFolder {
         return {std::istreambuf_iterator<char>(file), {}};
     }
     [[nodiscard]] bool Has(const std::string& name) const { return std::filesystem::exists(File(name)); }
-    // The names of what lies in it, in alphabetical order.
-    [[nodiscard]] std::vector<std::string> Names() const {
+    // The names of what lies in it, or in a folder below, in alphabetical order.
+    [[nodiscard]] std::vector<std::string> Names(const std::string& below = "") const {
         std::vector<std::string> names;
-        for (const auto& entry : std::filesystem::directory_iterator(path_))
+        std::error_code missing;
+        for (const auto& entry : std::filesystem::directory_iterator(File(below), missing))
             names.push_back(entry.path().filename().string());
         std::sort(names.begin(), names.end());
         return names;

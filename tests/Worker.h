@@ -11,14 +11,13 @@
 class Worker {
   public:
     explicit Worker(std::function<void()> work) : work_(std::move(work)) {
-        id_ = spawn_thread(
-            [](void* data) {
-                auto* worker = static_cast<Worker*>(data);
-                worker->work_();
-                worker->ended_ = true;
-                return int32{0};
-            },
-            "worker", suggest_thread_priority(), this);
+        const auto run = [](void* data) {
+            auto* worker = static_cast<Worker*>(data);
+            worker->work_();
+            worker->ended_ = true;
+            return int32{0};
+        };
+        id_ = spawn_thread(run, "worker", suggest_thread_priority(), this);
         resume_thread(id_);
     }
     Worker(const Worker&) = delete;
@@ -29,7 +28,6 @@ class Worker {
     }
 
     [[nodiscard]] thread_id Id() const { return id_; }
-    [[nodiscard]] bool HasEnded() const { return ended_; }
 
   private:
     std::function<void()> work_;

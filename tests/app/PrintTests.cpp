@@ -15,26 +15,20 @@ class Print : public testing::Test, protected Program {
             auto* found = qobject_cast<QDialog*>(QApplication::activeModalWidget());
             return found && found->objectName() == name ? found : nullptr;
         };
-        When(name, shown, [=] {
+        When(shown, [=] {
             if (!file.empty())
                 shown()->findChild<QLineEdit*>("filename")->setText(QString::fromStdString(file));
             accept ? shown()->accept() : shown()->reject();
         });
     }
-    // A step that waits for a report of the portfolio or investment.
-    void ExpectPrinted(const std::string& file, const std::string& name) {
-        Await("report of " + name, [=, this] { return prints_.Read(file).starts_with("%PDF"); });
-        Then(file, [=, this] {
-            EXPECT_NE(Output("pdftotext -layout " + prints_.File(file) + " -").find(name), std::string::npos);
+    // Steps that have the report printed, and wait for one of the portfolio or investment.
+    void PrintTo(const std::string& named, const std::string& file, const std::string& content) {
+        InDialog("print dialog", true, named);
+        Await([=, this] { return prints_.Read(file).starts_with("%PDF"); }).Then([=, this] {
+            EXPECT_NE(Output("pdftotext " + prints_.File(file) + " -").find(content), std::string::npos);
             EXPECT_EQ(Window()->FindView("printer view"), nullptr);
         });
     }
-    // Steps that print over a file that is there already.
-    void PrintOver(const std::string& file, const char* answer) {
-        Then("in the way", [=, this] { prints_.Write(file, "kept"); }).Send(MessagePortfolioPrint);
-        Answer("The file " + prints_.File(file) + " exists. Replace it by this report?", answer);
-    }
-
     const TemporaryFolder prints_;
 };
 
@@ -47,29 +41,17 @@ TEST_F(Print, AsksOnceAndNothingAfterACancel) {
     AddInvestment(MakeInvestment("Full one", "Timber"));
     Expect({"Timber"}).Send(MessagePortfolioPrint);
     InDialog("page setup dialog", false);
-    Send(MessagePortfolioPrint);
+    Then([] { Press(Main(), "print button"); });
     InDialog("page setup dialog", true);
-    InDialog("print dialog", false, prints_.File("a.pdf"));
-    Then("button", [this] {
-        EXPECT_FALSE(prints_.Has("a.pdf"));
-        Press(Main(), "print button");
-    });
-    InDialog("page setup dialog", true);
-    InDialog("print dialog", true, prints_.File("a.pdf"));
-    ExpectPrinted("a.pdf", "Timber");
+    PrintTo(prints_.File("a.pdf"), "a.pdf", "Timber");
     // A file that is there is not replaced unasked. Another one may be named, by its name alone.
-    Select("Empty one").Expect({});
-    PrintOver("a.pdf", "No");
-    InDialog("print dialog", true, "b.pdf");
-    ExpectPrinted("b.pdf", "Empty one");
-    PrintOver("b.pdf", "Yes");
-    ExpectPrinted("b.pdf", "Empty one");
+    Select("Empty one").Expect({}).Send(MessagePortfolioPrint);
+    Answer("The file " + prints_.File("a.pdf") + " exists. Replace it by this report?", "No");
+    PrintTo("b.pdf", "b.pdf", "Empty one");
     // A place that is gone is told of, and asked for anew.
-    Then("gone", [this] {
-        EXPECT_EQ(prints_.Read("a.pdf"), "kept");
-        std::filesystem::remove_all(prints_.Path());
-    }).Send(MessagePortfolioPrint);
-    Answer("The report could not be printed! Is the printer there, or the file protected?", "Ok");
+    Then([this] { std::filesystem::remove_all(prints_.Path()); });
+    Send(MessagePortfolioPrint);
+    Answer("The report could not be printed! Is the printer there, or the file protected?");
     Send(MessagePortfolioPrint);
     InDialog("page setup dialog", false);
     RunAndClose();

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <source_location>
 #include <string>
 #include <vector>
 
@@ -20,9 +21,16 @@
 
 using Texts = std::vector<std::string>;
 
-// The program in a folder of the test's own: fill the folder, give the driver its steps, and Run.
+inline constexpr const char* NotKept =
+    "The change could not be saved! Is the disk full, or the file protected?";
+inline constexpr const char* NothingToTake = "You must select a(n) investment(s) to cut or copy.";
+
+// The program in a folder of the test's own: fill the folder, give the driver its steps, and Run. A step that
+// waits in vain is told by its line.
 class Program : public DataFolder, public Driver {
   public:
+    using Place = std::source_location;
+
     Program() { BApplication::SetExecutablePath(File("quorvan").c_str()); }
 
     // From start to end, as main does it. The last step is to end the program. Returns its exit status.
@@ -33,58 +41,61 @@ class Program : public DataFolder, public Driver {
     }
     // The same, with a last step that closes the main window.
     int RunAndClose() { return Close().Run(); }
-    // A step as soon as the main window is shown and nothing keeps the person out of it.
-    Program& Then(std::string what, Action action) {
-        When(
-            std::move(what),
-            [] { return Main() && !QApplication::activeModalWidget() && !QApplication::activePopupWidget(); },
-            std::move(action));
+
+    Program& When(Condition condition, Action action, Place at = Place::current()) {
+        Driver::When("line " + std::to_string(at.line()), std::move(condition), std::move(action));
         return *this;
     }
+    Program& Await(Condition condition, Place at = Place::current()) {
+        return When(std::move(condition), Action([] {}), at);
+    }
+    Program& Answer(const std::string& text, const char* button = "Ok") {
+        Driver::Answer(text, button);
+        return *this;
+    }
+    // A step as soon as the main window is shown and nothing keeps the person out of it.
+    Program& Then(Action action, Place at = Place::current()) {
+        const auto free = [] {
+            return Main() && !QApplication::activeModalWidget() && !QApplication::activePopupWidget();
+        };
+        return When(free, std::move(action), at);
+    }
     Program& Close() {
-        return Then(
-            "close box", [] { Main()->close(); });
+        return Then([] { Main()->close(); });
     }
     // A step that sends a command and waits for what it led to.
     Program& Send(uint32 code) {
-        return Then(
-            "command " + std::to_string(code), [code] { Window()->PostMessage(code); });
+        return Then([code] { Window()->PostMessage(code); });
     }
-    Program& Select(const std::string& portfolio) {
-        return Then(
-            "select " + portfolio,
-            [portfolio] {
-                BMessage message(1015);
-                message.AddString("PortfolioName", portfolio.c_str());
-                Window()->PostMessage(&message);
-            });
+    Program& Select(const char* portfolio) {
+        return Then([portfolio] { Choose(portfolio); });
     }
     // A step that selects these rows of the list and no others.
     Program& Mark(std::vector<int32> rows) {
-        return Then(
-            "mark rows",
-            [rows = std::move(rows)] {
-                Locked([&] {
-                    List()->DeselectAll();
-                    for (const int32 row : rows)
-                        List()->Select(row, true);
-                });
-            });
+        const auto mark = [rows = std::move(rows)] {
+            List()->DeselectAll();
+            for (const int32 row : rows)
+                List()->Select(row, true);
+        };
+        return Then([mark] { Locked(mark); });
     }
-    // A step that waits until the list shows these investments, by name and in this order; then, if one is
-    // given, the total must be this.
-    Program& Expect(const Texts& names, const std::string& total = "") {
-        std::string what = "rows:";
-        for (const std::string& name : names)
-            what += " " + name;
-        When(
-            what, [names] { return Main() && Names() == names; },
-            [=] { EXPECT_TRUE(total.empty() || Total() == "Total Value: " + total) << what << Total(); });
-        return *this;
+    // A step that waits until the list shows these investments, by name and in this order, and, if one is
+    // given, this total.
+    Program& Expect(const Texts& names, const std::string& total = "", Place at = Place::current()) {
+        const auto shown = [=] {
+            return Main() && Names() == names && (total.empty() || Total() == "Total Value: " + total);
+        };
+        return Await(shown, at);
     }
 
     static QWidget* Main() { return Driver::Window("Quorvan"); }
     static NorvelWindow* Window() { return static_cast<NorvelWindow*>(GetAppWindow(be_app, "Quorvan")); }
+    // What the selector sends.
+    static void Choose(const char* portfolio) {
+        BMessage message(MessagePortfolioSelected);
+        message.AddString(PortfolioNameField, portfolio);
+        Window()->PostMessage(&message);
+    }
     // The first such view at or below this one.
     template <class View>
     static View* Find(BView* view = Window()->FindView("top view")) {
@@ -104,11 +115,11 @@ class Program : public DataFolder, public Driver {
         return names;
     }
     static QAbstractItemView* RowsWidget() { return Main()->findChild<QAbstractItemView*>(); }
-    static void ClickRow(int32 index, Qt::KeyboardModifiers keys = {}) {
+    static void ClickRow(int32 index) {
         List()->ScrollToRow(index);
         const BRect frame = List()->ItemFrame(index);
         const QPoint place(30, static_cast<int>((frame.top + frame.bottom) / 2 - List()->Bounds().top));
-        QTest::mouseClick(RowsWidget()->viewport(), Qt::LeftButton, keys, place);
+        QTest::mouseClick(RowsWidget()->viewport(), Qt::LeftButton, {}, place);
     }
     // Changes to the list want its window's lock.
     static void Locked(const Action& change) {

@@ -22,7 +22,6 @@
 namespace {
 
 constexpr const char* Title = "Getting current prices...";
-constexpr const char* NotSaved = "The change could not be saved! Is the disk full, or the file protected?";
 constexpr const char* NoConnection =
     "No Internet connection found!\nPlease establish your connection and try again.";
 
@@ -61,27 +60,26 @@ class PriceUpdate : public testing::Test, protected Program {
         for (const char* ticker : {"RISE", "FALL", "SAME", "FAIL", "NEW"})
             AddInvestment(Holding(ticker, 11, NoPreviousPrice));
     }
-    void Update() {
-        Then(
-            "update", [] { Press(Main(), "Update button"); });
+    Program& Update() {
+        return Then([] { Press(Main(), "Update button"); });
     }
     // The main window can be worked again and shows the prices of the file.
-    void UntilDone() {
-        Await(
-            "the progress window goes", [] { return Main() && !Driver::Window(Title); });
+    Program& UntilDone() {
+        return Await([] { return Main() && !Driver::Window(Title); });
+    }
+    // Waits for the new price of the first row.
+    Program& UntilPriced() {
+        return Await([] { return std::string(Row(0)->Text(5)) == "12.50"; });
     }
     // Updates until the server is held at a ticker, and then does this.
     void UpdateUpTo(const char* ticker, std::size_t requests, Action action) {
         held_ = ticker;
-        Update();
-        When(
-            "requests", [this, requests] { return server_.Requests().size() == requests; },
-            std::move(action));
+        const auto asked = [this, requests] { return server_.Requests().size() == requests; };
+        Update().When(asked, std::move(action));
     }
     // A step from which on the investments' file is this.
     void Watch(FaultyFiles& files) {
-        Then(
-            "watch", [this, &files] { files.Watch(app_state->investments, File("invest.db")); });
+        Then([this, &files] { files.Watch(app_state->investments, File("invest.db")); });
     }
     INVESTMENT_DATA Record(long number) const {
         INVESTMENT_DATA record{};
@@ -108,23 +106,15 @@ class PriceUpdate : public testing::Test, protected Program {
 };
 
 TEST(ApplyQuote, ChangesWhatItShall) {
-    constexpr auto failed = QuoteOutcome::Failed;
-    for (const auto& [quote, outcome] : {std::pair{12.5F, QuoteOutcome::Priced},
-                                         {NoQuote, QuoteOutcome::NoPrice},
-                                         {std::numeric_limits<float>::infinity(), QuoteOutcome::NoPrice},
-                                         {3e38F, QuoteOutcome::NoPrice},
-                                         {0, failed},
-                                         {NoQuoteSources, failed},
-                                         {std::nanf(""), failed}}) {
+    using enum QuoteOutcome;
+    for (const float quote : {12.5F, NoQuote, HUGE_VALF, 3e38F, 0.F, NoQuoteSources, std::nanf("")}) {
+        const bool unknown = quote == NoQuote || quote > 1e38F; // or the value is beyond a float
+        const QuoteOutcome outcome = quote == 12.5F ? Priced : unknown ? NoPrice : Failed;
         INVESTMENT_DATA record = Holding("T", 11, 5);
+        INVESTMENT_DATA expected = outcome == Priced ? Holding("T", quote, 11) : record;
+        expected.Date = outcome == Priced ? Today() : expected.Date;
         record.QuoteError = 7;
-        INVESTMENT_DATA expected = record;
-        if (outcome == QuoteOutcome::Priced) {
-            expected = Holding("T", quote, 11);
-            expected.Date = Today();
-        } else if (outcome == QuoteOutcome::NoPrice) {
-            expected.QuoteError = 1;
-        }
+        expected.QuoteError = outcome == Priced ? 0 : outcome == NoPrice ? 1 : 7;
         EXPECT_EQ(ApplyQuote(record, quote), outcome) << quote;
         EXPECT_EQ(std::memcmp(&record, &expected, sizeof record), 0) << quote;
     }
@@ -138,18 +128,15 @@ TEST_F(PriceUpdate, AsksForTheSelectedRowsThatHaveATicker) {
     Mark({5, 0, 1, 2, 3});
     Update();
     UntilDone();
-    When(
-        "the new prices", [] { return std::string(Row(0)->Text(5)) == "12.50"; },
-        [&] {
-            EXPECT_TRUE(files.HaveSynced());
-            const PriceMove moves[] = {PriceMove::Up,       PriceMove::Down,    PriceMove::Same,
-                                       PriceMove::NotFound, PriceMove::Unknown, PriceMove::Unknown};
-            for (int32 row = 0; row < 6; ++row)
-                EXPECT_EQ(Row(row)->Movement(), moves[row]) << row;
-            EXPECT_EQ(Total(), "Total Value: $482,558.75");
-        });
+    UntilPriced().Then([&] {
+        EXPECT_TRUE(files.HaveSynced());
+        using enum PriceMove;
+        const PriceMove moves[] = {Up, Down, Same, NotFound, Unknown, Unknown};
+        for (int32 row = 0; row < 6; ++row)
+            EXPECT_EQ(Row(row)->Movement(), moves[row]) << row;
+        EXPECT_EQ(Total(), "Total Value: $482,558.75");
+    });
     RunAndClose();
-    EXPECT_EQ(Record(1).PrevPrice, 11);
     ExpectUntouched(4, "NEW");
     const std::string log = Read("Quorvan.log");
     EXPECT_EQ(log.find("Checked '127.0.0.1', connection found ok\nChecking price for 'RISE'\n"), 0U) << log;
@@ -161,25 +148,19 @@ TEST_F(PriceUpdate, FromThePressToTheEndThereIsNoOtherCommand) {
     Write("Quorvan.ini", "[GENERAL]\nIsConnectedURL=slow.example\n[DISPLAY]\n");
     constexpr const char* waiting = "Looking for a connection";
     const auto press = [] {
-        Press(Main(), "Update button");
-        Press(Main(), "Update button");
-        Window()->PostMessage(1022);
-        BMessage other(1015);
-        other.AddString("PortfolioName", "Other");
-        Window()->PostMessage(&other);
+        for (int presses = 0; presses < 2; ++presses)
+            Press(Main(), "Update button");
+        Window()->PostMessage(MessageInvestmentCopy);
+        Choose("Other");
     };
-    Mark({0});
-    Then("press", press);
+    Mark({0}).Then(press);
     When(
-        "wait", WindowShown(waiting), [] { Press(Driver::Window(waiting), "cancel button"); });
-    Await("cancelled", [this] { return Read("Quorvan.log") == "Checked 'slow.example', cancelled\n"; });
-    Then("press again", press);
-    When("wait again", WindowShown(waiting), [] { slowHostIsFound.release(2); });
+        WindowShown(waiting), [] { Press(Driver::Window(waiting), "cancel button"); });
+    Await([this] { return Read("Quorvan.log") == "Checked 'slow.example', cancelled\n"; }).Then(press);
+    When(WindowShown(waiting), [] { slowHostIsFound.release(2); });
     UntilDone();
-    Await("the new price", [] { return std::string(Row(0)->Text(5)) == "12.50"; });
-    Expect({"RISE", "FALL", "SAME", "FAIL", "NEW"});
-    Send(1024); // commands are taken again
-    Answer("You must select a(n) investment(s) to cut or copy.", "Ok");
+    UntilPriced().Expect({"RISE", "FALL", "SAME", "FAIL", "NEW"});
+    Send(MessageInvestmentCut).Answer(NothingToTake); // taken again
     RunAndClose();
     EXPECT_EQ(server_.Requests().size(), 1U);
 }
@@ -203,44 +184,38 @@ TEST_F(PriceUpdate, ClosedHalfWayItGoesOnceTheFirstHalfIsOnTheDisk) {
             EXPECT_EQ(bar->value() * 6, bar->maximum() * 3);
             Driver::Window(Title)->close();
         });
-    When(
-        "the worker waits for the disk", [&] { return syncing.load(); },
-        [&] {
-            EXPECT_TRUE(QApplication::activeModalWidget());
-            EXPECT_EQ(QApplication::activeModalWidget(), Driver::Window(Title));
-            go.release();
-        });
-    Answer(NotSaved, "Ok");
-    UntilDone();
-    RunAndClose();
+    Await([&] { return syncing.load(); }).When(QApplication::activeModalWidget, [&] {
+        EXPECT_EQ(QApplication::activeModalWidget(), Driver::Window(Title));
+        go.release();
+    });
+    Answer(NotKept);
+    UntilDone().RunAndClose();
     EXPECT_EQ(Record(1).Price, 10.375F);
     ExpectUntouched(2, "SAME");
     EXPECT_EQ(server_.Requests().size(), 3U); // no reload is shown, and nobody was asked again
 }
 
 TEST_F(PriceUpdate, EndsWithAnAlertWhenNobodyCanBeAsked) {
-    TlsServer stranger(TlsIdentity("IP:127.0.0.1"), [](const std::string&) { return Reply{}; });
+    const TlsServer stranger(TlsIdentity("IP:127.0.0.1"), [](const std::string&) { return Reply{}; });
     const std::string toStranger = "stranger " + stranger.Host() + " /a Last 1\n";
     constexpr const char* notTrusted =
         "The server 127.0.0.1 could not be trusted: its certificate was refused, and it was not asked for a "
         "price.\nIs the name in Quorvan.cfg right, and the date of this computer?";
-    std::filesystem::remove(File("Quorvan.cfg"));
-    for (const auto& [host, sources, alert, logged] :
-         {std::tuple{"127.0.0.1", "", NoConnection, "Unable to open '"},
-          {"127.0.0.1\r", "reset 127.0.0.1:1 /a Last 1\n", NoConnection, "connect() error\n"},
-          {"127.0.0.1", toStranger.c_str(), notTrusted, "https error: SSL certificate problem"},
-          {"", ";\n", NoConnection, "Checked '', no connection found!\n"}}) {
-        Then("prepare", [this, host = host, sources = sources] {
-            Write("Quorvan.ini", std::string("[GENERAL]\nIsConnectedURL=") + host + "\n");
-            if (*sources != '\0')
-                Write("Quorvan.cfg", sources);
+    const std::tuple<std::string, std::string, const char*, const char*> cases[] = {
+        {"127.0.0.1", "", NoConnection, "Unable to open '"},
+        {"127.0.0.1\r", "reset 127.0.0.1:1 /a Last 1\n", NoConnection, "connect() error\n"},
+        {"127.0.0.1", toStranger, notTrusted, "https error: SSL certificate problem"},
+        {"", ";\n", NoConnection, "Checked '', no connection found!\n"}};
+    for (const auto& [host, sources, alert, logged] : cases) {
+        Then([&] {
+            Write("Quorvan.ini", "[GENERAL]\nIsConnectedURL=" + host + "\n");
+            Write("Quorvan.cfg", sources);
+            if (sources.empty())
+                std::filesystem::remove(File("Quorvan.cfg"));
         });
-        Update();
-        Answer(alert, "Ok");
-        UntilDone();
-        Then("the log", [this, logged = logged] {
-            EXPECT_NE(Read("Quorvan.log").find(logged), std::string::npos) << Read("Quorvan.log");
-        });
+        Update().Answer(alert);
+        UntilDone().Then(
+            [&] { EXPECT_NE(Read("Quorvan.log").find(logged), std::string::npos) << Read("Quorvan.log"); });
     }
     RunAndClose();
     ExpectUntouched(0, "RISE");
@@ -251,8 +226,7 @@ TEST_F(PriceUpdate, TheProgramsEndStopsItAndTellsOfADiskThatFails) {
     files.may = [](char call) { return call != 's'; };
     Watch(files);
     UpdateUpTo("FALL", 2, [] { be_app->PostMessage(B_QUIT_REQUESTED); });
-    Answer(NotSaved, "Ok");
-    Run();
+    Answer(NotKept).Run();
     EXPECT_EQ(Record(0).Price, 12.5F);
     ExpectUntouched(1, "FALL");
 }

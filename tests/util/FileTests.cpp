@@ -6,7 +6,6 @@
 #include <sys/resource.h>
 
 #include "InChild.h"
-#include "Output.h"
 #include "Shell.h"
 #include "util/File.h"
 #include "util/FolderLock.h"
@@ -187,8 +186,8 @@ TEST_F(FolderLockTest, IsHeldByOneAndNamesItUntilReleased) {
 
 // A text left behind, and whether the lock is given in spite of it.
 TEST_F(FolderLockTest, DoubtsWhatTheSystemsLockDoesNotTell) {
-    WaitingChild ended([] {});
-    ended.Kill();
+    folder_.Run("echo $$");
+    const long ended = std::stol(folder_.Output());
     const std::string alive = LockText(OwnHost, getpid());
     const FolderLock::LockCall usual = FolderLock::LockBySystem;
     const FolderLock::LockCall none = [](int /*file*/) { return ENOLCK; };
@@ -198,8 +197,8 @@ TEST_F(FolderLockTest, DoubtsWhatTheSystemsLockDoesNotTell) {
         {usual, std::string(100000, '\1'), Outcome::Taken},
         {none, "", Outcome::Taken},
         {none, alive, Outcome::Doubtful},
-        {none, LockText(OwnHost, ended.Id()), Outcome::Taken},
-        {none, LockText("elsewhere", ended.Id()), Outcome::Doubtful}};
+        {none, LockText(OwnHost, ended), Outcome::Taken},
+        {none, LockText("elsewhere", ended), Outcome::Doubtful}};
     for (const auto& [call, text, outcome] : cases) {
         SCOPED_TRACE(text.substr(0, 100));
         folder_.Write(LockName, text);
