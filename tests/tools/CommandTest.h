@@ -23,9 +23,25 @@ class CommandTest : public testing::Test {
     }
     // Whether a command succeeds and says so.
     testing::AssertionResult Works(const std::string& command, const std::string& text = "") {
-        if (folder_.Run(command) == 0)
-            return folder_.Says(text);
-        return testing::AssertionFailure() << command << ":\n" << folder_.Output() << folder_.Errors();
+        return testing::AssertionResult(folder_.Run(command) == 0 && folder_.Says(text))
+               << command + ":\n" + folder_.Output() + folder_.Errors();
+    }
+    struct Step {
+        std::string arguments;
+        std::string output;
+        std::vector<std::string> errors = {}; // what is told
+        int status = errors.empty() ? 0 : 1;
+    };
+    // Goes through the command's steps.
+    void Expect(const std::string& command, const std::vector<Step>& steps) {
+        for (const Step& step : steps) {
+            SCOPED_TRACE(step.arguments);
+            EXPECT_EQ(folder_.Run(command + step.arguments), step.status) << folder_.Errors();
+            EXPECT_EQ(folder_.Output(), step.output);
+            EXPECT_EQ(folder_.Errors().empty(), step.errors.empty()) << folder_.Errors();
+            for (const std::string& error : step.errors)
+                EXPECT_TRUE(folder_.Complains(error));
+        }
     }
     // All that a command prints, which must succeed.
     std::string Printed(const std::string& command) {

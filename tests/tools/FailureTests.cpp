@@ -9,9 +9,8 @@ namespace {
 class FailureTest : public CommandTest {};
 
 TEST_F(FailureTest, AWrongCommandLineDoesNothing) {
-    for (const std::string arguments :
-         {"", "quote", "quote --home", "chart A 2000", "report A", "report -o A", "setup", "db", "db A",
-          "db A create", "db A query a b", "db A delete x"})
+    for (const std::string arguments : {"", "quote", "chart A 2000", "report A", "report -o A", "setup",
+                                        "db A", "db A create", "db A query a b"})
         EXPECT_EQ(folder_.Run("quorvan-cli " + arguments), 2) << arguments;
     const std::pair<std::string, const char*> cases[] = {
         {"quote A --home home --source 'n h /q Last 2'", "excludes"},
@@ -85,6 +84,8 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
         {"quorvan-cli db a.db query --sort Nome", "1701 "},
         {"quorvan-cli db a.db query >/dev/full", "the output cannot be written: No space left on device"},
         {"quorvan-cli db a.db append N=1 N=2", "the column N is given twice"},
+        {"quorvan-cli db a.db append N=x", "a.db: N: 'x' is no whole number from -128 to 127"},
+        {"quorvan-cli db a.db set 'N = 128' --all", "a.db: N: '128' is no whole number"},
         {"quorvan-cli db a.db append Nn=1", "'Nn=1' begins with no column's name"},
         {"quorvan-cli db a.db set N=1 --all", ": a change is a column, an operator and a value"},
         {"quorvan-cli db a.db load a.db", "a.db: 1801 "},
@@ -92,8 +93,7 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
         {"quorvan-cli db a.db export no/where", "1901 Export error - unable to open output file (No such"},
         {"quorvan-cli db a.db create --column N:byte", "1102 Create error - file already exists"},
         {"quorvan-cli db n create --column N:byte --column N:long", "the column N is given twice"},
-        {"quorvan-cli db n create --column N:byte --description thirty-two-bytes-thirty-two-bytes",
-         "31 bytes"},
+        {"quorvan-cli db n create --column N:byte --description $(printf %032d 1)", "31 bytes"},
         {"quorvan-cli db bad.db append",
          "its header disagrees with it; nothing is changed before `check --repair`"},
         {reader + " db kept/a.db append", "the file may only be read, not changed"},
