@@ -62,11 +62,11 @@ class Process {
 class Display {
   public:
     Display() {
-        WaitUntil([this] { return folder_.Read("number").ends_with('\n') || server_.HasEnded(); });
+        if (!WaitUntil([this] { return folder_.Read("number").ends_with('\n'); }))
+            throw std::runtime_error("Xvfb did not start");
         setenv("DISPLAY", (":" + Output("cat " + folder_.File("number"))).c_str(), 1);
         setenv("QT_QPA_PLATFORM", "xcb", 1);
     }
-    [[nodiscard]] bool IsReady() { return !server_.HasEnded(); }
 
   private:
     const TemporaryFolder folder_;

@@ -6,10 +6,8 @@ namespace {
 
 class BuiltProgram : public testing::Test, protected DataFolder {
   protected:
-    void SetUp() override {
-        std::filesystem::copy(QUORVAN_PROGRAM, File("quorvan"));
-        ASSERT_TRUE(display_.IsReady()) << "Xvfb did not start";
-    }
+    BuiltProgram() { std::filesystem::copy(QUORVAN_PROGRAM, File("quorvan")); }
+
     static std::string WindowOf(const Process& program) {
         return Output("xdotool search --onlyvisible --pid " + std::to_string(program.Id()) + " 2>/dev/null");
     }
@@ -28,7 +26,7 @@ class BuiltProgram : public testing::Test, protected DataFolder {
     const std::string start_ = "exec " + File("quorvan");
 
   private:
-    Display display_;
+    const Display display_;
 };
 
 TEST_F(BuiltProgram, HasItsFolderToItselfUntilItHasGoneHoweverItWent) {

@@ -42,7 +42,6 @@ TEST(InvestmentTexts, FiguresAreWhole) {
     EXPECT_EQ(TextOf(FormatShares, 1.0005F), "1.000"); // just below in binary
     EXPECT_EQ(TextOf(FormatValue, 1234.5F), "1234.50");
     EXPECT_EQ(TextOf(FormatValue, 1e17F), "99999998,430,674,944.00");
-    EXPECT_EQ(TextOf(FormatDay, dbDATE{3, 2, 2001}), "02-03-2001");
 }
 
 TEST(PortfolioRules, OnlyFilesOfTheProgramsLayoutAreTaken) {

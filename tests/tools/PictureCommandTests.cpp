@@ -5,12 +5,10 @@
 
 namespace {
 
-class PictureCommandTest : public CommandTest {
-  protected:
-    PictureCommandTest() { EXPECT_TRUE(Works(Setup("--sample", "Quorvan"))); }
-};
+class PictureCommandTest : public CommandTest {};
 
 TEST_F(PictureCommandTest, WritesEachKindOfFileAndChangesNoData) {
+    ASSERT_TRUE(Works(Setup("--sample", "Quorvan")));
     const std::string before = State();
     const std::array<std::string, 3> cases[] = {
         {"chart --home Quorvan 'my retirement fund' 2000 -o out.svg", "cat out.svg",
@@ -31,6 +29,7 @@ TEST_F(PictureCommandTest, WritesEachKindOfFileAndChangesNoData) {
 
 // Without --home the folder is the program's own, or Quorvan in the person's.
 TEST_F(PictureCommandTest, PicturesAreAsPrivateAsThePersonWants) {
+    ASSERT_TRUE(Works(Setup("--sample", "Quorvan")));
     const std::string chart = "quorvan-cli chart 'My Retirement Fund' 2000 -o ";
     EXPECT_TRUE(Works("umask 077; HOME=$PWD " + chart + "new.svg"));
     EXPECT_TRUE(Works("echo >kept.svg; chmod 640 kept.svg; ln -s kept.svg link.svg; HOME=/nowhere Quorvan/" +

@@ -26,10 +26,8 @@ class QuoteCommandTest : public CommandTest {
 TEST_F(QuoteCommandTest, ShowsWhatEachSourceGives) {
     folder_.Write("home/Quorvan.cfg",
                   "one no..such..host /q?s= Last 2\ntwo fields\n" + Source(" /q?s= Last 2\n"));
-    EXPECT_EQ(folder_.Run("quorvan-cli quote --home home ABC"), 0);
-    EXPECT_EQ(folder_.Output(), "ABC\t45.38\n");
-    EXPECT_EQ(folder_.Errors(),
-              "ABC: looking in home/Quorvan.cfg\n"
+    EXPECT_EQ(Printed("quorvan-cli quote --home home ABC"),
+              "ABC\t45.38\nABC: looking in home/Quorvan.cfg\n"
               "source one: asking no..such..host for /q?s=ABC, marker 'Last', skip 2\n"
               "  failed: gethostbyname() error: the name does not resolve\n"
               "  no price, -4.00\n"
