@@ -1,4 +1,4 @@
-#include "Output.h"
+#include "Shell.h"
 #include "SampleFile.h"
 
 namespace {

@@ -1,6 +1,6 @@
 #include <random>
 
-#include "Output.h"
+#include "Shell.h"
 #include "SampleFile.h"
 
 namespace {
