@@ -2,6 +2,8 @@
 
 #include <algorithm>
 #include <cmath>
+#include <iterator>
+#include <numbers>
 
 #include "util/Numbers.h"
 #include "util/Utf8.h"
@@ -12,9 +14,30 @@ constexpr float FullTurn = 360;
 constexpr float LeastSweep = 0.1F; // a fifth of a pixel on the rim of a window's pie
 
 std::string Fixed(double value) {
-    char text[64]; // a float's 39 digits and two more
+    char text[96]; // a share of the smallest float has more digits than the largest float
     FormatFixed(value, text, sizeof text, 2);
     return text;
+}
+
+bool IsRightToLeft(char32_t code) {
+    constexpr struct {
+        char32_t first, last;
+    } ranges[] = {{0x590, 0x8FF},   {0x200F, 0x200F},   {0x202A, 0x202E},  {0xFB1D, 0xFDFF},
+                  {0xFE70, 0xFEFF}, {0x10800, 0x10FFF}, {0x1E800, 0x1EFFF}};
+    return std::any_of(std::begin(ranges), std::end(ranges),
+                       [code](const auto& range) { return code >= range.first && code <= range.last; });
+}
+
+// Such a label would turn the order of the numbers behind it as well. Between these two invisible characters
+// it keeps its direction to itself.
+std::string Isolated(const std::string& label) {
+    for (std::string_view rest = label; !rest.empty();) {
+        const Utf8Character character = DecodeFirst(rest);
+        if (IsRightToLeft(character.code))
+            return "\u2068" + label + "\u2069";
+        rest.remove_prefix(std::max<std::size_t>(character.length, 1));
+    }
+    return label;
 }
 
 } // namespace
@@ -33,34 +56,57 @@ PieEllipse EllipseIn(BRect chart) {
     return {{chart.left + width * 0.5F, chart.top + height * 0.5F}, radius, radius * 6 / 10};
 }
 
-bool IsPie(float total) {
+BPoint PointInPie(const PieEllipse& pie, float angle, float part) {
+    const float radians = angle / 180 * std::numbers::pi_v<float>;
+    return {pie.center.x + pie.xRadius * part * std::cos(radians),
+            pie.center.y - pie.yRadius * part * std::sin(radians)};
+}
+
+bool IsPie(double total) {
     return std::isfinite(total) && total != 0;
 }
 
-std::vector<PieSlice> SlicesOf(const float* values, int count, float total) {
+std::vector<PieSlice> SlicesOf(const float* values, int count) {
     std::vector<PieSlice> slices;
-    if (!IsPie(total))
+    const auto drawn = [values](int i) { return values[i] > 0 ? static_cast<double>(values[i]) : 0.0; };
+    double whole = 0;
+    for (int i = 0; i < count; ++i)
+        whole += drawn(i);
+    if (!IsPie(whole))
         return slices;
-    float angle = 0;
-    float drawn = 0;
+    double sum = 0;
+    float start = 0;
     for (int i = 0; i < count; ++i) {
-        // Values below 0 among others can make shares of more than the whole.
-        const float sweep = std::clamp(values[i] / total * FullTurn, -FullTurn, FullTurn);
-        angle += sweep;
-        if (std::abs(angle - drawn) < LeastSweep && i + 1 < count)
+        sum += drawn(i);
+        const auto end = static_cast<float>(sum / whole * FullTurn);
+        if (end - start < LeastSweep)
             continue;
-        if (angle != drawn)
-            slices.push_back({drawn, std::clamp(angle - drawn, -FullTurn, FullTurn), i});
-        drawn = angle;
+        slices.push_back({start, end - start, i});
+        start = end;
     }
+    slices.back().sweep = FullTurn - slices.back().start;
     return slices;
+}
+
+int ValueAt(const std::vector<PieSlice>& slices, const PieEllipse& pie, BPoint where) {
+    const float x = (where.x - pie.center.x) / pie.xRadius;
+    const float y = (pie.center.y - where.y) / pie.yRadius;
+    if (x * x + y * y > 1)
+        return -1;
+    const float angle = std::atan2(y, x) / std::numbers::pi_v<float> * 180;
+    const float turned = angle < 0 ? angle + FullTurn : angle;
+    const auto found = std::find_if(slices.begin(), slices.end(), [turned](const PieSlice& slice) {
+        return turned <= slice.start + slice.sweep;
+    });
+    return found == slices.end() ? -1 : found->value;
 }
 
 std::string LegendLine(const char* label, float value, float total, int decimalPlaces) {
     if (decimalPlaces != 2 && decimalPlaces != 3)
-        return label;
+        return Isolated(label);
     const char* unit = decimalPlaces == 2 ? ": $" : ": ";
-    return std::string(label) + unit + Fixed(value) + " " + Fixed(value / total * 100) + "%";
+    const double share = static_cast<double>(value) / total * 100;
+    return Isolated(label) + unit + Fixed(value) + " " + Fixed(share) + "%";
 }
 
 std::string FittedLegendLine(const char* label, float value, float total, int decimalPlaces, float width,
@@ -91,6 +137,6 @@ GrowthRow Grow(float currentValue, float rate) {
 }
 
 float PlaceOnAxis(float value, float from, float to, float begin, float end) {
-    const float place = begin + (value - from) * (end - begin) / (to - from);
-    return std::isfinite(place) ? place : begin;
+    const double part = (static_cast<double>(value) - from) / (static_cast<double>(to) - from);
+    return std::isfinite(part) ? static_cast<float>(begin + part * (end - begin)) : begin;
 }

@@ -32,16 +32,24 @@ struct PieSlice {
     float sweep;
     int value; // whose colour it has
 };
-// A slice for every value, in order, from 0 degrees on: its sweep is its share of total times 360. Slices too
-// narrow to be told apart are one with the next that is not, so that a thousand of them take no longer to
-// draw than can be seen. None when total is 0 or no number.
-[[nodiscard]] std::vector<PieSlice> SlicesOf(const float* values, int count, float total);
+// A slice for every value above 0, in order, from 0 degrees on: its sweep is its share of what these come to,
+// times 360. Slices too narrow to be told apart are one with the next that is not, or at the end with the
+// last, so that a thousand of them take no longer to draw than can be seen. None when the values above 0 come
+// to nothing or to no number.
+[[nodiscard]] std::vector<PieSlice> SlicesOf(const float* values, int count);
 
-// Whether a pie can be made of values with this sum.
-[[nodiscard]] bool IsPie(float total);
+// The value whose slice lies there; -1 beside the pie.
+[[nodiscard]] int ValueAt(const std::vector<PieSlice>& slices, const PieEllipse& pie, BPoint where);
+
+// The point in this direction, at a part of the way from the centre to the rim.
+[[nodiscard]] BPoint PointInPie(const PieEllipse& pie, float angle, float part);
+
+// Whether values with this sum have shares of it.
+[[nodiscard]] bool IsPie(double total);
 
 // A legend's line. With 2 decimal places label, amount of money and share of the total, with 3 the same for a
-// plain number, with any other number of places the label alone.
+// plain number, with any other number of places the label alone. The label stands first even when it is
+// written from right to left.
 [[nodiscard]] std::string LegendLine(const char* label, float value, float total, int decimalPlaces);
 
 // The same with the label's end replaced by three dots where the line would be wider than `width`: a number

@@ -1,14 +1,18 @@
 #include "charts/ChartWindow.h"
 
 #include <algorithm>
+#include <cerrno>
 #include <cmath>
 
 #include "app/model/PortfolioRules.h"
 #include "app/state/AppState.h"
+#include "charts/ChartPicture.h"
 #include "charts/PieChartView.h"
 #include "charts/ValueChartView.h"
+#include "platform/FilePanel.h"
 #include "platform/MenuField.h"
 #include "platform/MenuItem.h"
+#include "util/Strings.h"
 #include "util/interface/InterfaceHelpers.h"
 
 namespace {
@@ -59,10 +63,12 @@ void ShowDataSet(PieChartView& view, const ChartDataSets& dataSets, uint32 code)
 ChartWindow::ChartWindow(float left, float top, const char* portfolio)
     : BWindow(FrameAt(left, top), "Quorvan", B_FLOATING_WINDOW_LOOK, B_MODAL_APP_WINDOW_FEEL,
               B_NOT_RESIZABLE | B_NOT_ZOOMABLE | B_WILL_ACCEPT_FIRST_CLICK),
+      portfolio_(portfolio),
       topView_(new BView(Bounds(), "top view", B_FOLLOW_ALL_SIDES, B_WILL_DRAW)) {
     topView_->SetViewColor(colors::gray);
     AddChild(topView_);
     CreateGraphTypeMenu();
+    CreatePictureMenu();
     const BRect chart = ChartArea();
     pieView_ = new PieChartView(chart);
     topView_->AddChild(pieView_);
@@ -105,6 +111,10 @@ void ChartWindow::MessageReceived(BMessage* message) {
         ShowChart(message->what);
     else if (message->what == MessageToggleRates && !valueView_->IsHidden())
         valueView_->Toggle20And25Percent();
+    else if (message->what == MessageCopyChart)
+        CopyChart();
+    else if (message->what == MessageSaveChart)
+        SaveChart();
     else
         BWindow::MessageReceived(message);
 }
@@ -126,4 +136,40 @@ void ChartWindow::SelectDataSet(bool invalidate) {
     ShowDataSet(*pieView_, dataSets_, currentChart_);
     if (invalidate)
         pieView_->Invalidate();
+}
+
+void ChartWindow::CreatePictureMenu() {
+    auto* menu = new BMenu("Picture");
+    menu->AddItem(new BMenuItem("Copy", new BMessage(MessageCopyChart), 'C'));
+    menu->AddItem(new BMenuItem("Save picture...", new BMessage(MessageSaveChart), 'S'));
+    topView_->SetContextMenu(menu);
+}
+
+std::string ChartWindow::Picture(PictureFormat format) const {
+    const GrowthRates rates = valueView_->ShowsAllRates() ? GrowthRates::All : GrowthRates::Lower;
+    return ChartPicture(dataSets_, currentValue_, currentChart_, rates, format);
+}
+
+void ChartWindow::CopyChart() {
+    if (!CopyPicture(Picture(PictureFormat::Png)))
+        MessageBox("There is not enough memory to copy the chart!", B_STOP_ALERT);
+}
+
+void ChartWindow::SaveChart() {
+    const std::string title = Charts[currentChart_ - FirstChart].title;
+    const std::string path =
+        RunSavePanel("Save picture", portfolio_ + ", " + title,
+                     {{"PNG picture", ".png"}, {"SVG picture", ".svg"}, {"PDF page", ".pdf"}});
+    if (path.empty())
+        return;
+    const std::optional<PictureFormat> format = PictureFormatOf(path);
+    if (!format) {
+        MessageBox("The name of the picture must end with .png, .svg or .pdf!", B_INFO_ALERT);
+        return;
+    }
+    const std::string picture = Picture(*format);
+    const int error = picture.empty() ? ENOMEM : WritePicture(path, picture);
+    if (error != 0)
+        MessageBox(("The picture could not be saved as " + path + "!\n" + Reason(error)).c_str(),
+                   B_STOP_ALERT);
 }

@@ -1,14 +1,22 @@
 #pragma once
 
+#include <string>
+
 #include "charts/ChartDataSets.h"
 #include "platform/Window.h"
 
 class DATABASE;
 class PieChartView;
 class ValueChartView;
+enum class PictureFormat;
+
+// The messages of the chart's context menu.
+inline constexpr uint32 MessageCopyChart = 3002;
+inline constexpr uint32 MessageSaveChart = 3003;
 
 // The window that charts one portfolio: a chart, and below it the menu that chooses which. It reads the
-// portfolio's investments once, when it is created; nothing that it does changes a file. The caller makes it
+// portfolio's investments once, when it is created; nothing that it does changes a file of the program. The
+// chart's context menu copies it or saves it as a picture. The caller makes it
 // with new, when the portfolio is worth more than nothing, and keeps no pointer: it shows itself and deletes
 // itself when it is closed. While it is there the person can do nothing else in the program. Interface
 // thread; app_state must be set.
@@ -25,7 +33,12 @@ class ChartWindow : public BWindow {
     void CreateGraphTypeMenu();
     void ShowChart(uint32 code);
     void SelectDataSet(bool invalidate);
+    void CreatePictureMenu();
+    [[nodiscard]] std::string Picture(PictureFormat format) const;
+    void CopyChart();
+    void SaveChart();
 
+    const std::string portfolio_;
     ChartDataSets dataSets_;
     float currentValue_ = 0; // the sum of all investments' values
     uint32 currentChart_ = FirstChart;

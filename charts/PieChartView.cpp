@@ -4,6 +4,7 @@
 #include <cmath>
 #include <new>
 
+#include "charts/ChartDrawing.h"
 #include "util/CharacterBuffer.h"
 #include "util/interface/InterfaceHelpers.h"
 
@@ -11,10 +12,13 @@ namespace {
 
 constexpr std::size_t MaxTitle = 127;
 constexpr float ShadowDepth = 5;
-constexpr float LegendGap = 5; // between colour box and text
-constexpr float LineGap = 2;   // between two lines of the legend
-constexpr float TitleScale = 1.5F;
-constexpr float MessageScale = 2;
+constexpr float LegendGap = 5;      // between colour box and text
+constexpr float LineGap = 2;        // between two lines of the legend
+constexpr float SeamOverlap = 0.5F; // degrees
+constexpr float LeastSeamed = 1;    // a narrower slice would be all seam
+constexpr float Lift = 0.1F;        // of the pie's height, for the slice that is pointed to
+constexpr float NotePlace = 0.6F;   // of the way from the pie's centre to its rim
+constexpr const char* NegativeNote = "Negative values are not drawn.";
 constexpr rgb_color Veil{216, 216, 216, 120}; // keeps texts readable over dark slices; unseen elsewhere
 
 rgb_color ColorOf(int index) {
@@ -24,7 +28,8 @@ rgb_color ColorOf(int index) {
 } // namespace
 
 PieChartView::PieChartView(BRect frame)
-    : BView(frame, "pie chart view", B_FOLLOW_ALL_SIDES, B_WILL_DRAW | B_FRAME_EVENTS),
+    : BView(frame, "pie chart view", B_FOLLOW_ALL_SIDES,
+            B_WILL_DRAW | B_FRAME_EVENTS | B_NAVIGABLE | B_MOUSE_MOVES),
       rects_(LayOutPie(Bounds())) {
     SetViewColor(colors::gray);
 }
@@ -36,9 +41,11 @@ void PieChartView::SetTitle(const char* title) {
 int PieChartView::SetData(const float* values, int count) {
     data_ = values;
     count_ = count;
+    pointed_ = -1;
     total_ = 0;
     for (int i = 0; i < count; ++i)
         total_ += values[i];
+    hasNegative_ = std::any_of(values, values + std::max(count, 0), [](float value) { return value < 0; });
     try {
         labels_.assign(static_cast<std::size_t>(std::max(count, 0)), ChartLabel{});
     } catch (const std::bad_alloc&) {
@@ -69,75 +76,153 @@ void PieChartView::Draw(BRect /*updateRect*/) {
     if (HasChart()) {
         DrawChart();
         DrawLegend();
+        DrawPointedTo();
     } else {
         DrawEmptyMessage();
     }
+    DrawFocus(this);
 }
 
 void PieChartView::FrameResized(float /*width*/, float /*height*/) {
     Invalidate();
 }
 
+void PieChartView::MouseMoved(BPoint where, uint32 transit) {
+    PointTo(transit == B_EXITED_VIEW || !HasChart() ? -1 : IndexAt(where));
+}
+
+bool PieChartView::KeyDown(char key) {
+    if (!HasChart() || (key != B_LEFT_ARROW && key != B_RIGHT_ARROW))
+        return false;
+    const int step = key == B_LEFT_ARROW ? -1 : 1;
+    int next = pointed_ < 0 && step < 0 ? count_ - 1 : pointed_ + step;
+    while (next >= 0 && next < count_ && !HasLine(next))
+        next += step;
+    if (HasLine(next))
+        PointTo(next);
+    return true;
+}
+
+int PieChartView::IndexAt(BPoint where) const {
+    for (int i = 0; i < LinesShown(); ++i) {
+        BRect line = LegendLineRect(i);
+        line.right = std::min(line.left + StringWidth(LegendText(i).c_str()), line.right);
+        line.left = rects_.legend.left;
+        if (line.Contains(where) && HasLine(i))
+            return i;
+    }
+    const int found = ValueAt(SlicesOf(data_, count_), EllipseIn(rects_.chart), where);
+    return HasLine(found) ? found : -1;
+}
+
+void PieChartView::PointTo(int index) {
+    if (index == pointed_)
+        return;
+    pointed_ = index;
+    Invalidate();
+}
+
 void PieChartView::DrawTitle() {
-    BFont font;
-    font.SetSize(font.Size() * TitleScale);
-    SetFont(&font);
-    SetHighColor(colors::black);
-    DrawText(this, &rects_.title, title_.c_str(), DrawTextCenter | DrawTextMiddle);
-    SetFont(be_plain_font);
+    DrawChartTitle(this, rects_.title, title_);
 }
 
 void PieChartView::DrawChart() {
     SetHighColor(colors::gray);
     FillRect(rects_.chart);
-    const auto [center, xRadius, yRadius] = EllipseIn(rects_.chart);
+    const std::vector<PieSlice> slices = SlicesOf(data_, count_);
+    if (slices.empty())
+        return;
+    const PieEllipse pie = EllipseIn(rects_.chart);
+    const auto [center, xRadius, yRadius] = pie;
     const BPoint below(center.x, center.y + ShadowDepth);
     SetHighColor(colors::dark_gray);
     FillEllipse(below, xRadius, yRadius);
     SetHighColor(colors::black);
     StrokeEllipse(below, xRadius, yRadius);
-    for (const PieSlice& slice : SlicesOf(data_, count_, total_)) {
-        SetHighColor(ColorOf(slice.value));
-        FillArc(center, xRadius, yRadius, slice.start, slice.sweep);
-        SetHighColor(colors::black);
-        StrokeArc(center, xRadius, yRadius, slice.start, slice.sweep);
+    // Where two smooth edges meet, what lies below shines through: that is no shadow here, but the first
+    // slice's colour beside the last one, and each other slice's beside the one after it.
+    SetHighColor(ColorOf(slices.front().value));
+    FillEllipse(center, xRadius, yRadius);
+    for (const PieSlice& slice : slices)
+        DrawSlice(pie, slice, SeamOverlap);
+    DrawSeams(pie, slices);
+    for (const PieSlice& slice : slices)
+        if (slice.value == pointed_)
+            DrawLifted(pie, slice);
+}
+
+void PieChartView::DrawSlice(const PieEllipse& pie, const PieSlice& slice, float overlap) {
+    const auto& [center, xRadius, yRadius] = pie;
+    SetHighColor(ColorOf(slice.value));
+    FillArc(center, xRadius, yRadius, slice.start, std::min(slice.sweep + overlap, 360 - slice.start));
+    SetHighColor(colors::black);
+    StrokeArc(center, xRadius, yRadius, slice.start, slice.sweep);
+}
+
+// A line between two neighbours of one colour.
+void PieChartView::DrawSeams(const PieEllipse& pie, const std::vector<PieSlice>& slices) {
+    const PieSlice* before = &slices.back();
+    for (const PieSlice& slice : slices) {
+        if (&slice != before && ColorOf(slice.value) == ColorOf(before->value) &&
+            std::min(slice.sweep, before->sweep) > LeastSeamed)
+            StrokeLine(pie.center, PointInPie(pie, slice.start, 1));
+        before = &slice;
     }
 }
 
-std::string PieChartView::LegendText(int index) const {
-    const auto slot = static_cast<std::size_t>(index);
-    if (slot >= labels_.size() || labels_[slot][0] == '\0')
-        return {};
-    return LegendLine(labels_[slot].data(), data_[index], total_, decimalPlaces_);
+void PieChartView::DrawLifted(const PieEllipse& pie, const PieSlice& slice) {
+    SetHighColor(colors::dark_gray);
+    FillArc(pie.center, pie.xRadius, pie.yRadius, slice.start, slice.sweep);
+    PieEllipse lifted = pie;
+    lifted.center.y -= pie.yRadius * Lift;
+    DrawSlice(lifted, slice, 0);
+    if (slice.sweep == 360)
+        return;
+    for (const float angle : {slice.start, slice.start + slice.sweep})
+        StrokeLine(lifted.center, PointInPie(lifted, angle, 1));
 }
 
-std::string PieChartView::LegendText(int index, BRect text) const {
+bool PieChartView::HasLine(int index) const {
     const auto slot = static_cast<std::size_t>(index);
-    if (slot >= labels_.size() || labels_[slot][0] == '\0')
+    return index >= 0 && slot < labels_.size() && labels_[slot][0] != '\0';
+}
+
+std::string PieChartView::LegendText(int index) const {
+    if (!HasLine(index))
         return {};
-    return FittedLegendLine(labels_[slot].data(), data_[index], total_, decimalPlaces_, text.Width(),
-                            [this](const std::string& line) { return StringWidth(line.c_str()); });
+    return LegendLine(labels_[static_cast<std::size_t>(index)].data(), data_[index], total_, decimalPlaces_);
+}
+
+BRect PieChartView::LegendLineRect(int index) const {
+    const float height = std::ceil(::GetFontHeight(be_plain_font));
+    const float top = rects_.legend.top + static_cast<float>(index) * (height + LineGap);
+    return {rects_.legend.left + height + LegendGap, top, rects_.legend.right, top + height};
+}
+
+int PieChartView::LinesShown() const {
+    const float step = std::ceil(::GetFontHeight(be_plain_font)) + LineGap;
+    const int room = static_cast<int>((rects_.legend.Height() + LineGap) / step) - (hasNegative_ ? 1 : 0);
+    return count_ <= room ? count_ : std::max(room - 1, 0);
 }
 
 // The lines that have no room are told in place of the last one that has.
 void PieChartView::DrawLegend() {
     SetFont(be_plain_font);
-    const float height = std::ceil(::GetFontHeight(be_plain_font));
-    const float step = height + LineGap;
-    BRect box(rects_.legend.left, rects_.legend.top, rects_.legend.left + height, rects_.legend.top + height);
-    BRect text(box.right + LegendGap, box.top, rects_.legend.right, box.bottom);
-    const int room = static_cast<int>((rects_.legend.Height() + LineGap) / step);
-    const int shown = count_ <= room ? count_ : std::max(room - 1, 0);
+    const auto measure = [this](const std::string& line) { return StringWidth(line.c_str()); };
+    const int shown = LinesShown();
     for (int i = 0; i < shown; ++i) {
-        if (const std::string line = LegendText(i, text); !line.empty()) {
-            DrawLegendBox(box, i);
-            DrawLegendText(text, line);
-        }
-        box.OffsetBy(0, step);
-        text.OffsetBy(0, step);
+        if (!HasLine(i))
+            continue;
+        const BRect text = LegendLineRect(i);
+        DrawLegendBox({rects_.legend.left, text.top, text.left - LegendGap, text.bottom}, i);
+        DrawLegendText(text, FittedLegendLine(labels_[static_cast<std::size_t>(i)].data(), data_[i], total_,
+                                              decimalPlaces_, text.Width() - LineGap, measure));
     }
+    int line = shown;
     if (shown < count_)
-        DrawLegendText(text, "and " + std::to_string(count_ - shown) + " more");
+        DrawLegendText(LegendLineRect(line++), "and " + std::to_string(count_ - shown) + " more");
+    if (hasNegative_)
+        DrawLegendText(LegendLineRect(line), NegativeNote);
 }
 
 void PieChartView::DrawLegendBox(BRect box, int color) {
@@ -153,28 +238,38 @@ void PieChartView::DrawLegendText(BRect text, const std::string& line) {
     // Down to the next line's veil, so that no stripe shows between them.
     FillRect({text.left, text.top, end, text.bottom + LineGap - 1});
     SetHighColor(colors::black);
-    DrawText(this, &text, line.c_str(), DrawTextLeft | DrawTextMiddle);
+    // Some scripts rise above and fall below the font's own height.
+    DrawWholeText(this, {text.left, text.top - LineGap, text.right, text.bottom + LineGap}, line,
+                  DrawTextLeft | DrawTextMiddle);
+}
+
+// Beside the slice, or the line of one that cannot be seen.
+void PieChartView::DrawPointedTo() {
+    const std::string line = LegendText(pointed_);
+    if (line.empty())
+        return;
+    BPoint place = pointed_ < LinesShown() ? LegendLineRect(pointed_).LeftTop() : rects_.chart.LeftTop();
+    for (const PieSlice& slice : SlicesOf(data_, count_))
+        if (slice.value == pointed_)
+            place = PointInPie(EllipseIn(rects_.chart), slice.start + slice.sweep / 2, NotePlace);
+    DrawNote(this, place, line);
 }
 
 void PieChartView::DrawEmptyMessage() {
     SetHighColor(colors::gray);
     FillRect(rects_.chart);
-    SetHighColor(colors::black);
-    BFont font;
-    font.SetSize(font.Size() * MessageScale);
-    SetFont(&font);
-    const BRect bounds = Bounds();
-    DrawText(this, &bounds, "Nothing to Chart!", DrawTextCenter | DrawTextMiddle);
-    SetFont(be_plain_font);
+    DrawNothingToChart(this);
 }
 
 std::string PieChartView::AccessibleDescription() const {
     if (!HasChart())
         return title_ + ": Nothing to Chart!";
+    if (HasLine(pointed_))
+        return title_ + ": " + LegendText(pointed_);
     constexpr int mostLines = 1000;
     std::string description = title_;
     for (int i = 0; i < std::min(count_, mostLines); ++i)
         if (const std::string line = LegendText(i); !line.empty())
             description += "\n" + line;
-    return description;
+    return hasNegative_ ? description + "\n" + NegativeNote : description;
 }

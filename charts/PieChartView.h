@@ -27,8 +27,8 @@ inline constexpr std::array<rgb_color, 16> PieChartColors = {{
 }};
 
 // A titled pie chart with a legend of its slices. It knows nothing of investments and keeps no values: they
-// are lent to it. Where there is nothing to chart it says so. The geometry is that of the view's first size.
-// Interface thread.
+// are lent to it. Where there is nothing to chart it says so; of values below 0, which have no slice, too.
+// The geometry is that of the view's first size. Interface thread.
 class PieChartView : public BView {
   public:
     // Without data, and with 2 decimal places.
@@ -46,20 +46,34 @@ class PieChartView : public BView {
 
     void Draw(BRect updateRect) override;
     void FrameResized(float width, float height) override;
-    // Title and legend lines.
+    // Over a slice or its line in the legend: lifts the slice and shows the whole line. Left and Right go
+    // from one line to the next.
+    void MouseMoved(BPoint where, uint32 transit) override;
+    bool KeyDown(char key) override;
+    // Title and legend lines, or the line that is shown.
     [[nodiscard]] std::string AccessibleDescription() const override;
 
   private:
     [[nodiscard]] bool HasChart() const;
+    [[nodiscard]] bool HasLine(int index) const;
     // Empty for a slice without a label.
     [[nodiscard]] std::string LegendText(int index) const;
-    // The same as wide as the text rectangle at most.
-    [[nodiscard]] std::string LegendText(int index, BRect text) const;
+    // The rectangle of a line's text, as long as the legend is wide.
+    [[nodiscard]] BRect LegendLineRect(int index) const;
+    // How many slices have their line, with the rest told in one more.
+    [[nodiscard]] int LinesShown() const;
+    // The slice whose line or place in the pie this is; -1 for none.
+    [[nodiscard]] int IndexAt(BPoint where) const;
+    void PointTo(int index);
     void DrawTitle();
     void DrawChart();
+    void DrawSlice(const PieEllipse& pie, const PieSlice& slice, float overlap);
+    void DrawSeams(const PieEllipse& pie, const std::vector<PieSlice>& slices);
+    void DrawLifted(const PieEllipse& pie, const PieSlice& slice);
     void DrawLegend();
     void DrawLegendBox(BRect box, int color);
     void DrawLegendText(BRect text, const std::string& line);
+    void DrawPointedTo();
     void DrawEmptyMessage();
 
     std::string title_;
@@ -67,6 +81,8 @@ class PieChartView : public BView {
     int count_ = 0;
     std::vector<ChartLabel> labels_;
     float total_ = 0;
+    bool hasNegative_ = false;
+    int pointed_ = -1; // the slice that the person points to
     int decimalPlaces_ = 2;
     PieRects rects_;
 };

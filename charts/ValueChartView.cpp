@@ -1,8 +1,11 @@
 #include "charts/ValueChartView.h"
 
 #include <algorithm>
+#include <charconv>
 #include <cmath>
+#include <vector>
 
+#include "charts/ChartDrawing.h"
 #include "platform/CheckBox.h"
 #include "util/Dates.h"
 #include "util/Numbers.h"
@@ -21,22 +24,37 @@ constexpr float LegendIndent = 30;
 constexpr float LegendGap = 5;
 constexpr float LegendTextWidth = 50;
 constexpr float YearHalfWidth = 10;
-constexpr float TitleScale = 1.5F;
+constexpr float ValueHalfHeight = 10;
+constexpr float RateGap = 8; // between a curve's end and its rate
+constexpr float RateScale = 0.8F;
+constexpr float PointRadius = 4;      // of the mark of what is pointed to
+constexpr float LeastReadable = 0.6F; // of the font's size
 
 std::string Percent(float rate) {
     return std::to_string(std::lround(rate * 100)) + "%";
 }
 
 std::string Whole(float value) {
+    if (!std::isfinite(value))
+        return "too large for a number";
     char text[FormatNumberSize];
     FormatNumber(value, text, 0);
     return text;
 }
 
+// With an exponent.
+std::string Short(float value) {
+    char text[FormatNumberSize];
+    const auto [end, error] =
+        std::to_chars(text, text + sizeof text, value, std::chars_format::scientific, 2);
+    return {text, end};
+}
+
 } // namespace
 
 ValueChartView::ValueChartView(BRect frame, float currentValue, Controls controls)
-    : BView(frame, "value chart view", B_FOLLOW_ALL_SIDES, B_WILL_DRAW | B_FRAME_EVENTS),
+    : BView(frame, "value chart view", B_FOLLOW_ALL_SIDES,
+            B_WILL_DRAW | B_FRAME_EVENTS | B_NAVIGABLE | B_MOUSE_MOVES),
       currentValue_(currentValue),
       rects_(LayOutGrowth(Bounds(), ::GetFontHeight(be_plain_font))) {
     SetViewColor(colors::gray);
@@ -62,7 +80,12 @@ void ValueChartView::Toggle20And25Percent() {
     allRates_ = !allRates_;
     CalculateDataPoints();
     maximum_ = GetMaxValue();
+    pointed_.reset();
     Invalidate();
+}
+
+bool ValueChartView::HasChart() const {
+    return currentValue_ > 0 && std::isfinite(currentValue_);
 }
 
 std::size_t ValueChartView::RowsInUse() const {
@@ -77,7 +100,8 @@ void ValueChartView::CalculateDataPoints() {
 float ValueChartView::GetMaxValue() const {
     float maximum = currentValue_;
     for (std::size_t row = 0; row < RowsInUse(); ++row)
-        maximum = std::max(maximum, *std::max_element(points_[row].begin(), points_[row].end()));
+        for (const float point : points_[row])
+            maximum = std::isfinite(point) ? std::max(maximum, point) : maximum;
     return maximum;
 }
 
@@ -91,21 +115,75 @@ float ValueChartView::CalcYCoord(float value) const {
 
 void ValueChartView::Draw(BRect /*updateRect*/) {
     DrawTitle();
-    DrawChart();
-    DrawLegend();
+    if (HasChart()) {
+        DrawChart();
+        DrawLegend();
+        DrawPointedTo();
+    } else {
+        DrawNothingToChart(this);
+    }
+    DrawFocus(this);
 }
 
 void ValueChartView::FrameResized(float /*width*/, float /*height*/) {
     Invalidate();
 }
 
+void ValueChartView::MouseMoved(BPoint where, uint32 transit) {
+    if (transit == B_EXITED_VIEW || !HasChart() || !rects_.graph.Contains(where))
+        PointTo(std::nullopt);
+    else
+        PointTo(NearestTo(where));
+}
+
+bool ValueChartView::KeyDown(char key) {
+    const bool moves =
+        key == B_LEFT_ARROW || key == B_RIGHT_ARROW || key == B_UP_ARROW || key == B_DOWN_ARROW;
+    if (!moves || !HasChart())
+        return false;
+    Point point = pointed_.value_or(Point());
+    if (pointed_ && key == B_RIGHT_ARROW)
+        point.year = std::min<std::size_t>(point.year + 1, GrowthYears);
+    else if (key == B_LEFT_ARROW)
+        point.year -= point.year > 0 ? 1 : 0;
+    else if (key == B_UP_ARROW)
+        point.row = std::min(point.row + 1, RowsInUse() - 1);
+    else if (key == B_DOWN_ARROW)
+        point.row -= point.row > 0 ? 1 : 0;
+    PointTo(point);
+    return true;
+}
+
+ValueChartView::Point ValueChartView::NearestTo(BPoint where) const {
+    const BRect& graph = rects_.graph;
+    Point nearest;
+    nearest.year =
+        static_cast<std::size_t>(std::lround((where.x - graph.left) / graph.Width() * GrowthYears));
+    const auto distance = [&](std::size_t row) { return std::abs(PlaceOf({nearest.year, row}).y - where.y); };
+    for (std::size_t row = 1; row < RowsInUse(); ++row)
+        if (distance(row) < distance(nearest.row))
+            nearest.row = row;
+    return nearest;
+}
+
+BPoint ValueChartView::PlaceOf(Point point) const {
+    return {CalcXCoord(static_cast<float>(point.year)), CalcYCoord(points_[point.row][point.year])};
+}
+
+std::string ValueChartView::PointText() const {
+    return std::to_string(static_cast<std::size_t>(year_) + pointed_->year) + " at " +
+           Percent(Percentages[pointed_->row]) + ": " + Whole(points_[pointed_->row][pointed_->year]);
+}
+
+void ValueChartView::PointTo(std::optional<Point> point) {
+    if (pointed_ == point)
+        return;
+    pointed_ = point;
+    Invalidate();
+}
+
 void ValueChartView::DrawTitle() {
-    BFont font;
-    font.SetSize(font.Size() * TitleScale);
-    SetFont(&font);
-    SetHighColor(colors::black);
-    DrawText(this, &rects_.title, Title, DrawTextCenter | DrawTextMiddle);
-    SetFont(be_plain_font);
+    DrawChartTitle(this, rects_.title, Title);
 }
 
 void ValueChartView::DrawChart() {
@@ -120,6 +198,7 @@ void ValueChartView::DrawChart() {
     DrawValues();
     SetFont(&before);
     DrawGrowth();
+    DrawRates();
 }
 
 void ValueChartView::DrawYears() {
@@ -139,22 +218,33 @@ void ValueChartView::DrawYears() {
     }
 }
 
+std::vector<float> ValueChartView::AxisValues() const {
+    std::vector<float> values = {currentValue_};
+    while (values.size() <= AxisSteps)
+        values.push_back(values.back() + (maximum_ - currentValue_) / AxisSteps);
+    return values;
+}
+
+// All in letters of one size, and in the short form where these would be too small to read.
 void ValueChartView::DrawValues() {
     const BRect& graph = rects_.graph;
-    BRect label(rects_.frame.left, graph.bottom - 10, graph.left - 2, graph.bottom + 10);
-    // A number whose end is cut off would be another number: long ones are written smaller.
-    const float room = label.Width() - 3;
-    const float width = StringWidth(Whole(maximum_).c_str());
-    BFont font;
-    GetFont(&font);
-    if (width > room)
-        SetFontSize(font.Size() * room / width);
-    float value = currentValue_;
-    for (int i = 0; i <= AxisSteps; ++i) {
-        DrawText(this, &label, Whole(value).c_str(), DrawTextRight | DrawTextMiddle);
-        value += (maximum_ - currentValue_) / AxisSteps;
+    const float half = std::max(ValueHalfHeight, std::ceil(::GetFontHeight(be_fixed_font) / 2));
+    BRect label(rects_.frame.left, graph.bottom - half, graph.left - 2, graph.bottom + half);
+    const std::vector<float> values = AxisValues();
+    const auto scale = [&](std::string (*text)(float)) {
+        const float room = label.Width() - 3;
+        float width = room;
+        for (const float value : values)
+            width = std::max(width, StringWidth(text(value).c_str()));
+        return room / width;
+    };
+    const bool readable = scale(Whole) >= LeastReadable && Whole(maximum_).find('e') == std::string::npos;
+    const auto text = readable ? Whole : Short;
+    SetFontSize(be_fixed_font->Size() * scale(text));
+    for (const float value : values) {
+        DrawText(this, &label, text(value).c_str(), DrawTextRight | DrawTextMiddle);
         const float middle = (label.top + label.bottom) / 2;
-        if (i > 0 && i < AxisSteps)
+        if (middle < graph.bottom && middle > graph.top + 1)
             StrokeLine({graph.left + 1, middle}, {graph.right - 1, middle});
         label.OffsetBy(0, -graph.Height() / AxisSteps);
     }
@@ -164,11 +254,32 @@ void ValueChartView::DrawGrowth() {
     SetPenSize(2);
     for (std::size_t row = 0; row < RowsInUse(); ++row) {
         SetHighColor(LineColors[row]);
-        MovePenTo(CalcXCoord(0), CalcYCoord(currentValue_));
-        for (std::size_t year = 0; year < points_[row].size(); ++year)
-            StrokeLine({CalcXCoord(static_cast<float>(year)), CalcYCoord(points_[row][year])});
+        const BPoint start = PlaceOf({0, row});
+        MovePenTo(start.x, start.y);
+        for (std::size_t year = 0; year <= GrowthYears && std::isfinite(points_[row][year]); ++year)
+            StrokeLine(PlaceOf({year, row}));
     }
     SetPenSize(1);
+}
+
+// Each beside its curve's end, or as near above as the one below leaves room, with a line from there.
+void ValueChartView::DrawRates() {
+    SetFontSize(be_plain_font->Size() * RateScale);
+    BFont font;
+    GetFont(&font);
+    const float height = std::ceil(::GetFontHeight(&font));
+    const float left = rects_.graph.right + RateGap;
+    float middle = rects_.graph.bottom + height;
+    for (std::size_t row = 0; row < RowsInUse() && std::isfinite(points_[row].back()); ++row) {
+        const BPoint end = PlaceOf({GrowthYears, row});
+        middle = std::min(middle - height, end.y);
+        SetHighColor(LineColors[row]);
+        StrokeLine(end, {left - 2, middle});
+        SetHighColor(colors::black);
+        DrawWholeText(this, {left, middle - height / 2, Bounds().right, middle + height / 2},
+                      Percent(Percentages[row]), DrawTextLeft | DrawTextMiddle);
+    }
+    SetFont(be_plain_font);
 }
 
 void ValueChartView::DrawLegend() {
@@ -179,7 +290,8 @@ void ValueChartView::DrawLegend() {
     const float step =
         std::min(3 * StringWidth("10%"), (rects_.legend.right - left - entry) / (Percentages.size() - 1));
     BRect box(left, rects_.legend.top, left + size, rects_.legend.top + size);
-    BRect text(box.right + LegendGap, box.top, box.right + LegendGap + LegendTextWidth, box.bottom);
+    const float width = std::max(LegendTextWidth, StringWidth("10%") + LegendGap);
+    BRect text(box.right + LegendGap, box.top, box.right + LegendGap + width, box.bottom);
     for (std::size_t row = 0; row < RowsInUse(); ++row) {
         SetHighColor(LineColors[row]);
         FillRect(box);
@@ -191,8 +303,21 @@ void ValueChartView::DrawLegend() {
     }
 }
 
+void ValueChartView::DrawPointedTo() {
+    if (!pointed_)
+        return;
+    const BPoint place = PlaceOf(*pointed_);
+    SetHighColor(LineColors[pointed_->row]);
+    FillEllipse(place, PointRadius, PointRadius);
+    DrawNote(this, {place.x, place.y - PointRadius}, PointText());
+}
+
 std::string ValueChartView::AccessibleDescription() const {
     std::string description(Title);
+    if (!HasChart())
+        return description + ": Nothing to Chart!";
+    if (pointed_)
+        return description + ": " + PointText();
     description.append(": ").append(Whole(currentValue_)).append(" in ").append(std::to_string(year_));
     description.append(", and in ").append(std::to_string(year_ + GrowthYears));
     for (std::size_t row = 0; row < RowsInUse(); ++row)

@@ -15,6 +15,7 @@
 #include "platform/Window.h"
 #include "platform/private/ApplicationPeer.h"
 #include "platform/private/Convert.h"
+#include "platform/private/MenuPeer.h"
 #include "platform/private/ViewPeer.h"
 #include "platform/private/ViewWidget.h"
 
@@ -134,6 +135,7 @@ BView::BView(BRect frame, const char* name, uint32 resizingMode, uint32 flags)
     : BView(frame, name, resizingMode, flags, std::make_unique<ViewPeer>(new ViewWidget(this))) {
     peer_->widget->setAccessibleName(QString::fromUtf8(Name()));
     peer_->widget->setFocusPolicy(flags & B_NAVIGABLE ? Qt::TabFocus : Qt::NoFocus);
+    peer_->widget->setMouseTracking(flags & B_MOUSE_MOVES);
     ContrastWith(viewColor_, peer_->widget);
 }
 
@@ -149,6 +151,19 @@ BView::BView(BRect frame, const char* name, uint32 resizingMode, uint32 flags, s
 BView::~BView() {
     while (!children_.empty())
         children_.pop_back();
+}
+
+// The actions are the view's too, since a closed menu's shortcuts are not heard of.
+void BView::SetContextMenu(BMenu* menu) {
+    QWidget* widget = peer_->widget;
+    MenuPeer& peer = MenuAccess::Peer(*menu);
+    peer.shower = this;
+    widget->addActions(peer.menu->actions());
+    widget->setContextMenuPolicy(Qt::CustomContextMenu);
+    QObject::connect(
+        widget, &QWidget::customContextMenuRequested, peer.menu.get(),
+        [widget, shown = peer.menu.get()](const QPoint& at) { shown->popup(widget->mapToGlobal(at)); });
+    peer_->contextMenu.reset(menu);
 }
 
 void BView::SetAccessibleName(const char* name) {
@@ -230,6 +245,8 @@ void BView::FrameResized(float, float) {}
 void BView::MouseDown(BPoint) {}
 
 void BView::MouseUp(BPoint) {}
+
+void BView::MouseMoved(BPoint, uint32) {}
 
 bool BView::KeyDown(char) {
     return false;

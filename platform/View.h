@@ -8,6 +8,7 @@
 #include "platform/Handler.h"
 #include "platform/Rect.h"
 
+class BMenu;
 class BWindow;
 struct ViewPeer;
 
@@ -25,6 +26,11 @@ constexpr uint32 B_WILL_DRAW = 0x01;
 constexpr uint32 B_FRAME_EVENTS = 0x02;
 // The keyboard reaches the view by Tab.
 constexpr uint32 B_NAVIGABLE = 0x04;
+// The view hears of the pointer's moves.
+constexpr uint32 B_MOUSE_MOVES = 0x08;
+// How the pointer moved: in the view, or out of it.
+constexpr uint32 B_INSIDE_VIEW = 1;
+constexpr uint32 B_EXITED_VIEW = 2;
 
 enum drawing_mode { B_OP_COPY, B_OP_OVER };
 
@@ -40,6 +46,8 @@ constexpr char B_END = 0x04;
 constexpr char B_ENTER = 0x0a;
 constexpr char B_LEFT_ARROW = 0x1c;
 constexpr char B_RIGHT_ARROW = 0x1d;
+constexpr char B_UP_ARROW = 0x1e;
+constexpr char B_DOWN_ARROW = 0x1f;
 
 // A part of a view that a person takes for a small control, as assistive technology tells of it.
 struct AccessiblePart {
@@ -90,9 +98,14 @@ class BView : public BHandler {
     virtual void FrameResized(float width, float height);
     virtual void MouseDown(BPoint where);
     virtual void MouseUp(BPoint where);
+    // Called for views with B_MOUSE_MOVES, at once: where the pointer is, or was last.
+    virtual void MouseMoved(BPoint where, uint32 transit);
     // A key was pressed while the view has the focus (see B_NAVIGABLE), with no modifier key but Shift held.
     // False lets the key go on to the window, where Enter and Escape have their meaning.
     virtual bool KeyDown(char key);
+    // Opens the menu, whose items are complete, where the person asks for it in the view; its shortcuts work
+    // while the view's window is in front. Items without a target send to that window. Takes ownership.
+    void SetContextMenu(BMenu* menu);
     // What assistive technology calls the view; UTF-8. At first its name, or a control's label.
     void SetAccessibleName(const char* name);
     // The text that assistive technology reads for this view beside its name; UTF-8. The base has none.

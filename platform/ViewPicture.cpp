@@ -4,6 +4,8 @@
 #include <cmath>
 
 #include <QBuffer>
+#include <QClipboard>
+#include <QGuiApplication>
 #include <QImage>
 #include <QPageSize>
 #include <QPainter>
@@ -72,4 +74,11 @@ std::string DrawPicture(BView* view, PictureFormat format, float scale) {
                          : format == PictureFormat::Svg ? WriteSvg(view, file)
                                                         : WritePdf(view, file);
     return written ? file.data().toStdString() : std::string();
+}
+
+bool CopyPicture(const std::string& png) {
+    const QImage picture = QImage::fromData(QByteArray::fromStdString(png), "PNG");
+    if (!picture.isNull())
+        QGuiApplication::clipboard()->setImage(picture);
+    return !picture.isNull();
 }

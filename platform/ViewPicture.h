@@ -12,3 +12,6 @@ enum class PictureFormat { Png, Svg, Pdf };
 // point of the PDF's page). The view may be hidden and need be in no window. Interface thread; an application
 // object must exist.
 [[nodiscard]] std::string DrawPicture(BView* view, PictureFormat format, float scale = 1);
+
+// Puts a PNG picture on the clipboard, for other programs to paste. False when it is none. Interface thread.
+[[nodiscard]] bool CopyPicture(const std::string& png);

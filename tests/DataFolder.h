@@ -12,13 +12,14 @@
 
 // An investment with something in every field.
 inline INVESTMENT_DATA MakeInvestment(std::string_view portfolio, std::string_view name, float shares = 2,
-                                      float price = 10, std::string_view type = "Fund") {
+                                      float price = 10, std::string_view type = "Fund",
+                                      std::string_view ticker = "TICK", std::string_view risk = "Med") {
     INVESTMENT_DATA record{};
     CopyText(record.Portfolio, portfolio);
     CopyText(record.Name, name);
-    CopyText(record.Ticker, "TICK");
+    CopyText(record.Ticker, ticker);
     CopyText(record.Type, type);
-    CopyText(record.Risk, "Med");
+    CopyText(record.Risk, risk);
     CopyText(record.Agent, "Bank");
     record.Shares = shares;
     record.Price = price;

@@ -12,6 +12,7 @@
 #include <QMenuBar>
 #include <QMessageBox>
 #include <QPointer>
+#include <QRegularExpression>
 #include <QTest>
 #include <QTimer>
 
@@ -54,6 +55,27 @@ class StepDriver : public QObject {
         return When("alert: " + text, shown, [this, button] {
             answered_ = Alert();
             Press(answered_, button);
+        });
+    }
+
+    // Waits for one of the toolkit's dialogs, which proposes a file's name if one is given, names another
+    // file there if one is given, and ends it.
+    StepDriver& InDialog(const char* name, bool accept, const std::string& file = "",
+                         const std::string& proposed = "") {
+        const auto shown = [name] {
+            auto* found = qobject_cast<QDialog*>(QApplication::activeModalWidget());
+            return found && found->objectName() == name ? found : nullptr;
+        };
+        const auto field = [shown] {
+            return shown()->findChildren<QLineEdit*>(QRegularExpression("^file[nN]ame")).value(0);
+        };
+        const auto ready = [=] {
+            return shown() && (proposed.empty() || field()->text() == proposed.c_str());
+        };
+        return When(name, ready, [=] {
+            if (!file.empty())
+                field()->setText(QString::fromStdString(file));
+            accept ? shown()->accept() : shown()->reject();
         });
     }
 

@@ -1,20 +1,14 @@
 #include <CLI/CLI.hpp>
 #include <cmath>
 #include <cstring>
-#include <filesystem>
 #include <memory>
 #include <optional>
-#include <sys/stat.h>
-#include <unistd.h>
 
 #include "app/model/DataFolders.h"
+#include "charts/ChartPicture.h"
 #include "charts/ChartWindow.h"
-#include "charts/PieChartView.h"
-#include "charts/ValueChartView.h"
 #include "db/Database.h"
-#include "platform/ViewPicture.h"
 #include "tools/Commands.h"
-#include "util/File.h"
 #include "util/Strings.h"
 
 namespace {
@@ -23,7 +17,7 @@ constexpr int WrongUse = 2;
 
 struct ChartOptions : PortfolioOptions {
     std::string chart;
-    float scale = 2;
+    float scale = PictureScale;
 };
 
 // By code or by title in any letter case; null for neither.
@@ -32,39 +26,6 @@ const ChartInfo* FindChart(const std::string& wanted) {
         if (wanted == std::to_string(chart.code) || strcmpi(wanted.c_str(), chart.title) == 0)
             return &chart;
     return nullptr;
-}
-
-std::optional<PictureFormat> FormatOf(const std::string& path) {
-    const std::string extension = std::filesystem::path(path).extension().string();
-    if (strcmpi(extension.c_str(), ".png") == 0)
-        return PictureFormat::Png;
-    if (strcmpi(extension.c_str(), ".svg") == 0)
-        return PictureFormat::Svg;
-    if (strcmpi(extension.c_str(), ".pdf") == 0)
-        return PictureFormat::Pdf;
-    return std::nullopt;
-}
-
-// The errno number that tells why there is something that a picture must not replace, or 0.
-int WhyNotReplaced(const std::string& path) {
-    struct stat status {};
-    if (stat(path.c_str(), &status) != 0)
-        return 0;
-    if (!S_ISREG(status.st_mode))
-        return S_ISDIR(status.st_mode) ? EISDIR : EOPNOTSUPP;
-    return access(path.c_str(), W_OK) == 0 ? 0 : errno;
-}
-
-// A file that exists keeps its permissions, and a link to it stays a link.
-int Write(const std::string& path, const std::string& bytes) {
-    const mode_t mask = umask(0);
-    umask(mask);
-    const std::string target = RealPath(path);
-    int error = WhyNotReplaced(target);
-    if (error == 0)
-        error = WriteWholeFile(target, target + ".part" + std::to_string(getpid()), bytes, 0666 & ~mask,
-                               ExistingFile::Replace);
-    return error == 0 ? 0 : Fail(path + " cannot be written: " + Reason(error));
 }
 
 int DrawChart(const ChartOptions& options, const ChartInfo& chart, PictureFormat format,
@@ -77,17 +38,14 @@ int DrawChart(const ChartOptions& options, const ChartInfo& chart, PictureFormat
         return Fail("the investments in " + options.home + " could not all be read");
     if (data == ChartData::NoMemory)
         return Fail("there is not enough memory for the portfolio's charts");
-    const BRect area = ChartArea();
-    std::string bytes;
-    if (chart.code == GrowthChart) {
-        ValueChartView view(area, total, ValueChartView::Controls::None);
-        bytes = DrawPicture(&view, format, options.scale);
-    } else {
-        PieChartView view(area);
-        ShowDataSet(view, dataSets, chart.code);
-        bytes = DrawPicture(&view, format, options.scale);
-    }
-    return bytes.empty() ? Fail("the chart could not be drawn") : Write(options.output, bytes);
+    if (!std::isfinite(total))
+        return Fail("a value in the portfolio is not a number, or too large for one");
+    const std::string picture =
+        ChartPicture(dataSets, total, chart.code, GrowthRates::All, format, options.scale);
+    if (picture.empty())
+        return Fail("the chart could not be drawn");
+    const int error = WritePicture(options.output, picture);
+    return error == 0 ? 0 : Fail(options.output + " cannot be written: " + Reason(error));
 }
 
 int RunChart(ChartOptions& options) {
@@ -95,7 +53,7 @@ int RunChart(ChartOptions& options) {
     if (!chart)
         return Fail("there is no chart '" + options.chart + "'; there are 2000 to 2007, or their titles",
                     WrongUse);
-    const std::optional<PictureFormat> format = FormatOf(options.output);
+    const std::optional<PictureFormat> format = PictureFormatOf(options.output);
     if (!format)
         return Fail("the name of the picture must end with .png, .svg or .pdf", WrongUse);
     if (std::isnan(options.scale)) // which no range keeps out

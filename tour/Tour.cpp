@@ -221,6 +221,17 @@ void Tour::LookAtCharts() {
         Await(std::string("chart ") + chart.title, shown);
         Shoot(chart.picture);
     }
+    const auto chart = [] { return QApplication::activeModalWidget()->windowHandle(); };
+    static constexpr QPoint slice(300, 220);
+    When("point to a slice", shown, [chart] { QTest::mouseMove(chart(), slice); });
+    Shoot("chart-pointed");
+    When("the picture menu", shown, [chart] { QTest::mouseClick(chart(), Qt::RightButton, {}, slice); });
+    Await("the picture menu", OpenMenu);
+    Shoot("chart-menu");
+    When(
+        "save a picture", OpenMenu, [] { ClickItem("Save picture..."); });
+    InDialog(
+        "Save picture", "chart-save", [] { QApplication::activeModalWidget()->close(); });
     When("close the charts", shown, [] { QApplication::activeModalWidget()->close(); });
 }
 

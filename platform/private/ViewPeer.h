@@ -8,6 +8,7 @@
 #include <QPointer>
 #include <QWidget>
 
+#include "platform/Menu.h"
 #include "platform/View.h"
 
 // Holds a view's widget, and the painter while a paint pass runs. Belongs to its view. The widget belongs to
@@ -24,6 +25,7 @@ struct ViewPeer {
     virtual QWidget* Canvas() const { return widget; }
 
     QPointer<QWidget> widget;
+    std::unique_ptr<BMenu> contextMenu;
     QPainter* painter = nullptr;
     // What the painter was limited to when the paint pass began.
     QPainterPath baseClip;

@@ -22,7 +22,8 @@ struct KeyCode {
 };
 constexpr KeyCode kKeyCodes[] = {{Qt::Key_Home, B_HOME},       {Qt::Key_End, B_END},
                                  {Qt::Key_Return, B_ENTER},    {Qt::Key_Enter, B_ENTER},
-                                 {Qt::Key_Left, B_LEFT_ARROW}, {Qt::Key_Right, B_RIGHT_ARROW}};
+                                 {Qt::Key_Left, B_LEFT_ARROW}, {Qt::Key_Right, B_RIGHT_ARROW},
+                                 {Qt::Key_Up, B_UP_ARROW},     {Qt::Key_Down, B_DOWN_ARROW}};
 
 // 0 for a key that views do not hear of.
 char OurKey(const QKeyEvent& event) {
@@ -47,6 +48,8 @@ bool ViewWidget::event(QEvent* event) {
         owner_->GetMouse(&where, &buttons);
         ViewAccess::NotePointer(owner_, where, 0);
     }
+    if (type == QEvent::Leave)
+        TellMove(B_EXITED_VIEW);
     return QWidget::event(event);
 }
 
@@ -98,6 +101,17 @@ void ViewWidget::mousePressEvent(QMouseEvent* event) {
 
 void ViewWidget::mouseMoveEvent(QMouseEvent* event) {
     NotePointer(*event);
+    TellMove(B_INSIDE_VIEW);
+}
+
+void ViewWidget::TellMove(uint32 transit) {
+    if (!hasMouseTracking())
+        return;
+    BPoint where;
+    uint32 buttons = 0;
+    owner_->GetMouse(&where, &buttons);
+    const InterfaceLock lock(owner_->Looper());
+    owner_->MouseMoved(where, transit);
 }
 
 void ViewWidget::mouseReleaseEvent(QMouseEvent* event) {

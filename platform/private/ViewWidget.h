@@ -29,6 +29,7 @@ class ViewWidget : public QWidget {
     void TellAccessibility();
     void NotePointer(const QMouseEvent& event);
     void PostPointerMessage(const QMouseEvent& event, uint32 code);
+    void TellMove(uint32 transit);
 
     BView* owner_;
     int markedPart_ = -1; // of the view's parts, as far as assistive technology knows

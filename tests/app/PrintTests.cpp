@@ -1,26 +1,12 @@
 // The print command, through the toolkit's own dialogs.
 #include "Program.h"
 
-#include <QDialog>
-
 #include "Pdf.h"
 
 namespace {
 
 class Print : public testing::Test, protected Program {
   protected:
-    // A step that answers one of the two dialogs.
-    void InDialog(const char* name, bool accept, const std::string& file = "") {
-        const auto shown = [name] {
-            auto* found = qobject_cast<QDialog*>(QApplication::activeModalWidget());
-            return found && found->objectName() == name ? found : nullptr;
-        };
-        When(shown, [=] {
-            if (!file.empty())
-                shown()->findChild<QLineEdit*>("filename")->setText(QString::fromStdString(file));
-            accept ? shown()->accept() : shown()->reject();
-        });
-    }
     // Steps that have the report printed, and wait for one of the portfolio or investment.
     void PrintTo(const std::string& named, const std::string& file, const std::string& content) {
         InDialog("print dialog", true, named);

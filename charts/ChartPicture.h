@@ -1,0 +1,25 @@
+#pragma once
+
+#include <optional>
+#include <string>
+
+#include "charts/ChartDataSets.h"
+#include "platform/ViewPicture.h"
+
+// Charts as picture files. An application object must exist.
+
+inline constexpr float PictureScale = 2; // what a picture is drawn in unless the person says otherwise
+
+enum class GrowthRates { All, Lower };
+
+// The chart with this code as it stands in the window, without its controls; `total` is the value that grows.
+// As DrawPicture.
+[[nodiscard]] std::string ChartPicture(const ChartDataSets& dataSets, float total, std::uint32_t code,
+                                       GrowthRates rates, PictureFormat format, float scale = PictureScale);
+
+// By the name's end, in any letter case: .png, .svg or .pdf.
+[[nodiscard]] std::optional<PictureFormat> PictureFormatOf(const std::string& path);
+
+// Writes the file as a whole, or leaves the one that is there. A file that exists keeps its permissions, and
+// a link to it stays a link. Returns 0 or an errno number.
+[[nodiscard]] int WritePicture(const std::string& path, const std::string& bytes);
