@@ -55,7 +55,7 @@ class ConnectionDialog : public BDialog {
         : BDialog({leftTop.x, leftTop.y, leftTop.x + WidthFor(host), leftTop.y + FirstHeight},
                   "Looking for a connection", DialogHasCancel) {
         ResizeTo(Bounds().Width(), 6 * FontHeight());
-        TopView()->AddChild(
+        Form()->AddChild(
             new BStringView({Margin, Margin, Bounds().right - Margin, Margin + 1.5F * FontHeight()}, "host",
                             Sentence(host).c_str()));
     }

@@ -2,9 +2,11 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstdlib>
 
 #include "ColumnListView/CLVColumn.h"
 #include "ColumnListView/ColumnListView.h"
+#include "app/WindowLayout.h"
 #include "app/rows/NorvelItem.h"
 #include "app/state/AppState.h"
 #include "app/state/MessageCodes.h"
@@ -23,10 +25,11 @@ constexpr float GreatestSize = 10000;
 constexpr float ScrollBarSpace = 14;
 constexpr float ButtonSpace = 50; // below the list
 constexpr float ButtonStep = 125;
+constexpr float ButtonWidth = 90;
+constexpr float ButtonMargin = 16; // around a label that is wider than usual
 constexpr float TotalLeft = 200;
 constexpr float TotalGap = 10;
 
-constexpr const char* WidthSection = "DISPLAY";
 constexpr const char* WidthKey = "ColumnWidth%d";
 constexpr int DefaultWidth = 50;
 // The size, in pixels, of the list's letters that the widths were saved for.
@@ -55,8 +58,13 @@ constexpr ColumnInfo Columns[InvestmentColumnCount] = {
     {"Agent", CLVF_SORTABLE, 20},
 };
 
-// For the usual font 501 by 201 pixels.
+// As it was left; at first, for the usual font, 501 by 201 pixels.
 BRect FirstFrame() {
+    const std::vector<int> numbers = ReadNumbers(INI_FILEx(app_state->settingsPath), PlaceKey);
+    const std::vector<float> left(numbers.begin(), numbers.end());
+    const auto isSize = [](float size) { return size >= LeastSize && size <= GreatestSize; };
+    if (left.size() == 4 && isSize(left[2]) && isSize(left[3]))
+        return {left[0], left[1], left[0] + left[2], left[1] + left[3]};
     const float growth = GetFontGrowth();
     return {100, 100, 100 + std::round(500 * growth), 100 + std::round(200 * growth)};
 }
@@ -95,6 +103,7 @@ NorvelWindow::NorvelWindow()
 NorvelWindow::~NorvelWindow() {
     selector_->SetTextChangedHook(nullptr);
     SaveColumnWidths();
+    SaveLayout();
     be_app->PostMessage(B_QUIT_REQUESTED);
 }
 
@@ -155,6 +164,7 @@ void NorvelWindow::AddInvestmentList(BView* topView, float top) {
         B_MULTIPLE_SELECTION_LIST, false, true, true, true, B_NO_BORDER, be_plain_font);
     investmentList_->SetAccessibleName("Investments");
     AddColumns();
+    RestoreColumns();
     investmentList_->SetViewColor(colors::light_gray);
     investmentList_->SetFont(be_fixed_font);
     investmentList_->SetSortFunction(NorvelItem::MyCompare);
@@ -163,7 +173,7 @@ void NorvelWindow::AddInvestmentList(BView* topView, float top) {
 }
 
 float NorvelWindow::WidthGrowth() const {
-    const int size = settings_.ReadInt(WidthSection, TextSizeKey, 0);
+    const int size = settings_.ReadInt(DisplaySection, TextSizeKey, 0);
     if (size < LeastTextSize || size > GreatestTextSize)
         return 1;
     return be_fixed_font->Size() / static_cast<float>(size);
@@ -174,7 +184,7 @@ void NorvelWindow::AddColumns() {
     for (int index = 0; index < InvestmentColumnCount; ++index) {
         char key[32];
         FormatInto(key, sizeof key, WidthKey, index);
-        const auto width = static_cast<float>(settings_.ReadInt(WidthSection, key, DefaultWidth));
+        const auto width = static_cast<float>(settings_.ReadInt(DisplaySection, key, DefaultWidth));
         const ColumnInfo& info = Columns[index];
         investmentList_->AddColumn(new CLVColumn(info.label, info.label ? std::round(width * growth) : width,
                                                  info.flags, info.minWidth));
@@ -182,21 +192,55 @@ void NorvelWindow::AddColumns() {
 }
 
 void NorvelWindow::SaveColumnWidths() const {
-    if (settings_.ReadInt(WidthSection, TextSizeKey, 0) > 0)
+    if (settings_.ReadInt(DisplaySection, TextSizeKey, 0) > 0)
         static_cast<void>(
-            settings_.WriteInt(WidthSection, TextSizeKey, static_cast<int>(be_fixed_font->Size())));
+            settings_.WriteInt(DisplaySection, TextSizeKey, static_cast<int>(be_fixed_font->Size())));
     const CLVColumn* column = nullptr;
     for (int index = 0; (column = investmentList_->ColumnAt(index)) != nullptr; ++index) {
         char key[32];
         FormatInto(key, sizeof key, WidthKey, index);
         // Without a settings file there is nowhere to keep them.
-        static_cast<void>(settings_.WriteInt(WidthSection, key, static_cast<int>(column->Width())));
+        static_cast<void>(settings_.WriteInt(DisplaySection, key, static_cast<int>(column->Width())));
     }
 }
 
+// The list itself refuses an order that lacks a column, and keys that are none.
+void NorvelWindow::RestoreColumns() {
+    const std::vector<int> order = ReadNumbers(settings_, OrderKey);
+    if (order.size() == InvestmentColumnCount)
+        static_cast<void>(investmentList_->SetDisplayOrder(order.data()));
+    std::vector<int32> columns;
+    std::vector<CLVSortMode> modes;
+    for (const int key : ReadNumbers(settings_, SortKey)) {
+        columns.push_back(std::abs(key));
+        modes.push_back(key < 0 ? CLVSortMode::Descending : CLVSortMode::Ascending);
+    }
+    investmentList_->SetSorting(static_cast<int32>(columns.size()), columns.data(), modes.data());
+}
+
+void NorvelWindow::SaveLayout() const {
+    const BRect frame = Frame();
+    std::vector<int> place;
+    for (const float number : {frame.left, frame.top, frame.Width(), frame.Height()})
+        place.push_back(static_cast<int>(number));
+    WriteNumbers(settings_, PlaceKey, place);
+    WriteNumbers(settings_, OrderKey, investmentList_->DisplayOrder());
+    int32 keys[InvestmentColumnCount];
+    CLVSortMode modes[InvestmentColumnCount];
+    std::vector<int> sorted;
+    for (int32 i = 0; i < investmentList_->Sorting(keys, modes); ++i)
+        sorted.push_back(modes[i] == CLVSortMode::Descending ? -keys[i] : keys[i]);
+    WriteNumbers(settings_, SortKey, sorted);
+}
+
+void NorvelWindow::NameAfterPortfolio() {
+    SetAccessibleName((std::string(WindowTitle) + " " + currentPortfolio_).c_str());
+}
+
 void NorvelWindow::AddButtons(BView* topView) {
-    BRect frame(10, Bounds().bottom - 40, 100, Bounds().bottom - 10);
+    BRect frame(10, Bounds().bottom - 40, 10 + ButtonWidth, Bounds().bottom - 10);
     for (const ButtonInfo& info : Buttons) {
+        frame.right = frame.left + std::max(ButtonWidth, topView->StringWidth(info.label) + ButtonMargin);
         topView->AddChild(new BButton(frame, info.name, info.label, new BMessage(info.code),
                                       B_FOLLOW_LEFT | B_FOLLOW_BOTTOM));
         frame.OffsetBy(ButtonStep, 0);

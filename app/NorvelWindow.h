@@ -26,7 +26,7 @@ class NorvelWindow : public BWindow {
   public:
     // Builds the window, loads the selector and the last portfolio's investments, and shows it all.
     NorvelWindow();
-    // Saves the column widths.
+    // Saves its place and size, and the columns' widths, order and sort keys.
     ~NorvelWindow() override;
 
     // From the press of Update until that has ended what else is pressed is dropped: the investment file is
@@ -83,6 +83,11 @@ class NorvelWindow : public BWindow {
     // How many times larger the list's letters are than when the widths were saved; 1 when it is not known.
     [[nodiscard]] float WidthGrowth() const;
     void SaveColumnWidths() const;
+    // The columns' order and the sort keys as they were left.
+    void RestoreColumns();
+    void SaveLayout() const;
+    // Says to who does not see it which portfolio it shows.
+    void NameAfterPortfolio();
 
     // --- portfolios ---
     void LoadPortfolioList();

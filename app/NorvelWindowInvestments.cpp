@@ -41,6 +41,7 @@ int32 CountSelectedItems(const ColumnListView* list) {
 }
 
 void NorvelWindow::LoadInvestmentList() {
+    NameAfterPortfolio();
     ClearInvestmentList();
     float total = 0;
     BList rows;

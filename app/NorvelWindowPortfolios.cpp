@@ -56,6 +56,7 @@ void NorvelWindow::SelectFirstPortfolioMenuItem() {
     BMenuItem* first = selector_->Menu()->ItemAt(0);
     if (!first) {
         currentPortfolio_[0] = '\0';
+        NameAfterPortfolio();
         ClearInvestmentList();
         DisplayTotalValue(0);
         return;

@@ -26,16 +26,18 @@ int WhyNotReplaced(const std::string& path) {
 
 } // namespace
 
-std::string ChartPicture(const ChartDataSets& dataSets, float total, std::uint32_t code, GrowthRates rates,
-                         PictureFormat format, float scale) {
+std::string ChartPicture(const char* portfolio, const ChartDataSets& dataSets, float total,
+                         std::uint32_t code, GrowthRates rates, PictureFormat format, float scale) {
     if (code == GrowthChart) {
         ValueChartView view(ChartArea(), total, ValueChartView::Controls::None);
+        NameChart(view, portfolio);
         if (rates == GrowthRates::Lower)
             view.Toggle20And25Percent();
         return DrawPicture(&view, format, scale);
     }
     PieChartView view(ChartArea());
     ShowDataSet(view, dataSets, code);
+    NameChart(view, portfolio);
     return DrawPicture(&view, format, scale);
 }
 

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <cmath>
+#include <string>
 
 #include "app/model/PortfolioRules.h"
 #include "app/state/AppState.h"
@@ -27,6 +28,21 @@ BRect FrameAt(float left, float top) {
     return {left, top, left + std::ceil(Width * scale), top + std::ceil(Height * scale)};
 }
 
+// No larger than its screen has room for.
+BRect FrameOnScreen(float left, float top) {
+    BRect frame = FrameAt(left, top);
+    const BRect room = BWindow::RoomAt(frame.LeftTop());
+    frame.right = std::min(frame.right, left + room.Width());
+    frame.bottom = std::min(frame.bottom, top + room.Height());
+    return frame;
+}
+
+// What the menu at the window's bottom leaves.
+BRect AboveMenu(BRect window) {
+    window.bottom -= 2 * ::GetFontHeight(be_plain_font);
+    return window;
+}
+
 } // namespace
 
 ChartData ReadChartData(DATABASE& investments, const char* portfolio, ChartDataSets& dataSets, float& total) {
@@ -42,9 +58,11 @@ ChartData ReadChartData(DATABASE& investments, const char* portfolio, ChartDataS
 }
 
 BRect ChartArea() {
-    BRect area = FrameAt(0, 0);
-    area.bottom -= 2 * ::GetFontHeight(be_plain_font);
-    return area;
+    return AboveMenu(FrameAt(0, 0));
+}
+
+void NameChart(BView& view, const char* portfolio) {
+    view.SetAccessibleName((std::string("Chart of ") + portfolio).c_str());
 }
 
 void ShowDataSet(PieChartView& view, const ChartDataSets& dataSets, uint32 code) {
@@ -61,7 +79,7 @@ void ShowDataSet(PieChartView& view, const ChartDataSets& dataSets, uint32 code)
 }
 
 ChartWindow::ChartWindow(float left, float top, const char* portfolio)
-    : BWindow(FrameAt(left, top), "Quorvan", B_FLOATING_WINDOW_LOOK, B_MODAL_APP_WINDOW_FEEL,
+    : BWindow(FrameOnScreen(left, top), "Quorvan", B_FLOATING_WINDOW_LOOK, B_MODAL_APP_WINDOW_FEEL,
               B_NOT_RESIZABLE | B_NOT_ZOOMABLE | B_WILL_ACCEPT_FIRST_CLICK),
       portfolio_(portfolio),
       topView_(new BView(Bounds(), "top view", B_FOLLOW_ALL_SIDES, B_WILL_DRAW)) {
@@ -69,7 +87,7 @@ ChartWindow::ChartWindow(float left, float top, const char* portfolio)
     AddChild(topView_);
     CreateGraphTypeMenu();
     CreatePictureMenu();
-    const BRect chart = ChartArea();
+    const BRect chart = AboveMenu(Bounds());
     pieView_ = new PieChartView(chart);
     topView_->AddChild(pieView_);
     if (GenerateDataSets(portfolio) != 0)
@@ -78,6 +96,9 @@ ChartWindow::ChartWindow(float left, float top, const char* portfolio)
     valueView_ = new ValueChartView(chart, currentValue_);
     valueView_->Hide();
     topView_->AddChild(valueView_);
+    SetAccessibleName((std::string("Quorvan, charts of ") + portfolio).c_str());
+    for (BView* view : {static_cast<BView*>(pieView_), static_cast<BView*>(valueView_)})
+        NameChart(*view, portfolio);
     Show();
 }
 
@@ -147,7 +168,7 @@ void ChartWindow::CreatePictureMenu() {
 
 std::string ChartWindow::Picture(PictureFormat format) const {
     const GrowthRates rates = valueView_->ShowsAllRates() ? GrowthRates::All : GrowthRates::Lower;
-    return ChartPicture(dataSets_, currentValue_, currentChart_, rates, format);
+    return ChartPicture(portfolio_.c_str(), dataSets_, currentValue_, currentChart_, rates, format);
 }
 
 void ChartWindow::CopyChart() {

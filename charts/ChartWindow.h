@@ -57,5 +57,8 @@ enum class ChartData { Read, NotRead, NoMemory };
 // The part of the window that a chart fills, from (0, 0) on.
 [[nodiscard]] BRect ChartArea();
 
+// Says to who does not see the chart whose it is.
+void NameChart(BView& view, const char* portfolio);
+
 // Gives the view title, values and labels of one of the pie charts.
 void ShowDataSet(PieChartView& view, const ChartDataSets& dataSets, uint32 code);

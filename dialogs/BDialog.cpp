@@ -6,6 +6,7 @@
 
 #include "platform/Application.h"
 #include "platform/Button.h"
+#include "platform/FormView.h"
 #include "platform/Kernel.h"
 #include "util/interface/InterfaceHelpers.h"
 
@@ -17,6 +18,13 @@ constexpr uint32 MessageShow = 2000;
 constexpr float BottomMargin = 20;
 constexpr float RightMargin = 10;
 constexpr const char* WidestLabel = "  Cancel  ";
+
+// As wide as the screen at most, with a scroll bar.
+BRect Narrowed(BRect frame) {
+    const float room = BWindow::RoomAt(frame.LeftTop()).Width() - B_FORM_BAR_WIDTH;
+    frame.right = std::min(frame.right, frame.left + room);
+    return frame;
+}
 
 } // namespace
 
@@ -34,14 +42,17 @@ struct BDialog::Outcome {
 };
 
 BDialog::BDialog(BRect frame, const char* title, uint16 flags)
-    : BWindow(frame, title, B_FLOATING_WINDOW_LOOK, B_MODAL_APP_WINDOW_FEEL,
+    : BWindow(Narrowed(frame), title, B_FLOATING_WINDOW_LOOK, B_MODAL_APP_WINDOW_FEEL,
               B_NOT_RESIZABLE | B_NOT_ZOOMABLE | B_WILL_ACCEPT_FIRST_CLICK),
       topView_(new BView(Bounds(), "top view", B_FOLLOW_ALL_SIDES, B_WILL_DRAW)),
       fontHeight_(GetFontHeight(be_bold_font)),
       outcome_(std::make_shared<Outcome>()) {
     topView_->SetViewColor(colors::gray);
     AddChild(topView_);
-    AddButtons(flags);
+    BRect above = Bounds();
+    above.bottom = AddButtons(flags) - 1;
+    form_ = new BFormView(above, "form", B_FOLLOW_ALL_SIDES);
+    topView_->AddChild(form_);
 }
 
 BDialog::~BDialog() {
@@ -52,7 +63,7 @@ float BDialog::FormWidth(float usual) {
     return std::ceil(usual * GetFontGrowth());
 }
 
-void BDialog::AddButtons(uint16 flags) {
+float BDialog::AddButtons(uint16 flags) {
     const BRect bounds = Bounds();
     const float width = topView_->StringWidth(WidestLabel);
     const float step = width + RightMargin;
@@ -69,6 +80,14 @@ void BDialog::AddButtons(uint16 flags) {
     if (flags & DialogHasCancel)
         topView_->AddChild(new BButton(frame, "cancel button", "Cancel", new BMessage(DialogCancel),
                                        B_FOLLOW_RIGHT | B_FOLLOW_BOTTOM));
+    return frame.top;
+}
+
+void BDialog::Show() {
+    const float room = RoomAt(Frame().LeftTop()).Height();
+    if (Bounds().Height() > room)
+        ResizeTo(Bounds().Width() + B_FORM_BAR_WIDTH, room);
+    BWindow::Show();
 }
 
 uint32 BDialog::DoModal() {

@@ -44,10 +44,13 @@ class BDialog : public BWindow {
     virtual int HandleMessage(BMessage* /*message*/) { return 0; }
 
     void MessageReceived(BMessage* message) override;
+    // Makes the dialog less high first where the screen has no room for it.
+    void Show() override;
 
   protected:
-    // The background that fills the dialog; subclasses add their controls to it.
-    [[nodiscard]] BView* TopView() const { return topView_; }
+    // Fills the dialog above its buttons; subclasses add their controls to it. They scroll where the screen
+    // has no room for all, so that the buttons are always seen.
+    [[nodiscard]] BView* Form() const { return form_; }
     // The width of a form that is usual wide: more when the person's font is so large that buttons and fields
     // would not find room.
     [[nodiscard]] static float FormWidth(float usual);
@@ -57,9 +60,11 @@ class BDialog : public BWindow {
   private:
     struct Outcome;
 
-    void AddButtons(uint16 flags);
+    // Returns where they begin.
+    float AddButtons(uint16 flags);
 
     BView* topView_;
+    BView* form_ = nullptr;
     float fontHeight_;
     std::shared_ptr<Outcome> outcome_; // shared with DoModal, which may outlive the dialog
 };

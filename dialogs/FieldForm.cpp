@@ -19,9 +19,9 @@ FieldForm::FieldForm(BPoint where, const char* title, const char* label, std::si
     const BRect frame(Margin, Margin, Bounds().right - Margin, Margin + 1.5F * FontHeight());
     field_ = new BTextControl(frame, "text control", label, "", B_FOLLOW_LEFT | B_FOLLOW_TOP,
                               B_WILL_DRAW | B_NAVIGABLE);
-    field_->SetDivider(TopView()->StringWidth((label + std::string(" ")).c_str()));
+    field_->SetDivider(Form()->StringWidth((label + std::string(" ")).c_str()));
     field_->SetMaxBytes(static_cast<int32>(maxBytes));
-    TopView()->AddChild(field_);
+    Form()->AddChild(field_);
 }
 
 void FieldForm::SetText(const char* text) {

@@ -60,7 +60,7 @@ InvestmentDialog::InvestmentDialog(float x, float y, const char* title, INVESTME
       rowTop_(Margin) {
     ResizeTo(Bounds().Width(), 20 * FontHeight());
     rowWidth_ = Bounds().Width() - 2 * Margin;
-    divider_ = TopView()->StringWidth("Share price   ");
+    divider_ = Form()->StringWidth("Share price   ");
     AddRows();
     nameControl_->MakeFocus();
 }
@@ -103,7 +103,7 @@ BTextControl* InvestmentDialog::AddTextRow(const char* name, const char* label, 
     control->SetDivider(divider_);
     control->SetMaxBytes(maxBytes);
     control->SetText(text);
-    TopView()->AddChild(control);
+    Form()->AddChild(control);
     EndRow(control);
     return control;
 }
@@ -115,7 +115,7 @@ BMenuField* InvestmentDialog::AddRiskRow() {
     const BRect frame(Margin, rowTop_, Margin + 2 * rowWidth_ / 3, rowTop_ + FontHeight());
     auto* field = new BMenuField(frame, "", "Risk", risks);
     field->SetDivider(divider_);
-    TopView()->AddChild(field);
+    Form()->AddChild(field);
     EndRow(field);
     return field;
 }
@@ -127,16 +127,16 @@ BMenuField* InvestmentDialog::AddPickList(const BTextControl* control, BPopUpMen
                       row.top - PickListRise + FontHeight());
     auto* field = new BMenuField(frame, "", "", menu);
     field->SetDivider(0);
-    TopView()->AddChild(field);
+    Form()->AddChild(field);
     return field;
 }
 
 void InvestmentDialog::AddRetirementRow() {
-    const float width = 2 * TopView()->StringWidth("Retirement");
+    const float width = 2 * Form()->StringWidth("Retirement");
     const BRect frame(Margin, rowTop_, Margin + width, rowTop_ + FontHeight());
     retirementCheckBox_ = new BCheckBox(frame, "retirement check", "Retirement", nullptr);
     retirementCheckBox_->SetValue(investment_->Retire != 0 ? B_CONTROL_ON : B_CONTROL_OFF);
-    TopView()->AddChild(retirementCheckBox_);
+    Form()->AddChild(retirementCheckBox_);
     EndRow(retirementCheckBox_);
 }
 

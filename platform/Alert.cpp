@@ -1,6 +1,5 @@
 #include "platform/Alert.h"
 
-#include <algorithm>
 #include <atomic>
 #include <memory>
 
@@ -8,8 +7,6 @@
 #include <QLabel>
 #include <QMessageBox>
 #include <QPushButton>
-#include <QScreen>
-#include <QWindow>
 
 #include "platform/private/Loop.h"
 #include "platform/private/Mnemonics.h"
@@ -65,20 +62,6 @@ std::vector<QPushButton*> AddButtons(QMessageBox& box, const AlertText& alert) {
     return buttons;
 }
 
-// Above the window it interrupts, yet not its child: that window may go while the alert stands.
-void PlaceAbove(QMessageBox& box, const QWidget* window) {
-    if (!window)
-        return;
-    box.winId();
-    box.windowHandle()->setTransientParent(window->windowHandle());
-    const QRect screen = window->screen()->availableGeometry();
-    const QSize size = box.sizeHint();
-    const QPoint middle = window->frameGeometry().center();
-    box.move(
-        std::max(screen.left(), std::min(middle.x() - size.width() / 2, screen.right() - size.width())),
-        std::max(screen.top(), std::min(middle.y() - size.height() / 2, screen.bottom() - size.height())));
-}
-
 int32 ShowAlert(const AlertText& alert, const std::function<bool()>& cancelled) {
     QMessageBox box;
     box.setObjectName(QStringLiteral("alert"));
@@ -88,7 +71,6 @@ int32 ShowAlert(const AlertText& alert, const std::function<bool()>& cancelled) 
     box.setText(QString::fromStdString(alert.text));
     ShowIcon(box, LookOf(alert.type));
     const std::vector<QPushButton*> buttons = AddButtons(box, alert);
-    PlaceAbove(box, QApplication::activeWindow());
     RunDialog(box, cancelled);
     for (std::size_t index = 0; index < buttons.size(); index++)
         if (box.clickedButton() == buttons[index])

@@ -19,6 +19,7 @@
 #include "platform/private/AccessibleRoles.h"
 #include "platform/private/ApplicationPeer.h"
 #include "platform/private/Convert.h"
+#include "platform/private/Look.h"
 #include "platform/private/Loop.h"
 #include "platform/private/ViewPeer.h"
 
@@ -64,6 +65,7 @@ BApplication::BApplication(const char* signature)
     // The loop ends when the application says so, not when a start-up dialog closes before the first window
     // opens.
     QApplication::setQuitOnLastWindowClosed(false);
+    SetLook();
     NameAccessibleRoles();
     OpenInterfaceThread();
     ApplicationAccess::WatchInput(*peer_->toolkit);

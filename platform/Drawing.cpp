@@ -13,15 +13,22 @@
 
 namespace {
 
-// Lines run through the middle of pixels, except straight lines of an even width, which run between two.
-double LineOffset(BPoint from, BPoint to, float width) {
-    const bool straight = from.x == to.x || from.y == to.y;
-    return straight && std::fmod(width, 2.0F) == 0 ? 0.0 : 0.5;
+// What a straight line covers. It runs through the middle of pixels, or between two when its width is even.
+QRectF StraightLine(BPoint from, BPoint to, float width) {
+    const double half = width / 2;
+    const double offset = std::fmod(width, 2.0F) == 0 ? 0.0 : 0.5;
+    return QRectF(ToQt(from), ToQt(to))
+        .normalized()
+        .translated(offset, offset)
+        .adjusted(-half, -half, half, half);
 }
 
-QPen LinePen(BPoint from, BPoint to, rgb_color color, float width) {
-    const bool straight = from.x == to.x || from.y == to.y;
-    return {ToQt(color), width, Qt::SolidLine, straight ? Qt::SquareCap : Qt::RoundCap, Qt::RoundJoin};
+// Fills to whole pixels of the device, so that areas with a common edge leave no seam where a logical pixel
+// is no whole number of the device's. Where it is less than one of them, thin areas would vanish that way.
+void Fill(QPainter& painter, const QRectF& area, rgb_color color) {
+    painter.setRenderHint(QPainter::Antialiasing, painter.deviceTransform().m11() < 1);
+    painter.fillRect(area, ToQt(color));
+    painter.setRenderHint(QPainter::Antialiasing);
 }
 
 // The part of the image with every pixel made a square of at least as many as the device has for it, so that
@@ -87,9 +94,12 @@ void BView::GetClippingRegion(BRegion* region) const {
 void BView::StrokeLine(BPoint from, BPoint to) {
     pen_ = to;
     if (QPainter* painter = ViewAccess::Painter(this)) {
-        const double offset = LineOffset(from, to, penSize_);
-        painter->setPen(LinePen(from, to, highColor_, penSize_));
-        painter->drawLine(ToQt(from) + QPointF(offset, offset), ToQt(to) + QPointF(offset, offset));
+        if (from.x == to.x || from.y == to.y) {
+            Fill(*painter, StraightLine(from, to, penSize_), highColor_);
+            return;
+        }
+        painter->setPen(QPen(ToQt(highColor_), penSize_, Qt::SolidLine, Qt::RoundCap));
+        painter->drawLine(ToQt(from) + QPointF(0.5, 0.5), ToQt(to) + QPointF(0.5, 0.5));
     }
 }
 
@@ -103,22 +113,21 @@ void BView::StrokeRect(BRect rect) {
         const QRectF outer = ToQt(rect);
         const double pen = penSize_;
         const double inner = outer.height() - 2 * pen;
-        const QColor color = ToQt(highColor_);
-        painter->fillRect(QRectF(outer.left(), outer.top(), outer.width(), pen), color);
-        painter->fillRect(QRectF(outer.left(), outer.bottom() - pen, outer.width(), pen), color);
-        painter->fillRect(QRectF(outer.left(), outer.top() + pen, pen, inner), color);
-        painter->fillRect(QRectF(outer.right() - pen, outer.top() + pen, pen, inner), color);
+        Fill(*painter, QRectF(outer.left(), outer.top(), outer.width(), pen), highColor_);
+        Fill(*painter, QRectF(outer.left(), outer.bottom() - pen, outer.width(), pen), highColor_);
+        Fill(*painter, QRectF(outer.left(), outer.top() + pen, pen, inner), highColor_);
+        Fill(*painter, QRectF(outer.right() - pen, outer.top() + pen, pen, inner), highColor_);
     }
 }
 
 void BView::FillRect(BRect rect) {
     if (QPainter* painter = ViewAccess::Painter(this))
-        painter->fillRect(ToQt(rect), ToQt(highColor_));
+        Fill(*painter, ToQt(rect), highColor_);
 }
 
 void BView::FillRectLow(BRect rect) {
     if (QPainter* painter = ViewAccess::Painter(this))
-        painter->fillRect(ToQt(rect), ToQt(lowColor_));
+        Fill(*painter, ToQt(rect), lowColor_);
 }
 
 void BView::FillRoundRect(BRect rect, float xRadius, float yRadius) {
@@ -193,7 +202,7 @@ void BView::DrawBitmap(const BBitmap* bitmap, BRect source, BRect target) {
     if (!painter || !bitmap || !source.IsValid())
         return;
     if (drawingMode_ == B_OP_COPY)
-        painter->fillRect(ToQt(target), ToQt(lowColor_));
+        Fill(*painter, ToQt(target), lowColor_);
     const QRectF place = ToQt(target);
     const QRect part = ToQt(source).toAlignedRect();
     const double devicePixels = painter->deviceTransform().m11() * place.width() / part.width();

@@ -91,16 +91,6 @@ void FollowEdges(float& low, float& high, float delta, bool followsLow, bool fol
         low += delta;
 }
 
-// What lies on a view without a background of its own (labels, check boxes) stands out from the view's
-// colour, whatever the desktop's theme.
-void ContrastWith(rgb_color background, QWidget* widget) {
-    const bool light = 2 * background.red + 5 * background.green + background.blue > 4 * 255;
-    QPalette palette;
-    palette.setColor(QPalette::WindowText, light ? Qt::black : Qt::white);
-    palette.setColor(QPalette::Disabled, QPalette::WindowText, light ? Qt::darkGray : Qt::lightGray);
-    widget->setPalette(palette);
-}
-
 } // namespace
 
 uint32 modifiers() {
@@ -121,6 +111,11 @@ uint32 ModifierBits(Qt::KeyboardModifiers keys) {
     return keys & Qt::ShiftModifier ? B_SHIFT_KEY : 0;
 }
 
+QWidget* ViewAccess::Worked(const BView* view) {
+    QWidget* worked = Widget(view)->focusProxy();
+    return worked ? worked : Widget(view);
+}
+
 void ViewAccess::SetFrame(BView* view, const BRect& frame) {
     view->frame_ = frame;
 }
@@ -136,7 +131,6 @@ BView::BView(BRect frame, const char* name, uint32 resizingMode, uint32 flags)
     peer_->widget->setAccessibleName(QString::fromUtf8(Name()));
     peer_->widget->setFocusPolicy(flags & B_NAVIGABLE ? Qt::TabFocus : Qt::NoFocus);
     peer_->widget->setMouseTracking(flags & B_MOUSE_MOVES);
-    ContrastWith(viewColor_, peer_->widget);
 }
 
 BView::BView(BRect frame, const char* name, uint32 resizingMode, uint32 flags, std::unique_ptr<ViewPeer> peer)
@@ -167,9 +161,11 @@ void BView::SetContextMenu(BMenu* menu) {
 }
 
 void BView::SetAccessibleName(const char* name) {
-    QWidget* worked =
-        peer_->widget->focusProxy(); // of a control in several parts: the one that a person works
-    (worked ? worked : peer_->widget.data())->setAccessibleName(QString::fromUtf8(name));
+    ViewAccess::Worked(this)->setAccessibleName(QString::fromUtf8(name));
+}
+
+std::string BView::AccessibleName() const {
+    return ViewAccess::Worked(this)->accessibleName().toStdString();
 }
 
 BLooper* BView::Looper() const {
@@ -338,8 +334,6 @@ void BView::GetMouse(BPoint* where, uint32* buttons) const {
 
 void BView::SetViewColor(rgb_color color) {
     viewColor_ = color;
-    if (dynamic_cast<ViewWidget*>(peer_->widget.data()))
-        ContrastWith(color, peer_->widget);
     Invalidate();
 }
 

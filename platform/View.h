@@ -108,6 +108,7 @@ class BView : public BHandler {
     void SetContextMenu(BMenu* menu);
     // What assistive technology calls the view; UTF-8. At first its name, or a control's label.
     void SetAccessibleName(const char* name);
+    [[nodiscard]] std::string AccessibleName() const;
     // The text that assistive technology reads for this view beside its name; UTF-8. The base has none.
     [[nodiscard]] virtual std::string AccessibleDescription() const { return {}; }
     // What the view draws instead of child views, for assistive technology to go through, from left to right.

@@ -27,6 +27,15 @@ QSize SizeOf(const BView* view) {
             static_cast<int>(std::ceil(bounds.Height())) + 1};
 }
 
+// For who does not see the picture.
+QString NameOf(const BView* view) {
+    return QString::fromStdString(view->AccessibleName());
+}
+
+QString DescriptionOf(const BView* view) {
+    return NameOf(view) + QLatin1Char('\n') + QString::fromStdString(view->AccessibleDescription());
+}
+
 bool Paint(BView* view, QPaintDevice* device, double scale) {
     QPainter painter;
     if (!painter.begin(device))
@@ -42,6 +51,8 @@ bool WritePng(BView* view, QBuffer& file, float scale) {
     QImage image(SizeOf(view) * std::clamp(scale, 1 / kMaxScale, kMaxScale), QImage::Format_RGB32);
     if (image.isNull())
         return false;
+    image.setText(QStringLiteral("Title"), NameOf(view));
+    image.setText(QStringLiteral("Description"), DescriptionOf(view));
     return Paint(view, &image, std::clamp(scale, 1 / kMaxScale, kMaxScale)) && image.save(&file, "PNG");
 }
 
@@ -52,14 +63,15 @@ bool WriteSvg(BView* view, QBuffer& file) {
     svg.setSize(SizeOf(view));
     svg.setViewBox(QRect(QPoint(0, 0), SizeOf(view)));
     // The generator writes these as they are given.
-    svg.setTitle(QString::fromUtf8(view->Name()).toHtmlEscaped());
-    svg.setDescription(QString::fromStdString(view->AccessibleDescription()).toHtmlEscaped());
+    svg.setTitle(NameOf(view).toHtmlEscaped());
+    svg.setDescription(DescriptionOf(view).toHtmlEscaped());
     return Paint(view, &svg, 1);
 }
 
 bool WritePdf(BView* view, QBuffer& file) {
     QPdfWriter pdf(&file);
     pdf.setResolution(kPointsPerInch);
+    pdf.setTitle(NameOf(view));
     pdf.setPageSize(QPageSize(QSizeF(SizeOf(view)), QPageSize::Point, QString(), QPageSize::ExactMatch));
     pdf.setPageMargins(QMarginsF());
     return Paint(view, &pdf, 1);

@@ -2,18 +2,20 @@
 
 #include <algorithm>
 #include <cmath>
+#include <utility>
 
 #include <QApplication>
 #include <QCloseEvent>
 #include <QKeyEvent>
 #include <QPushButton>
-#include <QWindow>
 
 #include "platform/Button.h"
+#include "platform/FormView.h"
 #include "platform/private/ApplicationPeer.h"
 #include "platform/private/Convert.h"
 #include "platform/private/Loop.h"
 #include "platform/private/Mnemonics.h"
+#include "platform/private/Placement.h"
 #include "platform/private/ViewPeer.h"
 #include "platform/private/ViewWidget.h"
 #include "platform/private/WindowPeer.h"
@@ -36,11 +38,28 @@ int PixelCount(float span) {
                       QWIDGETSIZE_MAX);
 }
 
+// That of a small window: at least what its title takes, with the buttons that the window manager puts beside
+// it and says nothing of; but a title asks for no more than the screen has, with a bar for the form.
+float WidthOf(const BRect& frame, const char* title) {
+    QFont font = QApplication::font();
+    font.setBold(true);
+    const QFontMetrics letters(font);
+    const int wanted = letters.horizontalAdvance(QString::fromUtf8(title)) + 8 * letters.height();
+    const float room = BWindow::RoomAt(frame.LeftTop()).Width() - B_FORM_BAR_WIDTH;
+    return std::max(frame.Width(), std::min(static_cast<float>(wanted), room));
+}
+
 } // namespace
 
 void WindowWidget::closeEvent(QCloseEvent* event) {
     event->ignore();
     owner_->PostMessage(B_QUIT_REQUESTED);
+}
+
+void WindowWidget::changeEvent(QEvent* event) {
+    QWidget::changeEvent(event);
+    if (event->type() == QEvent::ActivationChange && isActiveWindow())
+        WindowAccess::Activated(owner_);
 }
 
 void WindowWidget::resizeEvent(QResizeEvent* event) {
@@ -69,6 +88,14 @@ void WindowAccess::ContentResized(BWindow* window, float width, float height) {
     window->FrameResized(width, height);
 }
 
+// The first time tells how large the frame is that the window manager has drawn.
+void WindowAccess::Activated(BWindow* window) {
+    if (std::exchange(window->peer_->placed, true))
+        return;
+    const InterfaceLock lock(window);
+    window->PutOnScreen();
+}
+
 void ApplicationAccess::QuitModalWindows(BApplication& application) {
     for (int32 index = application.CountWindows() - 1; index >= 0; index--) {
         BWindow* window = application.WindowAt(index);
@@ -94,7 +121,7 @@ BWindow::BWindow(BRect frame, const char* title, window_look look, window_feel f
     ViewAccess::Widget(content_.get())->setParent(widget);
     content_->EnterWindow(this);
     MoveTo(frame.left, frame.top);
-    ResizeTo(frame.Width(), frame.Height());
+    ResizeTo(look == B_FLOATING_WINDOW_LOOK ? WidthOf(frame, title) : frame.Width(), frame.Height());
     widget->setWindowTitle(QString::fromUtf8(title));
     widget->setObjectName(QString::fromUtf8(title));
     ApplicationAccess::AddWindow(this);
@@ -111,6 +138,10 @@ void BWindow::AddChild(BView* child) {
 
 BView* BWindow::FindView(const char* name) const {
     return content_->FindView(name);
+}
+
+void BWindow::SetAccessibleName(const char* name) {
+    peer_->widget->setAccessibleName(QString::fromUtf8(name).trimmed());
 }
 
 BRect BWindow::Frame() const {
@@ -147,15 +178,26 @@ void BWindow::SetSizeLimits(float minWidth, float maxWidth, float minHeight, flo
     peer_->widget->setMaximumSize(PixelCount(maxWidth), PixelCount(maxHeight));
 }
 
+BRect BWindow::RoomAt(BPoint where) {
+    return FromQt(QRectF(::RoomAt(ToQt(where).toPoint())));
+}
+
+void BWindow::PutOnScreen() {
+    const QRect wanted = peer_->widget->geometry();
+    const QRect place = PutInto(::RoomAt(wanted.center()), wanted);
+    if (place.size() != wanted.size())
+        ResizeTo(static_cast<float>(place.width() - 1), static_cast<float>(place.height() - 1));
+    if (place.topLeft() != wanted.topLeft())
+        MoveTo(static_cast<float>(place.left()), static_cast<float>(place.top()));
+}
+
 void BWindow::Show() {
     WindowWidget* widget = peer_->widget;
     if (!peer_->shownBefore) {
         AssignMnemonics(widget);
-        peer_->activeBefore = peer_->modal ? QApplication::activeWindow() : nullptr;
-        if (peer_->activeBefore) {
-            widget->winId(); // a modal window stays above the one it belongs to
-            widget->windowHandle()->setTransientParent(peer_->activeBefore->windowHandle());
-        }
+        peer_->activeBefore = peer_->modal ? WindowBelow() : nullptr;
+        KeepAbove(*widget, peer_->activeBefore);
+        PutOnScreen();
     }
     widget->show();
     if (!peer_->shownBefore) {

@@ -18,14 +18,16 @@ constexpr uint32 B_WILL_ACCEPT_FIRST_CLICK = 0x0010;
 
 // A window with its looper. It is created hidden with new, shown with Show, and deletes itself in Quit. It
 // belongs to the application's list of windows until then, owns the views added to it, and is used on the
-// interface thread with its lock held (the constructor's thread has it until Show).
+// interface thread with its lock held (the constructor's thread has it until Show). It opens wholly on the
+// free part of its screen, moved or made smaller where it must be.
 //
 // The close box posts B_QUIT_REQUESTED to the window, and so does the Escape key in a window with the feel
 // B_MODAL_APP_WINDOW_FEEL, which also keeps the person out of the application's other windows while it is
 // shown.
 class BWindow : public BLooper {
   public:
-    // frame is the window's content in screen coordinates.
+    // frame is the window's content in screen coordinates. With the floating look it becomes as wide as its
+    // title needs to be read.
     BWindow(BRect frame, const char* title, window_type type, uint32 flags);
     BWindow(BRect frame, const char* title, window_look look, window_feel feel, uint32 flags);
     ~BWindow() override;
@@ -36,9 +38,14 @@ class BWindow : public BLooper {
 
     [[nodiscard]] const char* Title() const { return Name(); }
 
+    // What the window is called by who does not see it; the title at first.
+    void SetAccessibleName(const char* name);
+
     // Frame is in screen coordinates; Bounds is the same size at (0, 0).
     [[nodiscard]] BRect Frame() const;
     [[nodiscard]] BRect Bounds() const;
+    // The part of the screen at this place that a window's content can fill.
+    [[nodiscard]] static BRect RoomAt(BPoint where);
     void MoveTo(float x, float y);
     void MoveBy(float dx, float dy);
     void ResizeTo(float width, float height);
@@ -70,6 +77,8 @@ class BWindow : public BLooper {
   private:
     friend class BView;
     friend struct WindowAccess;
+
+    void PutOnScreen();
 
     std::unique_ptr<WindowPeer> peer_;
     std::unique_ptr<BView> content_;

@@ -40,8 +40,8 @@ int DrawChart(const ChartOptions& options, const ChartInfo& chart, PictureFormat
         return Fail("there is not enough memory for the portfolio's charts");
     if (!std::isfinite(total))
         return Fail("a value in the portfolio is not a number, or too large for one");
-    const std::string picture =
-        ChartPicture(dataSets, total, chart.code, GrowthRates::All, format, options.scale);
+    const std::string picture = ChartPicture(options.portfolio.c_str(), dataSets, total, chart.code,
+                                             GrowthRates::All, format, options.scale);
     if (picture.empty())
         return Fail("the chart could not be drawn");
     const int error = WritePicture(options.output, picture);

@@ -43,13 +43,6 @@ void FieldButton::Open() {
     setDown(true);
 }
 
-// Styles draw the arrow like text on the window, whose colour here is one that stands out from the view
-// around the button.
-void FieldButton::initStyleOption(QStyleOptionButton* option) const {
-    QPushButton::initStyleOption(option);
-    option->palette.setColor(QPalette::WindowText, option->palette.color(QPalette::ButtonText));
-}
-
 void FieldButton::SetFullText(const QString& text) {
     fullText_ = text;
     setAccessibleDescription(text.trimmed());

@@ -20,7 +20,6 @@ class FieldButton : public QPushButton {
     [[nodiscard]] QSize sizeHint() const override;
 
   protected:
-    void initStyleOption(QStyleOptionButton* option) const override;
     void resizeEvent(QResizeEvent* event) override;
     void changeEvent(QEvent* event) override;
     void showEvent(QShowEvent* event) override;

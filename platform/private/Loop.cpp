@@ -21,6 +21,7 @@
 
 #include "platform/Kernel.h"
 #include "platform/private/LooperCore.h"
+#include "platform/private/Placement.h"
 
 namespace {
 
@@ -205,7 +206,8 @@ int RunDialog(QDialog& dialog, const std::function<bool()>& cancelled) {
         poll.start(kCancelPollMilliseconds);
     }
     // Not every window manager gives the keyboard back to where it was.
-    const QPointer<QWidget> before = QApplication::activeWindow();
+    const QPointer<QWidget> before = WindowBelow();
+    PlaceDialog(dialog, before);
     gOpenDialogs.push_back(&dialog);
     gWaitDepth++;
     const int result = dialog.exec();

@@ -177,18 +177,6 @@ void RowsWidget::DrawRow(QPainter& painter, int32 index, const QRect& place, boo
     painter.restore();
 }
 
-// Styles draw the arrows of the bars like text on the window, whose colour here is one that stands out from
-// the view around the list.
-void RowsWidget::changeEvent(QEvent* event) {
-    QListView::changeEvent(event);
-    if (event->type() != QEvent::PaletteChange)
-        return;
-    QPalette own;
-    own.setColor(QPalette::WindowText, palette().color(QPalette::ButtonText));
-    for (QScrollBar* bar : {horizontalScrollBar(), verticalScrollBar()})
-        bar->setPalette(own);
-}
-
 void RowsWidget::focusInEvent(QFocusEvent* event) {
     if (peer_)
         peer_->selection.Attach();

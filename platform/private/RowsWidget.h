@@ -51,7 +51,6 @@ class RowsWidget : public QListView {
     void resizeEvent(QResizeEvent* event) override;
     void scrollContentsBy(int dx, int dy) override;
     void updateGeometries() override;
-    void changeEvent(QEvent* event) override;
     void focusInEvent(QFocusEvent* event) override;
     void currentChanged(const QModelIndex& current, const QModelIndex& previous) override;
     void inputMethodEvent(QInputMethodEvent* event) override;

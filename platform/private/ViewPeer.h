@@ -40,6 +40,8 @@ struct ViewPeer {
 struct ViewAccess {
     static ViewPeer* Peer(const BView* view) { return view->peer_.get(); }
     static QWidget* Widget(const BView* view) { return view->peer_->widget; }
+    // Of a control in several parts: the one that a person works.
+    static QWidget* Worked(const BView* view);
     // The frame changed on the toolkit's side or by a control's own adjustment: takes it over without moving
     // widgets.
     static void SetFrame(BView* view, const BRect& frame);

@@ -14,6 +14,7 @@ class WindowWidget : public QWidget {
 
   protected:
     void closeEvent(QCloseEvent* event) override;
+    void changeEvent(QEvent* event) override;
     void resizeEvent(QResizeEvent* event) override;
     void keyPressEvent(QKeyEvent* event) override;
 
@@ -34,6 +35,7 @@ struct WindowPeer {
     bool modal = false;
     bool resizable = true;
     bool shownBefore = false;
+    bool placed = false; // with the frame that the window manager has drawn
 };
 
 // The layer's own way into windows.
@@ -41,4 +43,5 @@ struct WindowAccess {
     static WindowPeer* Peer(const BWindow* window) { return window->peer_.get(); }
     static QWidget* Widget(const BWindow* window) { return window->peer_->widget; }
     static void ContentResized(BWindow* window, float width, float height);
+    static void Activated(BWindow* window);
 };

@@ -114,7 +114,7 @@ TEST(EveryWindow, SaysWhatItIsAndHasRoomForLargeLetters) {
         {"Portfolio", "Add", "Add a Portfolio", Role::EditableText, "Name:", "At most 31 characters"},
         {"Portfolio", "Edit", "Edit Portfolio", Role::EditableText, "Name:", "At most 31 characters"},
         {"Portfolio", "Del", "Are you sure you want to delete this portfolio?", Role::Graphic, "Warning"},
-        {"Portfolio", "Chart", "Quorvan", Role::Graphic, nullptr,
+        {"Portfolio", "Chart", "Quorvan", Role::Graphic, "Chart of My Retirement Fund",
          "Value by Investment\nAlder Paper Mills: $1485"},
         {"Investment", "Add", "Add an Investment", Role::ButtonMenu, "Type choices"},
         {"Investment", "Edit", "Edit this Investment", Role::CheckBox, "Retirement"},

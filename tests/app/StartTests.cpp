@@ -66,7 +66,8 @@ TEST_F(StartTest, TheCloseBoxSavesWidthsAndCompacts) {
     EXPECT_EQ(Read("Quorvan.ini"),
               "[DISPLAY]\nColumnWidth0=20\nColumnWidth2=120\nColumnWidth4=20\nColumnWidth5=60\nTextSize=12\n"
               "ColumnWidth1=50\nColumnWidth3=123\nColumnWidth6=50\nColumnWidth7=50\nColumnWidth8=50\n"
-              "ColumnWidth9=50\nColumnWidth10=50\n");
+              "ColumnWidth9=50\nColumnWidth10=50\n"
+              "WindowPlace=100 100 500 200\nColumnOrder=0 10 9 8 7 6 5 4 3 2 1\nSortKeys=\n");
 }
 
 TEST_F(StartTest, ThePasswordOpensTheWindow) {

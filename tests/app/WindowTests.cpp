@@ -3,6 +3,8 @@
 
 #include <map>
 
+#include <QScreen>
+
 #include "db/FaultyFiles.h"
 #include "platform/Application.h"
 #include "platform/MenuItem.h"
@@ -210,6 +212,49 @@ TEST_F(MainWindow, AListLoadedAnewKeepsItsPlaceAndAnotherBegins) {
         });
     }
     RunAndClose();
+}
+
+TEST_F(MainWindow, OpensAsItWasLeft) {
+    const std::vector<int32> order = {0, 6, 1, 2, 3, 4, 5, 7, 8, 9, 10};
+    AddPortfolioOf("P", {"b", "c", "a"});
+    Then([&] {
+        Locked([&] {
+            Window()->MoveTo(130, 140);
+            Window()->ResizeTo(450, 250);
+            List()->SetDisplayOrder(order.data());
+            List()->SetSortKey(6);
+            List()->AddSortKey(1);
+            List()->SetSortMode(1, CLVSortMode::Descending);
+        });
+    });
+    RunAndClose();
+    Expect({"c", "b", "a"}).Then([&] {
+        EXPECT_EQ(Window()->Frame(), BRect(130, 140, 580, 390));
+        EXPECT_EQ(List()->DisplayOrder(), order);
+        EXPECT_EQ(List()->PrimarySortKey(), 6);
+        EXPECT_EQ(Main()->accessibleName(), "Quorvan P");
+    });
+    RunAndClose();
+}
+
+TEST_F(MainWindow, OpensOnTheScreenWhateverIsStored) {
+    const std::tuple<std::string, std::string, std::string, int> cases[] = {
+        {"1 2 3", "0 1 1 3 4 5 6 7 8 9 10", "0 77 -100000", 501},
+        {"1 2 400 99999999999", "10 9 8 7 6 5 4 3 2 1 11", "1 2 x", 501},
+        {"9000 9000 400 300", "", "", 401},
+        {"-90 0 400 9000", "-1 1 2 3 4 5 6 7 8 9 10", "1-1", 401}};
+    for (const auto& [place, order, keys, width] : cases) {
+        Write("Quorvan.ini",
+              "[DISPLAY]\nWindowPlace=" + place + "\nColumnOrder=" + order + "\nSortKeys=" + keys + "\n");
+        Await(
+            [] { return Main() && Main()->screen()->availableGeometry().contains(Main()->frameGeometry()); });
+        Then([&place = place, width = width] {
+            EXPECT_EQ(Main()->width(), width) << place;
+            EXPECT_EQ(List()->DisplayOrder()[10], 10);
+            EXPECT_EQ(List()->PrimarySortKey(), -1);
+        });
+        RunAndClose();
+    }
 }
 
 TEST_F(MainWindow, TellsWhatItCannotReadAndLeavesItAlone) {

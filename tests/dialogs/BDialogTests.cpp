@@ -5,6 +5,7 @@
 #include <atomic>
 
 #include <QPushButton>
+#include <QScreen>
 
 #include "dialogs/BDialog.h"
 #include "platform/Button.h"
@@ -20,11 +21,13 @@ constexpr uint32 MessageOwn = 3000;
 // Counts what it is told, refuses Ok as often as it should, and has a field and a button of its own.
 class TestDialog : public BDialog {
   public:
-    explicit TestDialog(uint16 flags = DialogHasOk | DialogHasCancel)
-        : BDialog({50, 50, 350, 200}, "Test", flags) {
+    explicit TestDialog(uint16 flags = 3, BRect frame = {50, 50, 350, 200}, const char* title = "Test")
+        : BDialog(frame, title, flags) {
         auto* field = new BTextControl({10, 10, 290, 30}, "field", "Field:", "text");
-        TopView()->AddChild(field);
-        TopView()->AddChild(new BButton({110, 50, 190, 70}, "own", "Own", new BMessage(MessageOwn)));
+        Form()->AddChild(field);
+        Form()->AddChild(new BButton({110, 50, 190, 70}, "own", "Own", new BMessage(MessageOwn)));
+        if (frame.Height() > 1000)
+            Form()->AddChild(new BButton({10, 2800, 90, 2820}, "far", "Far", nullptr));
         field->MakeFocus();
     }
     ~TestDialog() override { destroyed++; }
@@ -61,6 +64,28 @@ TEST(BDialog, FlagsSayWhichButtonsThereAre) {
             EXPECT_EQ(cancel->Frame().bottom + ok->Frame().bottom, 2 * 230);
         }
     }
+}
+
+TEST(BDialog, IsWholeOnTheScreenWithItsButtonsAndItsTitle) {
+    const BApplication application("test");
+    constexpr const char* title = "A title that is a little longer";
+    auto* dialog = new TestDialog(3, {5000, 5000, 5100, 8000}, title);
+    Driver driver;
+    driver.InField([] {
+        const QWidget* shown = QApplication::activeModalWidget();
+        EXPECT_TRUE(shown->screen()->availableGeometry().contains(shown->frameGeometry()));
+        EXPECT_GT(shown->width(), shown->fontMetrics().horizontalAdvance(title) + 80);
+        const auto isSeen = [&](const char* name) {
+            const auto* button = shown->findChild<QPushButton*>(name);
+            return button->visibleRegion().boundingRect() == button->rect();
+        };
+        EXPECT_TRUE(isSeen("Ok button") && isSeen("cancel button") && !isSeen("far"));
+        shown->findChild<QPushButton*>("far")->setFocus();
+        EXPECT_TRUE(isSeen("far"));
+        Driver::Key(Qt::Key_Escape);
+    });
+    EXPECT_EQ(dialog->DoModal(), DialogCancel);
+    ExpectGone(0);
 }
 
 TEST(BDialog, EveryWayOutHasItsResult) {

@@ -86,7 +86,8 @@ TEST_F(FormTest, ThePasswordIsTakenByOkAlone) {
 
     char answer[PasswordSize] = "first";
     auto* form = new PasswordDialog({300, 200}, answer, Both);
-    EXPECT_EQ(form->Frame().LeftTop(), BPoint(200, std::floor(200 - 3 * GetFontHeight(be_bold_font))));
+    EXPECT_EQ(form->Frame().LeftTop(), BPoint(std::floor(300 - form->Bounds().Width() / 2),
+                                              std::floor(200 - 3 * GetFontHeight(be_bold_font))));
     Enter(form, "first", "Secret", Qt::Key_Escape);
     Enter(new PasswordDialog({0, 0}, answer, Both), "first", "0123456789abcdefgh", Qt::Key_Return);
     EXPECT_STREQ(answer, "0123456789abcde");

@@ -66,8 +66,8 @@ TEST_F(Controls, HaveNamesAndLettersOfTheirOwnAndSendTheirMessages) {
     EXPECT_EQ(box->Value(), B_CONTROL_ON);
 }
 
-// The contrast ratio between the lightest and the darkest pixel that a widget shows inside its frame.
-double Contrast(const QWidget* widget) {
+// Of the darkest and the lightest pixel that a widget shows inside its frame.
+std::pair<double, double> Luminances(const QWidget* widget) {
     constexpr int frame = 4;
     const QPoint place = widget->mapTo(widget->window(), QPoint(0, 0));
     const QImage shown =
@@ -76,13 +76,18 @@ double Contrast(const QWidget* widget) {
     for (int y = 0; y < shown.height(); y++)
         for (int x = 0; x < shown.width(); x++)
             luminances.insert(std::pow(qGray(shown.pixel(x, y)) / 255.0, 2.2));
-    return (*luminances.rbegin() + 0.05) / (*luminances.begin() + 0.05);
+    return {*luminances.begin(), *luminances.rbegin()};
 }
 
-// Labels, check boxes and arrows bring no background of their own, or only half of one: they must stand out
-// from what they are drawn on, be it the view's colour or the theme's.
-TEST_F(Controls, AreReadableWhateverTheTheme) {
-    auto* ground = Add(new BView(BRect(0, 0, 399, 299), "ground", B_FOLLOW_ALL_SIDES, B_WILL_DRAW));
+TEST(DarkDesktop, LeavesControlsLightAndReadable) {
+    qAddPreRoutine([] {
+        QPalette dark(QColor(49, 54, 59), QColor(49, 54, 59));
+        for (const auto role : {QPalette::WindowText, QPalette::Text, QPalette::ButtonText})
+            dark.setColor(role, Qt::white);
+        QApplication::setPalette(dark);
+    });
+    Stage stage;
+    auto* ground = stage.Add(new BView(BRect(0, 0, 399, 299), "ground", B_FOLLOW_ALL_SIDES, B_WILL_DRAW));
     ground->AddChild(new BCheckBox(BRect(10, 10, 200, 40), "box", "Box", nullptr));
     ground->AddChild(new BTextControl(BRect(10, 50, 300, 80), "line", "Line", "typed"));
     ground->AddChild(new BButton(BRect(10, 90, 100, 120), "button", "Button", nullptr));
@@ -97,28 +102,16 @@ TEST_F(Controls, AreReadableWhateverTheTheme) {
     auto* list = new BListView(BRect(310, 10, 370, 60), "list");
     list->AddItem(&row);
     ground->AddChild(new BScrollView("around", list, B_FOLLOW_NONE, 0, false, true, B_NO_BORDER));
-    Show();
-    Find<QListView>("list")->verticalScrollBar()->setObjectName("scroll bar");
-    QPalette dark(QColor(49, 54, 59), QColor(49, 54, 59));
-    dark.setColor(QPalette::Base, QColor(35, 38, 41));
-    for (const QPalette::ColorRole role : {QPalette::WindowText, QPalette::Text, QPalette::ButtonText})
-        dark.setColor(role, QColor(239, 240, 241));
-    for (const QPalette& palette : {QPalette(QColor(239, 239, 239)), dark}) {
-        QApplication::setPalette(palette);
-        ASSERT_TRUE(QTest::qWaitFor([&] {
-            return Find<QWidget>("line")->palette().color(QPalette::Base) == palette.color(QPalette::Base);
-        }));
-        for (const rgb_color color : {rgb_color{216, 216, 216}, rgb_color{30, 30, 30}}) {
-            ground->SetViewColor(color);
-            for (const char* name :
-                 {"box", "line", "line container", "button", "arrow", "bar text", "scroll bar"})
-                EXPECT_GT(Contrast(Find<QWidget>(name)), 4.5)
-                    << name << " on " << int{color.red} << " with a window of "
-                    << palette.color(QPalette::Window).lightness();
-        }
-        total->SetHighColor({0, 128, 0});
-        EXPECT_EQ(Find<QLabel>("total")->palette().color(QPalette::WindowText), QColor(0, 128, 0));
+    stage.Show();
+    Stage::Find<QListView>("list")->verticalScrollBar()->setObjectName("scroll bar");
+    ground->SetViewColor({216, 216, 216});
+    for (const char* name : {"box", "line", "line container", "button", "arrow", "bar text", "scroll bar"}) {
+        const auto [darkest, lightest] = Luminances(Stage::Find<QWidget>(name));
+        EXPECT_GT((lightest + 0.05) / (darkest + 0.05), 4.5) << name;
+        EXPECT_GT(lightest, std::pow(215 / 255.0, 2.2)) << name;
     }
+    total->SetHighColor({0, 128, 0});
+    EXPECT_EQ(Stage::Find<QLabel>("total")->palette().color(QPalette::WindowText), QColor(0, 128, 0));
 }
 
 TEST_F(Controls, TextsKeepToTheirPlaceAndBytesWhateverIsPutIn) {
@@ -345,6 +338,20 @@ TEST_F(Controls, AlertsAnswerWithTheButtonPressed) {
         QTest::keyClick(box, Qt::Key_Escape);
     });
     EXPECT_EQ(ask(), 2);
+    Show();
+    for (const std::string& endless : {std::string(), QString(" and on").repeated(4000).toStdString()}) {
+        QApplication::setActiveWindow(nullptr); // as for a moment after another alert
+        driver.When("placed alert", Driver::Alert, [&] {
+            QMessageBox* box = Driver::Alert();
+            const auto* no = box->findChild<QPushButton*>("No");
+            EXPECT_EQ(no->visibleRegion().boundingRect(), no->rect());
+            EXPECT_TRUE(box->screen()->availableGeometry().contains(box->frameGeometry()));
+            const QPoint off = box->geometry().center() - Toolkit()->geometry().center();
+            EXPECT_TRUE(!endless.empty() || off.manhattanLength() < 3);
+            Driver::Press(box, "No");
+        });
+        static_cast<void>((new BAlert("", (text + endless).c_str(), "Yes", "No"))->Go());
+    }
 }
 
 TEST_F(Controls, AlertsBlockTheirCallerAloneAndEndWithItsStop) {

@@ -88,6 +88,25 @@ TEST(Drawing, ShapesCoverTheirInclusiveRectangles) {
     EXPECT_EQ(Colors(picture, {{45, 75}, {35, 85}, {45, 73}, {45, 78}, {45, 94}, {54, 85}}), "DDBBWW");
 }
 
+TEST(Drawing, WhatMeetsLeavesNoSeamAtAnyDensity) {
+    for (const double density : {1.25, 1.5, 1.75}) {
+        const QImage picture = Drawn(
+            [](BView* view) {
+                view->SetHighColor(kRed);
+                view->SetLowColor(kRed);
+                for (float left = 0; left < 99; left += 7) {
+                    view->FillRect({left, 0, left + 6, 9});
+                    view->FillRectLow({left, 10, left + 6, 19});
+                    view->StrokeLine({left, 20}, {left + 6, 20});
+                }
+            },
+            density);
+        for (int x = 0; x < picture.width(); ++x)
+            for (int y = 0; y < static_cast<int>(21 * density); ++y)
+                ASSERT_EQ(picture.pixel(x, y), qRgb(255, 0, 0)) << density << ": " << x << ", " << y;
+    }
+}
+
 TEST(Drawing, BitmapsKeepTheirTransparentPixelsAndStaySharpOnDenseScreens) {
     BBitmap bitmap(BRect(0, 0, 2, 0), B_CMAP8);
     const uint8 pixels[] = {0, B_TRANSPARENT_MAGIC_CMAP8};

@@ -13,6 +13,8 @@ TEST_F(PictureCommandTest, WritesEachKindOfFileAndChangesNoData) {
     const std::array<std::string, 3> cases[] = {
         {"chart --home Quorvan 'my retirement fund' 2000 -o out.svg", "cat out.svg",
          ">Birch &amp; Sons: $4026.75 2.41%</text>"},
+        {"chart --home Quorvan 'my retirement fund' 2000 -o out.svg", "cat out.svg",
+         "<desc>Chart of My Retirement Fund\nValue by Investment\n"},
         {"chart --home Quorvan 'My Retirement Fund' 'value OVER time' -o out.PDF", "pdftotext out.PDF -",
          "Value over Time"},
         {"chart --home Quorvan 'My Retirement Fund' 'Shares by Investment' -o out.png --scale 3",
