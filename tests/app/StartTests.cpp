@@ -67,7 +67,7 @@ TEST_F(StartTest, TheCloseBoxSavesWidthsAndCompacts) {
               "[DISPLAY]\nColumnWidth0=20\nColumnWidth2=120\nColumnWidth4=20\nColumnWidth5=60\nTextSize=12\n"
               "ColumnWidth1=50\nColumnWidth3=123\nColumnWidth6=50\nColumnWidth7=50\nColumnWidth8=50\n"
               "ColumnWidth9=50\nColumnWidth10=50\n"
-              "WindowPlace=100 100 500 200\nColumnOrder=0 10 9 8 7 6 5 4 3 2 1\nSortKeys=\n");
+              "WindowPlace=100 100 500 200\nColumnOrder=0 1 2 3 4 5 6 7 8 9 10\nSortKeys=\n");
 }
 
 TEST_F(StartTest, ThePasswordOpensTheWindow) {
