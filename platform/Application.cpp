@@ -27,10 +27,10 @@ BApplication* be_app = nullptr;
 
 namespace {
 
-constexpr int kQuitRetryMilliseconds = 5;
-constexpr bigtime_t kThreadPatience = 5000000;
+constexpr int QuitRetryMilliseconds = 5;
+constexpr bigtime_t ThreadPatience = 5000000;
 
-constexpr int kIconSizes[] = {16, 22, 24, 32, 48, 64, 128, 256};
+constexpr int IconSizes[] = {16, 22, 24, 32, 48, 64, 128, 256};
 
 std::string gExecutablePath; // empty: ask the system
 
@@ -50,7 +50,7 @@ bool OpenWithDesktop(const char* path) {
 }
 
 bool (*gLauncher)(const char*) = OpenWithDesktop;
-const BRoster kRoster;
+const BRoster Roster;
 
 } // namespace
 
@@ -75,7 +75,7 @@ BApplication::BApplication(const char* signature)
 BApplication::~BApplication() {
     while (BWindow* window = WindowAt(0))
         delete window;
-    StopAllThreads(kThreadPatience);
+    StopAllThreads(ThreadPatience);
     CloseInterfaceThread();
     FontAccess::DeleteSystemFonts();
     peer_->toolkit.reset();
@@ -125,7 +125,7 @@ bool BApplication::SetDesktopIdentity(const char* desktopId, std::string_view sv
     if (!picture.isValid())
         return false;
     QIcon icon;
-    for (const int size : kIconSizes) {
+    for (const int size : IconSizes) {
         QPixmap pixels(size, size);
         pixels.fill(Qt::transparent);
         QPainter painter(&pixels);
@@ -163,21 +163,21 @@ void ApplicationAccess::QuitWhenNothingWaits(BApplication& application) {
     if (CountInterfaceWaits() > 0) {
         if (!RejectInnermostDialog())
             QuitModalWindows(application);
-        QTimer::singleShot(kQuitRetryMilliseconds, application.peer_->toolkit.get(),
+        QTimer::singleShot(QuitRetryMilliseconds, application.peer_->toolkit.get(),
                            [&application] { QuitWhenNothingWaits(application); });
         return;
     }
     for (int32 index = application.CountWindows() - 1; index >= 0; index--)
         application.WindowAt(index)->Quit();
     if (application.CountWindows() > 0) {
-        QTimer::singleShot(kQuitRetryMilliseconds, application.peer_->toolkit.get(),
+        QTimer::singleShot(QuitRetryMilliseconds, application.peer_->toolkit.get(),
                            [&application] { QuitWhenNothingWaits(application); });
         return;
     }
     QApplication::quit();
 }
 
-const BRoster* be_roster = &kRoster;
+const BRoster* be_roster = &Roster;
 
 status_t BRoster::Launch(const entry_ref* ref) const {
     if (!QFileInfo::exists(QString::fromUtf8(ref->path.c_str())))

@@ -20,7 +20,7 @@ struct NamedEntry {
 
 // The entries that pictures of this program use, chosen to be told apart on white and on the selection's
 // grey.
-constexpr NamedEntry kNamedEntries[] = {
+constexpr NamedEntry NamedEntries[] = {
     {0, {0, 0, 0, 255}},      {143, {0, 128, 24, 255}}, {163, {136, 72, 0, 255}},
     {191, {0, 48, 200, 255}}, {228, {204, 0, 0, 255}},  {252, {255, 208, 0, 255}},
 };
@@ -41,7 +41,7 @@ QList<QRgb> MakeColorTable() {
 rgb_color color_map_entry(uint8 index) {
     if (index == B_TRANSPARENT_MAGIC_CMAP8)
         return {255, 255, 255, 0};
-    for (const NamedEntry& entry : kNamedEntries)
+    for (const NamedEntry& entry : NamedEntries)
         if (entry.index == index)
             return entry.color;
     // The rest is a plain cube: three bits of red, three of green, two of blue.

@@ -9,7 +9,7 @@
 
 namespace {
 
-constexpr int kMargin = 10; // below the last control
+constexpr int Margin = 10; // below the last control
 
 // What it holds is as wide as is seen, and as high as its controls are. Belongs to its view's peer.
 class FormArea : public QScrollArea {
@@ -30,7 +30,7 @@ class FormArea : public QScrollArea {
 
   protected:
     void resizeEvent(QResizeEvent* event) override {
-        const int controls = widget()->childrenRect().bottom() + 1 + kMargin;
+        const int controls = widget()->childrenRect().bottom() + 1 + Margin;
         widget()->resize(viewport()->width(), std::max(controls, viewport()->height()));
         QScrollArea::resizeEvent(event);
     }

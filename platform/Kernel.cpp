@@ -17,7 +17,7 @@
 
 namespace {
 
-constexpr std::size_t kThreadNameLimit = 15; // what the system keeps of a thread's name
+constexpr std::size_t ThreadNameLimit = 15; // what the system keeps of a thread's name
 
 // All of these are changed inside ChangeKernelState and looked at under the same lock.
 struct Semaphore {
@@ -73,7 +73,7 @@ std::shared_ptr<Thread> FindThread(thread_id thread) {
 
 void RunThread(const std::shared_ptr<Thread>& thread, thread_id id) {
     tCurrentThread = thread.get();
-    pthread_setname_np(pthread_self(), thread->name.substr(0, kThreadNameLimit).c_str());
+    pthread_setname_np(pthread_self(), thread->name.substr(0, ThreadNameLimit).c_str());
     WaitUntil([&] { return thread->started; }, B_INFINITE_TIMEOUT);
     // Once it was resumed it runs, even if it is asked to stop before it comes to that: somebody may wait for
     // what it does at its end.

@@ -22,11 +22,11 @@
 
 namespace {
 
-constexpr double kPointsPerInch = 72;
-constexpr int32 kMaxCopies = 999;
-constexpr int32 kMinResolution = 72;
-constexpr int32 kMaxResolution = 4800;
-constexpr float kMaxPagePoints = 14400; // what a PDF page may measure
+constexpr double PointsPerInch = 72;
+constexpr int32 MaxCopies = 999;
+constexpr int32 MinResolution = 72;
+constexpr int32 MaxResolution = 4800;
+constexpr float MaxPagePoints = 14400; // what a PDF page may measure
 
 std::string Text(const BMessage& settings, const char* name) {
     const char* text = "";
@@ -53,8 +53,8 @@ QPageSize PageSizeOf(const BMessage& settings, const QPageSize& present) {
         if (id != QPageSize::Custom && QPageSize::key(static_cast<QPageSize::PageSizeId>(id)) == key)
             return QPageSize(static_cast<QPageSize::PageSizeId>(id));
     const QSizeF size(Number(settings, "page width", 0), Number(settings, "page height", 0));
-    const bool sensible = size.width() >= 1 && size.height() >= 1 && size.width() <= kMaxPagePoints &&
-                          size.height() <= kMaxPagePoints;
+    const bool sensible = size.width() >= 1 && size.height() >= 1 && size.width() <= MaxPagePoints &&
+                          size.height() <= MaxPagePoints;
     return sensible ? QPageSize(size, QPageSize::Point) : present;
 }
 
@@ -215,9 +215,8 @@ void BPrintJob::SetSettings(const BMessage* message) {
     if (!file.isEmpty())
         printer.setOutputFileName(file);
     printer.setPageLayout(LayoutOf(*message, printer.pageLayout()));
-    printer.setCopyCount(Whole(*message, "copies", printer.copyCount(), 1, kMaxCopies));
-    printer.setResolution(
-        Whole(*message, "resolution", printer.resolution(), kMinResolution, kMaxResolution));
+    printer.setCopyCount(Whole(*message, "copies", printer.copyCount(), 1, MaxCopies));
+    printer.setResolution(Whole(*message, "resolution", printer.resolution(), MinResolution, MaxResolution));
     bool colour = printer.colorMode() == QPrinter::Color;
     message->FindBool("colour", &colour);
     printer.setColorMode(colour ? QPrinter::Color : QPrinter::GrayScale);
@@ -240,7 +239,7 @@ void BPrintJob::DrawView(BView* view, BRect rect, BPoint where) {
         peer_->printer.newPage();
     peer_->pageWanted = false;
     QPainter& painter = peer_->painter;
-    const double scale = peer_->printer.resolution() / kPointsPerInch;
+    const double scale = peer_->printer.resolution() / PointsPerInch;
     painter.save();
     painter.scale(scale, scale);
     painter.translate(ToQt(where - rect.LeftTop()));

@@ -5,14 +5,14 @@
 
 namespace {
 
-constexpr float kBarThickness = 14;
+constexpr float BarThickness = 14;
 
 BRect FrameAround(const BListView& target, bool horizontal, bool vertical) {
     BRect frame = target.Frame();
     if (vertical)
-        frame.right += kBarThickness;
+        frame.right += BarThickness;
     if (horizontal)
-        frame.bottom += kBarThickness;
+        frame.bottom += BarThickness;
     return frame;
 }
 

@@ -13,10 +13,10 @@
 
 namespace {
 
-constexpr int kSteps = 10000; // of the toolkit's bar, which counts in whole numbers
+constexpr int Steps = 10000; // of the toolkit's bar, which counts in whole numbers
 // As often as an eye can follow: painting every change would slow down a worker that makes a thousand of them
 // in a second.
-constexpr int kRefreshMilliseconds = 30;
+constexpr int RefreshMilliseconds = 30;
 
 // The bar with its text above. Owns its children.
 class StatusWidget : public QWidget {
@@ -25,7 +25,7 @@ class StatusWidget : public QWidget {
   public:
     StatusWidget() : text_(new QLabel(this)), bar_(new QProgressBar(this)) {
         text_->setTextFormat(Qt::PlainText);
-        bar_->setRange(0, kSteps);
+        bar_->setRange(0, Steps);
         bar_->setTextVisible(false);
         bar_->setMinimumHeight(bar_->fontMetrics().height() / 2);
         auto* layout = new QVBoxLayout(this);
@@ -44,7 +44,7 @@ class StatusWidget : public QWidget {
 
     void Show(const QString& text, float part) {
         text_->setText(text);
-        bar_->setValue(static_cast<int>(std::lround(part * kSteps)));
+        bar_->setValue(static_cast<int>(std::lround(part * Steps)));
         bar_->setAccessibleName(text);
     }
 
@@ -67,7 +67,7 @@ BStatusBar::BStatusBar(BRect frame, const char* name, const char* label)
     Refresh();
     auto* timer = new QTimer(Widget(this));
     QObject::connect(timer, &QTimer::timeout, Widget(this), [this] { Refresh(); });
-    timer->start(kRefreshMilliseconds);
+    timer->start(RefreshMilliseconds);
 }
 
 void BStatusBar::SetMaxValue(float maximum) {

@@ -18,8 +18,8 @@
 
 namespace {
 
-constexpr int kPointsPerInch = 72;
-constexpr float kMaxScale = 16;
+constexpr int PointsPerInch = 72;
+constexpr float MaxScale = 16;
 
 QSize SizeOf(const BView* view) {
     const BRect bounds = view->Bounds();
@@ -48,18 +48,18 @@ bool Paint(BView* view, QPaintDevice* device, double scale) {
 }
 
 bool WritePng(BView* view, QBuffer& file, float scale) {
-    QImage image(SizeOf(view) * std::clamp(scale, 1 / kMaxScale, kMaxScale), QImage::Format_RGB32);
+    QImage image(SizeOf(view) * std::clamp(scale, 1 / MaxScale, MaxScale), QImage::Format_RGB32);
     if (image.isNull())
         return false;
     image.setText(QStringLiteral("Title"), NameOf(view));
     image.setText(QStringLiteral("Description"), DescriptionOf(view));
-    return Paint(view, &image, std::clamp(scale, 1 / kMaxScale, kMaxScale)) && image.save(&file, "PNG");
+    return Paint(view, &image, std::clamp(scale, 1 / MaxScale, MaxScale)) && image.save(&file, "PNG");
 }
 
 bool WriteSvg(BView* view, QBuffer& file) {
     QSvgGenerator svg;
     svg.setOutputDevice(&file);
-    svg.setResolution(kPointsPerInch);
+    svg.setResolution(PointsPerInch);
     svg.setSize(SizeOf(view));
     svg.setViewBox(QRect(QPoint(0, 0), SizeOf(view)));
     // The generator writes these as they are given.
@@ -70,7 +70,7 @@ bool WriteSvg(BView* view, QBuffer& file) {
 
 bool WritePdf(BView* view, QBuffer& file) {
     QPdfWriter pdf(&file);
-    pdf.setResolution(kPointsPerInch);
+    pdf.setResolution(PointsPerInch);
     pdf.setTitle(NameOf(view));
     pdf.setPageSize(QPageSize(QSizeF(SizeOf(view)), QPageSize::Point, QString(), QPageSize::ExactMatch));
     pdf.setPageMargins(QMarginsF());

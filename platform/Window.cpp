@@ -243,7 +243,7 @@ void BWindow::Quit() {
 }
 
 void BWindow::DispatchMessage(BMessage* message, BHandler* handler) {
-    if (message->what != kMouseDownCode && message->what != kMouseUpCode) {
+    if (message->what != MouseDownCode && message->what != MouseUpCode) {
         BLooper::DispatchMessage(message, handler);
         return;
     }
@@ -251,7 +251,7 @@ void BWindow::DispatchMessage(BMessage* message, BHandler* handler) {
     auto* view = dynamic_cast<BView*>(handler);
     if (!view || message->FindPoint("where", &where) != B_OK)
         return;
-    if (message->what == kMouseDownCode)
+    if (message->what == MouseDownCode)
         view->MouseDown(where);
     else
         view->MouseUp(where);

@@ -25,7 +25,7 @@
 
 namespace {
 
-constexpr int kCancelPollMilliseconds = 50;
+constexpr int CancelPollMilliseconds = 50;
 
 std::mutex gPostMutex; // guards the box and its queue
 
@@ -203,7 +203,7 @@ int RunDialog(QDialog& dialog, const std::function<bool()>& cancelled) {
             if (cancelled())
                 dialog.reject();
         });
-        poll.start(kCancelPollMilliseconds);
+        poll.start(CancelPollMilliseconds);
     }
     // Not every window manager gives the keyboard back to where it was.
     const QPointer<QWidget> before = WindowBelow();

@@ -36,7 +36,7 @@ QString WithMnemonic(const QString& label, Letters& taken) {
 
 template <class Shown>
 void Assign(Shown* shown, Letters& taken) {
-    const QVariant label = shown->property(kLabelProperty);
+    const QVariant label = shown->property(LabelProperty);
     if (label.isValid())
         shown->setText(WithMnemonic(label.toString(), taken));
 }

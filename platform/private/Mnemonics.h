@@ -10,7 +10,7 @@ class QWidget;
 
 // The property of a widget or menu action that keeps its label as given; the text shown may carry a mnemonic
 // mark. What lacks the property gets no mnemonic.
-constexpr const char* kLabelProperty = "quorvanLabel";
+constexpr const char* LabelProperty = "quorvanLabel";
 
 // The label as toolkit text without any mnemonic: its own '&' doubled.
 QString EscapeLabel(const QString& label);
@@ -20,7 +20,7 @@ QString EscapeLabel(const QString& label);
 template <class Shown>
 void ShowLabel(Shown* shown, const char* label) {
     const QString text = QString::fromUtf8(label);
-    shown->setProperty(kLabelProperty, text);
+    shown->setProperty(LabelProperty, text);
     shown->setText(EscapeLabel(text));
 }
 

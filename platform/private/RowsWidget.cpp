@@ -235,7 +235,7 @@ BPoint RowsWidget::Where(const QMouseEvent& event) const {
 }
 
 void RowsWidget::HandlePress(QMouseEvent* event) {
-    BMessage message(kMouseDownCode);
+    BMessage message(MouseDownCode);
     message.AddPoint("where", Where(*event));
     message.AddInt32("buttons", static_cast<int32>(ButtonBits(event->buttons())));
     message.AddInt32("modifiers", static_cast<int32>(ModifierBits(event->modifiers())));

@@ -20,16 +20,16 @@ struct KeyCode {
     int toolkit;
     char ours;
 };
-constexpr KeyCode kKeyCodes[] = {{Qt::Key_Home, B_HOME},       {Qt::Key_End, B_END},
-                                 {Qt::Key_Return, B_ENTER},    {Qt::Key_Enter, B_ENTER},
-                                 {Qt::Key_Left, B_LEFT_ARROW}, {Qt::Key_Right, B_RIGHT_ARROW},
-                                 {Qt::Key_Up, B_UP_ARROW},     {Qt::Key_Down, B_DOWN_ARROW}};
+constexpr KeyCode KeyCodes[] = {{Qt::Key_Home, B_HOME},       {Qt::Key_End, B_END},
+                                {Qt::Key_Return, B_ENTER},    {Qt::Key_Enter, B_ENTER},
+                                {Qt::Key_Left, B_LEFT_ARROW}, {Qt::Key_Right, B_RIGHT_ARROW},
+                                {Qt::Key_Up, B_UP_ARROW},     {Qt::Key_Down, B_DOWN_ARROW}};
 
 // 0 for a key that views do not hear of.
 char OurKey(const QKeyEvent& event) {
     if (event.modifiers() & ~(Qt::ShiftModifier | Qt::KeypadModifier))
         return 0;
-    for (const KeyCode& code : kKeyCodes)
+    for (const KeyCode& code : KeyCodes)
         if (code.toolkit == event.key())
             return code.ours;
     const QString text = event.text();
@@ -96,7 +96,7 @@ void ViewWidget::keyPressEvent(QKeyEvent* event) {
 
 void ViewWidget::mousePressEvent(QMouseEvent* event) {
     NotePointer(*event);
-    PostPointerMessage(*event, kMouseDownCode);
+    PostPointerMessage(*event, MouseDownCode);
 }
 
 void ViewWidget::mouseMoveEvent(QMouseEvent* event) {
@@ -116,7 +116,7 @@ void ViewWidget::TellMove(uint32 transit) {
 
 void ViewWidget::mouseReleaseEvent(QMouseEvent* event) {
     NotePointer(*event);
-    PostPointerMessage(*event, kMouseUpCode);
+    PostPointerMessage(*event, MouseUpCode);
 }
 
 void ViewWidget::NotePointer(const QMouseEvent& event) {

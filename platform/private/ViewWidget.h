@@ -36,8 +36,8 @@ class ViewWidget : public QWidget {
 };
 
 // What pointer hooks are called by.
-constexpr uint32 kMouseDownCode = message_code("_MDN");
-constexpr uint32 kMouseUpCode = message_code("_MUP");
+constexpr uint32 MouseDownCode = message_code("_MDN");
+constexpr uint32 MouseUpCode = message_code("_MUP");
 
 // Draws that part of view, whose (0, 0) is the painter's origin, and of the views in it that are not hidden.
 // Controls draw themselves.

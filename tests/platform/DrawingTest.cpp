@@ -16,8 +16,8 @@
 
 namespace {
 
-constexpr rgb_color kRed{255, 0, 0};
-constexpr rgb_color kBlue{0, 0, 255};
+constexpr rgb_color Red{255, 0, 0};
+constexpr rgb_color Blue{0, 0, 255};
 
 using Work = std::function<void(BView*)>;
 
@@ -58,13 +58,13 @@ std::string Colors(const QImage& picture, std::initializer_list<QPoint> places) 
 
 TEST(Drawing, ShapesCoverTheirInclusiveRectangles) {
     const QImage picture = Drawn([](BView* view) {
-        view->SetHighColor(kBlue);
+        view->SetHighColor(Blue);
         view->FillRect({0, 70, 60, 99});
-        view->SetHighColor(kRed);
+        view->SetHighColor(Red);
         view->FillRect({10, 10, 19, 19});
         view->StrokeRect({30, 10, 39, 19});
         view->StrokeLine({50, 10}, {59, 10});
-        view->SetHighColor(kBlue);
+        view->SetHighColor(Blue);
         view->FillArc({50, 60}, 20, 20, 0, 90);
         const BRegion region(BRect(80, 80, 84, 84));
         view->ConstrainClippingRegion(&region);
@@ -92,8 +92,8 @@ TEST(Drawing, WhatMeetsLeavesNoSeamAtAnyDensity) {
     for (const double density : {1.25, 1.5, 1.75}) {
         const QImage picture = Drawn(
             [](BView* view) {
-                view->SetHighColor(kRed);
-                view->SetLowColor(kRed);
+                view->SetHighColor(Red);
+                view->SetLowColor(Red);
                 for (float left = 0; left < 99; left += 7) {
                     view->FillRect({left, 0, left + 6, 9});
                     view->FillRectLow({left, 10, left + 6, 19});
@@ -113,7 +113,7 @@ TEST(Drawing, BitmapsKeepTheirTransparentPixelsAndStaySharpOnDenseScreens) {
     bitmap.SetBits(pixels, 2, 0, B_CMAP8);
     bitmap.SetBits(pixels, 2, 2, B_CMAP8); // beyond the end: left out but for the first byte
     const auto draw = [&](BView* view) {
-        view->SetLowColor(kBlue);
+        view->SetLowColor(Blue);
         view->DrawBitmap(&bitmap, BPoint(20, 10));
         view->SetDrawingMode(B_OP_OVER);
         view->DrawBitmap(&bitmap, BPoint(10, 10));
@@ -186,7 +186,7 @@ class PrintJobs : public testing::Test {
     BApplication application_{"test"};
     TemporaryFolder folder_;
     Canvas page_{BRect(0, 0, 522, 769), [](BView* view) {
-                     view->SetHighColor(kRed);
+                     view->SetHighColor(Red);
                      view->FillRect({10, 20, 29, 39});
                      view->FillRect({10, 700, 29, 719});
                  }};

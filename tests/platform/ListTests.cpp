@@ -13,7 +13,7 @@
 
 namespace {
 
-constexpr uint32 kInvoked = 77;
+constexpr uint32 Invoked = 77;
 
 struct Row : BListItem {
     explicit Row(int32 n, float l = 20) : number(n), least(l) {}
@@ -36,7 +36,7 @@ struct Row : BListItem {
 
 struct List : BListView {
     explicit List(list_view_type type) : BListView(BRect(10, 10, 209, 109), "list", type) {
-        SetInvocationMessage(new BMessage(kInvoked));
+        SetInvocationMessage(new BMessage(Invoked));
     }
     void ScrollTo(BPoint where) override {
         scrolls.push_back(where);
@@ -165,7 +165,7 @@ TEST(Lists, AreWorkedWithKeysAndPointer) {
     for (int number = 0; const auto& [step, selected, invocations] : steps) {
         SCOPED_TRACE(number++);
         step();
-        EXPECT_EQ(stage.Received(invocations), Codes(invocations, kInvoked));
+        EXPECT_EQ(stage.Received(invocations), Codes(invocations, Invoked));
         EXPECT_EQ(stage.Selected(), selected);
     }
 }

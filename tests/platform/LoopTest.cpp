@@ -10,7 +10,7 @@
 
 namespace {
 
-constexpr bigtime_t kHour = 3'600'000'000;
+constexpr bigtime_t Hour = 3'600'000'000;
 
 status_t WaitFor(sem_id sem, bigtime_t timeout = B_INFINITE_TIMEOUT) {
     return acquire_sem_etc(sem, 1, B_RELATIVE_TIMEOUT, timeout);
@@ -69,7 +69,7 @@ TEST_F(Loopers, LockIsRecursiveAndTimesOutForOthers) {
     std::atomic<status_t> whileHeld{B_OK}, afterwards{B_ERROR};
     const Worker worker([&] {
         whileHeld = window->LockWithTimeout(2000);
-        afterwards = window->LockWithTimeout(kHour);
+        afterwards = window->LockWithTimeout(Hour);
         window->Unlock();
     });
     ASSERT_TRUE(QTest::qWaitFor([&] { return whileHeld == B_TIMED_OUT; }));
@@ -111,7 +111,7 @@ TEST_F(Loopers, SemaphoresCountTimeOutAndVanish) {
 // Somebody may wait for what a thread does at its end: also one that is stopped at once comes to it.
 TEST_F(Loopers, AStopEndsEveryKindOfAThreadsWait) {
     const std::function<int32()> waits[] = {
-        [] { return snooze(kHour); },
+        [] { return snooze(Hour); },
         [&] { return WaitFor(sem); },
         [] {
             pollfd stop{thread_stop_fd(), POLLIN, 0};
