@@ -2,12 +2,10 @@
 
 #include <CLI/CLI.hpp>
 #include <cstdlib>
-#include <cstring>
 #include <iostream>
 #include <pwd.h>
 #include <unistd.h>
 
-#include "app/model/PortfolioRules.h"
 #include "db/Database.h"
 
 namespace fs = std::filesystem;
@@ -19,15 +17,6 @@ fs::path PersonsFolder() {
         return home;
     const passwd* person = getpwuid(getuid());
     return person ? person->pw_dir : ".";
-}
-
-std::unique_ptr<DATABASE> OpenFile(const std::string& folder, const char* name, bool (*holds)(DATABASE&)) {
-    const std::string path = (fs::path(folder) / name).string();
-    auto database = std::make_unique<DATABASE>(path.c_str());
-    if (database->IsOpen() && holds(*database))
-        return database;
-    Fail(path + (database->IsOpen() ? " has other columns than Quorvan's" : " cannot be opened"));
-    return nullptr;
 }
 
 // The toolkit reads its environment as the application is made.
@@ -52,6 +41,11 @@ CLI::Option* AddHomeOption(CLI::App& command, std::string& home) {
         ->type_name("FOLDER");
 }
 
+CLI::Option* AddJsonOption(CLI::App& command, OutputFormat& format) {
+    return command.add_flag_callback(
+        "--json", [&format] { format = OutputFormat::Json; }, "Write an object on each line, for programs");
+}
+
 fs::path OwnPath() {
     std::error_code error;
     return fs::read_symlink("/proc/self/exe", error);
@@ -67,22 +61,27 @@ std::string HomeFolder(const std::string& named) {
     return (PersonsFolder() / "Quorvan").string();
 }
 
+std::unique_ptr<DATABASE> OpenOrFail(const ToolFolder& folder, const DataFileKind& file, DataFileUse use) {
+    std::string wrong;
+    std::unique_ptr<DATABASE> database = folder.Open(file, use, wrong);
+    if (!wrong.empty())
+        Fail(wrong);
+    return database;
+}
+
 std::unique_ptr<DATABASE> OpenInvestments(PortfolioOptions& options) {
     options.home = HomeFolder(options.home);
-    const auto portfolios = OpenFile(options.home, "portfol.db", HoldsPortfolios);
+    const ToolFolder folder(options.home);
+    const auto portfolios = OpenOrFail(folder, PortfolioFile, DataFileUse::Look);
     if (!portfolios)
         return nullptr;
-    const long count = SelectPortfolios(*portfolios, options.portfolio.c_str());
-    const void* found = count > 0 ? portfolios->QueryGetFirst(nullptr) : nullptr;
-    if (!found) {
-        Fail(count == 0 ? "there is no portfolio \"" + options.portfolio + "\" in " + options.home
-                        : "the portfolios in " + options.home + " could not all be read");
+    const std::string wrong =
+        folder.FindPortfolio(*portfolios, options.portfolio, ToolFolder::Letters::AnyCase);
+    if (!wrong.empty()) {
+        Fail(wrong);
         return nullptr;
     }
-    PORTFOLIO_DATA record;
-    std::memcpy(&record, found, sizeof record);
-    options.portfolio = FieldText(record.Name);
-    return OpenFile(options.home, "invest.db", HoldsInvestments);
+    return OpenOrFail(folder, InvestmentFile, DataFileUse::Look);
 }
 
 int Fail(const std::string& sentence, int status) {

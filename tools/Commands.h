@@ -5,12 +5,13 @@
 #include <string>
 
 #include "platform/Application.h"
+#include "tools/TableWriter.h"
+#include "tools/ToolFolder.h"
 
 namespace CLI {
 class App;
 class Option;
 } // namespace CLI
-class DATABASE;
 
 // The subcommands of quorvan-cli. Each function adds one to `application`. When the command line names it,
 // parsing runs it and stores the process's exit status in `status`, which must live as long as the
@@ -34,12 +35,19 @@ void AddPortfolioOptions(CLI::App& command, PortfolioOptions& options, const cha
 // Adds --home; `home` stays empty when it is not given.
 CLI::Option* AddHomeOption(CLI::App& command, std::string& home);
 
+// Adds --json, which makes `format` that.
+CLI::Option* AddJsonOption(CLI::App& command, OutputFormat& format);
+
 // The executable that runs; empty when it cannot be found out.
 [[nodiscard]] std::filesystem::path OwnPath();
 
 // The folder that --home named or else the usual one: that of quorvan-cli itself when it holds an invest.db,
 // else "Quorvan" in the person's own folder.
 [[nodiscard]] std::string HomeFolder(const std::string& named);
+
+// The folder's Open, which tells the person what is wrong.
+[[nodiscard]] std::unique_ptr<DATABASE> OpenOrFail(const ToolFolder& folder, const DataFileKind& file,
+                                                   DataFileUse use);
 
 // Opens the investment file of the portfolio, which must be listed in the portfolio file, for looking;
 // `options` gets the folder that is used and the portfolio's name as it is written there. Null, with one

@@ -75,30 +75,19 @@ bool DataFileTool::IsFileFailure(int code) {
 
 bool DataFileTool::TakeFolders() {
     const std::filesystem::path real(RealPath(file_));
-    const auto goesOn = [this](const FolderLock& lock, const std::string& folder,
-                               FolderLock::Outcome outcome) {
-        const std::string use = UseOf(lock, folder, outcome);
-        if (!use.empty())
-            Warn("the folder" + use + (outcome == FolderLock::Outcome::Held ? "; nothing is changed" : ""));
-        // Where there is no folder, there is no file either.
-        const bool failed = outcome == FolderLock::Outcome::Failed && lock.Error() != ENOENT;
-        if (failed)
-            Warn("other programs cannot be kept out of the folder: " + folder + "/" + FolderLock::FileName +
-                 (lock.Error() == EINVAL ? " is in the way" : " cannot be made: " + Reason(lock.Error())));
-        return use.empty() && !failed;
-    };
-    return ::TakeFolders(locks_, FolderOf(real), DailyBackup::FilesKeptWith(real.filename()), ToolName,
-                         goesOn);
+    folder_.emplace(FolderOf(real), DailyBackup::FilesKeptWith(real.filename()));
+    const std::string wrong = folder_->Lock();
+    if (!wrong.empty())
+        Warn(wrong);
+    return wrong.empty();
 }
 
 bool DataFileTool::KeepBackup() {
-    const std::filesystem::path real(RealPath(file_));
-    const int error = DailyBackup(FolderOf(real), DailyBackup::FilesKeptWith(real.filename())).Keep();
-    if (error != 0)
-        Warn(std::string("the day's backup cannot be made in the folder ") + DailyBackup::FolderName +
-             " beside it: " + Reason(error) + "; nothing is changed");
+    const std::string wrong = folder_->KeepBackup();
+    if (!wrong.empty())
+        Warn(wrong);
     errno = 0;
-    return error == 0;
+    return wrong.empty();
 }
 
 bool DataFileTool::Open(Access access) {
@@ -106,7 +95,7 @@ bool DataFileTool::Open(Access access) {
         return false;
     if (database_.Open(file_.c_str()) != 0) {
         const int code = database_.GetLastError(nullptr);
-        Warn(std::to_string(code) + " " + ErrorMessage(code) + ": " + WhyNotOpened());
+        Warn(std::to_string(code) + " " + ErrorMessage(code) + ": " + WhyNotOpened(file_));
         return false;
     }
     errno = 0; // so that it tells of the operations to come only
@@ -123,28 +112,8 @@ bool DataFileTool::Open(Access access) {
     return access == Access::Read || KeepBackup();
 }
 
-std::string DataFileTool::WhyNotOpened() const {
-    FileCheck check;
-    const int error = check.Run(file_);
-    if (error == 0 && !check.Findings().empty() && !check.IsSound())
-        return check.Findings().front().text;
-    if (const std::string leftover = FindCompactionLeftover(file_); error == ENOENT && !leftover.empty())
-        return "there is no such file, but " + leftover +
-               ", as an interrupted compaction leaves it; `check --repair` gives it the file's name";
-    if (error == EINVAL)
-        return "this is no regular file";
-    if (error != 0)
-        return Reason(error);
-    return file_.size() >= PathBufferSize ? "the path is longer than 127 bytes" : "there is no memory for it";
-}
-
 int DataFileTool::Print(const std::vector<std::string>& names, const std::vector<std::vector<Cell>>& rows) {
-    TableWriter writer(format_, names, output_);
-    for (const std::vector<Cell>& row : rows)
-        writer.Measure(row);
-    writer.WriteHeading();
-    for (const std::vector<Cell>& row : rows)
-        writer.WriteRow(row);
+    WriteRows(format_, names, rows, output_);
     return 0;
 }
 
@@ -159,11 +128,7 @@ void DataFileTool::Tell(const char* name, long number, const std::string& senten
 int DataFileTool::Finish(int status) {
     if (database_.Sync() != 0)
         status = FailAsEngine();
-    const int error = output_.Flush();
-    if (error == 0 || error == EPIPE)
-        return status;
-    errors_ << "quorvan-cli: the output cannot be written: " << Reason(error) << '\n';
-    return 1;
+    return FinishOutput(output_, errors_, status);
 }
 
 int DataFileTool::Info() {

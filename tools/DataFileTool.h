@@ -2,7 +2,7 @@
 
 #include <functional>
 #include <iosfwd>
-#include <list>
+#include <optional>
 #include <string>
 #include <utility>
 #include <vector>
@@ -10,7 +10,7 @@
 #include "db/Database.h"
 #include "tools/TableWriter.h"
 #include "tools/TextCheck.h"
-#include "util/FolderLock.h"
+#include "tools/ToolFolder.h"
 
 // Which records a command is about.
 struct Selection {
@@ -77,7 +77,6 @@ class DataFileTool {
     // tool lives.
     [[nodiscard]] bool TakeFolders();
     [[nodiscard]] bool KeepBackup();
-    [[nodiscard]] std::string WhyNotOpened() const;
     [[nodiscard]] int Fail(const std::string& sentence);
     // Tells of a failure of the engine, by default its latest, with the system's reason for one of the file.
     // Returns 1.
@@ -116,6 +115,6 @@ class DataFileTool {
     TextOutput& output_;
     std::ostream& errors_;
     FileOperations& operations_;
-    std::list<FolderLock> locks_;
+    std::optional<ToolFolder> folder_; // of a file that is to be changed
     DATABASE database_;
 };

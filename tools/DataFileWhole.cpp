@@ -96,7 +96,7 @@ int DataFileTool::Create(const std::string& description, const std::vector<std::
     if (!TakeFolders())
         return 1;
     if (!FindCompactionLeftover(file_).empty())
-        return Fail(WhyNotOpened() + "; nothing is made");
+        return Fail(WhyNotOpened(file_) + "; nothing is made");
     errno = 0;
     if (database_.Create(file_.c_str(), description.c_str(), static_cast<int>(entries.size()),
                          entries.data()) != 0)
@@ -133,7 +133,7 @@ int DataFileTool::Check(bool repair) {
         return 1;
     FileCheck check;
     if (const int error = check.Run(file_); error != 0)
-        return Fail(error == ENOENT ? WhyNotOpened() : Reason(error));
+        return Fail(error == ENOENT ? WhyNotOpened(file_) : Reason(error));
     if (repair && check.CanRepair()) {
         PrintFindings(check);
         std::string backup;

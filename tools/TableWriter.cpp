@@ -6,10 +6,12 @@
 #include <cmath>
 #include <iterator>
 #include <nlohmann/json.hpp>
+#include <ostream>
 #include <set>
 #include <unistd.h>
 
 #include "util/Numbers.h"
+#include "util/Strings.h"
 #include "util/Utf8.h"
 
 namespace {
@@ -48,6 +50,14 @@ int TextOutput::Flush() {
     }
     kept_.clear();
     return error_;
+}
+
+int FinishOutput(TextOutput& output, std::ostream& errors, int status) {
+    const int error = output.Flush();
+    if (error == 0 || error == EPIPE)
+        return status;
+    errors << "quorvan-cli: the output cannot be written: " << Reason(error) << '\n';
+    return 1;
 }
 
 void Cell::SetText(std::string_view bytes) {
@@ -194,4 +204,14 @@ void TableWriter::AppendAligned(std::size_t column, bool toTheRight, bool last) 
     line_ += "  ";
     if (last)
         line_.erase(line_.find_last_not_of(' ') + 1);
+}
+
+void WriteRows(OutputFormat format, const std::vector<std::string>& names,
+               const std::vector<std::vector<Cell>>& rows, TextOutput& output) {
+    TableWriter writer(format, names, output);
+    for (const std::vector<Cell>& row : rows)
+        writer.Measure(row);
+    writer.WriteHeading();
+    for (const std::vector<Cell>& row : rows)
+        writer.WriteRow(row);
 }

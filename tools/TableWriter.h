@@ -2,6 +2,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <iosfwd>
 #include <memory>
 #include <span>
 #include <string>
@@ -28,6 +29,10 @@ class TextOutput {
     int error_ = 0;
     std::string kept_;
 };
+
+// To be called last: writes what was kept back and returns `status`, or 1 with a sentence on `errors` when
+// the output could not be written. A reader that has gone away is no failure.
+int FinishOutput(TextOutput& output, std::ostream& errors, int status);
 
 enum class OutputFormat {
     Table, // aligned with blanks, under a heading line
@@ -90,3 +95,7 @@ class TableWriter {
     std::string field_; // of the cell at hand
     std::string line_;
 };
+
+// Rows that are there all at once.
+void WriteRows(OutputFormat format, const std::vector<std::string>& names,
+               const std::vector<std::vector<Cell>>& rows, TextOutput& output);
