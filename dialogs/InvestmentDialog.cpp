@@ -153,7 +153,7 @@ void InvestmentDialog::FillAgentMenu(BPopUpMenu* menu) {
 }
 
 void InvestmentDialog::FillRiskMenu(BPopUpMenu* menu) {
-    for (const char* risk : {"Low", "Med", "High"})
+    for (const char* risk : RiskNames)
         menu->AddItem(new BMenuItem(risk, nullptr));
     menu->ItemAt(1)->SetMarked(true);
 }

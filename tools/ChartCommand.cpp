@@ -4,7 +4,6 @@
 #include <memory>
 #include <optional>
 
-#include "app/model/DataFolders.h"
 #include "charts/ChartPicture.h"
 #include "charts/ChartWindow.h"
 #include "db/Database.h"
@@ -42,10 +41,7 @@ int DrawChart(const ChartOptions& options, const ChartInfo& chart, PictureFormat
         return Fail("a value in the portfolio is not a number, or too large for one");
     const std::string picture = ChartPicture(options.portfolio.c_str(), dataSets, total, chart.code,
                                              GrowthRates::All, format, options.scale);
-    if (picture.empty())
-        return Fail("the chart could not be drawn");
-    const int error = WritePicture(options.output, picture);
-    return error == 0 ? 0 : Fail(options.output + " cannot be written: " + Reason(error));
+    return picture.empty() ? Fail("the chart could not be drawn") : WriteOutputFile(options.output, picture);
 }
 
 int RunChart(ChartOptions& options) {

@@ -1,12 +1,18 @@
 #include "tools/Commands.h"
 
 #include <CLI/CLI.hpp>
+#include <cerrno>
+#include <csignal>
 #include <cstdlib>
 #include <iostream>
 #include <pwd.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
+#include "app/model/DataFolders.h"
 #include "db/Database.h"
+#include "util/File.h"
+#include "util/Strings.h"
 
 namespace fs = std::filesystem;
 
@@ -17,6 +23,16 @@ fs::path PersonsFolder() {
         return home;
     const passwd* person = getpwuid(getuid());
     return person ? person->pw_dir : ".";
+}
+
+// The errno number that tells why there is something that a picture must not replace, or 0.
+int WhyNotReplaced(const std::string& path) {
+    struct stat status {};
+    if (stat(path.c_str(), &status) != 0)
+        return 0;
+    if (!S_ISREG(status.st_mode))
+        return S_ISDIR(status.st_mode) ? EISDIR : EOPNOTSUPP;
+    return access(path.c_str(), W_OK) == 0 ? 0 : errno;
 }
 
 // The toolkit reads its environment as the application is made.
@@ -31,6 +47,11 @@ const char* PrepareToolkit() {
 void AddPortfolioOptions(CLI::App& command, PortfolioOptions& options, const char* outputHelp) {
     command.add_option("PORTFOLIO", options.portfolio, "The portfolio's name")->required();
     command.add_option("-o,--output", options.output, outputHelp)->required()->type_name("FILE");
+}
+
+void AddPortfolioOrAll(CLI::App& command, std::string& portfolio, bool& all) {
+    CLI::Option* name = command.add_option("PORTFOLIO", portfolio, "The portfolio's name");
+    command.add_flag("--all", all, "All portfolios, with a column Portfolio")->excludes(name);
 }
 
 CLI::Option* AddHomeOption(CLI::App& command, std::string& home) {
@@ -84,9 +105,28 @@ std::unique_ptr<DATABASE> OpenInvestments(PortfolioOptions& options) {
     return OpenOrFail(folder, InvestmentFile, DataFileUse::Look);
 }
 
+int WriteOutputFile(const std::string& path, std::string_view bytes) {
+    const mode_t mask = umask(0);
+    umask(mask);
+    const std::string target = RealPath(path);
+    int error = WhyNotReplaced(target);
+    if (error == 0)
+        error = WriteWholeFile(target, target + ".part" + std::to_string(getpid()), bytes, 0666 & ~mask,
+                               ExistingFile::Replace);
+    return error == 0 ? 0 : Fail(path + " cannot be written: " + Reason(error));
+}
+
 int Fail(const std::string& sentence, int status) {
     std::cerr << "quorvan-cli: " << sentence << '\n';
     return status;
+}
+
+int WithOutput(const std::function<int(TextOutput&)>& work) {
+    // A reader that goes away shall not end the program in the middle of a change.
+    std::signal(SIGPIPE, SIG_IGN);
+    TextOutput output(STDOUT_FILENO);
+    const int status = work(output);
+    return FinishOutput(output, std::cerr, status);
 }
 
 OffscreenApplication::OffscreenApplication() : BApplication(PrepareToolkit()) {}

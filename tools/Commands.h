@@ -1,8 +1,10 @@
 #pragma once
 
 #include <filesystem>
+#include <functional>
 #include <memory>
 #include <string>
+#include <string_view>
 
 #include "platform/Application.h"
 #include "tools/TableWriter.h"
@@ -17,7 +19,11 @@ class Option;
 // parsing runs it and stores the process's exit status in `status`, which must live as long as the
 // application.
 void AddChartCommand(CLI::App& application, int& status);
+void AddCheckCommand(CLI::App& application, int& status);
 void AddDbCommand(CLI::App& application, int& status);
+void AddExportCommand(CLI::App& application, int& status);
+void AddImportCommand(CLI::App& application, int& status);
+void AddListCommand(CLI::App& application, int& status);
 void AddQuoteCommand(CLI::App& application, int& status);
 void AddReportCommand(CLI::App& application, int& status);
 void AddSetupCommand(CLI::App& application, int& status);
@@ -32,6 +38,8 @@ struct PortfolioOptions {
 
 // Adds PORTFOLIO and --output, of which `outputHelp` tells.
 void AddPortfolioOptions(CLI::App& command, PortfolioOptions& options, const char* outputHelp);
+// Adds PORTFOLIO and --all, which exclude each other.
+void AddPortfolioOrAll(CLI::App& command, std::string& portfolio, bool& all);
 // Adds --home; `home` stays empty when it is not given.
 CLI::Option* AddHomeOption(CLI::App& command, std::string& home);
 
@@ -53,6 +61,13 @@ CLI::Option* AddJsonOption(CLI::App& command, OutputFormat& format);
 // `options` gets the folder that is used and the portfolio's name as it is written there. Null, with one
 // sentence for the person, when a file cannot be read or there is no such portfolio.
 [[nodiscard]] std::unique_ptr<DATABASE> OpenInvestments(PortfolioOptions& options);
+
+// Writes a file that was asked for, whole or not at all, and returns an exit status. One that exists keeps
+// its permissions, and a link to it stays a link.
+int WriteOutputFile(const std::string& path, std::string_view bytes);
+
+// Lets `work` write to standard output, and returns its exit status or that of the writing.
+int WithOutput(const std::function<int(TextOutput&)>& work);
 
 // Writes the sentence for the person. Returns `status`.
 int Fail(const std::string& sentence, int status = 1);

@@ -128,7 +128,7 @@ void DataFileTool::Tell(const char* name, long number, const std::string& senten
 int DataFileTool::Finish(int status) {
     if (database_.Sync() != 0)
         status = FailAsEngine();
-    return FinishOutput(output_, errors_, status);
+    return status;
 }
 
 int DataFileTool::Info() {

@@ -65,8 +65,7 @@ class DataFileTool {
     // gives what an interrupted compaction left in the file's place its name first.
     int Check(bool repair);
 
-    // To be called last: waits until the changes are on the disk, and writes what is left of the output. A
-    // reader that has gone away is no failure; what else hinders the output makes `status` 1.
+    // To be called last: waits until the changes are on the disk. Returns `status`, or 1 when that failed.
     int Finish(int status);
 
   private:

@@ -1,11 +1,9 @@
 #include <CLI/CLI.hpp>
-#include <csignal>
 #include <functional>
 #include <iostream>
 #include <map>
 #include <memory>
 #include <string>
-#include <unistd.h>
 #include <vector>
 
 #include "tools/Commands.h"
@@ -97,11 +95,10 @@ CLI::App* DbCommand::Add(const char* name, const char* description, Action actio
     AddFormat(added);
     added->callback([added, options = options_, &status = status_, action = std::move(action)] {
         CollectSteps(*added, &options->selection);
-        // A reader that goes away shall not end the program in the middle of a change.
-        std::signal(SIGPIPE, SIG_IGN);
-        TextOutput output(STDOUT_FILENO);
-        DataFileTool tool(options->file, options->format, output, std::cerr);
-        status = tool.Finish(action(tool, *options));
+        status = WithOutput([&](TextOutput& output) {
+            DataFileTool tool(options->file, options->format, output, std::cerr);
+            return tool.Finish(action(tool, *options));
+        });
     });
     return added;
 }

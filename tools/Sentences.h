@@ -2,8 +2,10 @@
 
 #include <cstdint>
 #include <string>
+#include <string_view>
 
 #include "util/FolderLock.h"
+#include "util/Utf8.h"
 
 // Parts of the sentences that quorvan-cli says.
 
@@ -11,6 +13,13 @@ inline constexpr const char* ToolName = "quorvan-cli"; // as a folder's lock nam
 
 [[nodiscard]] inline std::string Counted(std::int64_t count, const char* thing) {
     return std::to_string(count) + " " + thing + (count == 1 ? "" : "s");
+}
+
+// A text of any bytes between quotation marks.
+[[nodiscard]] inline std::string Quoted(std::string_view text) {
+    std::string quoted = "'";
+    AppendEscaped(quoted, text);
+    return quoted + "'";
 }
 
 // What follows the folder's name when its lock was not given since somebody else has it; else empty.

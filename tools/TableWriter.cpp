@@ -31,11 +31,29 @@ void AppendShortest(std::string& out, float value) {
     out.append(&buffer[0], end);
 }
 
+void AppendCsv(std::string& out, std::string_view text) {
+    // Blanks at the ends are often dropped without quotation marks.
+    if (text.find_first_of("\",\r\n") == text.npos && text.find_first_of(" \t") != 0 &&
+        (text.empty() || text.find_last_of(" \t") != text.size() - 1)) {
+        out += text;
+        return;
+    }
+    out += '"';
+    for (const char each : text)
+        out.append(each == '"' ? 2 : 1, each);
+    out += '"';
+}
+
+bool IsNumber(const Cell& cell) {
+    return cell.kind == Cell::Kind::Figure || cell.kind == Cell::Kind::Number ||
+           cell.kind == Cell::Kind::Float;
+}
+
 } // namespace
 
 void TextOutput::Write(std::string_view text) {
     kept_ += text;
-    if (kept_.size() >= PieceSize)
+    if (descriptor_ >= 0 && kept_.size() >= PieceSize)
         Flush();
 }
 
@@ -104,6 +122,7 @@ class TableWriter::JsonLine {
     static Json ValueOf(const Cell& cell) {
         switch (cell.kind) {
         case Cell::Kind::Text:
+        case Cell::Kind::Figure:
             return cell.text;
         case Cell::Kind::Number:
             return cell.number;
@@ -132,13 +151,17 @@ TableWriter::TableWriter(OutputFormat format, const std::vector<std::string>& na
 
 TableWriter::~TableWriter() = default;
 
-// The cell's text in a table or in tab-separated text.
+// The cell's text, save in JSON.
 void TableWriter::Render(const Cell& cell) {
     char buffer[64];
     field_.clear();
     switch (cell.kind) {
     case Cell::Kind::Text:
-        AppendEscaped(field_, cell.text);
+    case Cell::Kind::Figure:
+        if (format_ == OutputFormat::Csv)
+            AppendCsv(field_, cell.text);
+        else
+            AppendEscaped(field_, cell.text);
         break;
     case Cell::Kind::Number:
         field_.append(buffer, std::to_chars(buffer, std::end(buffer), cell.number).ptr);
@@ -161,7 +184,7 @@ void TableWriter::Measure(std::span<const Cell> row) {
     for (std::size_t i = 0; format_ == OutputFormat::Table && i < row.size(); ++i) {
         Render(row[i]);
         widths_[i] = std::max(widths_[i], DisplayWidth(field_));
-        right_[i] = row[i].kind == Cell::Kind::Number || row[i].kind == Cell::Kind::Float;
+        right_[i] = IsNumber(row[i]);
     }
 }
 
@@ -172,7 +195,11 @@ void TableWriter::WriteHeading() {
         AppendAligned(i, right_[i], i + 1 == names_.size());
     }
     if (format_ != OutputFormat::Json)
-        output_.Write(line_ += '\n');
+        WriteLine();
+}
+
+void TableWriter::WriteLine() {
+    output_.Write(line_ += format_ == OutputFormat::Csv ? "\r\n" : "\n");
 }
 
 void TableWriter::WriteRow(std::span<const Cell> row) {
@@ -183,17 +210,17 @@ void TableWriter::WriteRow(std::span<const Cell> row) {
     line_.clear();
     for (std::size_t i = 0; i < row.size(); ++i) {
         Render(row[i]);
-        const bool number = row[i].kind == Cell::Kind::Number || row[i].kind == Cell::Kind::Float;
-        AppendAligned(i, number, i + 1 == row.size());
+        AppendAligned(i, IsNumber(row[i]), i + 1 == row.size());
     }
-    output_.Write(line_ += '\n');
+    WriteLine();
 }
 
 // Appends the text of the cell at hand, and what separates it from the next.
 void TableWriter::AppendAligned(std::size_t column, bool toTheRight, bool last) {
-    if (format_ == OutputFormat::Tsv) {
+    if (format_ != OutputFormat::Table) {
         line_ += field_;
-        line_ += last ? "" : "\t";
+        if (!last)
+            line_ += format_ == OutputFormat::Csv ? ',' : '\t';
         return;
     }
     const std::size_t width = DisplayWidth(field_);

@@ -9,11 +9,12 @@
 #include <string_view>
 #include <vector>
 
-// Text for an open file descriptor, kept back and written in large pieces. The first failure ends it: what
-// comes later is dropped, and the owner asks for the failure when it is done. It neither opens nor closes the
-// descriptor. Used on one thread.
+// Text for an open file descriptor, kept back and written in large pieces, or without one kept as a whole.
+// The first failure ends it: what comes later is dropped, and the owner asks for the failure when it is done.
+// It neither opens nor closes the descriptor. Used on one thread.
 class TextOutput {
   public:
+    TextOutput() = default;
     explicit TextOutput(int descriptor) : descriptor_(descriptor) {}
     TextOutput(const TextOutput&) = delete;
     TextOutput& operator=(const TextOutput&) = delete;
@@ -23,9 +24,11 @@ class TextOutput {
     int Flush();
     // False once writing has failed: there is no use in going on.
     [[nodiscard]] bool IsWorking() const { return error_ == 0; }
+    // What is kept so far.
+    [[nodiscard]] const std::string& Kept() const { return kept_; }
 
   private:
-    int descriptor_;
+    int descriptor_ = -1;
     int error_ = 0;
     std::string kept_;
 };
@@ -37,6 +40,7 @@ int FinishOutput(TextOutput& output, std::ostream& errors, int status);
 enum class OutputFormat {
     Table, // aligned with blanks, under a heading line
     Tsv,   // separated by tabs, under a heading line; texts as AppendEscaped writes them
+    Csv,   // as spreadsheets read it (RFC 4180): texts as they are, in quotation marks where they need them
     Json,  // an object on a line of its own for each row
 };
 
@@ -45,6 +49,7 @@ struct Cell {
     enum class Kind {
         Nothing, // empty; null in JSON
         Text,    // bytes; what is no valid UTF-8 becomes U+FFFD in JSON
+        Figure,  // the text of a number
         Number,
         Float, // as short as it can be read back exactly; in a table with so many decimals
         Truth, // yes or no; true or false in JSON
@@ -67,8 +72,8 @@ struct Cell {
     return {Cell::Kind::Number, {}, number};
 }
 
-// Writes rows of cells as a table, as tab-separated text or as JSON lines. It keeps no row: for a table, all
-// rows are to be measured before the first is written, and those not measured stand out of line.
+// Writes rows of cells as a table, as tab- or comma-separated text or as JSON lines. It keeps no row: for a
+// table, all rows are to be measured before the first is written, and those not measured stand out of line.
 class TableWriter {
   public:
     // `output` must outlive the writer. Names that occur twice get a number in JSON ("Name_2").
@@ -85,6 +90,7 @@ class TableWriter {
     class JsonLine;
     void AppendAligned(std::size_t column, bool toTheRight, bool last);
     void Render(const Cell& cell);
+    void WriteLine();
 
     OutputFormat format_;
     std::vector<std::string> names_;

@@ -18,13 +18,6 @@ std::size_t DataSize(std::span<const COLUMN_ENTRY> columns) {
     return static_cast<std::size_t>(size);
 }
 
-// A text of any bytes between quotation marks.
-std::string Quoted(std::string_view text) {
-    std::string quoted = "'";
-    AppendEscaped(quoted, text);
-    return quoted + "'";
-}
-
 } // namespace
 
 TextCheck::TextCheck(std::span<const COLUMN_ENTRY> columns, const TextFormat& format,

@@ -77,7 +77,7 @@ std::unique_ptr<DATABASE> ToolFolder::Open(const DataFileKind& file, DataFileUse
 }
 
 std::string ToolFolder::FindPortfolio(DATABASE& portfolios, std::string& name, Letters letters) const {
-    const long count = SelectPortfolios(portfolios, name.c_str());
+    const long count = CanBePortfolioName(name.c_str()) ? SelectPortfolios(portfolios, name.c_str()) : 0;
     const void* found = count > 0 ? portfolios.QueryGetFirst(nullptr) : nullptr;
     if (!found)
         return count == 0 ? "there is no portfolio \"" + name + "\" in " + folder_

@@ -53,19 +53,6 @@ bool DeleteAll(DATABASE& database, const std::vector<long>& numbers) {
     return all;
 }
 
-// Appends the text that every record begins with, in the order of the file.
-bool CollectNames(DATABASE& database, std::vector<std::string>* names) {
-    return ForEachSelected(
-        database, database.Query(nullptr, QueryMode::New),
-        [&](const void* data, long) {
-            char name[NameSize];
-            std::memcpy(name, data, sizeof name);
-            // Most often the next investment is of the same portfolio.
-            if (names->empty() || names->back() != FieldText(name))
-                names->emplace_back(FieldText(name));
-        });
-}
-
 } // namespace
 
 bool HoldsPortfolios(DATABASE& database) {
@@ -104,6 +91,18 @@ std::optional<float> TotalValue(DATABASE& investments, const char* portfolio) {
     return read ? std::optional(total) : std::nullopt;
 }
 
+bool CollectPortfolios(DATABASE& file, std::vector<std::string>* names) {
+    return ForEachSelected(
+        file, file.Query(nullptr, QueryMode::New),
+        [&](const void* data, long) {
+            char name[NameSize];
+            std::memcpy(name, data, sizeof name);
+            // Most often the next investment is of the same portfolio.
+            if (names->empty() || names->back() != FieldText(name))
+                names->emplace_back(FieldText(name));
+        });
+}
+
 bool AddPortfolio(DATABASE& portfolios, const char* name) {
     if (!CanBePortfolioName(name) || SelectPortfolios(portfolios, name) != 0)
         return false;
@@ -115,7 +114,7 @@ bool AddPortfolio(DATABASE& portfolios, const char* name) {
 std::vector<std::string> RestorePortfolios(DATABASE& portfolios, DATABASE& investments) {
     std::vector<std::string> names;
     std::vector<std::string> holders;
-    if (!CollectNames(portfolios, &names) || !CollectNames(investments, &holders))
+    if (!CollectPortfolios(portfolios, &names) || !CollectPortfolios(investments, &holders))
         return {};
     std::unordered_set<std::string> listed;
     for (const std::string& name : names)

@@ -47,20 +47,24 @@ template <class Visit>
     return visited == selected;
 }
 
-// Calls visit(const INVESTMENT_DATA&, long recordNumber) for each of the portfolio's investments in record
-// order. visit must not change the database. The result set is left on the portfolio. False when they could
-// not all be read.
+// Calls visit(const INVESTMENT_DATA&, long recordNumber) for each record of a result set of `selected`
+// investments, as ForEachSelected does.
 template <class Visit>
-[[nodiscard]] bool ForEachInvestment(DATABASE& investments, const char* portfolio, Visit visit) {
+[[nodiscard]] bool ForEachInvestment(DATABASE& investments, long selected, Visit visit) {
     DATABASE_HEADER header;
     investments.GetHeaderInfo(&header);
     INVESTMENT_DATA record{};
     const auto length = std::min(static_cast<std::size_t>(header.recordLength - 1), sizeof record);
-    return ForEachSelected(investments, SelectInvestments(investments, portfolio),
-                           [&](const void* data, long number) {
-                               std::memcpy(&record, data, length);
-                               visit(record, number);
-                           });
+    return ForEachSelected(investments, selected, [&](const void* data, long number) {
+        std::memcpy(&record, data, length);
+        visit(record, number);
+    });
+}
+
+// The same for each of the portfolio's investments in record order. The result set is left on the portfolio.
+template <class Visit>
+[[nodiscard]] bool ForEachInvestment(DATABASE& investments, const char* portfolio, Visit visit) {
+    return ForEachInvestment(investments, SelectInvestments(investments, portfolio), visit);
 }
 
 // Reads a record into a zeroed struct; false when it cannot be read.
@@ -83,6 +87,10 @@ template <class Visit>
             visit(std::string(FieldText(record.Entry)).c_str());
         });
 }
+
+// Appends the portfolios' names as they stand in the records of portfol.db or invest.db, in the order of the
+// file; repeated ones that follow each other once. False when not all could be read.
+[[nodiscard]] bool CollectPortfolios(DATABASE& file, std::vector<std::string>* names);
 
 // Whether a record and a query can hold the name: 1 to 31 bytes without a tab or line end.
 [[nodiscard]] bool CanBePortfolioName(const char* name);

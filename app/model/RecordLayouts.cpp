@@ -20,11 +20,22 @@ constexpr COLUMN_ENTRY Float(std::string_view name, int decimals) {
     return column;
 }
 
+// Each where the engine will place it: columns follow each other without gaps.
+template <std::size_t Count>
+constexpr std::array<COLUMN_ENTRY, Count> Placed(std::array<COLUMN_ENTRY, Count> columns) {
+    int offset = 0;
+    for (COLUMN_ENTRY& column : columns) {
+        column.offset = static_cast<std::int16_t>(offset);
+        offset += column.size;
+    }
+    return columns;
+}
+
 } // namespace
 
 constexpr std::array<COLUMN_ENTRY, 1> PortfolioColumns = {Column("Name", ColumnType::String, NameSize)};
 
-constexpr std::array<COLUMN_ENTRY, 13> InvestmentColumns = {
+constexpr std::array<COLUMN_ENTRY, 13> InvestmentColumns = Placed<13>({
     Column("Portfolio", ColumnType::String, NameSize),
     Column("Name", ColumnType::String, NameSize),
     Column("Ticker", ColumnType::String, TickerSize),
@@ -39,25 +50,22 @@ constexpr std::array<COLUMN_ENTRY, 13> InvestmentColumns = {
     Column("Agent", ColumnType::String, NameSize),
     Column("Risk", ColumnType::String, RiskSize),
     Column("QuoteError", ColumnType::Byte, 1),
-};
+});
 
-constexpr std::array<COLUMN_ENTRY, 2> CategoryColumns = {
+constexpr std::array<COLUMN_ENTRY, 2> CategoryColumns = Placed<2>({
     Column("Category", ColumnType::String, NameSize),
     Column("Entry", ColumnType::String, NameSize),
-};
+});
 
 namespace {
 
-// Where the engine will place the column: columns follow each other without gaps.
+// Without such a column, where they all end.
 template <std::size_t Count>
 constexpr std::size_t OffsetOf(const std::array<COLUMN_ENTRY, Count>& columns, std::string_view name) {
-    std::size_t offset = 0;
-    for (const COLUMN_ENTRY& column : columns) {
+    for (const COLUMN_ENTRY& column : columns)
         if (std::string_view(column.name) == name)
-            return offset;
-        offset += static_cast<std::size_t>(column.size);
-    }
-    return offset;
+            return static_cast<std::size_t>(column.offset);
+    return static_cast<std::size_t>(columns.back().offset + columns.back().size);
 }
 
 static_assert(std::endian::native == std::endian::little, "records are written as they lie in memory");

@@ -35,7 +35,7 @@ struct [[gnu::packed]] INVESTMENT_DATA {
     float PrevPrice; // the price before the last one found; NoPreviousPrice when none was found yet
     float Value;     // Shares * Price, in single precision
     char Agent[NameSize];
-    char Risk[RiskSize];    // "Low", "Med" or "High"
+    char Risk[RiskSize];    // one of RiskNames
     std::int8_t QuoteError; // 1: the last look-up found no price
     char Unused[208];       // zero; no column covers it
 };
@@ -48,7 +48,10 @@ struct CATEGORY_DATA {
     char Entry[NameSize];
 };
 
-// The columns that the files are created with, in the order of the fields.
+// What Risk can be.
+inline constexpr std::array<const char*, 3> RiskNames = {"Low", "Med", "High"};
+
+// The columns that the files are created with, in the order of the fields and with their offsets.
 extern const std::array<COLUMN_ENTRY, 1> PortfolioColumns;
 extern const std::array<COLUMN_ENTRY, 13> InvestmentColumns;
 extern const std::array<COLUMN_ENTRY, 2> CategoryColumns;
