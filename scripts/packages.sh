@@ -2,7 +2,7 @@
 # Sourced by the other scripts: which Debian packages the work needs, and how they get there.
 
 # To build the program.
-build_packages=(g++ cmake ninja-build qt6-base-dev qt6-svg-dev libgl-dev libcli11-dev libcurl4-openssl-dev nlohmann-json3-dev)
+build_packages=(g++ cmake ninja-build qt6-base-dev qt6-svg-dev libgl-dev libcli11-dev libcurl4-openssl-dev nlohmann-json3-dev libcsv-dev)
 # To show it, with letters, and to trust quote servers.
 run_packages=(fonts-dejavu-core ca-certificates)
 # To show it on a virtual display and take pictures.

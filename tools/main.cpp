@@ -13,6 +13,10 @@ int Run(int argc, char** argv) {
     application.set_version_flag("--version", "quorvan-cli " QUORVAN_VERSION);
     application.require_subcommand(1);
     int status = 0;
+    AddListCommand(application, status);
+    AddExportCommand(application, status);
+    AddImportCommand(application, status);
+    AddCheckCommand(application, status);
     AddDbCommand(application, status);
     AddSetupCommand(application, status);
     AddQuoteCommand(application, status);

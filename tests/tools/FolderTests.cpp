@@ -1,0 +1,314 @@
+// quorvan-cli list, export, import and check.
+#include <sstream>
+#include <unistd.h>
+
+#include "CommandTest.h"
+#include "DataFolder.h"
+#include "InChild.h"
+#include "app/model/PortfolioRules.h"
+#include "db/FaultyFiles.h"
+#include "tools/CsvImport.h"
+#include "tools/CsvReader.h"
+
+namespace {
+
+TEST(CsvReader, DividesTextIntoFields) {
+    const std::string marks = "its quotation marks do not fit";
+    const std::tuple<std::string, char, std::string, std::string> cases[] = {
+        // a text, the delimiter, its rows with their lines, what is wrong with the rest
+        {"\uFEFF", ',', "", ""},
+        {"\uFEFFa,b\r\nc,d", ',', "1<a><b>2<c><d>", ""},
+        {"a;b,c;\n;;\n", ';', "1<a><b,c><>2<><><>", ""},
+        {"a\tb\n\t\n \n\n  c \t\" d \"\n", '\t', "1<a><b>2<><>5<c>< d >", ""},
+        {"\"a,\"\"b\"\"\",\"c\r\nd\n\",e\r\nf\n", ',', "1<a,\"b\"><c\r\nd\n><e>4<f>", ""},
+        {"a\rb\r\r\nc", ',', "1<a>2<b>4<c>", ""},
+        {"a\n\"b\n\nc\n", ',', "1<a>", "line 2: " + marks},
+        {"a\nb\n\"c\" d,e\nf", ',', "1<a>2<b>", "line 3: " + marks},
+        {"a,6\" pipe\nf", ',', "", "line 1: " + marks},
+        {std::string("a\0b\xFF", 4), ',', std::string("1<a\0b\xFF>", 7), ""},
+    };
+    for (const auto& [text, delimiter, rows, wrong] : cases) {
+        std::string found;
+        const auto take = [&found](long line, const std::vector<std::string>& fields) {
+            found += std::to_string(line);
+            for (const std::string& field : fields)
+                found += "<" + field + ">";
+        };
+        const std::string why = ReadCsv(text, delimiter, take);
+        EXPECT_EQ(found, rows);
+        EXPECT_TRUE(why.starts_with(wrong) && why.empty() == wrong.empty()) << text << ": " << why;
+    }
+}
+
+TEST(CsvReader, NumbersAreUnderstoodOrRefused) {
+    // The decimal mark or ? for none said, the text, and what it means; nothing for no number.
+    std::istringstream cases(
+        "?12.5=12.5|?1.234=1.234|?1,234,567=1234567|?-1,234.5=-1234.5|?+.5e-3=+.5e-3|.1,234=1234|,1.234=1234|"
+        ",1.234.567,25=1234567.25|,0,25=0.25|?1 234 567=1234567|?1'234.5=1234.5|,1\u00A0234,5=1234.5|"
+        "?1\u202F234=1234|?1\u2019234=1234|?44,50=|?0,234=|?1,23,456=|?1,234 567=|?1234,567=|,12.5=|?,5=|"
+        "?$5=|?12 3/8=|?1,2345=|?5-=|?1.2.3=");
+    for (std::string each; std::getline(cases, each, '|');) {
+        const std::size_t end = each.find('=');
+        const PlainNumber number = ReadPlainNumber(each.substr(1, end - 1), each[0] == '?' ? '\0' : each[0]);
+        EXPECT_EQ(number.text, each.substr(end + 1)) << each;
+        EXPECT_EQ(number.wrong, end + 1 == each.size() ? "is no number" : "") << each;
+    }
+    EXPECT_TRUE(ReadPlainNumber("1,234", 0).wrong.starts_with("may be a whole number or a broken one"));
+}
+
+class FolderTest : public CommandTest {
+  protected:
+    FolderTest() {
+        for (const char* portfolio : {"Growth", "Tab\x1b"})
+            home_.AddPortfolio(portfolio);
+        Add("Growth", "Zinc", 1000, 1.5F, {1, 2, 2024}, "Med", "AAA");
+        Add("Growth", "acorn", 9, 100, {2, 1, 2024});
+        Add("growth", "Birch", 80, 12.375F, {3, 12, 1999});
+    }
+    void Add(const char* portfolio, const char* name, float shares, float price, dbDATE date,
+             const char* risk = "Med", const char* ticker = "BBB") {
+        INVESTMENT_DATA record = MakeInvestment(portfolio, name, shares, price, "Stock");
+        CopyTextZeroed(record.Risk, risk);
+        CopyTextZeroed(record.Ticker, ticker);
+        record.Date = date;
+        record.PrevPrice = 8;
+        record.QuoteError = record.Retire = 1;
+        record.Value += static_cast<float>(record.Name[0] == '!'); // a wrong one
+        home_.AddInvestment(record);
+    }
+    std::string In(const std::string& command) const {
+        return "quorvan-cli " + command + " --home '" + home_.Path() + "'";
+    }
+    // What it says, with one blank for many, and its status.
+    std::string Of(const std::string& command, const std::string& pipe = "cat") {
+        return Printed("{ " + In(command) + "; echo $?; } | tr -s ' ' | " + pipe);
+    }
+
+    DataFolder home_;
+};
+
+TEST_F(FolderTest, WhatIsExportedComesBackTheSame) {
+    home_.AddPortfolio("A, \"b\"");
+    float amount = 1e-30F;
+    for (const char* name : {"\"", "a,b;c", " blank ", "line\r\nend", "\xC3\xA4\xE2\x82\xAC", "=1+1"}) {
+        home_.AddInvestment(MakeInvestment("A, \"b\"", name, amount, -1 / amount, ""));
+        amount *= 4.7e8F;
+    }
+    ASSERT_TRUE(
+        Works(Setup() + "; " + In("export --all -o a.csv") + "; " + In("export --all") + " | cmp - a.csv"));
+    ASSERT_TRUE(
+        Works("quorvan-cli import --home home --all a.csv --create",
+              "9 investments added, new portfolio Growth, new portfolio Tab\\x1B, new portfolio A, "));
+    for (const std::string file : {"invest.db", "portfol.db"}) // from behind the description on
+        EXPECT_TRUE(folder_.Read("home/" + file).substr(36) == home_.Read(file).substr(36));
+    // One portfolio, its name and the table's written otherwise.
+    ASSERT_TRUE(
+        Works("to() { sed '1s/Shares/Quantity/' | tr , '\\t' >t; quorvan-cli import --home home Other t "
+              "--create --delimiter tab --column Shares=quantity; }; " +
+              In("export Growth") + " | to"));
+    EXPECT_EQ(Printed("quorvan-cli export Other --home home"), Printed(In("export Growth")));
+    EXPECT_TRUE(
+        Works(In("export Growth --json"), R"("Retire":true,"Risk":"Med","Agent":"Bank","PrevPrice":8.0,)"));
+}
+
+TEST_F(FolderTest, SetsWhatTheWindowWouldSet) {
+    folder_.Write("t.csv",
+                  "Ticker;Anteile;Kurs;Name;Note;Date\nccc;1.234,5;2;New;x;\naaa;;3;;y;2020-01-02\n;;;;;\n");
+    const std::string read = " t.csv --delimiter ';' --decimal , --column Shares=Anteile --column Price=Kurs "
+                             "--update-by ticker";
+    const std::string before = State(home_.Path());
+    EXPECT_TRUE(
+        Works(In("import Growth --dry-run --json" + read), R"({"Line":2,"Action":"add","Portfolio":)"));
+    EXPECT_TRUE(folder_.Says(R"({"Line":3,"Action":"change","Portfolio":"Growth","Name":"Zinc")"));
+    EXPECT_EQ(State(home_.Path()), before);
+    ASSERT_TRUE(Works(In("import Growth" + read), "1 investment added, 1 changed\n"));
+    EXPECT_TRUE(folder_.Complains("t.csv: nothing is taken of 'Note'\n"));
+    const std::string today = Printed("date +%F | tr -d '\\n'");
+    EXPECT_EQ(Printed(In("export Growth")),
+              "Name,Ticker,Type,Shares,Price,Value,Date,Retire,Risk,Agent,PrevPrice,QuoteError\r\n"
+              "Zinc,aaa,Stock,1000,3,3000,2020-01-02,yes,Med,Bank,8,1\r\n"
+              "acorn,BBB,Stock,9,100,900,2024-01-02,yes,Med,Bank,8,1\r\n"
+              "Birch,BBB,Stock,80,12.375,990,1999-12-03,yes,Med,Bank,8,1\r\nNew,ccc,,1234.5,2,2469," +
+                  today + ",no,Med,,-1,0\r\n");
+    EXPECT_TRUE(home_.Has("backups"));
+}
+
+TEST_F(FolderTest, NamesEveryWrongLineAndChangesNothing) {
+    const std::string whole = "is no whole number from -128 to 127";
+    const std::string name = "1: the heading has no column 'Name'; is there another ";
+    const std::string x(32, 'x');
+    const std::tuple<std::string, std::string, std::vector<std::string>> cases[] = {
+        // the arguments, the table, each thing that is wrong
+        {"Growth t.csv",
+         "Name,Risk,Date\nA,mid,\nA,,0000-00-00\nB,hIgH\n" + x + ",,\n,LOW,\n",
+         {"2: Risk: 'mid' is none of Low, Med and High", "4: 2 fields, the heading has 3",
+          "3: Date: '0000-00-00' is no date of the form YYYY-MM-DD", "6: Name: there is none",
+          "5: Name: '" + x + "' is too long: 32 bytes, and the column holds 31"}},
+        {"Growth t.csv --column Shares=Sum",
+         "Name,Sum,Price,Retire\nA,x,\"1,234\",200\nB,3e38,9,\n\xFF,,,maybe\n",
+         {"2: Shares ('Sum'): 'x' is no number", "2: Price: '1,234' may be a whole number or a broken one: ",
+          "2: Retire: '200' " + whole, "3: Value: shares times price is too large a number",
+          "4: Name: '\\xFF' is no UTF-8", "4: Retire: 'maybe' " + whole}},
+        {"Growth t.csv", "Name;Price\nA;1\n", {name + "--delimiter?"}},
+        {"Growth t.csv --column Type=Kind",
+         "Ticker,Price,price\n",
+         {"1: the heading names Price twice", name + "name for --column Name=NAME?",
+          "1: the heading has no column 'Kind'"}},
+        {"Growth t.csv", "", {"1: there is no heading that names the columns"}},
+        {"Growth t.csv",
+         "Name,Portfolio\nA,Growth\nB,Income\n",
+         {"3: Portfolio: 'Income' is another one; --all imports each line into its own"}},
+        {"--all t.csv",
+         "Name,Portfolio\nA,Income\nB,\nC,Income\n",
+         {"2: Portfolio: there is no portfolio 'Income'; --create", "3: Portfolio: the line names none"}},
+        {"Growth t.csv --update-by ticker",
+         "Ticker,Price\nAAA,1\nBBB,1\nNEW,1\n,1\naaa,2\n",
+         {"3: Ticker: 'BBB' is that of 2 investments", "4: Name: there is none",
+          "5: Ticker: '' is empty, and tells the investment", "6: Ticker: 'aaa' stands in line 2 already"}},
+    };
+    const std::string before = State(home_.Path());
+    for (const auto& [arguments, table, wrong] : cases) {
+        folder_.Write("t.csv", table);
+        EXPECT_EQ(folder_.Run(In("import " + arguments)), 1) << arguments;
+        EXPECT_EQ(std::count(folder_.Errors().begin(), folder_.Errors().end(), '\n'), std::ssize(wrong));
+        for (const std::string& each : wrong)
+            EXPECT_TRUE(folder_.Complains("quorvan-cli: t.csv, line " + each));
+    }
+    EXPECT_EQ(State(home_.Path()), before);
+}
+
+// A row changed, one added, and a portfolio made.
+TEST_F(FolderTest, IsOneStepWhateverFails) {
+    using Texts = std::vector<std::string>;
+    const auto found = [](const DataFolder& home) {
+        DATABASE portfolios(home.File("portfol.db").c_str());
+        DATABASE investments(home.File("invest.db").c_str());
+        static_cast<void>(RestorePortfolios(portfolios, investments)); // as the program's start does
+        return std::pair(home.Portfolios(), home.Investments());
+    };
+    const std::pair<Texts, Texts> old = {{"Growth"}, {"Growth/Firm"}};
+    const std::pair<Texts, Texts> changed = {{"Growth", "New"}, {"Growth/Renamed", "New/n"}};
+    const auto run = [](const DataFolder& home, Fault fault, int at) {
+        FaultyFiles files;
+        DATABASE portfolios(home.File("portfol.db").c_str());
+        DATABASE investments(home.File("invest.db").c_str());
+        ImportOptions options;
+        options.create = options.updateByTicker = true;
+        CsvImport import(options, portfolios, investments);
+        EXPECT_EQ(import.Read("Portfolio,Ticker,Name\nGrowth,tick,Renamed\nNew,nn,n\n", [](long) {}), "");
+        files.Arm(fault, at);
+        const int failed = import.Write(ToolFolder(home.Path()), files).empty() ? 0 : 1;
+        return files.Disarm() ? failed : 200;
+    };
+    for (const Fault fault : {Fault::KilledBefore, Fault::KilledAfter, Fault::Error, Fault::HalfThenError}) {
+        int result = 0;
+        for (int at = 0; result != 200; ++at) {
+            SCOPED_TRACE(std::to_string(static_cast<int>(fault)) + " at call " + std::to_string(at));
+            ASSERT_LT(at, 100);
+            const DataFolder home;
+            home.AddPortfolio("Growth");
+            home.AddInvestment(MakeInvestment("Growth", "Firm"));
+            const Texts files = home.Names();
+            result = ResultInChild([&] { return run(home, fault, at); });
+            const bool made = found(home) == changed;
+            EXPECT_TRUE(made || (found(home) == old && std::abs(result) == 1));
+            EXPECT_TRUE(result == -1 || home.Names() == files) << "no part is left";
+            EXPECT_TRUE(made || (run(home, fault, 1000) == 200 && found(home) == changed)) << "once more";
+        }
+    }
+}
+
+TEST_F(FolderTest, ListsAsTheWindowDoes) {
+    EXPECT_EQ(Of("list"),
+              "Portfolio Investments Value\nGrowth 3 3390.00\nTab\\x1B 0 0.00\nTotal 3 3390.00\n0\n");
+    EXPECT_EQ(Of("list --json", "sed -n 2,3p"), R"({"Portfolio":"Tab\u001b","Investments":0,"Value":0.0})"
+                                                "\n"
+                                                R"({"Portfolio":null,"Investments":3,"Value":3390.0})"
+                                                "\n");
+    EXPECT_EQ(Of("list Growth --sort date --reverse"),
+              "Status Name Ticker Type Shares Price Value Date Retire Risk Agent\n"
+              "not found Zinc AAA Stock 1000.000 1 1/2 1500.00 02-01-2024 yes Med Bank\n"
+              "not found acorn BBB Stock 9.000 100 900.00 01-02-2024 yes Med Bank\n"
+              "not found Birch BBB Stock 80.000 12 3/8 990.00 12-03-1999 yes Med Bank\n"
+              "Total Value: $3390.00\n0\n");
+    EXPECT_EQ(Of("list Growth --json --sort value", "cut -sd'\"' -f8 | tr '\\n' ' '"), "acorn Birch Zinc ");
+}
+
+TEST_F(FolderTest, ChecksTheFolderAsAWhole) {
+    EXPECT_EQ(Of("check"), "nothing is wrong\n0\n");
+    Add("Lost", "!worth", 2, 10, {1, 1, 2020});
+    Add("lost", "risky", 2, 10, {}, "mid");
+    Add("Growth", "Future", 1, 1, {1, 1, 9999});
+    Add("Growth", "Never", 1, 1, {30, 2, 2024});
+    home_.Write("portfol.db", home_.Read("portfol.db").replace(40, 1, "\x01")); // one counts as deleted
+    const std::string left =
+        "problem invest.db 4 Risk is 'mid', which no chart counts, and none of Low, Med and High\n"
+        "problem invest.db 4 there is no Date\n"
+        "problem invest.db 5 Date is 9999-1-1, which lies ahead\n"
+        "problem invest.db 6 Date is 2024-2-30, which is none\n";
+    const std::string heading = "kind file offset record finding\n";
+    const auto expected = [&](const std::string& kind) {
+        return heading + kind + " portfol.db 40 the header counts 1 deleted, the status bytes 0\n" + kind +
+               " invest.db 3 Value is 21, and Shares times Price 20\n" + left + kind +
+               " invest.db 3 2 investments from here on of 'Lost', which is no portfolio of the list\n1\n";
+    };
+    const std::string before = State(home_.Path());
+    EXPECT_EQ(Of("check"), expected("problem"));
+    EXPECT_EQ(State(home_.Path()), before);
+    EXPECT_EQ(Of("check --repair"), expected("mended"));
+    EXPECT_TRUE(home_.Has("backups") && home_.Portfolios().back() == "Lost");
+    const std::string mended = home_.Read("portfol.db") + home_.Read("invest.db");
+    EXPECT_EQ(Of("check --repair"), heading + left + "1\n") << "but for what is left";
+    EXPECT_EQ(home_.Read("portfol.db") + home_.Read("invest.db"), mended);
+    Printed("cd '" + home_.Path() + "'; mv invest.db invest.bak; rm misc.db");
+    Of("check");
+    EXPECT_TRUE(folder_.Says("invest.bak, as an interrupted compaction leaves it") &&
+                folder_.Says("misc.db cannot be opened: No such file or directory\n1\n"));
+    Of("check --repair");
+    EXPECT_TRUE(folder_.Says("mended invest.db the backup of an interrupted compaction") &&
+                home_.Has("invest.db"));
+}
+
+TEST_F(FolderTest, FailsInOneSentenceAndLeavesFilesAlone) {
+    Add("Lost", "one", 1, 1, {1, 1, 2020});
+    ASSERT_TRUE(Works("cp -r '" + home_.Path() +
+                      R"sh(' home; for each in held short bad read link; do cp -r home $each; done
+        printf 'Name\nA\n' >t.csv; mkdir dir
+        head -c 60 home/invest.db >short/invest.db; printf '\377' | dd of=bad/invest.db bs=1 seek=36 conv=notrunc 2>&-
+        mv link/invest.db elsewhere.db; chmod 640 elsewhere.db; ln -s ../elsewhere.db link/invest.db
+        cp "$(command -v quorvan-cli)" alone; chmod 555 read; chmod 444 read/*; chmod 755 .)sh"));
+    ASSERT_TRUE(Works("quorvan-cli import Growth t.csv --home link", "1 investment added\n"));
+    EXPECT_EQ(Printed("stat -c %A elsewhere.db link/invest.db; readlink link/invest.db"),
+              "-rw-r-----\nlrwxrwxrwx\n../elsewhere.db\n");
+    FolderLock lock;
+    ASSERT_EQ(lock.Take(folder_.File("held"), "quorvan"), FolderLock::Outcome::Taken);
+    const std::string before = State();
+    const std::string held = "in use by quorvan (process " + std::to_string(getpid()) + " on ";
+    const std::string run = "quorvan-cli ";
+    const std::string reader = getuid() == 0 ? "setpriv --reuid 65534 --clear-groups ./alone " : "./alone ";
+    const std::pair<std::string, std::string> cases[] = {
+        {run + "list --home nowhere", "nowhere/portfol.db cannot be opened: No such file or directory"},
+        {run + "list growth --home home", "there is no portfolio \"growth\" in home, but \"Growth\""},
+        {run + "list --home short", "short/invest.db cannot be opened: header and 13 columns need"},
+        {run + "list --home home >/dev/full", "the output cannot be written: No space left on device"},
+        {run + "export --all --home home -o dir", "dir cannot be written: Is a directory"},
+        {run + "import Growt t.csv --home home", "there is no portfolio 'Growt'; --create makes it"},
+        {run + "import growth t.csv --create --home home", "\"growth\" in home, but \"Growth\""},
+        {run + "import $(seq -s x 20) t.csv --create --home home", "can be no portfolio's name"},
+        {run + "import Lost t.csv --create --home home", "`quorvan-cli check --repair` lists it"},
+        {run + "import Growth t.csv --home held", held},
+        {run + "import Growth t.csv --home bad", "bad/invest.db is damaged: its header disagrees with it"},
+        {reader + "import Growth t.csv --home read", "programs cannot be kept out of the folder: read/"},
+        {run + "check --repair --home held", held},
+    };
+    for (const auto& [command, reason] : cases)
+        EXPECT_TRUE(folder_.Fails(command, 1, reason));
+    for (const std::string arguments :
+         {"list --sort Name", "list A --sort Status", "export", "export A --all", "import A", "import --all",
+          "import --all A t.csv", "import A t.csv --decimal x", "import A t.csv --delimiter ab",
+          "import A t.csv --column Amount=N", "import A t.csv --update-by name", "import A t.csv --json"})
+        EXPECT_EQ(folder_.Run("quorvan-cli " + arguments + " --home home"), 2) << arguments;
+    EXPECT_EQ(State(), before);
+}
+
+} // namespace
