@@ -9,6 +9,8 @@ run_packages=(fonts-dejavu-core ca-certificates)
 display_packages=(xvfb xauth xdotool x11-utils imagemagick poppler-utils)
 # To build and run the tests and the benchmarks.
 test_packages=(libgtest-dev libgmock-dev libbenchmark-dev libsqlite3-dev libssl-dev poppler-utils clang-format)
+# To make a Debian package.
+test_packages+=(dpkg-dev file)
 # To check what desktops and man read.
 test_packages+=(desktop-file-utils appstream librsvg2-bin libxml2-utils libglib2.0-bin man-db groff-base)
 # For scripts/tidy.sh.
