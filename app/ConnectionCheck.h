@@ -1,9 +1,7 @@
 #pragma once
 
 #include "platform/Rect.h"
-
-// What a look at the network, through a host that the person names for it, comes to.
-enum class Connection { Found, NotFound, Cancelled };
+#include "quotes/run/PriceRun.h"
 
 // Finds out whether the host's name resolves. The look-up has a thread of its own, since it can take long:
 // the windows stay painted meanwhile. Unless the answer is there in an instant, a dialog with its left top

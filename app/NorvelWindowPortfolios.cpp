@@ -166,11 +166,7 @@ bool NorvelWindow::FindConnection() {
     const Connection connection = CheckConnection(host, WindowCorner());
     if (connection == Connection::NotFound)
         TellNotConnected();
-    const char* result = connection == Connection::Found      ? "connection found ok"
-                         : connection == Connection::NotFound ? "no connection found!"
-                                                              : "cancelled";
-    PrintDebugStatement((std::string("Checked '") + host + "', " + result + "\n").c_str(),
-                        app_state->logPath);
+    LogConnection(host, connection, app_state->logPath);
     return connection == Connection::Found;
 }
 

@@ -38,6 +38,19 @@ class QuoteObserver {
     virtual void SourceAnswered(float /*result*/) {}
 };
 
+// Remembers whether the source asked last was one that cannot be trusted.
+class RefusalObserver : public QuoteObserver {
+  public:
+    void SourceTried(const QuoteSource& /*source*/) override { refusedHost_.clear(); }
+    void CertificateRefused(const char* host) override { refusedHost_ = host; }
+
+    // Whose certificate was refused; empty for nobody's.
+    [[nodiscard]] const std::string& RefusedHost() const { return refusedHost_; }
+
+  private:
+    std::string refusedHost_;
+};
+
 // Where a look-up, or a run of them, says what it does: the debug log, and the observer if there is one. A
 // local object, or a member, of whoever has something to say, and used on its thread.
 class QuoteReport {

@@ -27,6 +27,7 @@ void AddListCommand(CLI::App& application, int& status);
 void AddQuoteCommand(CLI::App& application, int& status);
 void AddReportCommand(CLI::App& application, int& status);
 void AddSetupCommand(CLI::App& application, int& status);
+void AddUpdateCommand(CLI::App& application, int& status);
 
 // What they share. Options must live as long as the application.
 

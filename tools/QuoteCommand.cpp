@@ -48,8 +48,8 @@ int RunQuote(const QuoteOptions& options) {
         const float price = options.source.empty()
                                 ? GetPriceQuote(ticker.c_str(), context)
                                 : GetPriceQuoteFrom(options.source, ticker.c_str(), context);
-        if (price == NoQuote && !trace.AskedAny())
-            std::cerr << "there is no source to ask\n";
+        if (trace.Why() == QuoteTrace::NoSource)
+            std::cerr << QuoteTrace::NoSource << '\n';
         char number[64];
         FormatFixed(static_cast<double>(price), number, sizeof number, 2);
         std::cout << ticker << '\t' << number << std::endl;

@@ -45,8 +45,14 @@ std::string Number(double value, int decimals) {
 
 } // namespace
 
+void QuoteTrace::TellWhy(const std::string& why) {
+    why_ = why;
+    output_ << "  " << why << '\n';
+}
+
 void QuoteTrace::SourceTried(const QuoteSource& source) {
-    askedAny_ = true;
+    RefusalObserver::SourceTried(source);
+    why_.clear();
     marker_ = source.tag;
     beginning_.clear();
     lastBytes_.clear();
@@ -73,7 +79,7 @@ void QuoteTrace::Connected(const char* server) {
 
 void QuoteTrace::Failed(const char* reason) {
     failed_ = true;
-    output_ << "  failed: " << Printable(reason) << '\n';
+    TellWhy("failed: " + Printable(reason));
 }
 
 void QuoteTrace::PieceReceived(std::string_view piece) {
@@ -103,13 +109,13 @@ void QuoteTrace::MarkerFound(std::string_view piece, std::size_t position) {
 void QuoteTrace::PriceRead(std::string_view token, std::string_view following, double price,
                            double fraction) {
     priceRead_ = true;
-    output_ << "  price text '" << Printable(token.substr(0, Around)) << "' read as " << Number(price, 4)
-            << '\n'
-            << "  behind it '" << Printable(following.substr(0, Around)) << "': "
-            << (fraction < 0    ? "a malformed fraction"
-                : fraction == 0 ? "no fraction"
-                                : "fraction " + Number(fraction, 4))
-            << '\n';
+    TellWhy("price text '" + Printable(token.substr(0, Around)) + "' read as " + Number(price, 4));
+    const std::string behind = "behind it '" + Printable(following.substr(0, Around)) + "': ";
+    if (fraction < 0)
+        TellWhy(behind + "a malformed fraction");
+    else
+        output_ << "  " << behind << (fraction == 0 ? "no fraction" : "fraction " + Number(fraction, 4))
+                << '\n';
     const bool isNumber = token.find_first_of("0123456789+-.") == 0;
     if (!isNumber && fraction > 0)
         output_ << "  careful: the price text is no number, and the price is only the fraction behind it; is "
@@ -126,18 +132,16 @@ void QuoteTrace::SourceAnswered(float result) {
     if (!priceRead_ && received_ > 0)
         TellWhatIsMissing();
     else if (received_ == 0 && connected_ && !failed_)
-        output_ << "  the server closed the connection without sending a byte of the page\n";
+        TellWhy("the server closed the connection without sending a byte of the page");
     output_ << (result > 0 ? "  price " : "  no price, ") << Number(static_cast<double>(result), 2) << '\n';
 }
 
 void QuoteTrace::TellWhatIsMissing() {
     if (markerFound_)
-        output_ << "  the page ended before the skip count was used up, or without a price text\n";
+        TellWhy("the page ended before the skip count was used up, or without a price text");
     else if (markerDivided_)
-        output_ << "  the marker arrived in two pieces, and is found only in one; it may be found another "
-                   "time\n";
+        TellWhy("the marker arrived in two pieces, and is found only in one; it may be found another time");
     else
-        output_ << "  marker not found in the " << received_
-                << " bytes received, which begin: " << Printable(beginning_)
-                << (received_ > beginning_.size() ? "..." : "") << '\n';
+        TellWhy("marker not found in the " + std::to_string(received_) + " bytes received, which begin: " +
+                Printable(beginning_) + (received_ > beginning_.size() ? "..." : ""));
 }

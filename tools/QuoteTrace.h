@@ -10,7 +10,7 @@
 // Writes down what a look-up of a price does and finds, line by line, for a person who wants to know why a
 // quote source works or does not. Page text is cut to what stands around the place in question, and all that
 // is not plain printable ASCII is written as an escape, so that no page can play with the terminal.
-class QuoteTrace : public QuoteObserver {
+class QuoteTrace : public RefusalObserver {
   public:
     explicit QuoteTrace(std::ostream& output) : output_(output) {}
 
@@ -25,15 +25,18 @@ class QuoteTrace : public QuoteObserver {
                    double fraction) override;
     void SourceAnswered(float result) override;
 
-    // Whether a source was asked so far.
-    [[nodiscard]] bool AskedAny() const { return askedAny_; }
+    static constexpr const char* NoSource = "there is no source to ask";
+    // Why there is no price: NoSource while none was asked, else what is known of the one asked last.
+    [[nodiscard]] const std::string& Why() const { return why_; }
 
   private:
+    // Writes a line that says why there is no price.
+    void TellWhy(const std::string& why);
     void TellWhatIsMissing();
     [[nodiscard]] bool CrossesPieces(std::string_view piece) const;
 
     std::ostream& output_;
-    bool askedAny_ = false;
+    std::string why_ = NoSource;
     // Of the source being asked:
     std::string marker_;
     std::string beginning_;    // of the page

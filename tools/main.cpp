@@ -20,6 +20,7 @@ int Run(int argc, char** argv) {
     AddDbCommand(application, status);
     AddSetupCommand(application, status);
     AddQuoteCommand(application, status);
+    AddUpdateCommand(application, status);
     AddReportCommand(application, status);
     AddChartCommand(application, status);
     try {

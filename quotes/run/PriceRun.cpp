@@ -5,19 +5,15 @@
 #include "app/model/PortfolioRules.h"
 #include "db/Database.h"
 #include "quotes/QuoteRetrieval.h"
+#include "util/File.h"
 #include "util/Strings.h"
 
-namespace {
-
-// Remembers whether the source asked last was one that cannot be trusted.
-struct RefusedCertificate : QuoteObserver {
-    void SourceTried(const QuoteSource& /*source*/) override { host.clear(); }
-    void CertificateRefused(const char* refused) override { host = refused; }
-
-    std::string host; // empty for none
-};
-
-} // namespace
+void LogConnection(const char* host, Connection connection, const char* logPath) {
+    const char* result = connection == Connection::Found      ? "connection found ok"
+                         : connection == Connection::NotFound ? "no connection found!"
+                                                              : "cancelled";
+    PrintDebugStatement((std::string("Checked '") + host + "', " + result + "\n").c_str(), logPath);
+}
 
 QuoteOutcome ApplyQuote(INVESTMENT_DATA& record, float quote) {
     const float value = quote * record.Shares;
@@ -74,14 +70,14 @@ bool PriceRun::Update(long recordNumber) {
 bool PriceRun::Ask(const std::string& ticker, PriceRunResult* result) {
     report_.Log("Checking price for '" + ticker + "'\n");
     observer_.Asking(ticker);
-    RefusedCertificate refused;
-    context_.observer = &refused;
+    RefusalObserver& watcher = observer_.Watcher();
+    context_.observer = &watcher;
     result->quote = GetPriceQuote(ticker.c_str(), context_);
     // Whatever a call that was cut short answers, it says nothing about the price.
     if (IsStopped(context_.stopFd))
         return false;
     report_.LogNumber("GetPriceQuote() returned ", result->quote);
     result->outcome = ApplyQuote(result->after, result->quote);
-    result->refusedHost = refused.host;
+    result->refusedHost = watcher.RefusedHost();
     return true;
 }

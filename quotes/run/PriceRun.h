@@ -9,6 +9,12 @@
 
 class DATABASE;
 
+// What a look at the network, through a host that the person names for it, comes to: before a run.
+enum class Connection { Found, NotFound, Cancelled };
+
+// Says so in the debug log.
+void LogConnection(const char* host, Connection connection, const char* logPath);
+
 // What came of the question for an investment's price.
 enum class QuoteOutcome {
     Priced,   // the record has a new price
@@ -43,8 +49,16 @@ class PriceRunObserver {
 
     // This ticker's price is about to be asked for.
     virtual void Asking(const std::string& ticker) = 0;
+    // Who is to be told of that look-up, one that was told of none yet: the observer's own until the next.
+    virtual RefusalObserver& Watcher() {
+        watcher_ = {};
+        return watcher_;
+    }
     // An investment is done with. Failed, NotRead and NotSaved end the run.
     virtual void Done(const PriceRunResult& result) = 0;
+
+  private:
+    RefusalObserver watcher_;
 };
 
 // Brings the prices of investments up to date, one after another: reads each record, asks for its price,

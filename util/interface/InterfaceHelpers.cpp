@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <cmath>
 #include <cstring>
-#include <string>
 
 #include "platform/Application.h"
 #include "platform/Font.h"
@@ -11,6 +10,7 @@
 #include "platform/View.h"
 #include "platform/Window.h"
 #include "util/CharacterBuffer.h"
+#include "util/FailureTexts.h"
 
 namespace {
 
@@ -31,25 +31,19 @@ bool YesNoBox(const char* text) {
 }
 
 void TellNotSaved() {
-    MessageBox("The change could not be saved! Is the disk full, or the file protected?", B_STOP_ALERT);
+    MessageBox(NotSavedText, B_STOP_ALERT);
 }
 
 void TellNotRead(const char* what) {
-    MessageBox((std::string(what) + " could not be read from its file!").c_str(), B_STOP_ALERT);
+    MessageBox(NotReadText(what).c_str(), B_STOP_ALERT);
 }
 
 void TellNotConnected() {
-    MessageBox("No Internet connection found!\nPlease establish your connection and try again.",
-               B_STOP_ALERT);
+    MessageBox(NotConnectedText, B_STOP_ALERT);
 }
 
 void TellNotTrusted(const char* host) {
-    MessageBox(
-        (std::string("The server ") + host +
-         " could not be trusted: its certificate was refused, and it was not asked for a price.\nIs the "
-         "name in Quorvan.cfg right, and the date of this computer?")
-            .c_str(),
-        B_STOP_ALERT);
+    MessageBox(NotTrustedText(host).c_str(), B_STOP_ALERT);
 }
 
 bool GetHomeDir(char (&out)[PathBufferSize]) {
