@@ -18,6 +18,7 @@ class Option;
 // The subcommands of quorvan-cli. Each function adds one to `application`. When the command line names it,
 // parsing runs it and stores the process's exit status in `status`, which must live as long as the
 // application.
+void AddBackupsCommand(CLI::App& application, int& status);
 void AddChartCommand(CLI::App& application, int& status);
 void AddCheckCommand(CLI::App& application, int& status);
 void AddDbCommand(CLI::App& application, int& status);

@@ -21,6 +21,7 @@ int Run(int argc, char** argv) {
     AddSetupCommand(application, status);
     AddQuoteCommand(application, status);
     AddUpdateCommand(application, status);
+    AddBackupsCommand(application, status);
     AddReportCommand(application, status);
     AddChartCommand(application, status);
     try {

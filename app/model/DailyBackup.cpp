@@ -15,19 +15,33 @@ namespace {
 
 constexpr const char* PartSuffix = "part";
 
+// Whether the text is like the pattern, in which a 0 stands for any digit.
+bool IsLike(std::string_view text, std::string_view pattern) {
+    return std::equal(
+        text.begin(), text.end(), pattern.begin(), pattern.end(),
+        [](char letter, char wanted) {
+            return wanted == '0' ? letter >= '0' && letter <= '9' : letter == wanted;
+        });
+}
+
 // Whether the text is a day such as "2026-11-22".
-bool IsDay(std::string_view text) {
-    constexpr std::string_view pattern = "0000-00-00";
-    if (text.size() != pattern.size())
-        return false;
-    for (std::size_t i = 0; i < pattern.size(); ++i) {
-        const bool digit = text[i] >= '0' && text[i] <= '9';
-        if (pattern[i] == '0' ? !digit : text[i] != pattern[i])
-            return false;
-    }
-    const std::string parts(text);
-    return CheckDate(std::atoi(parts.c_str()), std::atoi(parts.c_str() + 5), std::atoi(parts.c_str() + 8)) ==
-           0;
+bool IsDay(const std::string& text) {
+    return IsLike(text, "0000-00-00") &&
+           CheckDate(std::atoi(text.c_str()), std::atoi(text.c_str() + 5), std::atoi(text.c_str() + 8)) == 0;
+}
+
+// Whether the text is a day and time such as "2026-11-22-140307".
+bool IsMoment(const std::string& text) {
+    return IsLike(text, "0000-00-00-000000") && IsDay(text.substr(0, 10));
+}
+
+std::string MomentText(std::time_t now) {
+    std::tm parts{};
+    char text[32] = "";
+    return localtime_r(&now, &parts) != nullptr &&
+                   std::strftime(text, sizeof text, "%Y-%m-%d-%H%M%S", &parts) != 0
+               ? text
+               : "";
 }
 
 } // namespace
@@ -60,6 +74,20 @@ DailyBackup::~DailyBackup() {
 std::string DailyBackup::Kept(const std::string& file, const std::string& suffix) {
     const std::filesystem::path path(file);
     return (path.parent_path() / FolderName / path.filename()).string() + "." + suffix;
+}
+
+std::vector<std::pair<std::string, std::string>> DailyBackup::KeptIn(const std::string& folder) {
+    std::vector<std::pair<std::string, std::string>> kept;
+    std::error_code error;
+    std::filesystem::directory_iterator entry(std::filesystem::path(folder) / FolderName, error);
+    for (; !error && entry != std::filesystem::directory_iterator(); entry.increment(error)) {
+        const std::string name = entry->path().filename().string();
+        const std::size_t dot = std::min(name.rfind('.'), name.size() - 1);
+        if (std::string suffix = name.substr(dot + 1); IsDay(suffix) || IsMoment(suffix))
+            kept.emplace_back(name.substr(0, dot), std::move(suffix));
+    }
+    std::sort(kept.begin(), kept.end());
+    return kept;
 }
 
 void DailyBackup::EndPreparing() {
@@ -125,7 +153,7 @@ int DailyBackup::Keep() {
 int DailyBackup::KeepAll() {
     int error = 0;
     for (const std::string& file : files_) {
-        const int failure = IsWanted(file) ? KeepFile(file) : 0;
+        const int failure = IsWanted(file) ? KeepFile(file, day_) : 0;
         error = error == 0 ? failure : error;
     }
     for (const std::string& file : files_)
@@ -134,14 +162,30 @@ int DailyBackup::KeepAll() {
     return error;
 }
 
-int DailyBackup::KeepFile(const std::string& file) {
+int DailyBackup::KeepPresent(std::string* suffix) {
+    const std::lock_guard guard(mutex_);
+    EndPreparing();
+    const auto isTaken = [suffix](const std::string& file) { return FileExists(Kept(file, *suffix)); };
+    std::time_t now = clock_();
+    do
+        *suffix = MomentText(now++);
+    while (std::any_of(files_.begin(), files_.end(), isTaken));
+    if (suffix->empty())
+        return EOVERFLOW;
+    for (const std::string& file : files_)
+        if (const int error = FileExists(file) ? KeepFile(file, *suffix) : 0; error != 0)
+            return error;
+    return 0;
+}
+
+int DailyBackup::KeepFile(const std::string& file, const std::string& suffix) {
     const auto prepared = std::find(prepared_.begin(), prepared_.end(), file);
     if (prepared != prepared_.end())
         prepared_.erase(prepared); // the file is not as it was then for a second time
     else if (const int error = CopyToPart(file); error != 0)
         return error;
     const std::string part = Kept(file, PartSuffix);
-    const int error = RenameFile(operations_, part, Kept(file, day_));
+    const int error = RenameFile(operations_, part, Kept(file, suffix));
     if (error != 0)
         static_cast<void>(RemoveFile(operations_, part));
     return error != 0 ? error : SyncFolderOf(operations_, part);
@@ -170,21 +214,11 @@ int DailyBackup::CopyToPart(const std::string& file) {
 }
 
 void DailyBackup::RemoveOldOf(const std::string& file) {
-    const std::filesystem::path newest(Kept(file, day_));
-    const std::string beginning = std::filesystem::path(file).filename().string() + ".";
     std::vector<std::string> days;
-    std::error_code error;
-    std::filesystem::directory_iterator entry(newest.parent_path(), error);
-    for (; !error && entry != std::filesystem::directory_iterator(); entry.increment(error)) {
-        const std::string name = entry->path().filename().string();
-        if (!name.starts_with(beginning))
-            continue;
-        std::string day = name.substr(beginning.size());
+    for (const auto& [name, day] : KeptIn(FolderOf(file)))
         // Today's is never too old, whatever a clock that ran ahead has left.
-        if (IsDay(day) && day != day_)
-            days.push_back(std::move(day));
-    }
-    std::sort(days.begin(), days.end());
+        if (name == std::filesystem::path(file).filename() && IsDay(day) && day != day_)
+            days.push_back(day);
     for (std::size_t i = 0; i + Generations - 1 < days.size(); ++i)
         static_cast<void>(RemoveFile(operations_, Kept(file, days[i])));
 }

@@ -6,6 +6,7 @@
 #include <mutex>
 #include <string>
 #include <thread>
+#include <utility>
 #include <vector>
 
 #include "util/File.h"
@@ -13,8 +14,8 @@
 // Keeps what data files held before the first change of a day: in the folder "backups" beside each, a file
 // such as invest.db.2026-11-22. Each of these is complete and on the disk under its name, or is not there at
 // all; it is its owner's alone, unless the data file is several people's (PermissionsBeside). Of each data
-// file the newest Generations are kept. Nothing that is named otherwise is touched, save NAME.part, where a
-// copy is made.
+// file the newest Generations are kept, and all that KeepPresent made, such as invest.db.2026-11-22-140307.
+// Nothing that is named otherwise is touched, save NAME.part, where a copy is made.
 //
 // It does not see changes by itself: who is about to change one of the files calls Keep first (BackedUpFiles
 // does so for a DATABASE), and holds the FolderLock of all their folders (TakeFolders) all the while. The
@@ -41,6 +42,12 @@ class DailyBackup {
     // The names of the data files whose contents refer to each other, this one among them.
     [[nodiscard]] static std::vector<std::string> FilesKeptWith(const std::string& name);
 
+    // What lies in the folder's backups: the data file's name, and the day, or the day and time of
+    // KeepPresent, that its backup has behind it. In the order of names, of each the oldest first.
+    [[nodiscard]] static std::vector<std::pair<std::string, std::string>> KeptIn(const std::string& folder);
+    // The path of the backup that has `suffix` behind the name of the file, whose own path is `file`.
+    [[nodiscard]] static std::string Kept(const std::string& file, const std::string& suffix);
+
     // Has `tell` called the first time that Keep fails on a day, with the errno number. To be called before
     // the files change; `tell` runs on the thread that called Keep, must not wait for another, and must not
     // call Keep.
@@ -55,13 +62,17 @@ class DailyBackup {
     // day.
     [[nodiscard]] int Keep();
 
+    // Keeps the files as they are now, beside the backups of the day, which it neither makes nor removes;
+    // `suffix` gets what the copies have behind their names. 0, or the errno number of the first failure:
+    // then some of them may be there.
+    [[nodiscard]] int KeepPresent(std::string* suffix);
+
   private:
     // A file is named by its path.
-    [[nodiscard]] static std::string Kept(const std::string& file, const std::string& suffix);
     [[nodiscard]] bool BeginDay(std::time_t now);
     [[nodiscard]] bool IsWanted(const std::string& file) const;
     [[nodiscard]] int KeepAll();
-    [[nodiscard]] int KeepFile(const std::string& file);
+    [[nodiscard]] int KeepFile(const std::string& file, const std::string& suffix);
     [[nodiscard]] int CopyToPart(const std::string& file);
     void EndPreparing();
     void RemoveOldOf(const std::string& file);
