@@ -35,10 +35,12 @@ endmacro()
 # quorvan_compressed(variable file): the build's copy of the file, compressed as Debian wants it.
 function(quorvan_compressed variable file)
   cmake_path(GET file FILENAME name)
-  set(compressed ${PROJECT_BINARY_DIR}/package/${name}.gz)
-  add_custom_command(OUTPUT ${compressed}
-    COMMAND gzip -9nc ${PROJECT_SOURCE_DIR}/${file} > ${compressed} DEPENDS ${file})
-  set(${variable} ${compressed} PARENT_SCOPE)
+  set(copy ${PROJECT_BINARY_DIR}/package/${name})
+  add_custom_command(OUTPUT ${copy}.gz
+    COMMAND ${CMAKE_COMMAND} -E copy ${PROJECT_SOURCE_DIR}/${file} ${copy}
+    COMMAND gzip -9nf ${copy}
+    DEPENDS ${file} VERBATIM)
+  set(${variable} ${copy}.gz PARENT_SCOPE)
 endfunction()
 
 file(MAKE_DIRECTORY ${PROJECT_BINARY_DIR}/package)
@@ -46,7 +48,7 @@ file(CREATE_LINK ../lib/quorvan/quorvan-cli ${PROJECT_BINARY_DIR}/package/quorva
 quorvan_compressed(program_page doc/man/quorvan.1)
 quorvan_compressed(companion_page doc/man/quorvan-cli.1)
 quorvan_compressed(changelog resources/debian/changelog)
-add_custom_target(compressed ALL DEPENDS ${program_page} ${companion_page} ${changelog})
+add_custom_target(quorvan_package_documents ALL DEPENDS ${program_page} ${companion_page} ${changelog})
 
 quorvan_system_install(TARGETS quorvan quorvan-cli DESTINATION lib/quorvan)
 quorvan_system_install(PROGRAMS resources/debian/quorvan DESTINATION bin)

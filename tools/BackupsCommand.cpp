@@ -38,7 +38,11 @@ std::vector<Cell> RowOf(const BackupFile& backup, const std::optional<RecordChan
 }
 
 int ListBackups(const BackupsOptions& options) {
-    std::vector<BackupFile> backups = FindBackups(HomeFolder(options.home));
+    const std::string home = HomeFolder(options.home);
+    std::error_code notThere;
+    if (!std::filesystem::is_directory(home, notThere))
+        return Fail("there is no folder " + home);
+    std::vector<BackupFile> backups = FindBackups(home);
     std::vector<std::vector<Cell>> rows;
     std::map<std::string, std::string> later; // what each file was next
     int status = 0;

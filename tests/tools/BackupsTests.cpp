@@ -3,142 +3,107 @@
 #include "InChild.h"
 #include "db/FaultyFiles.h"
 #include "tools/Backups.h"
-#include "util/FolderLock.h"
 
 namespace {
 
-const std::string Names[] = {"invest.db", "portfol.db"};
-const std::string Day = "2026-11-20";
+namespace fs = std::filesystem;
 
-// Everything but the wait for the disk.
-struct QuickFiles : FileOperations {
-    int Sync(int /*file*/) override { return 0; }
-};
-
-// A folder with portfolios A and B, of which B was not there on a day whose backups are. The states are the
-// bytes of the files.
+// A folder with portfolios A and B, and its backups of a day on which there was no B.
 class Backups : public CommandTest {
   protected:
     Backups() {
-        std::filesystem::create_directory(home_.File("backups"));
+        fs::create_directory(home_.File("backups"));
         home_.AddPortfolio("A");
         for (const char* name : {"kept", "changed", "removed"})
             home_.AddInvestment(MakeInvestment("A", name));
-        for (const std::string& name : Names)
-            std::filesystem::copy(home_.File(name), home_.File("backups/" + name + "." + Day));
-        earlier_ = State(home_);
+        for (const std::string name : {"portfol.db", "invest.db"})
+            fs::copy(home_.File(name), home_.File("backups/" + name + ".2026-11-20"));
+        earlier_ = State();
         home_.AddPortfolio("B");
         home_.AddInvestment(MakeInvestment("B", "added"));
         DATABASE investments(home_.File("invest.db").c_str());
         const INVESTMENT_DATA changed = MakeInvestment("A", "changed", 3);
         EXPECT_EQ(investments.Write(1, &changed) + investments.Delete(2), 0);
-        present_ = State(home_);
+        present_ = State();
     }
-    static std::vector<std::string> State(const TemporaryFolder& folder, const std::string& suffix = "") {
-        return {folder.Read(Names[0] + suffix), folder.Read(Names[1] + suffix)};
-    }
-    std::string Command(const std::string& arguments) const {
-        return "quorvan-cli backups " + arguments + " --home '" + home_.Path() + "'";
+    // The bytes of both files.
+    std::array<std::string, 2> State() const { return {home_.Read("portfol.db"), home_.Read("invest.db")}; }
+    // In the folder, as each command here.
+    static std::string Command(const std::string& arguments) {
+        return "quorvan-cli backups --home . " + arguments;
     }
     int Restore(FileOperations& files) const {
         std::string kept;
         std::vector<BackupFile> backups = FindBackups(home_.Path());
-        std::erase_if(backups, [](const BackupFile& backup) { return backup.day != Day; });
+        std::erase_if(backups, [](const BackupFile& backup) { return backup.day != "2026-11-20"; });
         return RestoreBackups(home_.Path(), backups, &kept, files).empty() ? 0 : 1;
-    }
-    // What is kept besides that day.
-    std::vector<std::string> OtherDays() const {
-        std::vector<std::string> days;
-        for (const BackupFile& backup : FindBackups(home_.Path()))
-            if (backup.day != Day && (days.empty() || days.back() != backup.day))
-                days.push_back(backup.day);
-        return days;
     }
 
     DataFolder home_;
-    std::vector<std::string> earlier_;
-    std::vector<std::string> present_;
+    std::array<std::string, 2> earlier_;
+    std::array<std::string, 2> present_;
 };
 
 TEST_F(Backups, AreListedAndGoThereAndBack) {
-    EXPECT_EQ(Printed(Command("")), "day         file        bytes  records  added  changed  removed\n"
-                                    "2026-11-20  invest.db    1317        3      1        1        1\n"
-                                    "2026-11-20  portfol.db    129        1      1        0        0\n");
-    EXPECT_TRUE(Works(Command("--json"), R"({"day":"2026-11-20","file":"invest.db","bytes":)"));
-    EXPECT_TRUE(Works("chmod 640 '" + home_.File("invest.db'; ") + Command("restore " + Day),
+    const std::string in = "cd '" + home_.Path() + "'; ";
+    EXPECT_EQ(Printed(in + Command("")), "day         file        bytes  records  added  changed  removed\n"
+                                         "2026-11-20  invest.db    1317        3      1        1        1\n"
+                                         "2026-11-20  portfol.db    129        1      1        0        0\n");
+    EXPECT_TRUE(Works(in + Command("--json"), R"({"day":"2026-11-20","file":"invest.db","bytes":1317,"rec)"));
+    EXPECT_TRUE(Works(in + "chmod 640 invest.db; " + Command("restore 2026-11-20"),
                       "restored invest.db, portfol.db of "));
-    EXPECT_TRUE(State(home_) == earlier_);
-    EXPECT_EQ(std::filesystem::status(home_.File("invest.db")).permissions(), std::filesystem::perms(0640));
+    EXPECT_TRUE(State() == earlier_);
     // Once more on the same day, and then back to what was there at first.
-    EXPECT_TRUE(Works(Command("restore " + Day + " invest.db"), "restored invest.db of "));
-    ASSERT_EQ(OtherDays().size(), 2U);
-    EXPECT_TRUE(Works(Command("restore " + OtherDays()[0])));
-    EXPECT_TRUE(State(home_) == present_);
-    EXPECT_EQ(home_.Names(),
-              (std::vector<std::string>{"Quorvan.ini", "backups", "invest.db", "misc.db", "portfol.db"}));
+    EXPECT_TRUE(Works(in + Command("restore 2026-11-20 invest.db"), "restored invest.db of "));
+    EXPECT_TRUE(Works(in + Command("restore $(" + Command("--json") +
+                                   " | cut -c 9-25 | grep -v , | sort -u | head -n 1)")));
+    EXPECT_TRUE(State() == present_);
+    EXPECT_EQ(Printed(in + "stat -c '%a %n' *.db"), "640 invest.db\n600 misc.db\n600 portfol.db\n");
 }
 
 TEST_F(Backups, ThatCannotBeUsedChangeNothing) {
-    std::optional<FolderLock> lock(std::in_place);
-    ASSERT_EQ(lock->Take(home_.Path(), "quorvan"), FolderLock::Outcome::Taken);
-    EXPECT_TRUE(folder_.Fails(Command("restore " + Day), 1, "in use by quorvan (process "));
-    lock.reset();
-    const std::pair<std::string, std::string> cases[] = {
-        {"restore ../" + Day, "there is no backup of ../" + Day},
-        {"restore ''", "there is no backup of  in "},
-        {"restore " + Day + " ../invest.db", "there is no backup of ../invest.db of " + Day},
-        {"restore " + Day + " misc.db", "there is no backup of misc.db of " + Day},
-        {"restore 2026-11-21", "invest.db.2026-11-21 cannot be used: it is damaged"},
-        {"restore 2026-11-22", "invest.db.2026-11-22 cannot be used: it has other columns than Quorvan's"},
-        {"restore 2026-11-23", "what was cut is not pasted yet"},
+    const std::string in = "cd '" + home_.Path() + "'; ";
+    ASSERT_TRUE(Works(in + "cd backups; head -c 900 invest.db.2026-11-20 >invest.db.2026-11-21; "
+                           "cp portfol.db.2026-11-20 invest.db.2026-11-22"));
+    const std::pair<const char*, const char*> cases[] = {
+        {"../2026-11-20", "there is no backup of ../2026-11-20 in "},
+        {"2026-11-20 ../invest.db", "there is no backup of ../invest.db of 2026-11-20"},
+        {"2026-11-21", "invest.db.2026-11-21 cannot be used: it is damaged"},
+        {"2026-11-22", "invest.db.2026-11-22 cannot be used: it has other columns than Quorvan's"},
     };
-    ASSERT_TRUE(Works("cd '" + home_.Path() + "/backups'; head -c 900 invest.db." + Day +
-                      " >invest.db.2026-11-21; "
-                      "cp portfol.db." +
-                      Day + " invest.db.2026-11-22; cp invest.db." + Day + " invest.db.2026-11-23"));
-    for (const auto& [arguments, reason] : cases) {
-        if (arguments.ends_with("23"))
-            home_.Write("cut.db", "");
-        EXPECT_TRUE(folder_.Fails(Command(arguments), 1, reason));
-    }
-    EXPECT_TRUE(State(home_) == present_);
-    EXPECT_TRUE(OtherDays().size() == 3) << "and nothing more is kept";
+    for (const auto& [day, reason] : cases)
+        EXPECT_TRUE(folder_.Fails(in + Command("restore ") + day, 1, reason));
+    EXPECT_TRUE(
+        folder_.Fails(in + "touch cut.db; " + Command("restore 2026-11-20"), 1, "what was cut is not"));
+    EXPECT_TRUE(State() == present_);
 }
 
-// Whatever fails, and wherever it is killed, every file is of one state, and doing it again finishes it.
+// Whatever fails, and wherever it is killed, each file is of one state, and doing it again finishes it.
 TEST_F(Backups, SurviveEveryFaultOfARestore) {
-    const auto reset = [&] {
-        std::filesystem::remove_all(home_.File("backups"));
-        std::filesystem::create_directory(home_.File("backups"));
-        for (const std::size_t i : {0U, 1U}) {
-            home_.Write(Names[i], present_[i]);
-            home_.Write("backups/" + Names[i] + "." + Day, earlier_[i]);
-            std::filesystem::remove(home_.File(Names[i] + ".part"));
-        }
-    };
-    QuickFiles quick;
+    struct : FileOperations {
+        int Sync(int /*file*/) override { return 0; }
+    } quick;
+    const TemporaryFolder before;
+    fs::copy(home_.Path(), before.Path(), fs::copy_options::recursive);
     for (const Fault fault : {Fault::HalfThenError, Fault::KilledBefore}) {
-        bool met = true;
-        for (int at = 0; met; ++at) {
-            reset();
-            const int result = ResultInChild([&] {
+        for (int at = 0, result = -1; result < 0 || result > 1; ++at) {
+            home_.Clear();
+            fs::copy(before.Path(), home_.Path(), fs::copy_options::recursive);
+            result = ResultInChild([&] {
                 FaultyFiles files;
                 files.Arm(fault, at);
                 const int restored = Restore(files);
                 return files.Disarm() ? 2 + restored : restored;
             });
-            met = result < 0 || result > 1;
-            for (const std::size_t i : {0U, 1U}) {
-                const std::string content = home_.Read(Names[i]);
-                EXPECT_TRUE(content == earlier_[i] || content == present_[i]) << at;
-                EXPECT_TRUE(result < 0 || !home_.Has(Names[i] + ".part")) << at;
-            }
-            EXPECT_EQ(Restore(quick), 0);
-            EXPECT_TRUE(State(home_) == earlier_);
             for (const std::size_t i : {0U, 1U})
-                EXPECT_TRUE(std::ranges::any_of(OtherDays(), [&](const std::string& day) {
-                    return home_.Read("backups/" + Names[i] + "." + day) == present_[i];
-                })) << at;
+                EXPECT_TRUE(State()[i] == earlier_[i] || State()[i] == present_[i]) << at;
+            EXPECT_TRUE(result < 0 || !home_.Has("invest.db.part")) << at;
+            EXPECT_EQ(Restore(quick), 0);
+            EXPECT_TRUE(State() == earlier_) << at;
+            std::string kept;
+            for (const auto& entry : fs::directory_iterator(home_.File("backups")))
+                kept += home_.Read("backups/" + entry.path().filename().string());
+            EXPECT_TRUE(kept.find(present_[0]) != kept.npos && kept.find(present_[1]) != kept.npos) << at;
         }
     }
 }

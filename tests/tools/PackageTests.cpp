@@ -1,9 +1,6 @@
 // The archive and the Debian package, as somebody who has nothing else finds them.
-#include <optional>
-
 #include "Session.h"
 #include "Shell.h"
-#include "util/FolderLock.h"
 
 namespace {
 
@@ -30,99 +27,68 @@ TEST(PackageTest, UnpacksToAFolderThatRuns) {
     }
 }
 
-// Installed into a root of the test's own, with another program to start that needs no display.
-class InstalledPackage : public testing::Test {
+// Installs the package into a root of the test's own, with another program to start that needs no display.
+// What a person of that root is told and gets, the test's folder written as a full stop.
+class Installed : public testing::Test {
   protected:
-    InstalledPackage() {
-        setenv("HOME", folder_.File("me").c_str(), 1);
-        setenv("PATH", (folder_.File("root/usr/bin:") + folder_.Path() + ":" + getenv("PATH")).c_str(), 1);
-        folder_.Write("notify-send", "#!/bin/sh\necho \"$*\" >>" + folder_.File("notices") + "\n");
-        EXPECT_EQ(folder_.Run("mkdir me; chmod +x notify-send; " QUORVAN_PACK
+    Installed() {
+        folder_.Write("notify-send", "#!/bin/sh\necho \"$2\" >>'" + folder_.File("notices") + "'\n");
+        EXPECT_EQ(folder_.Run("chmod +x notify-send; mkdir me; " QUORVAN_PACK
                               " -G DEB -B packed && dpkg-deb -x packed/*.deb root"),
-                  0)
-            << folder_.Errors();
-    }
-    void Provide(const std::string& version) {
-        folder_.Write("root/usr/lib/quorvan/quorvan",
-                      "#!/bin/sh\n[ $# = 0 ] && echo \"started $0\" || echo 'quorvan " + version + "'\n");
-    }
-    // Whether the launcher starts the program of that folder, having said this.
-    testing::AssertionResult Starts(const std::string& command, const std::string& folder,
-                                    const std::string& said = "") {
-        if (folder_.Run(command) != 0 || folder_.Output() != "started " + folder + "/quorvan\n")
-            return testing::AssertionFailure() << command << folder_.Output() << folder_.Errors();
-        return (said.empty() ? folder_.Errors().empty() : folder_.Errors().find(said) != said.npos)
-                   ? testing::AssertionSuccess()
-                   : testing::AssertionFailure() << folder_.Errors();
-    }
-    // Of all that is a person's own, in the folder that the launcher made.
-    std::string State() {
-        EXPECT_EQ(folder_.Run("cd me/Quorvan; stat -c '%n %Y' *.db Quorvan.*; cat *.db Quorvan.* | md5sum"),
                   0);
+    }
+    std::string Told(const std::string& script) {
+        const std::string environment = R"(export HOME=$PWD/me PATH=$PWD/root/usr/bin:$PWD:$PATH; provide() {
+            printf '#!/bin/sh\n[ $# = 0 ] && echo "starts $0" || echo quorvan %s\n' $1 >root/usr/lib/quorvan/quorvan; }
+        { )";
+        folder_.Run(environment + script + "\n} 2>&1 | sed \"s|$PWD|.|g\"");
         return folder_.Output();
     }
 
     Shell folder_;
 };
 
-TEST_F(InstalledPackage, StartsFromAFolderThatItMakesAndKeepsUpToDate) {
-    Provide("1.0");
-    const std::string home = folder_.File("me/Quorvan");
-    EXPECT_TRUE(Starts("quorvan", home, "quorvan: Made the folder " + home + " for your portfolios.\n"));
-    const std::string before = State();
-    EXPECT_TRUE(Starts("quorvan", home));
-
-    Provide("1.10");
-    folder_.Write("me/Quorvan/help/Quorvan.html", "old");
-    std::optional<FolderLock> lock(std::in_place);
-    ASSERT_EQ(lock->Take(home, "quorvan"), FolderLock::Outcome::Taken);
-    EXPECT_TRUE(Starts("quorvan", home, "is in use by quorvan (process "));
-    EXPECT_EQ(folder_.Read("me/Quorvan/help/Quorvan.html"), "old");
-    lock.reset();
-    EXPECT_TRUE(Starts("quorvan", home));
-    EXPECT_NE(folder_.Read("me/Quorvan/help/Quorvan.html"), "old");
-    EXPECT_EQ(folder_.Run("me/Quorvan/quorvan --version"), 0);
-    Provide("1.9");
-    EXPECT_TRUE(Starts("quorvan", home));
-    EXPECT_EQ(folder_.Run("me/Quorvan/quorvan --version"), 0);
-    EXPECT_EQ(folder_.Output(), "quorvan 1.10\n") << "it is the newer one";
-    EXPECT_EQ(State(), before);
-    EXPECT_EQ(folder_.Read("notices").find("Quorvan Made the folder "), 0U) << "for who sees no terminal";
+TEST_F(Installed, HasAllInItsPlaceAndNothingThatRunsOnRemoval) {
+    EXPECT_EQ(
+        Told("quorvan --version; quorvan-cli --version; dpkg-deb --ctrl-tarfile packed/*.deb | tar t | sort\n"
+             "dpkg-deb -f packed/*.deb Depends | grep -o 'libqt6widgets6\\|libcurl4' | sort; cd "
+             "root/usr/share\n"
+             "desktop-file-validate applications/*; ls metainfo/*.xml icons/*/*/*/*.svg\n"
+             "man -M man -w quorvan quorvan-cli | grep -o '[^/]*$'"),
+        "quorvan 1.0\nquorvan-cli 1.0\n./control\n./md5sums\nlibcurl4\nlibqt6widgets6\n"
+        "icons/hicolor/scalable/apps/org.quorvan.quorvan.svg\nmetainfo/org.quorvan.quorvan.metainfo.xml\n"
+        "quorvan.1.gz\nquorvan-cli.1.gz\n");
+    ASSERT_EQ(Told("provide 1.0; mkdir 'a b' half other; touch half/invest.db.part other/letter\n"
+                   "quorvan 'a b'; quorvan half; ls half/invest.db"),
+              "quorvan: Made the folder a b for your portfolios.\nstarts a b/quorvan\nstarts half/quorvan\n"
+              "half/invest.db\n");
+    const std::pair<const char*, const char*> cases[] = {
+        {"quorvan other; ls other",
+         "quorvan: other is no folder of Quorvan's, since it holds other things; name a "
+         "new or an empty one.\nletter\n"},
+        {"quorvan other/letter/new",
+         "quorvan: The folder ./other/letter/new cannot be made: Not a directory.\n"},
+        {"HOME= quorvan", "quorvan: There is no home folder; name a folder: quorvan FOLDER\n"},
+        {"chmod -x half/quorvan; quorvan half", "quorvan: The program half/quorvan cannot be started.\n"},
+        {"quorvan --new 2>told; echo $?; quorvan a b 2>told; echo $?", "2\n2\n"},
+    };
+    for (const auto& [command, told] : cases)
+        EXPECT_EQ(Told(command).substr(0, std::string(told).size()), told);
 }
 
-TEST_F(InstalledPackage, HasEverythingInItsPlaceAndTakesNoForeignFolder) {
-    EXPECT_EQ(folder_.Run("quorvan --version && quorvan-cli --version"), 0);
-    EXPECT_EQ(folder_.Output(), "quorvan 1.0\nquorvan-cli 1.0\n");
-    // What a removal could run, what the tools found it to need, and what desktops and man find.
-    EXPECT_EQ(folder_.Run("dpkg-deb --ctrl-tarfile packed/*.deb | tar t | sort; dpkg-deb -f packed/*.deb "
-                          "Depends | grep -o 'libqt6widgets6\\|libcurl4' | sort; cd root/usr/share && "
-                          "desktop-file-validate applications/* && ls metainfo/*.xml icons/*/*/*/*.svg && "
-                          "man -M man -w quorvan quorvan-cli"),
-              0);
-    const std::string shared = folder_.File("root/usr/share/");
-    EXPECT_EQ(folder_.Output(), "./control\n./md5sums\nlibcurl4\nlibqt6widgets6\nicons/hicolor/scalable/"
-                                "apps/org.quorvan.quorvan.svg\n"
-                                "metainfo/org.quorvan.quorvan.metainfo.xml\n" +
-                                    shared + "man/man1/quorvan.1.gz\n" + shared +
-                                    "man/man1/quorvan-cli.1.gz\n");
-    Provide("1.0");
-    ASSERT_EQ(folder_.Run("mkdir 'a b' half other; touch half/invest.db.part other/letter file"), 0);
-    EXPECT_TRUE(Starts("quorvan 'a b'", "a b", "Made the folder a b"));
-    EXPECT_TRUE(Starts("quorvan half; ls half/invest.db >&2", "half", "half/invest.db"));
-    const std::tuple<const char*, int, const char*> cases[] = {
-        {"quorvan other", 1, "quorvan: other is no folder of Quorvan's"},
-        {"quorvan file", 1, "quorvan: file is no folder of Quorvan's"},
-        {"quorvan file/new", 1, "file/new cannot be made: Not a directory"},
-        {"quorvan ''", 1, "the name is empty"},
-        {"HOME= quorvan", 1, "There is no home folder"},
-        {"chmod -x half/quorvan; quorvan half", 1, "The program half/quorvan cannot be started"},
-        {"quorvan --new", 2, "Usage: quorvan"},
-        {"quorvan a b", 2, "Usage: quorvan"},
-    };
-    for (const auto& [command, status, reason] : cases)
-        EXPECT_TRUE(folder_.Fails(command, status, reason));
-    EXPECT_EQ(folder_.Run("ls -A other"), 0);
-    EXPECT_EQ(folder_.Output(), "letter\n");
+TEST_F(Installed, MakesAFolderAndKeepsItUpToDate) {
+    EXPECT_EQ(
+        Told(R"(provide 1.0; quorvan; cat me/Quorvan/*.db | md5sum >sum; quorvan
+        provide 1.10; cd me/Quorvan; echo old >help/Quorvan.html; echo 'host: elsewhere' >Quorvan.lock
+        quorvan; cat help/Quorvan.html; rm Quorvan.lock
+        quorvan; ./quorvan --version; grep -c '<h1>' help/Quorvan.html; cd ../..
+        provide 1.9; quorvan; me/Quorvan/quorvan --version; cat me/Quorvan/*.db | md5sum | cmp - sum; head -n 1 notices)"),
+        "quorvan: Made the folder ./me/Quorvan for your portfolios.\n"
+        "starts ./me/Quorvan/quorvan\nstarts ./me/Quorvan/quorvan\n"
+        "quorvan: The folder ./me/Quorvan was in use by another program; once that program has ended, delete "
+        "./me/Quorvan/Quorvan.lock.\nstarts ./me/Quorvan/quorvan\nold\n"
+        "starts ./me/Quorvan/quorvan\nquorvan 1.10\n1\n"
+        "starts ./me/Quorvan/quorvan\nquorvan 1.10\nMade the folder ./me/Quorvan for your portfolios.\n");
 }
 
 } // namespace
