@@ -59,6 +59,11 @@ TEST_F(Backups, AreListedAndGoThereAndBack) {
                                    " | cut -c 9-25 | grep -v , | sort -u | head -n 1)")));
     EXPECT_TRUE(State() == present_);
     EXPECT_EQ(Printed(in + "stat -c '%a %n' *.db"), "640 invest.db\n600 misc.db\n600 portfol.db\n");
+    // Old days go when a new one comes, and what a restore kept does not.
+    EXPECT_EQ(Printed(in + "touch $(seq -f backups/invest.db.2001-01-0%g 7) $(seq -f "
+                           "backups/invest.db.2001-01-0%g-010203 7); quorvan-cli db invest.db delete 0; "
+                           "ls backups | grep -c 010203; ls backups | grep -c 2001-01-..$"),
+              "1 record deleted\n7\n5\n");
 }
 
 TEST_F(Backups, ThatCannotBeUsedChangeNothing) {
