@@ -1,6 +1,8 @@
 #include <CLI/CLI.hpp>
 #include <algorithm>
 #include <array>
+#include <cerrno>
+#include <cmath>
 #include <csignal>
 #include <cstdint>
 #include <iostream>
@@ -96,17 +98,16 @@ class UpdateReport : public PriceRunObserver {
     TableWriter json_{
         OutputFormat::Json, {"portfolio", "name", "ticker", "old", "new", "change", "why"}, output_};
     std::string later_; // lines that would break the one that is written over
-    std::size_t asked_ = 0;
+    std::size_t done_ = 0;
     std::size_t priced_ = 0;
     std::size_t withoutPrice_ = 0;
     std::string failure_; // what ended the run
 };
 
 void UpdateReport::Asking(const std::string& ticker) {
-    ++asked_;
     if (!rewrites_)
         return;
-    std::string line = "\r\x1B[K" + std::to_string(asked_) + " of " + std::to_string(total_) + ": ";
+    std::string line = "\r\x1B[K" + std::to_string(done_ + 1) + " of " + std::to_string(total_) + ": ";
     AppendEscaped(line, ticker);
     output_.Write(line);
     static_cast<void>(output_.Flush());
@@ -129,6 +130,7 @@ std::string UpdateReport::WhyNot(const PriceRunResult& result) const {
 
 void UpdateReport::Done(const PriceRunResult& result) {
     const bool priced = result.outcome == QuoteOutcome::Priced;
+    ++done_;
     priced_ += priced ? 1 : 0;
     withoutPrice_ += result.outcome == QuoteOutcome::NoPrice ? 1 : 0;
     if (result.outcome == QuoteOutcome::NotRead)
@@ -144,7 +146,9 @@ void UpdateReport::Done(const PriceRunResult& result) {
 void UpdateReport::WriteLine(const INVESTMENT_DATA& before, const std::optional<float>& price,
                              const std::string& why) {
     const float old = before.Price;
-    const float change = price.value_or(old) - old;
+    // What the rounding of floats adds to it is no news.
+    const auto change = static_cast<float>(
+        std::round((static_cast<double>(price.value_or(old)) - static_cast<double>(old)) * 1e4) / 1e4);
     const std::string ticker(FieldText(before.Ticker));
     const std::string name(FieldText(before.Name));
     if (format_ == OutputFormat::Json) {
