@@ -5,11 +5,11 @@
 namespace {
 
 constexpr const char* EraseLine = "\r\x1b[K";
-constexpr std::chrono::milliseconds Pause(100);
 
 } // namespace
 
-ProgressLine::ProgressLine(int descriptor) : descriptor_(descriptor), shows_(isatty(descriptor) == 1) {}
+ProgressLine::ProgressLine(int descriptor, std::chrono::milliseconds pause)
+    : descriptor_(descriptor), pause_(pause), shows_(isatty(descriptor) == 1) {}
 
 ProgressLine::~ProgressLine() {
     if (shown_)
@@ -20,7 +20,7 @@ void ProgressLine::Show(const std::string& text) {
     const auto now = std::chrono::steady_clock::now();
     if (!shows_ || now < next_)
         return;
-    next_ = now + Pause;
+    next_ = now + pause_;
     shown_ = true;
     Write(EraseLine + text);
 }

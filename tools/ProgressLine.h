@@ -7,18 +7,20 @@
 // where the descriptor is no terminal. Used on one thread.
 class ProgressLine {
   public:
-    explicit ProgressLine(int descriptor);
+    // A text that is younger than `pause` is not replaced.
+    explicit ProgressLine(int descriptor, std::chrono::milliseconds pause = std::chrono::milliseconds(100));
     ProgressLine(const ProgressLine&) = delete;
     ProgressLine& operator=(const ProgressLine&) = delete;
     ~ProgressLine();
 
-    // Shows the text, unless the one before is less than a tenth of a second old.
+    // Shows the text in place of the one before.
     void Show(const std::string& text);
 
   private:
     void Write(const std::string& text) const;
 
     int descriptor_;
+    std::chrono::milliseconds pause_;
     bool shows_;
     std::chrono::steady_clock::time_point next_{};
     bool shown_ = false;

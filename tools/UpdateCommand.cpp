@@ -2,6 +2,7 @@
 #include <algorithm>
 #include <array>
 #include <cerrno>
+#include <chrono>
 #include <cmath>
 #include <csignal>
 #include <cstdint>
@@ -18,6 +19,7 @@
 #include "app/model/PortfolioRules.h"
 #include "quotes/run/PriceRun.h"
 #include "tools/Commands.h"
+#include "tools/ProgressLine.h"
 #include "tools/QuoteTrace.h"
 #include "tools/Sentences.h"
 #include "util/FailureTexts.h"
@@ -75,8 +77,10 @@ std::string Price(float price) {
 // those without a price; elsewhere in a line for each investment.
 class UpdateReport : public PriceRunObserver {
   public:
-    UpdateReport(OutputFormat format, std::size_t total)
-        : format_(format), total_(total), rewrites_(format == OutputFormat::Table && isatty(STDOUT_FILENO)) {}
+    UpdateReport(OutputFormat format, std::size_t total) : format_(format), total_(total) {
+        if (format == OutputFormat::Table && isatty(STDOUT_FILENO) == 1)
+            line_.emplace(STDOUT_FILENO, std::chrono::milliseconds(0)); // the next answer may take its time
+    }
 
     void Asking(const std::string& ticker) override;
     RefusalObserver& Watcher() override { return trace_.emplace(nowhere_); }
@@ -91,8 +95,8 @@ class UpdateReport : public PriceRunObserver {
 
     const OutputFormat format_;
     const std::size_t total_;
-    const bool rewrites_;
-    std::ostream nowhere_{nullptr}; // only the reason is wanted
+    std::optional<ProgressLine> line_; // on a terminal
+    std::ostream nowhere_{nullptr};    // only the reason is wanted
     std::optional<QuoteTrace> trace_;
     TextOutput output_{STDOUT_FILENO};
     TableWriter json_{
@@ -105,12 +109,10 @@ class UpdateReport : public PriceRunObserver {
 };
 
 void UpdateReport::Asking(const std::string& ticker) {
-    if (!rewrites_)
-        return;
-    std::string line = "\r\x1B[K" + std::to_string(done_ + 1) + " of " + std::to_string(total_) + ": ";
-    AppendEscaped(line, ticker);
-    output_.Write(line);
-    static_cast<void>(output_.Flush());
+    std::string text = std::to_string(done_ + 1) + " of " + std::to_string(total_) + ": ";
+    AppendEscaped(text, ticker);
+    if (line_)
+        line_->Show(text);
 }
 
 std::string UpdateReport::WhyNot(const PriceRunResult& result) const {
@@ -169,14 +171,15 @@ void UpdateReport::WriteLine(const INVESTMENT_DATA& before, const std::optional<
         '\t' +
         (price ? Price(old) + '\t' + Price(*price) + '\t' + (change > 0 ? "+" : "") + Price(change) : why) +
         '\n';
-    if (!rewrites_)
+    if (!line_)
         output_.Write(line);
     else if (!price)
         later_ += line;
 }
 
 int UpdateReport::Summarize() {
-    std::string text = (rewrites_ ? "\r\x1B[K" : "") + later_ + std::to_string(priced_) + " of " +
+    line_.reset();
+    std::string text = later_ + std::to_string(priced_) + " of " +
                        Counted(static_cast<std::int64_t>(total_), "investment") + " priced";
     if (withoutPrice_ > 0)
         text += ", " + std::to_string(withoutPrice_) + " without a price";
