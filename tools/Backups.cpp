@@ -4,27 +4,33 @@
 #include <array>
 #include <cstddef>
 #include <iterator>
+#include <list>
 #include <set>
 
 #include "app/model/DailyBackup.h"
 #include "app/model/DataFolders.h"
-#include "tools/ToolFolder.h"
+#include "tools/DataFileCopy.h"
 #include "util/Strings.h"
 
 namespace {
 
 constexpr std::array DataFiles = {PortfolioFile, InvestmentFile, CategoryFile};
 
-// Why the file cannot be the data file of that name; empty when it can.
-std::string WhyUnusable(const std::string& path, const std::string& name, FileOperations& operations) {
-    DATABASE database(path.c_str(), operations);
-    if (!database.IsOpen())
-        return WhyNotOpened(path);
-    if (database.IsDamaged())
+// How the data file of that name is known to be that; any other only has to be one.
+DataFileKind KindOf(const std::string& name) {
+    const auto* known = std::find_if(
+        DataFiles.begin(), DataFiles.end(), [&](const DataFileKind& kind) { return kind.name == name; });
+    return known != DataFiles.end() ? *known : DataFileKind{name.c_str(), [](DATABASE&) { return true; }};
+}
+
+// Makes the copy that is to take the place of the data file, and looks at it.
+std::string Prepare(DataFileCopy& copy, const BackupFile& backup, FileOperations& operations) {
+    RestoreCompactionBackup(backup.present.c_str(), operations); // it is what is there
+    if (std::string wrong = copy.Make(backup.path); !wrong.empty())
+        return wrong;
+    if (copy.Data().IsDamaged())
         return "it is damaged: its header disagrees with it";
-    const auto isWrong = [&](const DataFileKind& kind) { return kind.name == name && !kind.holds(database); };
-    return std::any_of(DataFiles.begin(), DataFiles.end(), isWrong) ? "it has other columns than Quorvan's"
-                                                                    : "";
+    return KindOf(backup.name).holds(copy.Data()) ? copy.Finish() : "it has other columns than Quorvan's";
 }
 
 // The data of the active records, sorted.
@@ -52,67 +58,6 @@ std::vector<std::string> NamesLacking(const std::string& name, const std::vector
         for (std::string& record : lacking)
             record.resize(std::min(record.size(), offsetof(INVESTMENT_DATA, Ticker)));
     return lacking;
-}
-
-// One restoring of some files.
-class Restoring {
-  public:
-    Restoring(const std::vector<BackupFile>& backups, FileOperations& operations)
-        : backups_(backups), operations_(operations) {}
-    // What is left of the copies.
-    ~Restoring() {
-        for (const BackupFile& backup : backups_)
-            static_cast<void>(RemoveFile(operations_, Copy(backup)));
-    }
-    Restoring(const Restoring&) = delete;
-    Restoring& operator=(const Restoring&) = delete;
-
-    [[nodiscard]] std::string Prepare();
-    [[nodiscard]] std::string Replace();
-
-  private:
-    [[nodiscard]] static std::string Copy(const BackupFile& backup) { return backup.present + ".part"; }
-    [[nodiscard]] int MakeCopy(const BackupFile& backup);
-
-    const std::vector<BackupFile>& backups_;
-    FileOperations& operations_;
-};
-
-int Restoring::MakeCopy(const BackupFile& backup) {
-    File source(operations_);
-    File copy(operations_);
-    File present(operations_);
-    static_cast<void>(RemoveFile(operations_, Copy(backup))); // left by a program that was killed
-    int error = source.Open(backup.path, FileMode::ReadOnly);
-    error = error != 0 ? error : copy.Open(Copy(backup), FileMode::CreateNew);
-    error = error != 0 ? error : copy.CopyFrom(source);
-    const bool replaces = error == 0 && present.Open(backup.present, FileMode::ReadOnly) == 0;
-    return replaces ? copy.TakeOwnerAndMode(present) : error;
-}
-
-std::string Restoring::Prepare() {
-    for (const BackupFile& backup : backups_) {
-        RestoreCompactionBackup(backup.present.c_str(), operations_); // it is what is there
-        const int error = MakeCopy(backup);
-        const std::string wrong =
-            error != 0 ? Reason(error) : WhyUnusable(Copy(backup), backup.name, operations_);
-        if (!wrong.empty())
-            return backup.path + " cannot be used: " + wrong;
-    }
-    return {};
-}
-
-std::string Restoring::Replace() {
-    std::string done;
-    for (const BackupFile& backup : backups_) {
-        int error = RenameFile(operations_, Copy(backup), backup.present);
-        error = error != 0 ? error : SyncFolderOf(operations_, backup.present);
-        if (error != 0)
-            return backup.present + " cannot be replaced: " + Reason(error) +
-                   (done.empty() ? "" : "; restored already:" + done + ", and doing it again finishes it");
-        done += " " + backup.name;
-    }
-    return {};
 }
 
 } // namespace
@@ -154,16 +99,26 @@ std::optional<RecordChanges> CompareRecords(const std::string& name, const std::
                          count(gone) - count(changed)};
 }
 
-std::string RestoreBackups(const std::string& folder, const std::vector<BackupFile>& backups,
+std::string RestoreBackups(const ToolFolder& folder, const std::vector<BackupFile>& backups,
                            std::string* kept, FileOperations& operations) {
-    Restoring restoring(backups, operations);
-    if (const std::string wrong = restoring.Prepare(); !wrong.empty())
-        return wrong + "; nothing is changed";
+    std::list<DataFileCopy> copies;
     std::vector<std::string> names;
-    for (const BackupFile& backup : backups)
+    for (const BackupFile& backup : backups) {
+        DataFileCopy& copy = copies.emplace_back(folder, KindOf(backup.name), operations);
+        if (const std::string wrong = Prepare(copy, backup, operations); !wrong.empty())
+            return backup.path + " cannot be used: " + wrong + "; nothing is changed";
         names.push_back(backup.name);
-    if (const int error = DailyBackup(folder, names, operations).KeepPresent(kept); error != 0)
+    }
+    if (const int error = DailyBackup(folder.Path(), names, operations).KeepPresent(kept); error != 0)
         return std::string("what is there cannot be kept in the folder ") + DailyBackup::FolderName + ": " +
                Reason(error) + "; nothing is changed";
-    return restoring.Replace();
+    std::string done;
+    auto name = names.begin();
+    for (DataFileCopy& copy : copies) {
+        if (const std::string wrong = copy.TakePlace(); !wrong.empty())
+            return wrong +
+                   (done.empty() ? "" : "; restored already:" + done + ", and doing it again finishes it");
+        done += " " + *name++;
+    }
+    return {};
 }

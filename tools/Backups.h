@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-#include "util/File.h"
+#include "tools/ToolFolder.h"
 
 // A backup of a data file of the program's folder (app/model/DailyBackup.h).
 struct BackupFile {
@@ -32,11 +32,11 @@ struct RecordChanges {
 [[nodiscard]] std::optional<RecordChanges> CompareRecords(const std::string& name, const std::string& path,
                                                           const std::string& later, std::string& wrong);
 
-// Puts the backups in the places of the data files, of which the caller has the folder's lock. Each is copied
+// Puts the backups in the places of the data files, of the folder that the caller has locked. Each is copied
 // beside its data file and looked at first, then what is there is kept as one more backup, of which `kept`
 // gets the day and time, and only then the first copy takes its place, with owner and permissions of the file
 // that it replaces. Killed at any moment, each data file is the old one or the new one; done again, it is
 // finished. Returns an empty text, or what hindered it: a sentence without its full stop, which says what was
 // done.
-[[nodiscard]] std::string RestoreBackups(const std::string& folder, const std::vector<BackupFile>& backups,
+[[nodiscard]] std::string RestoreBackups(const ToolFolder& folder, const std::vector<BackupFile>& backups,
                                          std::string* kept, FileOperations& operations = SystemFiles());

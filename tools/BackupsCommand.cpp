@@ -101,7 +101,7 @@ int RestoreDay(const BackupsOptions& options) {
         return Fail("what was cut is not pasted yet, and would be added to the investments of another day; "
                     "start Quorvan once, which puts it back, and try again");
     std::string kept;
-    if (const std::string wrong = RestoreBackups(home, backups, &kept); !wrong.empty())
+    if (const std::string wrong = RestoreBackups(folder, backups, &kept); !wrong.empty())
         return Fail(wrong);
     std::cout << "restored " << listed << " of " << options.day << "; what was there is kept as " << kept
               << std::endl;

@@ -15,15 +15,17 @@ DataFileCopy::~DataFileCopy() {
         static_cast<void>(RemoveFile(operations_, copy_));
 }
 
-std::string DataFileCopy::Make() {
+std::string DataFileCopy::Make(const std::string& from) {
     static_cast<void>(RemoveFile(operations_, copy_)); // left by a program that was killed
     File source(operations_);
     File target(operations_);
-    int error = source.Open(path_, FileMode::ReadOnly);
+    File present(operations_);
+    int error = source.Open(from, FileMode::ReadOnly);
     error = error != 0 ? error : target.Open(copy_, FileMode::CreateNew);
     made_ = target.IsOpen();
     error = error != 0 ? error : target.CopyFrom(source);
-    error = error != 0 ? error : target.TakeOwnerAndMode(source);
+    if (error == 0 && present.Open(path_, FileMode::ReadOnly) == 0)
+        error = target.TakeOwnerAndMode(present);
     if (error != 0)
         return copy_ + " cannot be made: " + Reason(error);
     return data_.Open(copy_.c_str()) == 0 ? "" : copy_ + " cannot be opened: " + WhyNotOpened(copy_);

@@ -21,8 +21,9 @@ class DataFileCopy {
     // Removes a copy that has not taken the file's place.
     ~DataFileCopy();
 
-    // Makes the copy and opens it.
-    [[nodiscard]] std::string Make();
+    // Makes the copy and opens it: one of the file, or of another, `from`, that is to take its place.
+    [[nodiscard]] std::string Make() { return Make(path_); }
+    [[nodiscard]] std::string Make(const std::string& from);
     // To be changed between the two.
     [[nodiscard]] DATABASE& Data() { return data_; }
     // Brings it to the disk and checks it.

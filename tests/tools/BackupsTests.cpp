@@ -36,7 +36,7 @@ class Backups : public CommandTest {
         std::string kept;
         std::vector<BackupFile> backups = FindBackups(home_.Path());
         std::erase_if(backups, [](const BackupFile& backup) { return backup.day != "2026-11-20"; });
-        return RestoreBackups(home_.Path(), backups, &kept, files).empty() ? 0 : 1;
+        return RestoreBackups(ToolFolder(home_.Path()), backups, &kept, files).empty() ? 0 : 1;
     }
 
     DataFolder home_;
