@@ -20,7 +20,3 @@ enum class GrowthRates { All, Lower };
 
 // By the name's end, in any letter case: .png, .svg or .pdf.
 [[nodiscard]] std::optional<PictureFormat> PictureFormatOf(const std::string& path);
-
-// Writes the file as a whole, or leaves the one that is there. A file that exists keeps its permissions, and
-// a link to it stays a link. Returns 0 or an errno number.
-[[nodiscard]] int WritePicture(const std::string& path, const std::string& bytes);

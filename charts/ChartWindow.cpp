@@ -13,6 +13,7 @@
 #include "platform/FilePanel.h"
 #include "platform/MenuField.h"
 #include "platform/MenuItem.h"
+#include "util/File.h"
 #include "util/Strings.h"
 #include "util/interface/InterfaceHelpers.h"
 
@@ -189,7 +190,7 @@ void ChartWindow::SaveChart() {
         return;
     }
     const std::string picture = Picture(*format);
-    const int error = picture.empty() ? ENOMEM : WritePicture(path, picture);
+    const int error = picture.empty() ? ENOMEM : WriteNamedFile(path, picture);
     if (error != 0)
         MessageBox(("The picture could not be saved as " + path + "!\n" + Reason(error)).c_str(),
                    B_STOP_ALERT);

@@ -6,7 +6,6 @@
 #include <cstdlib>
 #include <iostream>
 #include <pwd.h>
-#include <sys/stat.h>
 #include <unistd.h>
 
 #include "app/model/DataFolders.h"
@@ -23,16 +22,6 @@ fs::path PersonsFolder() {
         return home;
     const passwd* person = getpwuid(getuid());
     return person ? person->pw_dir : ".";
-}
-
-// The errno number that tells why there is something that a picture must not replace, or 0.
-int WhyNotReplaced(const std::string& path) {
-    struct stat status {};
-    if (stat(path.c_str(), &status) != 0)
-        return 0;
-    if (!S_ISREG(status.st_mode))
-        return S_ISDIR(status.st_mode) ? EISDIR : EOPNOTSUPP;
-    return access(path.c_str(), W_OK) == 0 ? 0 : errno;
 }
 
 // The toolkit reads its environment as the application is made.
@@ -106,13 +95,7 @@ std::unique_ptr<DATABASE> OpenInvestments(PortfolioOptions& options) {
 }
 
 int WriteOutputFile(const std::string& path, std::string_view bytes) {
-    const mode_t mask = umask(0);
-    umask(mask);
-    const std::string target = RealPath(path);
-    int error = WhyNotReplaced(target);
-    if (error == 0)
-        error = WriteWholeFile(target, target + ".part" + std::to_string(getpid()), bytes, 0666 & ~mask,
-                               ExistingFile::Replace);
+    const int error = WriteNamedFile(path, bytes);
     return error == 0 ? 0 : Fail(path + " cannot be written: " + Reason(error));
 }
 

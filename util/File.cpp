@@ -43,6 +43,16 @@ int FlagsOf(FileMode mode) {
     return O_RDWR | common;
 }
 
+// The errno number that tells why there is something that a file must not replace, or 0.
+int WhyNotReplaced(const std::string& path) {
+    struct stat status {};
+    if (stat(path.c_str(), &status) != 0)
+        return 0;
+    if (!S_ISREG(status.st_mode))
+        return S_ISDIR(status.st_mode) ? EISDIR : EOPNOTSUPP;
+    return access(path.c_str(), W_OK) == 0 ? 0 : errno;
+}
+
 } // namespace
 
 int FileOperations::Open(const char* path, int flags, mode_t mode) {
@@ -338,6 +348,17 @@ int WriteWholeFile(const std::string& path, const std::string& temporaryPath, st
     if (error != 0)
         static_cast<void>(RemoveFile(SystemFiles(), temporaryPath));
     return error;
+}
+
+int WriteNamedFile(const std::string& path, std::string_view content) {
+    const mode_t mask = umask(0);
+    umask(mask);
+    const std::string real = FollowLinks(path);
+    const std::string& target = real.empty() ? path : real;
+    if (const int error = WhyNotReplaced(target); error != 0)
+        return error;
+    return WriteWholeFile(target, target + ".part" + std::to_string(getpid()), content, 0666 & ~mask,
+                          ExistingFile::Replace);
 }
 
 int MoveWithoutReplacing(const std::string& from, const std::string& to) {

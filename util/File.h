@@ -136,6 +136,10 @@ enum class ExistingFile { Replace, Keep };
 [[nodiscard]] int WriteWholeFile(const std::string& path, const std::string& temporaryPath,
                                  std::string_view content, mode_t mode, ExistingFile existing);
 
+// WriteWholeFile for a file that a person named: it is as private as the person wants new files, a link to it
+// stays a link, and what is no regular file or may not be written is left alone.
+[[nodiscard]] int WriteNamedFile(const std::string& path, std::string_view content);
+
 // Renames `from` to `to`, which must not exist, not even as a link that leads nowhere: EEXIST then. Returns 0
 // or an errno number.
 [[nodiscard]] int MoveWithoutReplacing(const std::string& from, const std::string& to);
