@@ -40,36 +40,37 @@ class Backups : public CommandTest {
     }
 
     DataFolder home_;
+    const std::string in_ = "cd '" + home_.Path() + "'; ";
     std::array<std::string, 2> earlier_;
     std::array<std::string, 2> present_;
 };
 
 TEST_F(Backups, AreListedAndGoThereAndBack) {
-    const std::string in = "cd '" + home_.Path() + "'; ";
-    EXPECT_EQ(Printed(in + Command("")), "day         file        bytes  records  added  changed  removed\n"
-                                         "2026-11-20  invest.db    1317        3      1        1        1\n"
-                                         "2026-11-20  portfol.db    129        1      1        0        0\n");
-    EXPECT_TRUE(Works(in + Command("--json"), R"({"day":"2026-11-20","file":"invest.db","bytes":1317,"rec)"));
-    EXPECT_TRUE(Works(in + "chmod 640 invest.db; " + Command("restore 2026-11-20"),
+    EXPECT_EQ(Printed(in_ + Command("")),
+              "day         file        bytes  records  added  changed  removed\n"
+              "2026-11-20  invest.db    1317        3      1        1        1\n"
+              "2026-11-20  portfol.db    129        1      1        0        0\n");
+    EXPECT_TRUE(
+        Works(in_ + Command("--json"), R"({"day":"2026-11-20","file":"invest.db","bytes":1317,"rec)"));
+    EXPECT_TRUE(Works(in_ + "chmod 640 invest.db; " + Command("restore 2026-11-20"),
                       "restored invest.db, portfol.db of "));
     EXPECT_TRUE(State() == earlier_);
     // Once more on the same day, and then back to what was there at first.
-    EXPECT_TRUE(Works(in + Command("restore 2026-11-20 invest.db"), "restored invest.db of "));
-    EXPECT_TRUE(Works(in + Command("restore $(" + Command("--json") +
-                                   " | cut -c 9-25 | grep -v , | sort -u | head -n 1)")));
+    EXPECT_TRUE(Works(in_ + Command("restore 2026-11-20 invest.db"), "restored invest.db of "));
+    EXPECT_TRUE(Works(in_ + Command("restore $(" + Command("--json") +
+                                    " | cut -c 9-25 | grep -v , | sort -u | head -n 1)")));
     EXPECT_TRUE(State() == present_);
-    EXPECT_EQ(Printed(in + "stat -c '%a %n' *.db"), "640 invest.db\n600 misc.db\n600 portfol.db\n");
+    EXPECT_EQ(Printed(in_ + "stat -c '%a %n' *.db"), "640 invest.db\n600 misc.db\n600 portfol.db\n");
     // Old days go when a new one comes, and what a restore kept does not.
-    EXPECT_EQ(Printed(in + "touch $(seq -f backups/invest.db.2001-01-0%g 7) $(seq -f "
-                           "backups/invest.db.2001-01-0%g-010203 7); quorvan-cli db invest.db delete 0; "
-                           "ls backups | grep -c 010203; ls backups | grep -c 2001-01-..$"),
+    EXPECT_EQ(Printed(in_ + "touch $(seq -f backups/invest.db.2001-01-0%g 7) $(seq -f "
+                            "backups/invest.db.2001-01-0%g-010203 7); quorvan-cli db invest.db delete 0; "
+                            "ls backups | grep -c 010203; ls backups | grep -c 2001-01-..$"),
               "1 record deleted\n7\n5\n");
 }
 
 TEST_F(Backups, ThatCannotBeUsedChangeNothing) {
-    const std::string in = "cd '" + home_.Path() + "'; ";
-    ASSERT_TRUE(Works(in + "cd backups; head -c 900 invest.db.2026-11-20 >invest.db.2026-11-21; "
-                           "cp portfol.db.2026-11-20 invest.db.2026-11-22"));
+    ASSERT_TRUE(Works(in_ + "cd backups; head -c 900 invest.db.2026-11-20 >invest.db.2026-11-21; "
+                            "cp portfol.db.2026-11-20 invest.db.2026-11-22"));
     const std::pair<const char*, const char*> cases[] = {
         {"../2026-11-20", "there is no backup of ../2026-11-20 in "},
         {"2026-11-20 ../invest.db", "there is no backup of ../invest.db of 2026-11-20"},
@@ -77,9 +78,9 @@ TEST_F(Backups, ThatCannotBeUsedChangeNothing) {
         {"2026-11-22", "invest.db.2026-11-22 cannot be used: it has other columns than Quorvan's"},
     };
     for (const auto& [day, reason] : cases)
-        EXPECT_TRUE(folder_.Fails(in + Command("restore ") + day, 1, reason));
+        EXPECT_TRUE(folder_.Fails(in_ + Command("restore ") + day, 1, reason));
     EXPECT_TRUE(
-        folder_.Fails(in + "touch cut.db; " + Command("restore 2026-11-20"), 1, "what was cut is not"));
+        folder_.Fails(in_ + "touch cut.db; " + Command("restore 2026-11-20"), 1, "what was cut is not"));
     EXPECT_TRUE(State() == present_);
 }
 
