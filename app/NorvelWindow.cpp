@@ -12,7 +12,7 @@
 #include "app/state/MessageCodes.h"
 #include "platform/Application.h"
 #include "platform/Button.h"
-#include "platform/MenuBar.h"
+#include "platform/Menu.h"
 #include "platform/MenuField.h"
 #include "platform/StringView.h"
 #include "util/CharacterBuffer.h"

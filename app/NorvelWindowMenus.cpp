@@ -10,7 +10,7 @@
 #include "db/Database.h"
 #include "dialogs/PasswordDialogs.h"
 #include "platform/Application.h"
-#include "platform/MenuBar.h"
+#include "platform/Menu.h"
 #include "util/interface/InterfaceHelpers.h"
 
 namespace {

@@ -6,7 +6,7 @@
 #include <vector>
 
 #include "charts/ChartDrawing.h"
-#include "platform/CheckBox.h"
+#include "platform/Button.h"
 #include "util/Dates.h"
 #include "util/Numbers.h"
 #include "util/interface/InterfaceHelpers.h"

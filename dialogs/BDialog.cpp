@@ -3,11 +3,14 @@
 #include <algorithm>
 #include <atomic>
 #include <cmath>
+#include <string>
 
 #include "platform/Application.h"
 #include "platform/Button.h"
-#include "platform/FormView.h"
 #include "platform/Kernel.h"
+#include "platform/ScrollView.h"
+#include "platform/TextControl.h"
+#include "platform/View.h"
 #include "util/interface/InterfaceHelpers.h"
 
 namespace {
@@ -25,6 +28,10 @@ BRect Narrowed(BRect frame) {
     frame.right = std::min(frame.right, frame.left + room);
     return frame;
 }
+
+constexpr float FieldFormWidth = 200;
+constexpr float FirstHeight = 100;
+constexpr float Margin = 10;
 
 } // namespace
 
@@ -147,4 +154,24 @@ void BDialog::MessageReceived(BMessage* message) {
         BWindow::MessageReceived(message);
     else if (handled == 2)
         EndDialog(DialogOk);
+}
+
+FieldForm::FieldForm(BPoint where, const char* title, const char* label, std::size_t maxBytes, uint16 flags)
+    : BDialog({where.x, where.y, where.x + FormWidth(FieldFormWidth), where.y + FirstHeight}, title, flags) {
+    ResizeTo(Bounds().Width(), 7 * FontHeight());
+    const BRect frame(Margin, Margin, Bounds().right - Margin, Margin + 1.5F * FontHeight());
+    field_ = new BTextControl(frame, "text control", label, "", B_FOLLOW_LEFT | B_FOLLOW_TOP,
+                              B_WILL_DRAW | B_NAVIGABLE);
+    field_->SetDivider(Form()->StringWidth((label + std::string(" ")).c_str()));
+    field_->SetMaxBytes(static_cast<int32>(maxBytes));
+    Form()->AddChild(field_);
+}
+
+void FieldForm::SetText(const char* text) {
+    field_->SetText(text);
+    field_->MakeFocus();
+}
+
+const char* FieldForm::Text() const {
+    return field_->Text();
 }

@@ -1,8 +1,11 @@
 #pragma once
 
+#include <cstddef>
 #include <memory>
 
 #include "platform/Window.h"
+
+class BTextControl;
 
 // How a modal dialog ended; also the codes of its two buttons.
 inline constexpr uint32 DialogCancel = 2001; // cancelled or closed
@@ -67,4 +70,20 @@ class BDialog : public BWindow {
     BView* form_ = nullptr;
     float fontHeight_;
     std::shared_ptr<Outcome> outcome_; // shared with DoModal, which may outlive the dialog
+};
+
+// A dialog with one field for a short text, readable as typed, that has the focus and cannot grow beyond what
+// is kept of it. What the text is for is the subclasses' business.
+class FieldForm : public BDialog {
+  protected:
+    // where is the form's left top in screen coordinates; the field takes maxBytes at most.
+    FieldForm(BPoint where, const char* title, const char* label, std::size_t maxBytes, uint16 flags);
+
+    // Puts the text into the field, selected.
+    void SetText(const char* text);
+    // Valid until the text changes.
+    [[nodiscard]] const char* Text() const;
+
+  private:
+    BTextControl* field_;
 };

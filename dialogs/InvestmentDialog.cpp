@@ -5,7 +5,7 @@
 #include "app/model/PortfolioRules.h"
 #include "app/state/AppState.h"
 #include "platform/Alert.h"
-#include "platform/CheckBox.h"
+#include "platform/Button.h"
 #include "platform/MenuField.h"
 #include "platform/TextControl.h"
 #include "util/CharacterBuffer.h"

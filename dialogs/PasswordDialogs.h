@@ -1,6 +1,6 @@
 #pragma once
 
-#include "dialogs/FieldForm.h"
+#include "dialogs/BDialog.h"
 #include "util/IniFile.h"
 
 // What a password is kept in: at most 15 bytes and a NUL.

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "app/model/RecordLayouts.h"
-#include "dialogs/FieldForm.h"
+#include "dialogs/BDialog.h"
 
 class DATABASE;
 

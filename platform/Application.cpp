@@ -10,16 +10,15 @@
 #include <QFileInfo>
 #include <QIcon>
 #include <QPainter>
+#include <QPalette>
 #include <QPixmap>
 #include <QSvgRenderer>
 #include <QTimer>
 #include <QUrl>
 
 #include "platform/Window.h"
-#include "platform/private/AccessibleRoles.h"
 #include "platform/private/ApplicationPeer.h"
 #include "platform/private/Convert.h"
-#include "platform/private/Look.h"
 #include "platform/private/Loop.h"
 #include "platform/private/ViewPeer.h"
 
@@ -51,6 +50,17 @@ bool OpenWithDesktop(const char* path) {
 
 bool (*gLauncher)(const char*) = OpenWithDesktop;
 const BRoster Roster;
+
+// Controls in light colours, black on grey and white, whatever the desktop's theme: they stand between what
+// views paint in colours of their own. The person's fonts are left alone.
+// The style, too: some paint in the theme's colours whatever the palette says.
+void SetLook() {
+    QPalette palette(QColor(240, 240, 240), QColor(216, 216, 216));
+    palette.setColor(QPalette::Highlight, QColor(0, 0, 128));
+    palette.setColor(QPalette::HighlightedText, Qt::white);
+    QApplication::setStyle(QStringLiteral("Fusion"));
+    QApplication::setPalette(palette);
+}
 
 } // namespace
 

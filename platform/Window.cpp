@@ -6,11 +6,13 @@
 
 #include <QApplication>
 #include <QCloseEvent>
+#include <QGuiApplication>
 #include <QKeyEvent>
 #include <QPushButton>
+#include <QScreen>
 
 #include "platform/Button.h"
-#include "platform/FormView.h"
+#include "platform/ScrollView.h"
 #include "platform/private/ApplicationPeer.h"
 #include "platform/private/Convert.h"
 #include "platform/private/Loop.h"
@@ -255,4 +257,9 @@ void BWindow::DispatchMessage(BMessage* message, BHandler* handler) {
         view->MouseDown(where);
     else
         view->MouseUp(where);
+}
+
+BRect BScreen::Frame() const {
+    const QScreen* screen = QGuiApplication::primaryScreen();
+    return screen ? FromQt(QRectF(screen->geometry())) : BRect();
 }

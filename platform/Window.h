@@ -83,3 +83,10 @@ class BWindow : public BLooper {
     std::unique_ptr<WindowPeer> peer_;
     std::unique_ptr<BView> content_;
 };
+
+// The main screen, as of the moment of the call. Interface thread.
+class BScreen {
+  public:
+    // In logical pixels; the left top is (0, 0) on a single screen.
+    [[nodiscard]] BRect Frame() const;
+};

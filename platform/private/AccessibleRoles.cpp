@@ -1,11 +1,10 @@
-#include "platform/private/AccessibleRoles.h"
-
 #include <vector>
 
 #include <QAccessibleWidget>
 #include <QPointer>
 
 #include "platform/View.h"
+#include "platform/private/ApplicationPeer.h"
 #include "platform/private/Convert.h"
 #include "platform/private/Loop.h"
 #include "platform/private/ViewWidget.h"

@@ -29,3 +29,8 @@ struct ApplicationAccess {
 // Asks every thread that spawn_thread made to stop and waits for their ends, at most patience microseconds in
 // all.
 void StopAllThreads(bigtime_t patience);
+
+// The toolkit calls every widget that is no control of its own a mere filler, which screen readers pass over.
+// From here on windows are windows or dialogs, a view with an accessible description is a picture, and the
+// parts of a view are its children. To be called once the toolkit is there.
+void NameAccessibleRoles();

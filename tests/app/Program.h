@@ -14,7 +14,7 @@
 #include "app/rows/NorvelItem.h"
 #include "app/state/AppState.h"
 #include "app/state/MessageCodes.h"
-#include "platform/MenuBar.h"
+#include "platform/Menu.h"
 #include "platform/MenuField.h"
 #include "platform/StringView.h"
 #include "util/interface/InterfaceHelpers.h"

@@ -6,7 +6,6 @@
 
 #include "platform/Application.h"
 #include "platform/Font.h"
-#include "platform/Screen.h"
 #include "platform/View.h"
 #include "platform/Window.h"
 #include "util/CharacterBuffer.h"
