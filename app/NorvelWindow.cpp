@@ -219,7 +219,7 @@ void NorvelWindow::RestoreColumns() {
 }
 
 void NorvelWindow::SaveLayout() const {
-    const BRect frame = Frame();
+    const BRect frame = UnzoomedFrame();
     std::vector<int> place;
     for (const float number : {frame.left, frame.top, frame.Width(), frame.Height()})
         place.push_back(static_cast<int>(number));

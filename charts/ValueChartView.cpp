@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <charconv>
 #include <cmath>
+#include <limits>
 #include <vector>
 
 #include "charts/ChartDrawing.h"
@@ -130,10 +131,10 @@ void ValueChartView::FrameResized(float /*width*/, float /*height*/) {
 }
 
 void ValueChartView::MouseMoved(BPoint where, uint32 transit) {
-    if (transit == B_EXITED_VIEW || !HasChart() || !rects_.graph.Contains(where))
-        PointTo(std::nullopt);
-    else
-        PointTo(NearestTo(where));
+    std::optional<Point> nearest;
+    if (transit != B_EXITED_VIEW && HasChart() && rects_.graph.Contains(where))
+        nearest = NearestTo(where);
+    PointTo(nearest && IsDrawn(*nearest) ? nearest : std::nullopt);
 }
 
 bool ValueChartView::KeyDown(char key) {
@@ -159,7 +160,10 @@ ValueChartView::Point ValueChartView::NearestTo(BPoint where) const {
     Point nearest;
     nearest.year =
         static_cast<std::size_t>(std::lround((where.x - graph.left) / graph.Width() * GrowthYears));
-    const auto distance = [&](std::size_t row) { return std::abs(PlaceOf({nearest.year, row}).y - where.y); };
+    const auto distance = [&](std::size_t row) {
+        const Point point{nearest.year, row};
+        return IsDrawn(point) ? std::abs(PlaceOf(point).y - where.y) : std::numeric_limits<float>::infinity();
+    };
     for (std::size_t row = 1; row < RowsInUse(); ++row)
         if (distance(row) < distance(nearest.row))
             nearest.row = row;
@@ -176,7 +180,7 @@ std::string ValueChartView::PointText() const {
 }
 
 void ValueChartView::PointTo(std::optional<Point> point) {
-    if (pointed_ == point)
+    if (pointed_ == point || (point && !IsDrawn(*point)))
         return;
     pointed_ = point;
     Invalidate();
@@ -270,8 +274,11 @@ void ValueChartView::DrawRates() {
     const float height = std::ceil(::GetFontHeight(&font));
     const float left = rects_.graph.right + RateGap;
     float middle = rects_.graph.bottom + height;
-    for (std::size_t row = 0; row < RowsInUse() && std::isfinite(points_[row].back()); ++row) {
-        const BPoint end = PlaceOf({GrowthYears, row});
+    for (std::size_t row = 0; row < RowsInUse(); ++row) {
+        std::size_t last = GrowthYears;
+        while (last > 0 && !IsDrawn({last, row}))
+            --last;
+        const BPoint end = PlaceOf({last, row});
         middle = std::min(middle - height, end.y);
         SetHighColor(LineColors[row]);
         StrokeLine(end, {left - 2, middle});

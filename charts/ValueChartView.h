@@ -1,6 +1,7 @@
 #pragma once
 
 #include <array>
+#include <cmath>
 #include <optional>
 #include <string>
 #include <vector>
@@ -47,6 +48,8 @@ class ValueChartView : public BView {
 
     void AddCheckBox();
     [[nodiscard]] bool HasChart() const;
+    // A curve ends where a float ends.
+    [[nodiscard]] bool IsDrawn(Point point) const { return std::isfinite(points_[point.row][point.year]); }
     [[nodiscard]] std::size_t RowsInUse() const;
     [[nodiscard]] BPoint PlaceOf(Point point) const;
     [[nodiscard]] Point NearestTo(BPoint where) const;

@@ -150,6 +150,11 @@ BRect BWindow::Frame() const {
     return FromQt(QRectF(peer_->widget->geometry()));
 }
 
+BRect BWindow::UnzoomedFrame() const {
+    const WindowWidget* widget = peer_->widget;
+    return widget->isMaximized() ? FromQt(QRectF(widget->normalGeometry())) : Frame();
+}
+
 BRect BWindow::Bounds() const {
     return FromQt(QRectF(peer_->widget->rect()));
 }

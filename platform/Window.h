@@ -44,6 +44,8 @@ class BWindow : public BLooper {
     // Frame is in screen coordinates; Bounds is the same size at (0, 0).
     [[nodiscard]] BRect Frame() const;
     [[nodiscard]] BRect Bounds() const;
+    // The frame, or while the window fills its screen the one that it goes back to.
+    [[nodiscard]] BRect UnzoomedFrame() const;
     // The part of the screen at this place that a window's content can fill.
     [[nodiscard]] static BRect RoomAt(BPoint where);
     void MoveTo(float x, float y);

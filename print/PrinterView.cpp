@@ -88,19 +88,23 @@ long PrinterView::ReadRows(long wanted, std::vector<Row>& rows) {
     return all;
 }
 
-void PrinterView::SetTableFont(BRect place, long rowCount) {
+bool PrinterView::SetTableFont(BRect place, long rowCount) {
     BFont font(*be_fixed_font);
     font.SetSize(std::min(font.Size(), LargestFont));
     font = FittingFont(font, std::string(TableCharacters(), 'm'), place.Width(), 1);
+    const float widest = font.Size();
     while (PRINT_TABLE::RowsWithin(place.Height(), font) < rowCount && font.Size() > LeastTableFont)
         font.SetSize(std::max(font.Size() - SizeStep, LeastTableFont));
     SetFont(&font);
+    return font.Size() < widest;
 }
 
 void PrinterView::DrawTable(BRect place, const std::vector<Row>& rows) {
-    SetTableFont(place, static_cast<long>(rows.size()));
+    // Rows that became less high leave the columns their width.
+    const bool areLower = SetTableFont(place, static_cast<long>(rows.size()));
     auto columns = ReportColumns;
-    PRINT_TABLE table(this, place.left, place.top, ReportColumnCount, columns.data(), 0);
+    PRINT_TABLE table(this, place.left, place.top, ReportColumnCount, columns.data(),
+                      areLower ? place.Width() : 0);
     table.DrawHeader();
     for (const Row& row : rows)
         table.Measure(row.cells[0], ReportCellSize);

@@ -36,7 +36,8 @@ class PrinterView : public BView {
     // Reads the first rows of the portfolio, as many as may be wanted. Returns how many it has in all.
     [[nodiscard]] long ReadRows(long wanted, std::vector<Row>& rows);
     // Sets the largest font in which the table fits the place in its width, and that many rows its height.
-    void SetTableFont(BRect place, long rowCount);
+    // Whether the rows made it smaller.
+    bool SetTableFont(BRect place, long rowCount);
     void DrawTable(BRect place, const std::vector<Row>& rows);
     // Sets the largest font in which the texts of all these bars, so wide, fit side by side.
     void SetBarFont(float width, std::span<const Bar> bars);

@@ -31,10 +31,14 @@ bool HasCommaBehindNumber(std::string_view token) {
 // Whether the text of the price, or of its fraction, goes on to the end of what lies behind the price in its
 // piece of the page, so that more of it may be in the next piece.
 bool ReachesEnd(std::string_view following, double fraction) {
-    const std::string text = Lowered(following);
-    if (text.find("sup") != text.npos)
-        return fraction < 0 || (text.back() >= '0' && text.back() <= '9');
-    return text.find_first_not_of("0123456789/ ") == text.npos || std::string_view("sup").starts_with(text);
+    constexpr std::string_view digits = "0123456789";
+    std::string text = Lowered(following);
+    text.erase(0, text.find_first_not_of(" \t\r\n<"));
+    if (!text.starts_with("sup"))
+        return fraction < 0 || text.find_first_not_of("0123456789/ ") == text.npos ||
+               std::string_view("sup").starts_with(text);
+    const std::size_t below = text.find('>', std::min(text.find("sub"), text.size()));
+    return fraction < 0 || below == text.npos || text.find_first_not_of(digits, below + 1) == text.npos;
 }
 
 std::string Number(double value, int decimals) {

@@ -32,7 +32,9 @@ class DialogPlacer : public QObject {
         : QObject(&dialog), dialog_(dialog), middle_((below ? below->geometry() : RoomAt({})).center()) {}
 
     bool eventFilter(QObject* watched, QEvent* event) override {
-        if (event->type() == QEvent::Show && !event->spontaneous()) {
+        // The desktop's own dialog, in the place of the toolkit's, has its place from the desktop.
+        const bool isOurs = !dialog_.testAttribute(Qt::WA_DontShowOnScreen);
+        if (event->type() == QEvent::Show && !event->spontaneous() && isOurs) {
             const QRect room = RoomAt(middle_);
             LayOut();
             QWidget* part = LargePart();
@@ -53,8 +55,9 @@ class DialogPlacer : public QObject {
     // The text of an alert, or else what the dialog begins with; null when that is not most of it.
     [[nodiscard]] QWidget* LargePart() const {
         QWidget* part = dialog_.findChild<QLabel*>(QStringLiteral("qt_msgbox_label"));
-        if (!part)
-            part = dialog_.layout()->itemAt(0)->widget();
+        const QLayoutItem* first = dialog_.layout() ? dialog_.layout()->itemAt(0) : nullptr;
+        if (!part && first)
+            part = const_cast<QLayoutItem*>(first)->widget();
         return part && 2 * part->height() > dialog_.height() ? part : nullptr;
     }
     void LetScroll(QWidget* part, QSize room) {
@@ -99,8 +102,16 @@ void KeepAbove(QWidget& window, const QWidget* below) {
 }
 
 QRect RoomAt(QPoint place) {
-    const QScreen* at = QGuiApplication::screenAt(place);
-    const QScreen* screen = at ? at : QGuiApplication::primaryScreen();
+    const auto distance = [place](const QScreen* screen) {
+        const QRect all = screen->geometry();
+        const QPoint nearest(std::clamp(place.x(), all.left(), all.right()),
+                             std::clamp(place.y(), all.top(), all.bottom()));
+        return (place - nearest).manhattanLength();
+    };
+    const QList<QScreen*> screens = QGuiApplication::screens();
+    const QScreen* screen =
+        *std::min_element(screens.begin(), screens.end(),
+                          [&](const QScreen* a, const QScreen* b) { return distance(a) < distance(b); });
     return screen->availableGeometry().marginsRemoved(WindowFrame());
 }
 
