@@ -25,9 +25,9 @@ struct Written {
 };
 
 // A surface that keeps the texts that a widget writes on it, and nothing else.
-class TextRecorder : public QPaintEngine, public QPaintDevice {
+class TextRecorder : public QPaintEngine, public QImage {
   public:
-    explicit TextRecorder(QWidget* widget) : QPaintEngine(AllFeatures), widget_(widget) {
+    explicit TextRecorder(QWidget* widget) : QPaintEngine(AllFeatures), QImage(widget->size(), Format_RGB32) {
         widget->render(this);
     }
     std::vector<Written> written;
@@ -38,13 +38,11 @@ class TextRecorder : public QPaintEngine, public QPaintDevice {
         if (ink.isEmpty())
             return;
         const QRectF box = place.mapRect(QRectF(at.x(), at.y() + ink.top(), item.width(), ink.height()));
-        QRectF seen = widget_->rect();
+        QRectF seen = rect();
         if (painter()->hasClipping())
             seen &= place.mapRect(painter()->clipBoundingRect());
-        const double blur = 0.5; // of a smooth edge
-
-        written.push_back({item.text().toStdString(), box, item.font().pixelSize() * place.m22(),
-                           seen.adjusted(-blur, -blur, blur, blur).contains(box)});
+        const bool whole = seen.marginsAdded({0.5, 0.5, 0.5, 0.5}).contains(box); // but for a blurred edge
+        written.push_back({item.text().toStdString(), box, item.font().pixelSize() * place.m22(), whole});
     }
     bool begin(QPaintDevice*) override { return true; }
     bool end() override { return true; }
@@ -54,19 +52,6 @@ class TextRecorder : public QPaintEngine, public QPaintDevice {
     void drawPixmap(const QRectF&, const QPixmap&, const QRectF&) override {}
     [[nodiscard]] Type type() const override { return User; }
     [[nodiscard]] QPaintEngine* paintEngine() const override { return const_cast<TextRecorder*>(this); }
-
-  protected:
-    [[nodiscard]] int metric(PaintDeviceMetric metric) const override {
-        return metric == PdmWidth                    ? widget_->width()
-               : metric == PdmHeight                 ? widget_->height()
-               : metric == PdmDepth                  ? 32
-               : metric == PdmDevicePixelRatio       ? 1
-               : metric == PdmDevicePixelRatioScaled ? static_cast<int>(devicePixelRatioFScale())
-                                                     : 96;
-    }
-
-  private:
-    QWidget* widget_;
 };
 
 // What the view of a name, of which there is only one, writes, in the order it is drawn.
@@ -100,9 +85,9 @@ struct Picture : QImage {
         loadFromData(QByteArray::fromStdString(DrawPicture(&view, PictureFormat::Png)));
     }
     [[nodiscard]] rgb_color At(BPoint point) const {
-        const QColor color = pixelColor(static_cast<int>(point.x), static_cast<int>(point.y));
-        const auto part = [](int value) { return static_cast<uint8>(value); };
-        return {part(color.red()), part(color.green()), part(color.blue()), 255};
+        const QRgb color = pixel(static_cast<int>(point.x), static_cast<int>(point.y));
+        const auto part = [color](int shift) { return static_cast<uint8>(color >> shift); };
+        return {part(16), part(8), part(0), 255};
     }
     // Near the point.
     [[nodiscard]] bool Has(BPoint point, rgb_color color) const {

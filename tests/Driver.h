@@ -9,7 +9,7 @@ class Driver : public StepDriver {
   public:
     ~Driver() override { FailForStepsLeft(); }
 
-    // A step as soon as the keyboard is in a field.
+    // Once the keyboard is in a field.
     void InField(Action action) { When("a field", Field, std::move(action)); }
 
   protected:

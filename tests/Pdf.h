@@ -1,7 +1,7 @@
 #pragma once
 
 #include <algorithm>
-#include <cstdio>
+#include <sstream>
 #include <string>
 #include <vector>
 
@@ -15,22 +15,15 @@ struct PdfWord {
     float left = -1, top = -1, right = -1, bottom = -1;
 };
 
-// The words of a page, counted from 1, as they follow each other in the file.
-inline std::vector<PdfWord> PdfWords(const std::string& file, int page = 1) {
-    const std::string number = std::to_string(page);
-    const std::string list = Output("pdftotext -f " + number + " -l " + number + " -bbox " + file + " -");
+// The words of the first page, as they follow each other in the file.
+inline std::vector<PdfWord> PdfWords(const std::string& file) {
+    std::istringstream list(Output("pdftotext -l 1 -bbox " + file + R"( - | sed -n 's/"//g
+        s/.*<word xMin=\(.*\) yMin=\(.*\) xMax=\(.*\) yMax=\(.*\)>\(.*\)<.*/\1 \2 \3 \4 \5/p')"));
     std::vector<PdfWord> words;
-    std::size_t place = 0;
-    while ((place = list.find("<word", place)) != std::string::npos) {
-        PdfWord& word = words.emplace_back();
-        std::sscanf(list.c_str() + place, "<word xMin=\"%f\" yMin=\"%f\" xMax=\"%f\" yMax=\"%f\"", &word.left,
-                    &word.top, &word.right, &word.bottom);
-        place = list.find('>', place) + 1;
-        word.text = list.substr(place, list.find("</word>", place) - place);
-    }
+    for (PdfWord word; list >> word.left >> word.top >> word.right >> word.bottom >> word.text;)
+        words.push_back(word);
     return words;
 }
-
 // The first such word; one at -1 when there is none.
 inline PdfWord FindWord(const std::vector<PdfWord>& words, const std::string& text) {
     const auto found = std::ranges::find(words, text, &PdfWord::text);

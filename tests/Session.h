@@ -18,12 +18,10 @@
 // False when the condition does not come true within a minute.
 inline bool WaitUntil(const std::function<bool()>& condition) {
     const auto end = std::chrono::steady_clock::now() + std::chrono::seconds(60);
-    while (!condition()) {
-        if (std::chrono::steady_clock::now() > end)
-            return false;
+    bool is = condition();
+    for (; !is && std::chrono::steady_clock::now() < end; is = condition())
         std::this_thread::sleep_for(std::chrono::milliseconds(20));
-    }
-    return true;
+    return is;
 }
 
 // What a shell runs, as a child process that ends with the object. A single program is to take the shell's

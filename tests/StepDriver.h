@@ -32,9 +32,9 @@ class StepDriver : public QObject {
     StepDriver() {
         self_ = this;
         if (QCoreApplication::instance())
-            Begin();
+            Poll();
         else
-            qAddPreRoutine([] { self_->Begin(); });
+            qAddPreRoutine([] { self_->Poll(); });
     }
     ~StepDriver() override { self_ = nullptr; }
 
@@ -51,7 +51,7 @@ class StepDriver : public QObject {
     // Waits for an alert with this text and presses one of its buttons. The next step comes when the code
     // that showed it has gone on.
     StepDriver& Answer(const std::string& text, const char* button) {
-        const auto shown = [text] { return Alert() && Alert()->text() == QString::fromStdString(text); };
+        const auto shown = [text] { return Alert() && Alert()->text() == text.c_str(); };
         return When("alert: " + text, shown, [this, button] {
             answered_ = Alert();
             Press(answered_, button);
@@ -156,10 +156,6 @@ class StepDriver : public QObject {
             if ((item->menu() ? item->menu()->objectName() : item->objectName()) == name)
                 QTest::mouseClick(menu, Qt::LeftButton, {}, menu->actionGeometry(item).center());
     }
-    void Begin() {
-        deadline_.setRemainingTime(PatienceMilliseconds);
-        QTimer::singleShot(PollMilliseconds, Qt::CoarseTimer, this, &StepDriver::Poll);
-    }
     void Poll() {
         const bool ready = !answered_ && !steps_.empty() && steps_.front().condition();
         if (!ready && deadline_.hasExpired()) {
@@ -181,5 +177,5 @@ class StepDriver : public QObject {
     static inline StepDriver* self_ = nullptr;
     std::deque<Step> steps_;
     QPointer<QMessageBox> answered_;
-    QDeadlineTimer deadline_;
+    QDeadlineTimer deadline_{PatienceMilliseconds};
 };

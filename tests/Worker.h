@@ -20,8 +20,6 @@ class Worker {
         id_ = spawn_thread(run, "worker", suggest_thread_priority(), this);
         resume_thread(id_);
     }
-    Worker(const Worker&) = delete;
-    Worker& operator=(const Worker&) = delete;
     ~Worker() {
         while (!ended_)
             QTest::qWait(1);
