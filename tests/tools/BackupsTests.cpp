@@ -1,7 +1,4 @@
 #include "CommandTest.h"
-#include "DataFolder.h"
-#include "InChild.h"
-#include "db/FaultyFiles.h"
 #include "tools/Backups.h"
 
 namespace {
@@ -9,7 +6,7 @@ namespace {
 namespace fs = std::filesystem;
 
 // A folder with portfolios A and B, and its backups of a day on which there was no B.
-class Backups : public CommandTest {
+class Backups : public HomeTest {
   protected:
     Backups() {
         fs::create_directory(home_.File("backups"));
@@ -28,37 +25,29 @@ class Backups : public CommandTest {
     }
     // The bytes of both files.
     std::array<std::string, 2> State() const { return {home_.Read("portfol.db"), home_.Read("invest.db")}; }
-    // In the folder, as each command here.
-    static std::string Command(const std::string& arguments) {
-        return "quorvan-cli backups --home . " + arguments;
-    }
     int Restore(FileOperations& files) const {
         std::string kept;
-        std::vector<BackupFile> backups = FindBackups(home_.Path());
-        std::erase_if(backups, [](const BackupFile& backup) { return backup.day != "2026-11-20"; });
+        const std::vector<BackupFile> found = FindBackups(home_.Path()); // and what restores kept
+        const std::vector<BackupFile> backups(found.begin(), found.begin() + 2);
         return RestoreBackups(ToolFolder(home_.Path()), backups, &kept, files).empty() ? 0 : 1;
     }
 
-    DataFolder home_;
-    const std::string in_ = "cd '" + home_.Path() + "'; ";
+    const std::string in_ = "cd '" + home_.Path() + "'; backups() { quorvan-cli backups --home . $*; }; ";
     std::array<std::string, 2> earlier_;
     std::array<std::string, 2> present_;
 };
 
 TEST_F(Backups, AreListedAndGoThereAndBack) {
-    EXPECT_EQ(Printed(in_ + Command("")),
-              "day         file        bytes  records  added  changed  removed\n"
-              "2026-11-20  invest.db    1317        3      1        1        1\n"
-              "2026-11-20  portfol.db    129        1      1        0        0\n");
+    EXPECT_EQ(Printed(in_ + "backups"), "day         file        bytes  records  added  changed  removed\n"
+                                        "2026-11-20  invest.db    1317        3      1        1        1\n"
+                                        "2026-11-20  portfol.db    129        1      1        0        0\n");
     EXPECT_TRUE(
-        Works(in_ + Command("--json"), R"({"day":"2026-11-20","file":"invest.db","bytes":1317,"rec)"));
-    EXPECT_TRUE(Works(in_ + "chmod 640 invest.db; " + Command("restore 2026-11-20"),
-                      "restored invest.db, portfol.db of "));
+        Works(in_ + "chmod 640 invest.db; backups restore 2026-11-20", "restored invest.db, portfol.db of "));
     EXPECT_TRUE(State() == earlier_);
     // Once more on the same day, and then back to what was there at first.
-    EXPECT_TRUE(Works(in_ + Command("restore 2026-11-20 invest.db"), "restored invest.db of "));
-    EXPECT_TRUE(Works(in_ + Command("restore $(" + Command("--json") +
-                                    " | cut -c 9-25 | grep -v , | sort -u | head -n 1)")));
+    EXPECT_TRUE(Works(in_ + "backups restore 2026-11-20 invest.db", "restored invest.db of "));
+    EXPECT_TRUE(
+        Works(in_ + "backups restore $(backups --json | cut -c 9-25 | grep -v , | sort -u | head -n 1)"));
     EXPECT_TRUE(State() == present_);
     EXPECT_EQ(Printed(in_ + "stat -c '%a %n' *.db"), "640 invest.db\n600 misc.db\n600 portfol.db\n");
     // Old days go when a new one comes, and what a restore kept does not.
@@ -76,42 +65,26 @@ TEST_F(Backups, ThatCannotBeUsedChangeNothing) {
         {"2026-11-20 ../invest.db", "there is no backup of ../invest.db of 2026-11-20"},
         {"2026-11-21", "invest.db.2026-11-21 cannot be used: it is damaged"},
         {"2026-11-22", "invest.db.2026-11-22 cannot be used: it has other columns than Quorvan's"},
+        {"2026-11-20 $(touch cut.db)", "what was cut is not pasted yet"},
     };
     for (const auto& [day, reason] : cases)
-        EXPECT_TRUE(folder_.Fails(in_ + Command("restore ") + day, 1, reason));
-    EXPECT_TRUE(
-        folder_.Fails(in_ + "touch cut.db; " + Command("restore 2026-11-20"), 1, "what was cut is not"));
+        EXPECT_TRUE(folder_.Fails(in_ + "backups restore " + day, 1, reason));
     EXPECT_TRUE(State() == present_);
 }
 
 // Whatever fails, and wherever it is killed, each file is of one state, and doing it again finishes it.
 TEST_F(Backups, SurviveEveryFaultOfARestore) {
-    struct : FileOperations {
-        int Sync(int /*file*/) override { return 0; }
-    } quick;
-    const TemporaryFolder before;
-    fs::copy(home_.Path(), before.Path(), fs::copy_options::recursive);
-    for (const Fault fault : {Fault::HalfThenError, Fault::KilledBefore}) {
-        for (int at = 0, result = -1; result < 0 || result > 1; ++at) {
-            home_.Clear();
-            fs::copy(before.Path(), home_.Path(), fs::copy_options::recursive);
-            result = ResultInChild([&] {
-                FaultyFiles files;
-                files.Arm(fault, at);
-                const int restored = Restore(files);
-                return files.Disarm() ? 2 + restored : restored;
-            });
-            for (const std::size_t i : {0U, 1U})
-                EXPECT_TRUE(State()[i] == earlier_[i] || State()[i] == present_[i]) << at;
-            EXPECT_TRUE(result < 0 || !home_.Has("invest.db.part")) << at;
-            EXPECT_EQ(Restore(quick), 0);
-            EXPECT_TRUE(State() == earlier_) << at;
-            std::string kept;
-            for (const auto& entry : fs::directory_iterator(home_.File("backups")))
-                kept += home_.Read("backups/" + entry.path().filename().string());
-            EXPECT_TRUE(kept.find(present_[0]) != kept.npos && kept.find(present_[1]) != kept.npos) << at;
-        }
-    }
+    const auto restore = [this](FileOperations& files) { return Restore(files); };
+    AtEveryCall({Fault::HalfThenError, Fault::KilledBefore}, restore, [this](int result) {
+        for (const std::size_t i : {0U, 1U})
+            EXPECT_TRUE(State()[i] == earlier_[i] || State()[i] == present_[i]);
+        EXPECT_TRUE(result < 0 || !home_.Has("invest.db.part"));
+        FileOperations files;
+        EXPECT_EQ(Restore(files), 0);
+        EXPECT_TRUE(State() == earlier_);
+        const std::string kept = Printed(in_ + "cat backups/*");
+        EXPECT_TRUE(kept.find(present_[0]) != kept.npos && kept.find(present_[1]) != kept.npos);
+    });
 }
 
 } // namespace

@@ -1,10 +1,11 @@
 #pragma once
 
-#include <gtest/gtest.h>
-
 #include <string>
 
+#include "DataFolder.h"
+#include "InChild.h"
 #include "Shell.h"
+#include "db/FaultyFiles.h"
 
 // The built quorvan-cli as a person runs it in a folder, with `built` for the program and without a display.
 class CommandTest : public testing::Test {
@@ -56,4 +57,33 @@ class CommandTest : public testing::Test {
     }
 
     Shell folder_;
+};
+
+// The same with a program's folder.
+class HomeTest : public CommandTest {
+  protected:
+    // For each fault: does work in a child process with the folder as it is now, once for each of its calls
+    // that change a file and meet the fault, and looks at what became of it: 0 well done, 1 failed, -1
+    // killed; over 1 in the end, when no call was left for the fault.
+    void AtEveryCall(const std::vector<Fault>& faults, const std::function<int(FileOperations&)>& work,
+                     const std::function<void(int)>& look) {
+        constexpr auto all = std::filesystem::copy_options::recursive;
+        const TemporaryFolder before;
+        std::filesystem::copy(home_.Path(), before.Path(), all);
+        for (std::size_t i = 0; i < faults.size(); ++i)
+            for (int at = 0, result = 0; result < 2; ++at) {
+                SCOPED_TRACE("fault " + std::to_string(i) + " at call " + std::to_string(at));
+                home_.Clear();
+                std::filesystem::copy(before.Path(), home_.Path(), all);
+                result = ResultInChild([&] {
+                    FaultyFiles files;
+                    files.Arm(faults[i], at);
+                    const int failed = work(files);
+                    return files.Disarm() ? failed : 2 + failed;
+                });
+                look(result);
+            }
+    }
+
+    DataFolder home_;
 };

@@ -9,8 +9,27 @@ namespace {
 class FailureTest : public CommandTest {};
 
 TEST_F(FailureTest, AWrongCommandLineDoesNothing) {
-    for (const std::string arguments : {"", "quote", "chart A 2000", "report A", "report -o A", "setup",
-                                        "db A", "db A create", "db A query a b"})
+    for (const std::string arguments : {"",
+                                        "quote",
+                                        "chart A 2000",
+                                        "report A",
+                                        "report -o A",
+                                        "setup",
+                                        "db A",
+                                        "db A create",
+                                        "db A query a b",
+                                        "list --sort Name",
+                                        "list A --sort Status",
+                                        "export",
+                                        "export A --all",
+                                        "import A",
+                                        "import --all",
+                                        "import --all A t.csv",
+                                        "import A t.csv --decimal x",
+                                        "import A t.csv --delimiter ab",
+                                        "import A t.csv --column Amount=N",
+                                        "import A t.csv --update-by name",
+                                        "import A t.csv --json"})
         EXPECT_EQ(folder_.Run("quorvan-cli " + arguments), 2) << arguments;
     const std::pair<std::string, const char*> cases[] = {
         {"quote A --home home --source 'n h /q Last 2'", "excludes"},
@@ -36,7 +55,7 @@ TEST_F(FailureTest, AWrongCommandLineDoesNothing) {
 }
 
 TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
-    ASSERT_TRUE(Works(Setup("--sample")));
+    ASSERT_TRUE(Works(Setup("--sample") + "; quorvan-cli db home/portfol.db append Name=A"));
     ASSERT_TRUE(Works(R"sh(quorvan-cli db a.db create --column N:byte --column Name:string:8
         quorvan-cli db a.db append N=1; head -c 70 a.db >short.db
         head -c 36 a.db >bad.db; printf '\11' >>bad.db; tail -c +38 a.db >>bad.db
@@ -47,6 +66,9 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
         cp -r home "$(printf '\377')"
         XDG_DATA_HOME=$PWD/full quorvan-cli setup home --program built --desktop
         rm -r full/applications; echo >full/applications
+        printf 'Name\nA\n' >t.csv; for each in cut bad read lost; do cp -r home $each; done; cp home/*.db held
+        quorvan-cli db lost/invest.db append Portfolio=Lost; head -c 60 home/invest.db >cut/invest.db
+        printf '\377' | dd of=bad/invest.db bs=1 seek=36 conv=notrunc 2>&-; chmod 555 read; chmod 444 read/*.db
         mkdir kept; cp a.db kept; chmod 444 kept/a.db; chmod 777 . kept)sh"));
     // As an ordinary user, also where the tests run as root, whom no permission keeps out.
     const std::string reader = getuid() == 0 ? "setpriv --reuid 65534 --clear-groups ./alone" : "./alone";
@@ -61,7 +83,7 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
     const std::string chart = "quorvan-cli chart --home home 'My Retirement Fund' 2000 -o ";
     const std::string report = "quorvan-cli report --home home 'My Retirement Fund' -o ";
     const std::pair<std::string, std::string> cases[] = {
-        {"quorvan-cli chart --home home A 2000 -o old.png", "there is no portfolio \"A\" in home"},
+        {"quorvan-cli chart --home home B 2000 -o old.png", "there is no portfolio \"B\" in home"},
         {chart + "missing/new.png", "missing/new.png cannot be written: No such file"},
         {"ulimit -f 4; trap '' XFSZ; " + chart + "old.png", "old.png cannot be written: "},
         {chart + "pipe.png", "pipe.png cannot be written: "},
@@ -104,6 +126,19 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
         {"quorvan-cli db left/b.db create --column N:byte",
          "left/b.new, as an interrupted compaction leaves it; `check --repair`"},
         {"quorvan-cli db block/a.db append", "the day's backup cannot be made in the folder backups"},
+        {"quorvan-cli list --home nowhere", "nowhere/portfol.db cannot be opened: No such file"},
+        {"quorvan-cli list a --home home", "there is no portfolio \"a\" in home, but \"A\""},
+        {"quorvan-cli list --home cut", "cut/invest.db cannot be opened: header and 13 columns need"},
+        {"quorvan-cli list --home home >/dev/full", "the output cannot be written: No space left on device"},
+        {"quorvan-cli export --all --home home -o left", "left cannot be written: Is a directory"},
+        {"quorvan-cli import B t.csv --home home", "there is no portfolio 'B'; --create makes it"},
+        {"quorvan-cli import a t.csv --create --home home", "\"a\" in home, but \"A\""},
+        {"quorvan-cli import $(seq -s x 20) t.csv --create --home home", "can be no portfolio's name"},
+        {"quorvan-cli import Lost t.csv --create --home lost", "`quorvan-cli check --repair` lists it"},
+        {"quorvan-cli import A t.csv --home held", held},
+        {"quorvan-cli import A t.csv --home bad", "bad/invest.db is damaged: its header disagrees with it"},
+        {reader + " import A t.csv --home read", "programs cannot be kept out of the folder: read/"},
+        {"quorvan-cli check --repair --home held", held},
     };
     for (const auto& [command, reason] : cases)
         EXPECT_TRUE(folder_.Fails(command, 1, reason));
