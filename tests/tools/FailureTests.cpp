@@ -1,4 +1,5 @@
 // What each command refuses, or cannot do: it says so in one sentence and leaves every file alone.
+#include <sstream>
 #include <unistd.h>
 
 #include "CommandTest.h"
@@ -9,42 +10,24 @@ namespace {
 class FailureTest : public CommandTest {};
 
 TEST_F(FailureTest, AWrongCommandLineDoesNothing) {
-    for (const std::string arguments : {"",
-                                        "quote",
-                                        "chart A 2000",
-                                        "report A",
-                                        "report -o A",
-                                        "setup",
-                                        "db A",
-                                        "db A create",
-                                        "db A query a b",
-                                        "list --sort Name",
-                                        "list A --sort Status",
-                                        "export",
-                                        "export A --all",
-                                        "import A",
-                                        "import --all",
-                                        "import --all A t.csv",
-                                        "import A t.csv --decimal x",
-                                        "import A t.csv --delimiter ab",
-                                        "import A t.csv --column Amount=N",
-                                        "import A t.csv --update-by name",
-                                        "import A t.csv --json"})
+    std::istringstream wrong(
+        "|quote|chart A 2000|report A|report -o A|setup|db A|db A create|db A query a b|list --sort Name|"
+        "list A --sort Status|export|export A --all|import A|import --all|import --all A t.csv|"
+        "import A t.csv --decimal x|import A t.csv --delimiter ab|import A t.csv --column Amount=N|"
+        "import A t.csv --update-by name|import A t.csv --json|quote A --home home --source 'n h /q Last 2'|"
+        "setup new --desktop --remove-desktop|db A delete 1 --where 'N = 1'|db A undelete --where 'N = 1'");
+    for (std::string arguments; std::getline(wrong, arguments, '|');)
         EXPECT_EQ(folder_.Run("quorvan-cli " + arguments), 2) << arguments;
     const std::pair<std::string, const char*> cases[] = {
-        {"quote A --home home --source 'n h /q Last 2'", "excludes"},
         {"quote ''", "a ticker is empty"},
         {"quote \"$(printf 'A\\tB')\"", "control characters"},
         {"quote A --source 'net h /q?s= Last'", "it has fewer than five fields"},
         {"chart A 2008 -o new.png", "there is no chart '2008'; there are 2000 to 2007"},
         {"chart A 2000 -o new.gif", "must end with .png, .svg or .pdf"},
         {"chart A 2000 -o new.png --scale nan", "the scale must be a number"},
-        {"setup new --desktop --remove-desktop", "excludes"},
         {"db new.db query --format xml", "'xml' is none of table, tsv and json"},
         {"db new.db set 'N = 1'", "--where or --all"},
         {"db new.db set 'N = 1' --where ''", "the statement is empty"},
-        {"db new.db delete 1 --where 'N = 1'", "excludes"},
-        {"db new.db undelete --where 'N = 1'", "RECORD"},
         {"db new.db delete", "A record's number"},
         {"db new.db append N", "a value is NAME=VALUE, not 'N'"},
         {"db new.db create --column N:text", "'text' is none of the types"},
@@ -55,22 +38,22 @@ TEST_F(FailureTest, AWrongCommandLineDoesNothing) {
 }
 
 TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
-    ASSERT_TRUE(Works(Setup("--sample") + "; quorvan-cli db home/portfol.db append Name=A"));
-    ASSERT_TRUE(Works(R"sh(quorvan-cli db a.db create --column N:byte --column Name:string:8
-        quorvan-cli db a.db append N=1; head -c 70 a.db >short.db
+    ASSERT_TRUE(
+        Works(Setup("--sample") + R"sh(; db() { quorvan-cli db "$@"; }; db home/portfol.db append Name=A
+        for _ in 1 2; do db home/invest.db append Portfolio=A Value=3e38; done
+        db a.db create --column N:byte --column Name:string:8; db a.db append N=1; head -c 70 a.db >short.db
         head -c 36 a.db >bad.db; printf '\11' >>bad.db; tail -c +38 a.db >>bad.db
-        mkdir other held left block folder.png; mkfifo p; ln -s p pipe.png; echo old | tee old.png >old.pdf
+        mkdir other held left block folder.png; echo old >old.png
         cp home/*.db other; cp a.db other/invest.db; cp a.db held; ln -s ../held/a.db other/link.db
         cp a.db block; echo >block/backups; cp a.db left/a.bak; cp a.db left/b.new
         cp -r home new; rm new/quorvan; cp "$(command -v quorvan-cli)" alone
         cp -r home "$(printf '\377')"
         XDG_DATA_HOME=$PWD/full quorvan-cli setup home --program built --desktop
         rm -r full/applications; echo >full/applications
-        printf 'Name\nA\n' >t.csv; for each in cut bad read lost; do cp -r home $each; done; cp home/*.db held
-        quorvan-cli db lost/invest.db append Portfolio=Lost; head -c 60 home/invest.db >cut/invest.db
-        printf '\377' | dd of=bad/invest.db bs=1 seek=36 conv=notrunc 2>&-; chmod 555 read; chmod 444 read/*.db
+        printf 'Name\nA\n' >t.csv; for each in bad read lost; do cp -r home $each; done; cp home/*.db held
+        db lost/invest.db append Portfolio=Lost; printf '\377' | dd of=bad/invest.db bs=1 seek=36 conv=notrunc 2>&-; chmod 555 read; chmod 444 read/*.db
         mkdir kept; cp a.db kept; chmod 444 kept/a.db; chmod 777 . kept)sh"));
-    // As an ordinary user, also where the tests run as root, whom no permission keeps out.
+    // An ordinary user, also where the tests run as root, whom no permission keeps out.
     const std::string reader = getuid() == 0 ? "setpriv --reuid 65534 --clear-groups ./alone" : "./alone";
     EXPECT_TRUE(Works(reader + " db kept/a.db query --format tsv", "record\tN\tName\n0\t1\t\n"));
     FolderLock lock;
@@ -81,15 +64,14 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
     const std::string held = "in use by quorvan (process " + std::to_string(getpid()) + " on ";
     const std::string doubt = "once that program has ended, delete " + folder_.File("other/Quorvan.lock");
     const std::string chart = "quorvan-cli chart --home home 'My Retirement Fund' 2000 -o ";
-    const std::string report = "quorvan-cli report --home home 'My Retirement Fund' -o ";
     const std::pair<std::string, std::string> cases[] = {
         {"quorvan-cli chart --home home B 2000 -o old.png", "there is no portfolio \"B\" in home"},
+        {"quorvan-cli chart --home home A 2007 -o old.png", "a value in the portfolio is not a number, or "},
         {chart + "missing/new.png", "missing/new.png cannot be written: No such file"},
         {"ulimit -f 4; trap '' XFSZ; " + chart + "old.png", "old.png cannot be written: "},
-        {chart + "pipe.png", "pipe.png cannot be written: "},
         {"quorvan-cli report --home nowhere A -o old.pdf", "nowhere/portfol.db cannot be opened"},
         {"quorvan-cli report --home other 'My Retirement Fund' -o a", "other/invest.db has other columns"},
-        {"ulimit -f 4; " + report + "old.pdf", "old.pdf cannot be written: "},
+        {"quorvan-cli report --home home A -o missing/a", "missing/a cannot be written: No such file"},
         {Setup("", "built/home"), "cannot be made: Not a directory"},
         {Setup("", ""), "the name is empty"},
         {Setup("", std::string(109, 'd')), "path is too long"},
@@ -110,25 +92,20 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
         {"quorvan-cli db a.db set 'N = 128' --all", "a.db: N: '128' is no whole number"},
         {"quorvan-cli db a.db append Nn=1", "'Nn=1' begins with no column's name"},
         {"quorvan-cli db a.db set N=1 --all", ": a change is a column, an operator and a value"},
-        {"quorvan-cli db a.db load a.db", "a.db: 1801 "},
         {"quorvan-cli db a.db load no/where", "no/where: 1801 Load error - unable to open file (No such"},
         {"quorvan-cli db a.db export no/where", "1901 Export error - unable to open output file (No such"},
-        {"quorvan-cli db a.db create --column N:byte", "1102 Create error - file already exists"},
         {"quorvan-cli db n create --column N:byte --column N:long", "the column N is given twice"},
         {"quorvan-cli db n create --column N:byte --description $(printf %032d 1)", "31 bytes"},
-        {"quorvan-cli db bad.db append",
-         "its header disagrees with it; nothing is changed before `check --repair`"},
+        {"quorvan-cli db bad.db append", "its header disagrees with it; nothing is changed before `check"},
         {reader + " db kept/a.db append", "the file may only be read, not changed"},
         {"quorvan-cli db held/a.db append", held},
         {"quorvan-cli db held/a.db check --repair", held},
         {"quorvan-cli db other/portfol.db append", doubt},
         {"quorvan-cli db left/a.db info", "file could not be opened: there is no such file, but "},
         {"quorvan-cli db left/b.db create --column N:byte",
-         "left/b.new, as an interrupted compaction leaves it; `check --repair`"},
+         "left/b.new, as an interrupted compaction leaves"},
         {"quorvan-cli db block/a.db append", "the day's backup cannot be made in the folder backups"},
-        {"quorvan-cli list --home nowhere", "nowhere/portfol.db cannot be opened: No such file"},
         {"quorvan-cli list a --home home", "there is no portfolio \"a\" in home, but \"A\""},
-        {"quorvan-cli list --home cut", "cut/invest.db cannot be opened: header and 13 columns need"},
         {"quorvan-cli list --home home >/dev/full", "the output cannot be written: No space left on device"},
         {"quorvan-cli export --all --home home -o left", "left cannot be written: Is a directory"},
         {"quorvan-cli import B t.csv --home home", "there is no portfolio 'B'; --create makes it"},

@@ -10,17 +10,13 @@ class QuoteCommandTest : public CommandTest {
     // A source on the server.
     std::string Source(const std::string& rest) const { return "net " + server_.Host() + rest; }
 
-    LoopbackServer server_{[](const std::string& request) {
-        if (request.find("/moved") != std::string::npos)
-            return Reply{{"HTTP/1.0 301 Moved\r\nLocation: https://\x1B[2J\xFF\r\n\r\n"}};
-        if (request.find("/closes") != std::string::npos)
-            return Reply{};
-        if (request.find("/cut") != std::string::npos)
-            return Reply{{"Last>12 3"}};
-        if (request.find("/comma") != std::string::npos)
-            return Reply{{"Last>202,45<"}};
-        return Reply{{std::string(100, 'a') + "\x1B[2JLast\\\n</td><b>45 3/8</b>" + std::string(100, 'z')}};
-    }};
+    std::map<std::string, Reply> pages_ = {
+        {"/moved", {{"HTTP/1.0 301 Moved\r\nLocation: https://\x1B[2J\xFF\r\n\r\n"}}},
+        {"/closes", {}},
+        {"/comma", {{"Last>202,45<"}}},
+        {"/q?s=", {{std::string(100, 'a') + "\x1B[2JLast\\\n</td><b>45 3/8</b>" + std::string(100, 'z')}}}};
+    LoopbackServer server_{
+        [this](const std::string& request) { return pages_[request.substr(4, request.find("ABC") - 4)]; }};
 };
 
 TEST_F(QuoteCommandTest, ShowsWhatEachSourceGives) {
