@@ -42,22 +42,17 @@ TEST_F(QuoteCommandTest, SaysWhyThereIsNoPrice) {
     const std::string source = "--source '" + Source(" /");
     Expect(
         "quorvan-cli quote ABC ",
-        {{"DEF --home home",
-          "ABC\t-4.00\nDEF\t-4.00\n",
-          {"line 2 ends the list, since it is empty or too short for a source\nthere is no source to ask\n"}},
-         {"--home nowhere", "ABC\t-3.00\n", {"failed: the file nowhere/Quorvan.cfg cannot be read\n"}},
-         {source + "moved Last 1'",
-          "ABC\t-4.00\n",
-          {"  marker not found in the 47 bytes received, which begin: HTTP/1.0 301 Moved\\r\\nLocation: "
-           "https://\\x1B[2J\\xFF\\r\\n\\r\\n\n"}},
-         {source + "q?s= Last 9'", "ABC\t-4.00\n", {"  the page ended before the skip count was used up"}},
-         {source + "q?s= Last 0'", "ABC\t0.00\n", {"  price text 'Last\\\\' read as 0.0000\n"}},
-         {source + "q?s= Last 1'", "ABC\t15.00\n", {"  careful: the price text is no number"}, 0},
-         {source + "closes Last 1'", "ABC\t-4.00\n", {"  the server closed the connection without"}},
-         {source + "comma Last 1'",
-          "ABC\t202.00\n",
-          {"  careful: the price text is read only up to its"},
-          0}});
+        {{"DEF --home home", "ABC\t-4.00\nDEF\t-4.00\n",
+          "line 2 ends the list, since it is empty or too short for a source\nthere is no source to ask\n"},
+         {"--home nowhere", "ABC\t-3.00\n", "failed: the file nowhere/Quorvan.cfg cannot be read\n"},
+         {source + "moved Last 1'", "ABC\t-4.00\n",
+          "  marker not found in the 47 bytes received, which begin: HTTP/1.0 301 Moved\\r\\nLocation: "
+          "https://\\x1B[2J\\xFF\\r\\n\\r\\n\n"},
+         {source + "q?s= Last 9'", "ABC\t-4.00\n", "  the page ended before the skip count was used up"},
+         {source + "q?s= Last 0'", "ABC\t0.00\n", "  price text 'Last\\\\' read as 0.0000\n"},
+         {source + "q?s= Last 1'", "ABC\t15.00\n", "  careful: the price text is no number", 0},
+         {source + "closes Last 1'", "ABC\t-4.00\n", "  the server closed the connection without"},
+         {source + "comma Last 1'", "ABC\t202.00\n", "  careful: the price text is read only up to its", 0}});
 }
 
 } // namespace

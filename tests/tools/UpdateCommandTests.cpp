@@ -41,24 +41,22 @@ TEST_F(UpdateCommand, EndsWithAStatusForEachThingThatCanHappen) {
          {"update B A --ticker UP \"$(printf 'GO\\tNE')\"",
           "GO\\tNE\tno price: marker not found in the 7 bytes received, which begin: nothing\n"
           "UP\t12.50\t12.50\t0.00\n1 of 2 investments priced, 1 without a price\n",
-          {},
-          3},
+          "", 3},
          {"update --all --ticker UP --json",
           R"({"portfolio":"A","name":"Name of UP","ticker":"UP","old":12.5,"new":12.5,"change":0.0,"why":null})"
           "\n"},
          {"echo 'net no..such..host / @ 1' >Quorvan.cfg; update B B",
           "GO\\tNE\tno price: failed: gethostbyname() error: the name does not resolve\n"
           "0 of 1 investment priced, 1 without a price\n",
-          {},
-          3},
+          "", 3},
          {"rm Quorvan.cfg; update A --ticker UP",
           "UP\tno price: failed: the file ./Quorvan.cfg cannot be read\n0 of 1 investment priced\n",
-          {notConnected}},
-         {"echo >Quorvan.ini; update A", "", {notConnected}},
-         {"update a", "", {"but \"A\""}},
-         {"update A --ticker GONE", "", {"quorvan-cli: no investment there has the ticker GONE\n"}},
-         {"update", "", {"a PORTFOLIO or --all"}, 2},
-         {"update A --all", "", {"excludes"}, 2}});
+          notConnected},
+         {"echo >Quorvan.ini; update A", "", notConnected},
+         {"update a", "", "but \"A\""},
+         {"update A --ticker GONE", "", "quorvan-cli: no investment there has the ticker GONE\n"},
+         {"update", "", "a PORTFOLIO or --all", 2},
+         {"update A --all", "", "excludes", 2}});
     EXPECT_EQ(Printed(in_ + "cat backups/*.db.* | grep -c 'Name of' -a"), "1\n");
 }
 
