@@ -4,12 +4,7 @@
 #include <string>
 #include <vector>
 
-#include <QApplication>
-#include <QFontMetricsF>
-#include <QImage>
-#include <QPaintEngine>
-#include <QPainter>
-#include <QWidget>
+#include <QtWidgets>
 #include <gtest/gtest.h>
 
 #include "platform/View.h"

@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <sstream>
-#include <string>
 #include <vector>
 
 #include "Shell.h"

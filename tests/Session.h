@@ -2,9 +2,7 @@
 
 #include <chrono>
 #include <csignal>
-#include <cstdlib>
 #include <functional>
-#include <string>
 #include <thread>
 
 #include <sys/prctl.h>

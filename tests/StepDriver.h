@@ -3,18 +3,9 @@
 #include <deque>
 #include <functional>
 #include <string>
-#include <utility>
 
-#include <QAbstractButton>
-#include <QApplication>
-#include <QDeadlineTimer>
-#include <QLineEdit>
-#include <QMenuBar>
-#include <QMessageBox>
-#include <QPointer>
-#include <QRegularExpression>
 #include <QTest>
-#include <QTimer>
+#include <QtWidgets>
 
 #include "platform/Application.h"
 

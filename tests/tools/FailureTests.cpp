@@ -15,22 +15,16 @@ TEST_F(FailureTest, AWrongCommandLineDoesNothing) {
         "list A --sort Status|export|export A --all|import A|import --all|import --all A t.csv|"
         "import A t.csv --decimal x|import A t.csv --delimiter ab|import A t.csv --column Amount=N|"
         "import A t.csv --update-by name|import A t.csv --json|quote A --home home --source 'n h /q Last 2'|"
-        "setup new --desktop --remove-desktop|db A delete 1 --where 'N = 1'|db A undelete --where 'N = 1'");
+        "setup new --desktop --remove-desktop|db A delete 1 --where 'N = 1'|db A undelete --where 'N = 1'|"
+        "quote ''|chart A 2000 -o new.gif|chart A 2000 -o new.png --scale nan|db new.db query --format xml|"
+        "db new.db set 'N = 1'|db new.db delete|db new.db append N|db new.db create --column N:text");
     for (std::string arguments; std::getline(wrong, arguments, '|');)
         EXPECT_EQ(folder_.Run("quorvan-cli " + arguments), 2) << arguments;
     const std::pair<std::string, const char*> cases[] = {
-        {"quote ''", "a ticker is empty"},
         {"quote \"$(printf 'A\\tB')\"", "control characters"},
         {"quote A --source 'net h /q?s= Last'", "it has fewer than five fields"},
         {"chart A 2008 -o new.png", "there is no chart '2008'; there are 2000 to 2007"},
-        {"chart A 2000 -o new.gif", "must end with .png, .svg or .pdf"},
-        {"chart A 2000 -o new.png --scale nan", "the scale must be a number"},
-        {"db new.db query --format xml", "'xml' is none of table, tsv and json"},
-        {"db new.db set 'N = 1'", "--where or --all"},
         {"db new.db set 'N = 1' --where ''", "the statement is empty"},
-        {"db new.db delete", "A record's number"},
-        {"db new.db append N", "a value is NAME=VALUE, not 'N'"},
-        {"db new.db create --column N:text", "'text' is none of the types"},
     };
     for (const auto& [arguments, reason] : cases)
         EXPECT_TRUE(folder_.Fails("quorvan-cli " + arguments, 2, reason));
@@ -41,33 +35,29 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
     ASSERT_TRUE(
         Works(Setup("--sample") + R"sh(; db() { quorvan-cli db "$@"; }; db home/portfol.db append Name=A
         for _ in 1 2; do db home/invest.db append Portfolio=A Value=3e38; done
-        db a.db create --column N:byte --column Name:string:8; db a.db append N=1; head -c 70 a.db >short.db
+        db a.db create --column N:byte --column Name:string:8; db a.db append N=1; mkfifo p; ln -s p pipe.png
         head -c 36 a.db >bad.db; printf '\11' >>bad.db; tail -c +38 a.db >>bad.db
         mkdir other held left block folder.png; echo old >old.png
-        cp home/*.db other; cp a.db other/invest.db; cp a.db held; ln -s ../held/a.db other/link.db
+        cp home/*.db other; cp a.db other/invest.db; cp a.db held
         cp a.db block; echo >block/backups; cp a.db left/a.bak; cp a.db left/b.new
-        cp -r home new; rm new/quorvan; cp "$(command -v quorvan-cli)" alone
-        cp -r home "$(printf '\377')"
+        cp -r home new; rm new/quorvan; cp "$(command -v quorvan-cli)" alone; cp -r home "$(printf '\377')"
         XDG_DATA_HOME=$PWD/full quorvan-cli setup home --program built --desktop
         rm -r full/applications; echo >full/applications
         printf 'Name\nA\n' >t.csv; for each in bad read lost; do cp -r home $each; done; cp home/*.db held
-        db lost/invest.db append Portfolio=Lost; printf '\377' | dd of=bad/invest.db bs=1 seek=36 conv=notrunc 2>&-; chmod 555 read; chmod 444 read/*.db
-        mkdir kept; cp a.db kept; chmod 444 kept/a.db; chmod 777 . kept)sh"));
+        db lost/invest.db append Portfolio=Lost; printf '\377' | dd of=bad/invest.db bs=1 seek=36 conv=notrunc 2>&-
+        mkdir kept; cp a.db kept; chmod 777 . kept; chmod 444 kept/a.db read/*.db; chmod 555 read)sh"));
     // An ordinary user, also where the tests run as root, whom no permission keeps out.
     const std::string reader = getuid() == 0 ? "setpriv --reuid 65534 --clear-groups ./alone" : "./alone";
     EXPECT_TRUE(Works(reader + " db kept/a.db query --format tsv", "record\tN\tName\n0\t1\t\n"));
     FolderLock lock;
     ASSERT_EQ(lock.Take(folder_.File("held"), "quorvan"), FolderLock::Outcome::Taken);
-    folder_.Write("other/Quorvan.lock", "program: quorvan\nprocess: 17\nhost: elsewhere\n");
     const std::string before = State();
-
     const std::string held = "in use by quorvan (process " + std::to_string(getpid()) + " on ";
-    const std::string doubt = "once that program has ended, delete " + folder_.File("other/Quorvan.lock");
     const std::string chart = "quorvan-cli chart --home home 'My Retirement Fund' 2000 -o ";
     const std::pair<std::string, std::string> cases[] = {
         {"quorvan-cli chart --home home B 2000 -o old.png", "there is no portfolio \"B\" in home"},
         {"quorvan-cli chart --home home A 2007 -o old.png", "a value in the portfolio is not a number, or "},
-        {chart + "missing/new.png", "missing/new.png cannot be written: No such file"},
+        {chart + "pipe.png", "pipe.png cannot be written: "},
         {"ulimit -f 4; trap '' XFSZ; " + chart + "old.png", "old.png cannot be written: "},
         {"quorvan-cli report --home nowhere A -o old.pdf", "nowhere/portfol.db cannot be opened"},
         {"quorvan-cli report --home other 'My Retirement Fund' -o a", "other/invest.db has other columns"},
@@ -76,23 +66,19 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
         {Setup("", ""), "the name is empty"},
         {Setup("", std::string(109, 'd')), "path is too long"},
         {Setup("", "held"), held},
-        {Setup("", "other"), doubt},
         {"./alone setup new", "The program quorvan was not found beside quorvan-cli"},
         {"quorvan-cli setup home --program nothing --desktop", "nothing cannot be read: No such file"},
         {"XDG_DATA_HOME=relative HOME= " + Setup("--remove-desktop"), "There is no home folder"},
         {"XDG_DATA_HOME=$PWD/full " + Setup("--desktop"), ".desktop cannot be made: Not a directory"},
         {Setup("--desktop", "\xFF"), "its path has a sign that no entry can hold"},
         {"quorvan-cli db folder.png info", "this is no regular file"},
-        {"quorvan-cli db short.db info", "header and 2 columns need 140"},
         {"quorvan-cli db a.db query Name=", ": a condition is a column, an operator and a value"},
         {"quorvan-cli db a.db query --sort Nome", "1701 "},
-        {"quorvan-cli db a.db query >/dev/full", "the output cannot be written: No space left on device"},
         {"quorvan-cli db a.db append N=1 N=2", "the column N is given twice"},
         {"quorvan-cli db a.db append N=x", "a.db: N: 'x' is no whole number from -128 to 127"},
         {"quorvan-cli db a.db set 'N = 128' --all", "a.db: N: '128' is no whole number"},
         {"quorvan-cli db a.db append Nn=1", "'Nn=1' begins with no column's name"},
         {"quorvan-cli db a.db set N=1 --all", ": a change is a column, an operator and a value"},
-        {"quorvan-cli db a.db load no/where", "no/where: 1801 Load error - unable to open file (No such"},
         {"quorvan-cli db a.db export no/where", "1901 Export error - unable to open output file (No such"},
         {"quorvan-cli db n create --column N:byte --column N:long", "the column N is given twice"},
         {"quorvan-cli db n create --column N:byte --description $(printf %032d 1)", "31 bytes"},
@@ -100,10 +86,9 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
         {reader + " db kept/a.db append", "the file may only be read, not changed"},
         {"quorvan-cli db held/a.db append", held},
         {"quorvan-cli db held/a.db check --repair", held},
-        {"quorvan-cli db other/portfol.db append", doubt},
+        {"quorvan-cli update A --home held", held},
         {"quorvan-cli db left/a.db info", "file could not be opened: there is no such file, but "},
-        {"quorvan-cli db left/b.db create --column N:byte",
-         "left/b.new, as an interrupted compaction leaves"},
+        {"quorvan-cli db left/b.db create --column N:byte", "left/b.new, as an interrupted compaction"},
         {"quorvan-cli db block/a.db append", "the day's backup cannot be made in the folder backups"},
         {"quorvan-cli list a --home home", "there is no portfolio \"a\" in home, but \"A\""},
         {"quorvan-cli list --home home >/dev/full", "the output cannot be written: No space left on device"},
