@@ -142,7 +142,6 @@ TEST_F(DbCommandTest, WhatIsExportedLoadsBackTheSame) {
 TEST_F(DbCommandTest, TextWithAWrongLineIsNotLoaded) {
     const std::string before = folder_.Read("a.db");
     const std::string good = "Birch\t+1e1\t20240229\t091530\t-7\t\r\n";
-    const std::string names = heading_.substr(heading_.find('\t') + 1);
     const std::string rest = "\t5\t20240229\t091530\t0\n";
     const std::array<std::string, 3> cases[] = {
         // a text, the options, the only thing wrong
@@ -162,7 +161,7 @@ TEST_F(DbCommandTest, TextWithAWrongLineIsNotLoaded) {
     Db({{"load a.txt", "", "line 4: 6 fields, the data file has 5"}});
     EXPECT_TRUE(folder_.Complains("line 1: the line is longer than ")); // each is told
     EXPECT_EQ(folder_.Read("a.db"), before);
-    folder_.Write("a.txt", "\xEF\xBB\xBF" + names + "\r\n" + good + "\r\n");
+    folder_.Write("a.txt", "\xEF\xBB\xBF" + heading_.substr(7) + "\r\n" + good + "\r\n");
     Db({{"load a.txt --heading", "1 record loaded from a.txt\n"},
         {"query 'Name = Birch' --format tsv", heading_ + "3\tBirch\t10\t20240229\t091530\t-7\n"}});
 }
@@ -189,19 +188,22 @@ TEST_F(DbCommandTest, DamageIsToldAndMended) {
 
 TEST_F(DbCommandTest, ADiskThatFailsIsTold) {
     FaultyFiles disk;
-    const auto told = [&](const std::function<int(DataFileTool&)>& work) {
+    const auto told = [&](const std::string& name, const std::function<int(DataFileTool&)>& work) {
         TextOutput output(STDOUT_FILENO);
         std::ostringstream errors;
-        DataFileTool tool(path_, OutputFormat::Table, output, errors, disk);
+        DataFileTool tool(folder_.File(name), OutputFormat::Table, output, errors, disk);
         EXPECT_EQ(tool.Finish(work(tool)), 1);
-        return errors.str();
+        return errors.str().substr(errors.str().find(": 3001") + 1);
     };
     disk.Arm(Fault::NoReads, 3); // of the records
-    EXPECT_NE(told([](auto& tool) { return tool.Query({}); }), "");
+    EXPECT_NE(told("a.db", [](auto& tool) { return tool.Query({}); }), "");
     EXPECT_TRUE(disk.Disarm());
-    disk.may = [](char call) { return call != 's'; };
-    EXPECT_NE(told([](auto& tool) { return tool.Append({}); }).find(": 3001 Sync error - unable to reach"),
-              std::string::npos);
+    const std::string reason = " 3001 Sync error - unable to reach the disk (No space left on device)\n";
+    disk.may = [syncs = 1](char call) mutable { return call != 's' || syncs-- > 0; }; // the name's fails
+    EXPECT_EQ(told(
+                  "new", [](auto& tool) { return tool.Create("", {"A:long"}); }),
+              reason);
+    EXPECT_EQ(told("a.db", [](auto& tool) { return tool.Append({}); }), reason);
 }
 
 TEST_F(DbCommandTest, OutputThatNobodyTakesIsNoFailure) {
@@ -214,8 +216,9 @@ TEST_F(DbCommandTest, OutputThatNobodyTakesIsNoFailure) {
 
 TEST_F(DbCommandTest, ManualNamesEveryCommandAndOptionAndIsInOrder) {
     EXPECT_TRUE(Works(
-        R"sh(for command in '' setup quote chart report list export import check update backups db 'db x info' 'db x query' 'db x set' \
-            'db x append' 'db x delete' 'db x check' 'db x create' 'db x export' 'db x load'; do
+        R"sh(for command in '' setup quote chart report list export import check update backups db \
+            'db x info' 'db x query' 'db x set' 'db x append' 'db x delete' 'db x check' 'db x create' \
+            'db x export' 'db x load'; do
             quorvan-cli $command --help | sed -n 's/^  \(-., *\)*\(--[^ ,]*\).*/\2/p
                 /^Subcommands:/,$ s/^  \([^ ]\+\).*/\1/p'
         done | sort -u >offered; [ $(wc -l <offered) -gt 30 ] && tr -d '\\' <')sh" QUORVAN_SOURCES

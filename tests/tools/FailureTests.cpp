@@ -20,14 +20,11 @@ TEST_F(FailureTest, AWrongCommandLineDoesNothing) {
         "db new.db set 'N = 1'|db new.db delete|db new.db append N|db new.db create --column N:text");
     for (std::string arguments; std::getline(wrong, arguments, '|');)
         EXPECT_EQ(folder_.Run("quorvan-cli " + arguments), 2) << arguments;
-    const std::pair<std::string, const char*> cases[] = {
-        {"quote \"$(printf 'A\\tB')\"", "control characters"},
-        {"quote A --source 'net h /q?s= Last'", "it has fewer than five fields"},
-        {"chart A 2008 -o new.png", "there is no chart '2008'; there are 2000 to 2007"},
-        {"db new.db set 'N = 1' --where ''", "the statement is empty"},
-    };
-    for (const auto& [arguments, reason] : cases)
-        EXPECT_TRUE(folder_.Fails("quorvan-cli " + arguments, 2, reason));
+    EXPECT_TRUE(folder_.Fails("quorvan-cli quote \"$(printf 'A\\tB')\"", 2, "control characters"));
+    EXPECT_TRUE(
+        folder_.Fails("quorvan-cli quote A --source 'net h /q?s= Last'", 2, "fewer than five fields"));
+    EXPECT_TRUE(folder_.Fails("quorvan-cli chart A 2008 -o new.png", 2, "'2008'; there are 2000 to 2007"));
+    EXPECT_TRUE(folder_.Fails("quorvan-cli db A set 'N = 1' --where ''", 2, "the statement is empty"));
     EXPECT_EQ(folder_.Names(), std::vector<std::string>{"built"});
 }
 
@@ -80,6 +77,7 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
         {"quorvan-cli db a.db append Nn=1", "'Nn=1' begins with no column's name"},
         {"quorvan-cli db a.db set N=1 --all", ": a change is a column, an operator and a value"},
         {"quorvan-cli db a.db export no/where", "1901 Export error - unable to open output file (No such"},
+        {"quorvan-cli db a.db create --column N:byte", "1102 Create error - file already exists"},
         {"quorvan-cli db n create --column N:byte --column N:long", "the column N is given twice"},
         {"quorvan-cli db n create --column N:byte --description $(printf %032d 1)", "31 bytes"},
         {"quorvan-cli db bad.db append", "its header disagrees with it; nothing is changed before `check"},

@@ -19,12 +19,11 @@ class UpdateCommand : public HomeTest {
     }
 
     const std::string in_ = "cd '" + home_.Path() + "'; ";
-    const std::string update_ = "quorvan-cli update --home '" + home_.Path() + "' A";
     std::map<std::string, Reply> pages_ = {{"UP", {{"@>12.5<"}}}, {"DOWN", {{"@>9.75<"}}}};
     LoopbackServer server_{[this](const std::string& request) {
         const std::string ticker = request.substr(5, request.find(' ', 5) - 5);
         if (pages_[ticker].end == Reply::End::Hold)
-            std::system(("kill -INT $(cat " + folder_.File("process") + ")").c_str());
+            std::system(("kill -INT $(cat " + home_.File("process") + ")").c_str());
         return pages_[ticker];
     }};
 };
@@ -61,11 +60,11 @@ TEST_F(UpdateCommand, EndsWithAStatusForEachThingThatCanHappen) {
 
 TEST_F(UpdateCommand, RewritesOneLineOnATerminalAndStopsAtOnce) {
     EXPECT_EQ(
-        Printed("script -qec \"" + update_ + "\" /dev/null"),
+        Printed(in_ + "script -qec 'quorvan-cli update --home . A' /dev/null"),
         "\r\x1B[K1 of 3: UP\r\x1B[K2 of 3: DOWN\r\x1B[KName of \tno ticker\r\n2 of 3 investments priced\r\n");
     pages_["DOWN"].end = Reply::End::Hold;
     pages_["UP"] = {{"@>13.5<"}};
-    EXPECT_EQ(folder_.Run("sh -c \"echo \\$\\$ >process; exec " + update_ + "\""), 130);
+    EXPECT_EQ(folder_.Run(in_ + "sh -c 'echo $$ >process; exec quorvan-cli update --home . A'"), 130);
     EXPECT_TRUE(folder_.Complains("quorvan-cli: stopped; what was not asked for yet is as it was\n"));
     EXPECT_EQ(Printed(in_ + "quorvan-cli db invest.db query --format tsv | cut -f 9 | xargs"),
               "Price 13.5 9.75 10 10\n");
