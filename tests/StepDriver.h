@@ -25,7 +25,7 @@ class StepDriver : public QObject {
         if (QCoreApplication::instance())
             Poll();
         else
-            qAddPreRoutine([] { self_->Poll(); });
+            qAddPreRoutine([] { QTimer::singleShot(PollMilliseconds, self_, &StepDriver::Poll); });
     }
     ~StepDriver() override { self_ = nullptr; }
 
