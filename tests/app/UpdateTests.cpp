@@ -221,6 +221,18 @@ TEST_F(PriceUpdate, EndsWithAnAlertWhenNobodyCanBeAsked) {
     ExpectUntouched(0, "RISE");
 }
 
+TEST_F(PriceUpdate, EndsAtARecordThatIsNotReadOrWritten) {
+    FaultyFiles files;
+    Watch(files);
+    Then([] { app_state->investments->Delete(1); });
+    Update();
+    UntilPriced().Then([&] { files.may = [](char call) { return call != 'w'; }; });
+    Update().Answer(NotKept);
+    UntilDone().RunAndClose();
+    EXPECT_EQ(server_.Requests().size(), 2U);
+    ExpectUntouched(2, "SAME");
+}
+
 TEST_F(PriceUpdate, TheProgramsEndStopsItAndTellsOfADiskThatFails) {
     FaultyFiles files;
     files.may = [](char call) { return call != 's'; };
