@@ -192,6 +192,7 @@ TEST_F(PriceUpdate, ClosedHalfWayItGoesOnceTheFirstHalfIsOnTheDisk) {
     UntilDone().RunAndClose();
     EXPECT_EQ(Record(1).Price, 10.375F);
     ExpectUntouched(2, "SAME");
+    EXPECT_TRUE(Read("Quorvan.log").ends_with("\ncancelled\n")); // and tells of no price
     EXPECT_EQ(server_.Requests().size(), 3U); // no reload is shown, and nobody was asked again
 }
 
