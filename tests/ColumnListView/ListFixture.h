@@ -1,11 +1,8 @@
 // A list for a window, with rows whose columns can be told apart by colour and text.
 #pragma once
 
-#include <functional>
 #include <memory>
 #include <sstream>
-#include <string>
-#include <vector>
 
 #include "ColumnListView/CLVColumnLabelView.h"
 #include "ColumnListView/ColumnListView.h"

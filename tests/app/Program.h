@@ -1,8 +1,6 @@
 #pragma once
 
 #include <source_location>
-#include <string>
-#include <vector>
 
 #include <QAbstractItemView>
 

@@ -1,7 +1,4 @@
 // The rules of the commands and the texts of a row, on real data files and without a window.
-#include <gtest/gtest.h>
-
-#include <algorithm>
 #include <cmath>
 #include <limits>
 

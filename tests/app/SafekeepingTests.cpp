@@ -1,7 +1,4 @@
 // The day's backups, and what is said about data files at start.
-#include <gtest/gtest.h>
-
-#include <filesystem>
 #include <thread>
 
 #include "DataFolder.h"

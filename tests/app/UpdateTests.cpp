@@ -2,20 +2,16 @@
 #include "Program.h"
 
 #include <atomic>
-#include <chrono>
 #include <cmath>
 #include <map>
 #include <semaphore>
 
 #include <QProgressBar>
-#include <QTest>
 
 #include <dlfcn.h>
 #include <netdb.h>
 
 #include "db/FaultyFiles.h"
-#include "quotes/LoopbackServer.h"
-#include "quotes/QuoteRetrieval.h"
 #include "quotes/TlsServer.h"
 #include "quotes/run/PriceRun.h"
 

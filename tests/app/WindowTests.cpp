@@ -6,7 +6,6 @@
 #include <QScreen>
 
 #include "db/FaultyFiles.h"
-#include "platform/Application.h"
 #include "platform/MenuItem.h"
 
 namespace {
@@ -16,7 +15,7 @@ constexpr const char* NotPasted =
     "What you cut has not been pasted yet, and would be lost. Go on all the same?";
 constexpr const char* NoPortfolio = "This command requires that a portfolio be created first.";
 
-enum class Needs { Nothing, Portfolio, Investment };
+enum Needs { Nothing, Portfolio, Investment };
 enum Files { None, Portfolios, Investments, Both };
 
 // Each command, in an order in which those that change files can follow each other, from a portfolio P with
@@ -32,26 +31,23 @@ constexpr struct {
     const char* dialog = nullptr; // its title
     const char* name = nullptr;   // what is typed there
 } Commands[] = {
-    {MessageSettings, Needs::Nothing, nullptr},
-    {MessageHelp, Needs::Nothing, nullptr},
-    {B_ABOUT_REQUESTED, Needs::Nothing, nullptr},
-    {B_QUIT_REQUESTED, Needs::Nothing, nullptr},
-    {MessagePortfolioChart, Needs::Investment,
-     "This command requires a portfolio with at least one investment."},
-    {MessagePortfolioPrint, Needs::Investment, NoPortfolio},
-    {MessagePortfolioUpdate, Needs::Investment, NoPortfolio},
-    {MessageInvestmentCopy, Needs::Investment, NothingToTake},
-    {MessageInvestmentAdd, Needs::Portfolio, NoPortfolio, Investments, -1, "abcd", 3, "Add an Investment",
-     "d"},
-    {MessageInvestmentEdit, Needs::Investment, "You must select an investment to edit!", Investments, 1,
-     "aecd", 1, "Edit this Investment", "e"},
-    {MessageInvestmentDelete, Needs::Investment, "You must select an investment to delete!", Investments, 0,
-     "ecd"},
-    {MessageInvestmentCut, Needs::Investment, NothingToTake, Investments, 0, "cd"},
-    {MessageInvestmentPaste, Needs::Portfolio, nullptr, Investments, -1, "cde", 2},
-    {MessagePortfolioEdit, Needs::Portfolio, nullptr, Both, -1, "cde", -1, "Edit Portfolio", "Q"},
-    {MessagePortfolioAdd, Needs::Nothing, nullptr, Portfolios, -1, "", -1, "Add a Portfolio", "R"},
-    {MessagePortfolioDelete, Needs::Portfolio, "There are no portfolios to delete!", Portfolios, -1, "cde"},
+    {MessageSettings, Nothing, nullptr},
+    {MessageHelp, Nothing, nullptr},
+    {B_ABOUT_REQUESTED, Nothing, nullptr},
+    {B_QUIT_REQUESTED, Nothing, nullptr},
+    {MessagePortfolioChart, Investment, "This command requires a portfolio with at least one investment."},
+    {MessagePortfolioPrint, Investment, NoPortfolio},
+    {MessagePortfolioUpdate, Investment, NoPortfolio},
+    {MessageInvestmentCopy, Investment, NothingToTake},
+    {MessageInvestmentAdd, Portfolio, NoPortfolio, Investments, -1, "abcd", 3, "Add an Investment", "d"},
+    {MessageInvestmentEdit, Investment, "You must select an investment to edit!", Investments, 1, "aecd", 1,
+     "Edit this Investment", "e"},
+    {MessageInvestmentDelete, Investment, "You must select an investment to delete!", Investments, 0, "ecd"},
+    {MessageInvestmentCut, Investment, NothingToTake, Investments, 0, "cd"},
+    {MessageInvestmentPaste, Portfolio, nullptr, Investments, -1, "cde", 2},
+    {MessagePortfolioEdit, Portfolio, nullptr, Both, -1, "cde", -1, "Edit Portfolio", "Q"},
+    {MessagePortfolioAdd, Nothing, nullptr, Portfolios, -1, "", -1, "Add a Portfolio", "R"},
+    {MessagePortfolioDelete, Portfolio, "There are no portfolios to delete!", Portfolios, -1, "cde"},
 };
 
 class MainWindow : public testing::Test, protected Program {
@@ -147,7 +143,7 @@ TEST_F(MainWindow, ShowsAPortfolioAndOffersWhatCanBeDoneWithIt) {
     AddPortfolioOf("Worthless", {"f"}, 0);
     Expect({"f"}, "$0.00").Then([] {
         EXPECT_EQ(Marked(), "Worthless");
-        ExpectMenus(Needs::Investment);
+        ExpectMenus(Investment);
     });
     Send(MessagePortfolioChart).Answer("Unable to chart. Total value of portfolio equals zero!");
     DeletePortfolio("No", nullptr);
@@ -157,7 +153,7 @@ TEST_F(MainWindow, ShowsAPortfolioAndOffersWhatCanBeDoneWithIt) {
     DeletePortfolio("Yes", "Yes");
     Expect({}, "$0.00").Then([] {
         EXPECT_EQ(Marked(), "Empty");
-        ExpectMenus(Needs::Portfolio);
+        ExpectMenus(Portfolio);
     });
     DeletePortfolio("Yes", "Yes");
     Expect({"f"});
@@ -169,7 +165,7 @@ TEST_F(MainWindow, ShowsAPortfolioAndOffersWhatCanBeDoneWithIt) {
 
 TEST_F(MainWindow, WithoutAPortfolioSaysWhatACommandLacksAndHelps) {
     Then([] {
-        ExpectMenus(Needs::Nothing);
+        ExpectMenus(Nothing);
         EXPECT_EQ(Marked(), "");
         EXPECT_STREQ(Selector()->Name(), "        ");
         Press(Main(), "add button");

@@ -2,14 +2,11 @@
 #include "Driver.h"
 #include "Worker.h"
 
-#include <atomic>
-
 #include <QPushButton>
 #include <QScreen>
 
 #include "dialogs/BDialog.h"
 #include "platform/Button.h"
-#include "platform/Font.h"
 #include "platform/Stage.h"
 #include "platform/TextControl.h"
 #include "util/interface/InterfaceHelpers.h"

@@ -4,7 +4,6 @@
 #include <cmath>
 #include <sstream>
 
-#include <QMenu>
 #include <QPushButton>
 
 #include "DataFolder.h"
@@ -15,7 +14,6 @@
 #include "dialogs/PasswordDialogs.h"
 #include "dialogs/PortfolioDialog.h"
 #include "platform/Font.h"
-#include "util/Dates.h"
 #include "util/interface/InterfaceHelpers.h"
 
 namespace {
@@ -88,8 +86,7 @@ TEST_F(FormTest, ThePasswordIsTakenByOkAlone) {
     auto* form = new PasswordDialog({300, 200}, answer, Both);
     EXPECT_EQ(form->Frame().LeftTop(), BPoint(std::floor(300 - form->Bounds().Width() / 2),
                                               std::floor(200 - 3 * GetFontHeight(be_bold_font))));
-    Enter(form, "first", "Secret", Qt::Key_Escape);
-    Enter(new PasswordDialog({0, 0}, answer, Both), "first", "0123456789abcdefgh", Qt::Key_Return);
+    Enter(form, "first", "0123456789abcdefgh", Qt::Key_Return);
     EXPECT_STREQ(answer, "0123456789abcde");
 }
 
@@ -189,19 +186,8 @@ TEST(InvestmentInput, AmountsLeftAsShownStayWhatTheyWere) {
         EXPECT_EQ(FillInvestment(Amounts("2", "45.37"), &record), InvestmentCheck::Accepted);
         // No risk was chosen, and the name is cut between whole characters.
         EXPECT_EQ(Fields(record), "P|" + std::string(30, 'n') + "|||Med||00|2|45.37|90.74|-1");
-        int year = 0, month = 0, day = 0;
-        GetDate(&year, &month, &day);
-        EXPECT_EQ((std::array{+record.Date.year, +record.Date.month, +record.Date.day}),
-                  (std::array{year, month, day}));
-    }
-}
-
-TEST_F(FormTest, TheHomeFolderIsTheProgramsOrNone) {
-    for (const std::string& folder : {std::string(), std::string(127, 'f'), std::string(128, 'f')}) {
-        BApplication::SetExecutablePath((folder + "/quorvan").c_str());
-        char found[PathBufferSize] = "left over";
-        EXPECT_EQ(GetHomeDir(found), folder.size() < PathBufferSize);
-        EXPECT_EQ(found, folder.size() < PathBufferSize ? folder : "");
+        const dbDATE today = Today();
+        EXPECT_EQ(std::memcmp(&record.Date, &today, sizeof today), 0);
     }
 }
 

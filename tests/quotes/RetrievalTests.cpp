@@ -1,5 +1,3 @@
-#include <gtest/gtest.h>
-
 #include <future>
 #include <poll.h>
 #include <semaphore>

@@ -1,7 +1,4 @@
-#include <gtest/gtest.h>
-
 #include <algorithm>
-#include <string>
 #include <vector>
 
 #include "QuoteTest.h"

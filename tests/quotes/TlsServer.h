@@ -1,10 +1,8 @@
 #pragma once
 
-#include <memory>
 #include <openssl/pem.h>
 #include <openssl/ssl.h>
 #include <openssl/x509v3.h>
-#include <string>
 
 #include "LoopbackServer.h"
 
