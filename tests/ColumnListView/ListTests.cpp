@@ -90,6 +90,9 @@ TEST_F(List, BorrowsItsRows) {
     EXPECT_TRUE(list->FullListIsEmpty() && list->AddList(&both, 0));
     rows.erase(rows.begin()); // a row that dies leaves its list
     EXPECT_EQ(Shown(), "b");
+    list->Select(0);
+    list->RemoveSelected();
+    EXPECT_TRUE(list->CountItems() == 0 && list->AddItem(b));
 }
 
 TEST_F(Outline, HidesColumnsAndTellsRowsOfWidthsWhenAsked) {

@@ -67,11 +67,9 @@ TEST(Dragging, JoinsColumnsThatMoveTogether) {
                                                   {50, CLVF_HIDDEN}});
     std::ostringstream all;
     for (const DragGroup& group : groups)
-        all << group.first << "-" << group.last << " last shown " << group.lastShown << ", " << group.begin
-            << ".." << group.end << " keeps " << group.allKeepFirst << group.allKeepLast << " flags "
-            << group.flags << "; ";
-    EXPECT_EQ(all.str(), "0-1 last shown 1, 0..51 keeps 10 flags 10; 2-3 last shown 3, 52..92 keeps 00 flags "
-                         "16; 4-4 last shown -1, 0..0 keeps 00 flags 0; ");
+        all << group.first << "-" << group.last << " (" << group.lastShown << ") " << group.begin << ".."
+            << group.end << " " << group.allKeepFirst << group.allKeepLast << " " << group.flags << "; ";
+    EXPECT_EQ(all.str(), "0-1 (1) 0..51 10 10; 2-3 (3) 52..92 00 16; 4-4 (-1) 0..0 00 0; ");
     EXPECT_EQ(GroupAt(groups, 0), 0);
     EXPECT_EQ(GroupAt(groups, 3), 1);
     EXPECT_EQ(GroupAt(groups, 5), -1);

@@ -57,7 +57,7 @@ class Retrieval : public QuoteTest {
         ExpectLogsEnd(last + "cancelled\n");
     }
 
-    TlsIdentity identity_{"IP:127.0.0.1"};
+    TlsIdentity identity_;
     std::string caFile_ = folder_.File("ca.pem");
 };
 
@@ -123,7 +123,7 @@ TEST_F(Retrieval, OnceAskedTheAnswerBehindTlsCountsWhateverItsEnd) {
 }
 
 TEST_F(Retrieval, SaysWhyThereIsNoConnection) {
-    TlsServer unknown(TlsIdentity("IP:127.0.0.1"), [](const std::string&) { return Reply{{Page}}; });
+    TlsServer unknown(TlsIdentity(), [](const std::string&) { return Reply{{Page}}; });
     std::string otherName;
     TlsServer redirecting(identity_, [&](const std::string&) { return Redirect(otherName); });
     otherName = "https://localhost:" + std::to_string(redirecting.Port());
@@ -196,10 +196,9 @@ TEST_F(Retrieval, StopsAtOnceWhereverItIs) {
     TlsServer tls(identity_, [](const std::string&) { return Reply{{}, End::Hold}; });
     // They serve one at a time: a connection must have ended for the next to be taken.
     for (const std::size_t times : {1, 2}) {
-        ExpectCancelled(
-            silent.Host(), [&] { EXPECT_TRUE(silent.WaitFor(times)); });
-        ExpectCancelled(
-            endless.Host(), [&] { EXPECT_TRUE(endless.WaitFor(times)); });
+        for (const LoopbackServer* server : {&silent, &endless})
+            ExpectCancelled(
+                server->Host(), [&] { EXPECT_TRUE(server->WaitFor(times)); });
         ExpectCancelled(tls.Host(), [&] { EXPECT_TRUE(tls.WaitFor(times)); });
     }
     // A server that accepts nobody: one waits for its greeting, and leaves no place in the queue.

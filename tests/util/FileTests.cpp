@@ -28,9 +28,7 @@ TEST(File, CopiesWithItsOwnerForThoseWhoMayWriteOrFails) {
     const std::string both = folder.Output();
     EXPECT_EQ(both.substr(0, both.size() / 2), both.substr(both.size() / 2));
     struct : FileOperations {
-        ssize_t WriteAt(int /*file*/, const void* /*data*/, std::size_t /*size*/, off_t /*at*/) override {
-            return 0;
-        }
+        ssize_t WriteAt(int, const void*, std::size_t, off_t) override { return 0; }
     } stuck; // its writes get nowhere
     File file(stuck);
     ASSERT_EQ(file.Open(folder.File("new"), FileMode::CreateNew), 0);
