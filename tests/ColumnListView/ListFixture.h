@@ -50,7 +50,6 @@ class TextRow : public CLVListItem {
     std::ostringstream heard;
 };
 
-// Counts what a program would hear.
 class NoticedList : public ColumnListView {
   public:
     using ColumnListView::ColumnListView;
@@ -99,7 +98,6 @@ struct ListFixture : Stage {
             all += static_cast<TextRow*>(list->FullListItemAt(i))->texts[0];
         return all;
     }
-    // The columns that the list is sorted by, each with its direction.
     [[nodiscard]] std::string Keys() const {
         int32 columns[3] = {};
         Mode modes[3] = {};

@@ -115,7 +115,6 @@ TEST(Labels, AreCutBetweenCharactersAndRaised) {
                                                 {"a\xC3\xA4z12", 5, "a..."},
                                                 {"a\xC3\xA4z123", 6, "a\xC3\xA4..."}})
         EXPECT_EQ(TruncatedLabel(text, static_cast<float>(width), measure), expected) << text << width;
-    // In upper case, of ASCII letters only.
     EXPECT_STREQ(std::unique_ptr<char[]>(ToUpperStr("az`{1.250\xC3\xA4")).get(), "AZ`{1.250\xC3\xA4");
 }
 

@@ -81,7 +81,6 @@ struct ListWindow : ListFixture {
         ASSERT_TRUE(Settle());
     }
 
-    // By default in a line above all labels.
     [[nodiscard]] std::string HeaderColors(int y = 2) const { return Colors(header->grab().toImage(), y); }
     [[nodiscard]] std::string RowColors(int y = 25) const {
         return Colors(view->grab(view->viewport()->geometry()).toImage(), y);

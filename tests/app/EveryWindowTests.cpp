@@ -51,7 +51,6 @@ void ExpectTextsWhole(const QWidget* window) {
     }
 }
 
-// Looks at the window, and at one thing that it holds, whose description begins so.
 void ExpectWindow(QWidget* window, Role windowRole, Role role, const char* name, const char* description) {
     window->grab(); // a description comes with the first painting
     ExpectTextsWhole(window);

@@ -34,7 +34,6 @@ TEST_F(Print, AsksOnceAndNothingAfterACancel) {
     Select("Empty one").Expect({}).Send(MessagePortfolioPrint);
     Answer("The file " + prints_.File("a.pdf") + " exists. Replace it by this report?", "No");
     PrintTo("b.pdf", "b.pdf", "Empty one");
-    // A place that is gone is told of, and asked for anew.
     Then([this] { std::filesystem::remove_all(prints_.Path()); });
     Send(MessagePortfolioPrint);
     Answer("The report could not be printed! Is the printer there, or the file protected?");

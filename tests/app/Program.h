@@ -37,7 +37,6 @@ class Program : public DataFolder, public Driver {
         application.Run();
         return application.ExitStatus();
     }
-    // The same, with a last step that closes the main window.
     int RunAndClose() { return Close().Run(); }
 
     Program& When(Condition condition, Action action, Place at = Place::current()) {
@@ -88,7 +87,6 @@ class Program : public DataFolder, public Driver {
 
     static QWidget* Main() { return Driver::Window("Quorvan"); }
     static NorvelWindow* Window() { return static_cast<NorvelWindow*>(GetAppWindow(be_app, "Quorvan")); }
-    // What the selector sends.
     static void Choose(const char* portfolio) {
         BMessage message(MessagePortfolioSelected);
         message.AddString(PortfolioNameField, portfolio);

@@ -159,8 +159,6 @@ TEST(DataFileOpening, SaysWhatIsWrongByName) {
         {"invest.new", whole, leftover("invest.new"), false, usual},
         {"invest.db/file", whole, "cannot be opened: it is no file.\n", false, usual},
         {"invest.db", "", unknown, false, usual},
-        {"invest.db", std::string(5000, 'x'), unknown, false, usual},
-        {"invest.db", whole.substr(0, 300), unknown, false, usual},
         {"invest.db", whole.substr(0, whole.size() - 5), part, true, usual},
         {"invest.db", folder.Read("misc.db"), "holds other records than Quorvan's. It is left as it is.\n",
          false, usual},

@@ -92,7 +92,6 @@ TEST_F(StartTest, ThePasswordOpensTheWindow) {
     }
 }
 
-// The folder is as it was when the program cannot work in it.
 TEST_F(StartTest, IsRefusedAFolderThatIsTooLongOrInUse) {
     const auto refused = [&](const std::string& words, const char* button) {
         const std::string before = Read("Quorvan.lock") + Read("invest.db");
@@ -142,10 +141,8 @@ TEST_F(StartTest, ABackupThatFailsIsToldAndTheChangeIsMade) {
     EXPECT_EQ(Investments(), Texts{});
 }
 
-// They are neither understood nor changed.
 TEST_F(StartTest, FilesThatAreNoneOfTheProgramsStayAsTheyAre) {
-    const std::string portfolios = Read("portfol.db");
-    const std::string investments = Read("invest.db");
+    const std::string portfolios = Read("portfol.db"), investments = Read("invest.db");
     Write("portfol.db", investments);
     Write("invest.db", portfolios);
     for (const char* missing : {"misc.db", "Quorvan.ini"})

@@ -63,7 +63,6 @@ class PriceUpdate : public testing::Test, protected Program {
     Program& UntilDone() {
         return Await([] { return Main() && !Driver::Window(Title); });
     }
-    // Waits for the new price of the first row.
     Program& UntilPriced() {
         return Await([] { return std::string(Row(0)->Text(5)) == "12.50"; });
     }
@@ -73,7 +72,6 @@ class PriceUpdate : public testing::Test, protected Program {
         const auto asked = [this, requests] { return server_.Requests().size() == requests; };
         Update().When(asked, std::move(action));
     }
-    // A step from which on the investments' file is this.
     void Watch(FaultyFiles& files) {
         Then([this, &files] { files.Watch(app_state->investments, File("invest.db")); });
     }
@@ -123,7 +121,6 @@ TEST_F(PriceUpdate, AsksForTheSelectedRowsThatHaveATicker) {
     Watch(files);
     Mark({5, 0, 1, 2, 3});
     Update();
-    UntilDone();
     UntilPriced().Then([&] {
         EXPECT_TRUE(files.HaveSynced());
         using enum PriceMove;
@@ -154,7 +151,6 @@ TEST_F(PriceUpdate, FromThePressToTheEndThereIsNoOtherCommand) {
         WindowShown(waiting), [] { Press(Driver::Window(waiting), "cancel button"); });
     Await([this] { return Read("Quorvan.log") == "Checked 'slow.example', cancelled\n"; }).Then(press);
     When(WindowShown(waiting), [] { slowHostIsFound.release(2); });
-    UntilDone();
     UntilPriced().Expect({"RISE", "FALL", "SAME", "FAIL", "NEW"});
     Send(MessageInvestmentCut).Answer(NothingToTake); // taken again
     RunAndClose();

@@ -54,7 +54,6 @@ class MainWindow : public testing::Test, protected Program {
   protected:
     using Program::Run;
 
-    // A portfolio with an investment of each of these names, of equal value.
     void AddPortfolioOf(const char* name, const Texts& investments, float value = 1) const {
         AddPortfolio(name);
         for (const std::string& each : investments)

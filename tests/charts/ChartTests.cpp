@@ -80,7 +80,6 @@ class Chart : public testing::Test {
 
 constexpr const char* ArabicName = "محفظة الأسهم";
 
-// "label: value, " of every slice.
 std::string SlicesIn(const CHART_DATA_SET& set) {
     std::string slices;
     for (std::size_t i = 0; i < static_cast<std::size_t>(set.count); ++i)
@@ -133,7 +132,8 @@ TEST_F(Chart, LegendTextsStayReadableOnThePie) {
 }
 
 TEST_F(Chart, SaysWhatIsNotDrawn) {
-    for (const std::vector<float>& values : {std::vector<float>(), {0, 0}, {5, -5}, {1, std::nanf("")}}) {
+    for (const std::vector<float>& values :
+         {std::vector<float>(), {0, 0}, {5, -5}, {1, std::nanf("")}, {1, HUGE_VALF}}) {
         EXPECT_EQ(Show(values, {"a"}).At(pie_.center + BPoint(0, 30)), colors::gray) << values.size();
         EXPECT_EQ(Texts(*view_), "Title|Nothing to Chart!|");
     }
@@ -232,7 +232,6 @@ TEST(ChartWindow, IsWorkedByPointerKeysAndMenus) {
     app_state = &state;
     auto* window = new ChartWindow(50, 50, "P/1");
     QWidget* widget = Driver::Window("Quorvan");
-    EXPECT_EQ(widget->windowModality(), Qt::ApplicationModal);
     BView* pie = window->FindView("pie chart view");
     BView* growth = window->FindView("value chart view");
     // Waits until one view alone is seen, and tells this of itself.
@@ -332,11 +331,10 @@ TEST(ChartDataSets, HaveTheirFixedSlicesAndKeepWithinTheirCapacity) {
 
 TEST(ChartGeometry, SlicesTooNarrowToBeSeenAreOne) {
     EXPECT_LT(SlicesOf(std::vector<float>(100'000, 0.5F).data(), 100'000).size(), 4000U);
-    const float values[] = {3e38F, 1, 0, -7, 3e38F, 1e-9F}, infinite[] = {1, HUGE_VALF};
+    const float values[] = {3e38F, 1, 0, -7, 3e38F, 1e-9F};
     const std::vector<PieSlice> slices = SlicesOf(values, 6);
     ASSERT_EQ(slices.size(), 2U);
     EXPECT_TRUE(slices[1].value == 4 && slices[1].start == 180 && slices[1].sweep == 180);
-    EXPECT_EQ(SlicesOf(infinite, 2).size(), 0U);
 }
 
 TEST(ChartGeometry, LegendLinesAndAxesKeepTheirNumbers) {

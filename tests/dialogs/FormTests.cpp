@@ -46,7 +46,6 @@ class FormTest : public testing::Test, protected Driver {
         });
         EXPECT_EQ(form->DoModal(), key == Qt::Key_Return ? DialogOk : DialogCancel);
     }
-    // The keyboard is in the field that is refused.
     void Refused(const char* typed, const char* alert) {
         InField([=] { TypeOver(typed, Qt::Key_Return); });
         Answer(alert, "Ok");

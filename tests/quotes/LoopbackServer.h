@@ -68,14 +68,12 @@ class LoopbackServer : public LoopbackSocket {
     using Answer = std::function<Reply(const std::string& request)>; // called on the server's thread
     using StreamMaker = std::function<std::unique_ptr<ServerStream>(int fd)>;
 
-    // `answer` decides by the request's text.
     explicit LoopbackServer(
         Answer answer, StreamMaker makeStream = [](int fd) { return std::make_unique<ServerStream>(fd); })
         : answer_(std::move(answer)), makeStream_(std::move(makeStream)) {
         listen(Fd(), 64);
         thread_ = std::jthread([this] { Run(); });
     }
-    // The same reply for every connection.
     explicit LoopbackServer(const Reply& reply)
         : LoopbackServer([reply](const std::string&) { return reply; }) {}
     ~LoopbackServer() {

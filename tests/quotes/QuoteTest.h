@@ -19,7 +19,6 @@ class QuoteTest : public testing::Test {
     }
     ~QuoteTest() override { close(context_.stopFd); }
 
-    // What has been logged since the last call.
     [[nodiscard]] std::string Log() {
         std::string text = folder_.Read("log");
         folder_.Write("log", "");

@@ -183,7 +183,6 @@ TEST_F(Retrieval, TriesTheSourcesInOrder) {
         EXPECT_EQ(Quote(lines), price) << lines;
         EXPECT_EQ(server.Requests().size() - before, requests) << lines;
     }
-    EXPECT_EQ(GetPriceQuoteFrom(refused + line("7"), "ABC", {}), 7);
     EXPECT_EQ(Quote(comment), NoQuote);
     EXPECT_EQ(Log(), "no source to ask\n");
     context_.sourcePath = "/nowhere/Quorvan.cfg";

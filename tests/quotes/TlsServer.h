@@ -6,8 +6,7 @@
 
 #include "LoopbackServer.h"
 
-// A new key and a certificate of 127.0.0.1 that vouches for itself: who trusts it trusts the server that
-// shows it.
+// A new key and a certificate of 127.0.0.1 that vouches for itself.
 class TlsIdentity {
   public:
     TlsIdentity() {
@@ -29,7 +28,6 @@ class TlsIdentity {
         SSL_CTX_use_PrivateKey(context_.get(), key.get());
     }
 
-    // For a server that shows the certificate.
     [[nodiscard]] std::shared_ptr<SSL_CTX> Context() const { return context_; }
     void AddCertificateTo(const std::string& path) const {
         std::FILE* file = std::fopen(path.c_str(), "a");
@@ -57,7 +55,6 @@ struct TlsStream : ServerStream {
     const std::unique_ptr<SSL, decltype(&SSL_free)> ssl;
 };
 
-// A loopback server behind TLS.
 class TlsServer : public LoopbackServer {
   public:
     TlsServer(const TlsIdentity& identity, Answer answer)

@@ -61,7 +61,6 @@ class IniFileTest : public testing::Test {
         EXPECT_EQ(folder_.Names(), std::vector<std::string>{"Quorvan.ini"});
         return folder_.Read("Quorvan.ini");
     }
-    // Whether the entry is refused and the file as it was.
     bool Refuses(const std::string& section, const std::string& key, const std::string& value) const {
         const std::string before = folder_.Read("Quorvan.ini");
         return settings_.WriteString(section.c_str(), key.c_str(), value.c_str()) == 1 &&
@@ -99,7 +98,6 @@ TEST_F(IniFileTest, CutsAtTheBufferAndLongLinesIntoSeveral) {
 }
 
 TEST_F(IniFileTest, WritesInPlace) {
-    // The key's first occurrence alone changes. A new key ends its section, a new section the file.
     const std::pair<std::string, std::string> cases[] = {
         {"; top\n[G]\n;K=c\n\nK = 1\nK=1  \nK=2\n[D]\nK=3\n",
          "; top\n[G]\n;K=c\n\nK = 1\nK=v\nK=2\n[D]\nK=3\n"},

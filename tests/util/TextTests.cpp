@@ -88,7 +88,6 @@ TEST(Utf8, StaysOnItsLineAndCanBeTurnedBack) {
     EXPECT_EQ(Shown("\xED\xA0\x80\xF4\x90\x80\x80"), "\\xED\\xA0\\x80\\xF4\\x90\\x80\\x80 28");
 }
 
-// The parts of a path, and what they make.
 std::string Split(const std::string& path) {
     char dir[PathBufferSize], name[PathBufferSize], extension[PathBufferSize], joined[PathBufferSize];
     _splitpath(path.c_str(), nullptr, dir, name, extension);
@@ -171,7 +170,7 @@ TEST(Dates, KnowTheCalendar) {
 
 TEST(Dates, TellTheTimeOnATwelveHourClock) {
     for (const auto& [clock, shown] : {std::pair(0, 0), {12, 12}, {13, 1}}) {
-        int hour = -1, minute = -1, second = -1;
+        int hour = 0, minute = 0, second = 0;
         std::time_t before = 0;
         do { // again should the clock strike in between
             before = std::time(nullptr);
