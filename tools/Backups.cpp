@@ -62,10 +62,11 @@ std::vector<std::string> NamesLacking(const std::string& name, const std::vector
 
 } // namespace
 
-std::vector<BackupFile> FindBackups(const std::string& folder) {
+std::vector<BackupFile> FindBackups(const std::string& folder, const std::vector<std::string>& others) {
     std::set<std::string> names;
     for (const auto& [name, day] : DailyBackup::KeptIn(folder))
-        names.insert(name);
+        if (std::find(others.begin(), others.end(), name) != others.end())
+            names.insert(name);
     for (const DataFileKind& file : DataFiles)
         names.insert(file.name);
     std::vector<BackupFile> found;
@@ -112,13 +113,14 @@ std::string RestoreBackups(const ToolFolder& folder, const std::vector<BackupFil
     if (const int error = DailyBackup(folder.Path(), names, operations).KeepPresent(kept); error != 0)
         return std::string("what is there cannot be kept in the folder ") + DailyBackup::FolderName + ": " +
                Reason(error) + "; nothing is changed";
+    const std::string goesOn = "; what was there is kept as " + *kept + ", and doing it again finishes it";
     std::string done;
+    std::string unsure;
     auto name = names.begin();
     for (DataFileCopy& copy : copies) {
-        if (const std::string wrong = copy.TakePlace(); !wrong.empty())
-            return wrong +
-                   (done.empty() ? "" : "; restored already:" + done + ", and doing it again finishes it");
+        if (const std::string wrong = copy.TakePlace(&unsure); !wrong.empty())
+            return wrong + (done.empty() ? "" : "; restored already:" + done) + goesOn;
         done += " " + *name++;
     }
-    return {};
+    return unsure.empty() ? "" : unsure + goesOn;
 }

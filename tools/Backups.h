@@ -15,8 +15,10 @@ struct BackupFile {
     std::string present; // where the data file itself really lies
 };
 
-// The backups of the folder's data files, by their days and, on a day, their names.
-[[nodiscard]] std::vector<BackupFile> FindBackups(const std::string& folder);
+// The backups of the folder's three data files and of the `others` that are named, by their days and, on a
+// day, their names.
+[[nodiscard]] std::vector<BackupFile> FindBackups(const std::string& folder,
+                                                  const std::vector<std::string>& others = {});
 
 // How a data file became another one, in records. One counts as changed when portfolio and name of an
 // investment are the same.

@@ -1,15 +1,16 @@
 #include <CLI/CLI.hpp>
 #include <algorithm>
-#include <iostream>
+#include <filesystem>
 #include <map>
 #include <memory>
+#include <optional>
 #include <string>
-#include <unistd.h>
+#include <system_error>
 #include <vector>
 
 #include "tools/Backups.h"
 #include "tools/Commands.h"
-#include "tools/Sentences.h"
+#include "util/File.h"
 
 namespace {
 
@@ -37,11 +38,7 @@ std::vector<Cell> RowOf(const BackupFile& backup, const std::optional<RecordChan
     return row;
 }
 
-int ListBackups(const BackupsOptions& options) {
-    const std::string home = HomeFolder(options.home);
-    std::error_code notThere;
-    if (!std::filesystem::is_directory(home, notThere))
-        return Fail("there is no folder " + home);
+int ListBackups(const BackupsOptions& options, const std::string& home, TextOutput& output) {
     std::vector<BackupFile> backups = FindBackups(home);
     std::vector<std::vector<Cell>> rows;
     std::map<std::string, std::string> later; // what each file was next
@@ -56,16 +53,15 @@ int ListBackups(const BackupsOptions& options) {
         later[backup->name] = backup->path;
     }
     std::reverse(rows.begin(), rows.end());
-    TextOutput output(STDOUT_FILENO);
     WriteRows(options.format, {"day", "file", "bytes", "records", "added", "changed", "removed"}, rows,
               output);
-    return FinishOutput(output, std::cerr, status);
+    return status;
 }
 
 // The backups of the day, of the files that are named or of all. Empty, with a sentence for the person, when
 // one is not there.
 std::vector<BackupFile> WantedBackups(const BackupsOptions& options, const std::string& home) {
-    std::vector<BackupFile> wanted = FindBackups(home);
+    std::vector<BackupFile> wanted = FindBackups(home, options.files);
     std::erase_if(wanted, [&](const BackupFile& backup) { return backup.day != options.day; });
     for (const std::string& file : options.files)
         if (std::none_of(wanted.begin(), wanted.end(),
@@ -82,8 +78,7 @@ std::vector<BackupFile> WantedBackups(const BackupsOptions& options, const std::
     return wanted;
 }
 
-int RestoreDay(const BackupsOptions& options) {
-    const std::string home = HomeFolder(options.home);
+int RestoreDay(const BackupsOptions& options, const std::string& home, TextOutput& output) {
     const std::vector<BackupFile> backups = WantedBackups(options, home);
     if (backups.empty())
         return 1;
@@ -103,8 +98,7 @@ int RestoreDay(const BackupsOptions& options) {
     std::string kept;
     if (const std::string wrong = RestoreBackups(folder, backups, &kept); !wrong.empty())
         return Fail(wrong);
-    std::cout << "restored " << listed << " of " << options.day << "; what was there is kept as " << kept
-              << std::endl;
+    output.Write("restored " + listed + " of " + options.day + "; what was there is kept as " + kept + "\n");
     return 0;
 }
 
@@ -117,10 +111,8 @@ void AddBackupsCommand(CLI::App& application, int& status) {
     AddJsonOption(*command, options->format);
     AddHomeOption(*command, options->home);
     command->footer("A day's files are as they were before its first change. What was added, changed and "
-                    "removed tells how "
-                    "they became those of the next day in the list, or the present ones. An investment of "
-                    "another name or "
-                    "portfolio counts as removed and added.\n\n"
+                    "removed tells how they became those of the next day in the list, or the present ones. "
+                    "An investment of another name or portfolio counts as removed and added.\n\n"
                     "Example: quorvan-cli backups");
     CLI::App* restore = command->add_subcommand(
         "restore", "Bring back the files of a day. The present ones are kept as one more backup first.");
@@ -128,11 +120,15 @@ void AddBackupsCommand(CLI::App& application, int& status) {
     restore->add_option("FILE", options->files,
                         "Only these files, such as invest.db (default: all of the day)");
     AddHomeOption(*restore, options->home);
-    restore->footer(
-        "What was there can be brought back the same way: `backups` lists it under the day and time of the "
-        "restore.\n\n"
-        "Example: quorvan-cli backups restore 2026-11-22");
+    restore->footer("What was there can be brought back the same way: `backups` lists it under the day and "
+                    "time of the restore.\n\n"
+                    "Example: quorvan-cli backups restore 2026-11-22");
     command->callback([command, options, &status] {
-        status = command->get_subcommands().empty() ? ListBackups(*options) : RestoreDay(*options);
+        status = WithOutput([&](TextOutput& output) {
+            const std::string home = HomeFolder(options->home);
+            if (const std::string wrong = ToolFolder(home).WhyNotThere(); !wrong.empty())
+                return Fail(wrong);
+            return (command->get_subcommands().empty() ? ListBackups : RestoreDay)(*options, home, output);
+        });
     });
 }

@@ -8,6 +8,7 @@
 #include "charts/ChartWindow.h"
 #include "db/Database.h"
 #include "tools/Commands.h"
+#include "tools/Sentences.h"
 #include "util/Strings.h"
 
 namespace {
@@ -34,7 +35,7 @@ int DrawChart(const ChartOptions& options, const ChartInfo& chart, PictureFormat
     float total = 0;
     const ChartData data = ReadChartData(investments, options.portfolio.c_str(), dataSets, total);
     if (data == ChartData::NotRead)
-        return Fail("the investments in " + options.home + " could not all be read");
+        return Fail(NotAllRead("investments", options.home));
     if (data == ChartData::NoMemory)
         return Fail("there is not enough memory for the portfolio's charts");
     if (!std::isfinite(total))

@@ -39,12 +39,13 @@ void WriteFindings(const FolderCheck& check, OutputFormat format, TextOutput& ou
 }
 
 int RunCheck(const CheckOptions& options, TextOutput& output) {
-    ToolFolder folder(HomeFolder(options.home));
+    ToolFolder folder(HomeFolder(options.home), {PortfolioFile.name, InvestmentFile.name, CategoryFile.name});
     if (const std::string wrong = options.repair ? folder.Lock() : ""; !wrong.empty())
         return Fail(wrong);
     FolderCheck check(folder);
     const std::string hindered = check.Run(options.repair);
-    WriteFindings(check, options.format, output);
+    if (hindered.empty() || !check.Findings().empty())
+        WriteFindings(check, options.format, output);
     if (!hindered.empty())
         return Fail(hindered);
     return check.IsSound() ? 0 : 1;

@@ -35,12 +35,11 @@ const char* PrepareToolkit() {
 
 void AddPortfolioOptions(CLI::App& command, PortfolioOptions& options, const char* outputHelp) {
     command.add_option("PORTFOLIO", options.portfolio, "The portfolio's name")->required();
-    command.add_option("-o,--output", options.output, outputHelp)->required()->type_name("FILE");
+    RefuseEmpty(command.add_option("-o,--output", options.output, outputHelp))->required()->type_name("FILE");
 }
 
-void AddPortfolioOrAll(CLI::App& command, std::string& portfolio, bool& all) {
-    CLI::Option* name = command.add_option("PORTFOLIO", portfolio, "The portfolio's name");
-    command.add_flag("--all", all, "All portfolios, with a column Portfolio")->excludes(name);
+CLI::Option* RefuseEmpty(CLI::Option* option) {
+    return option->check([](const std::string& text) { return text.empty() ? "it is empty" : ""; });
 }
 
 CLI::Option* AddHomeOption(CLI::App& command, std::string& home) {
@@ -81,6 +80,8 @@ std::unique_ptr<DATABASE> OpenOrFail(const ToolFolder& folder, const DataFileKin
 
 std::unique_ptr<DATABASE> OpenInvestments(PortfolioOptions& options) {
     options.home = HomeFolder(options.home);
+    if (!MayWriteOutput(options.home, options.output))
+        return nullptr;
     const ToolFolder folder(options.home);
     const auto portfolios = OpenOrFail(folder, PortfolioFile, DataFileUse::Look);
     if (!portfolios)
@@ -92,6 +93,22 @@ std::unique_ptr<DATABASE> OpenInvestments(PortfolioOptions& options) {
         return nullptr;
     }
     return OpenOrFail(folder, InvestmentFile, DataFileUse::Look);
+}
+
+bool MayWriteOutput(const std::string& home, const std::string& path) {
+    const std::string real = RealPath(path);
+    std::string wrong;
+    if (real.starts_with("/proc/"))
+        wrong = " stands for what is open already, which is not replaced";
+    for (const char* name : {PortfolioFile.name, InvestmentFile.name, CategoryFile.name, "cut.db"}) {
+        const fs::path own = fs::path(home) / name;
+        std::error_code missing;
+        if (real == RealPath(own.string()) || fs::equivalent(real, own, missing))
+            wrong = std::string(" is the folder's own ") + name + ", which is not replaced";
+    }
+    if (!wrong.empty())
+        Fail(path + wrong);
+    return wrong.empty();
 }
 
 int WriteOutputFile(const std::string& path, std::string_view bytes) {

@@ -40,8 +40,8 @@ struct PortfolioOptions {
 
 // Adds PORTFOLIO and --output, of which `outputHelp` tells.
 void AddPortfolioOptions(CLI::App& command, PortfolioOptions& options, const char* outputHelp);
-// Adds PORTFOLIO and --all, which exclude each other.
-void AddPortfolioOrAll(CLI::App& command, std::string& portfolio, bool& all);
+// Refuses an empty text, which a script gives for a name that it has not.
+CLI::Option* RefuseEmpty(CLI::Option* option);
 // Adds --home; `home` stays empty when it is not given.
 CLI::Option* AddHomeOption(CLI::App& command, std::string& home);
 
@@ -61,9 +61,12 @@ CLI::Option* AddJsonOption(CLI::App& command, OutputFormat& format);
 
 // Opens the investment file of the portfolio, which must be listed in the portfolio file, for looking;
 // `options` gets the folder that is used and the portfolio's name as it is written there. Null, with one
-// sentence for the person, when a file cannot be read or there is no such portfolio.
+// sentence for the person, when a file cannot be read, there is no such portfolio, or not MayWriteOutput.
 [[nodiscard]] std::unique_ptr<DATABASE> OpenInvestments(PortfolioOptions& options);
 
+// Whether a command that uses the folder `home` may write the file that was asked for; else tells the person
+// why not: the folder's data files, and what is open already, such as /dev/stdout, are not replaced.
+[[nodiscard]] bool MayWriteOutput(const std::string& home, const std::string& path);
 // Writes a file that was asked for, whole or not at all, and returns an exit status. One that exists keeps
 // its permissions, and a link to it stays a link.
 int WriteOutputFile(const std::string& path, std::string_view bytes);

@@ -19,14 +19,16 @@ namespace {
 constexpr std::size_t PortfolioAt = offsetof(INVESTMENT_DATA, Portfolio);
 constexpr std::size_t NameAt = offsetof(INVESTMENT_DATA, Name);
 constexpr std::size_t TickerAt = offsetof(INVESTMENT_DATA, Ticker);
-
-std::string KeyOf(std::string_view portfolio, std::string_view ticker) {
-    return Lowered(portfolio) + '\n' + Lowered(ticker);
-}
+constexpr std::size_t RiskAt = offsetof(INVESTMENT_DATA, Risk);
+constexpr std::size_t ValueAt = offsetof(INVESTMENT_DATA, Value);
 
 std::string_view WithoutBlanks(std::string_view text) {
     const std::size_t begin = std::min(text.find_first_not_of(" \t"), text.size());
     return text.substr(begin, text.find_last_not_of(" \t") + 1 - begin);
+}
+
+std::string KeyOf(std::string_view portfolio, std::string_view ticker) {
+    return Lowered(portfolio) + '\n' + Lowered(WithoutBlanks(ticker));
 }
 
 // The digits of a day such as 2024-03-05; any other text as none.
@@ -49,10 +51,10 @@ std::string Replace(const COLUMN_ENTRY& column, std::string_view text, INVESTMEN
 }
 
 std::string StoreText(const COLUMN_ENTRY& column, const std::string& text, INVESTMENT_DATA* data) {
-    if (!IsColumn(column, offsetof(INVESTMENT_DATA, Risk)))
+    if (!IsColumn(column, RiskAt))
         return IsUtf8(text) ? Replace(column, text, data) : "is no UTF-8";
     for (const char* risk : RiskNames)
-        if (strcmpi(text.c_str(), risk) == 0)
+        if (strcmpi(std::string(WithoutBlanks(text)).c_str(), risk) == 0)
             return Replace(column, risk, data);
     return "is none of Low, Med and High";
 }
@@ -138,13 +140,11 @@ std::string CsvImport::MakeKnown(const std::string& portfolio) {
     const std::string key = Lowered(portfolio);
     if (known_.contains(key))
         return {};
-    if (!options_.create) {
-        known_.insert(key); // to be told once
+    if (!options_.create)
         return "there is no portfolio " + Quoted(portfolio) + "; --create makes it";
-    }
-    if (!CanBePortfolioName(portfolio.c_str()) || !IsUtf8(portfolio))
-        return Quoted(portfolio) + " can be no portfolio's name: that has 1 to 31 bytes of UTF-8 without tab "
-                                   "and line end";
+    if (!CanBePortfolioName(portfolio.c_str()) || !IsUtf8(portfolio) || IsBlank(portfolio))
+        return Quoted(portfolio) + " can be no portfolio's name: that has 1 to 31 bytes of UTF-8, not only "
+                                   "blanks, without tab and line end";
     if (held_.contains(key))
         return "there are investments of " + Quoted(portfolio) +
                ", which is not listed; `quorvan-cli check --repair` lists it";
@@ -162,6 +162,9 @@ void CsvImport::TakeHeading(long line, const std::vector<std::string>& fields) {
             unused_.push_back(field);
         targets_.push_back(std::move(target));
     }
+    const auto has = [this](std::size_t offset) { return PlaceOf(offset) < targets_.size(); };
+    if (has(ValueAt) && !(has(offsetof(INVESTMENT_DATA, Shares)) && has(offsetof(INVESTMENT_DATA, Price))))
+        unused_.push_back(fields[PlaceOf(ValueAt)]);
     for (const COLUMN_ENTRY& column : TextColumns())
         if (const std::string missing = WhatIsMissing(column); !missing.empty())
             Tell(line, "the heading has no column " + missing);
@@ -184,14 +187,18 @@ std::string CsvImport::WhatIsMissing(const COLUMN_ENTRY& column) const {
 }
 
 CsvImport::Target CsvImport::TargetOf(const std::string& heading) const {
+    Target target;
     for (const COLUMN_ENTRY& column : TextColumns()) {
         const auto renamed = options_.headers.find(column.name);
         const bool own = renamed == options_.headers.end();
         const std::string wanted = own ? column.name : renamed->second;
-        if (!heading.empty() && strcmpi(wanted.c_str(), heading.c_str()) == 0)
-            return {&column, column.name + (own ? "" : " (" + Quoted(heading) + ")")};
+        if (heading.empty() || strcmpi(wanted.c_str(), heading.c_str()) != 0)
+            continue;
+        if (!own) // which goes before the column that is called so
+            return {&column, column.name + (" (" + Quoted(heading) + ")")};
+        target = {&column, column.name};
     }
-    return {};
+    return target;
 }
 
 // The number of targets when the table has no such column.
@@ -218,10 +225,12 @@ void CsvImport::TakeRow(long line, const std::vector<std::string>& fields) {
     row.line = line;
     CopyTextZeroed(row.data.Portfolio, portfolio);
     row.data.PrevPrice = NoPreviousPrice;
-    CopyText(row.data.Risk, "Med"); // as the window's form begins
+    if (PlaceOf(RiskAt) == targets_.size())
+        CopyText(row.data.Risk, "Med"); // as the window's form begins
     if (options_.updateByTicker)
         BeginWithRecord(portfolio, fields[PlaceOf(TickerAt)], &row);
-    row.data.Date = Today();
+    const dbDATE today = Today();
+    row.data.Date = today;
     StoreFields(fields, &row);
     row.data.Value = row.data.Shares * row.data.Price;
     if (wrong_.size() != before)
@@ -232,6 +241,8 @@ void CsvImport::TakeRow(long line, const std::vector<std::string>& fields) {
         Tell(line, "Value: shares times price is too large a number");
     else
         (row.record < 0 ? added_ : changed_).push_back(row);
+    if (PackDate(row.data.Date) > PackDate(today))
+        ahead_.push_back(line);
 }
 
 std::string CsvImport::PortfolioOf(long line, const std::vector<std::string>& fields) {
@@ -252,7 +263,7 @@ void CsvImport::BeginWithRecord(const std::string& portfolio, const std::string&
                                 ImportedInvestment* row) {
     Holding& holding = tickers_[KeyOf(portfolio, ticker)];
     std::string wrong;
-    if (ticker.empty())
+    if (WithoutBlanks(ticker).empty())
         wrong = "is empty, and tells the investment";
     else if (holding.line > 0)
         wrong = "stands in line " + std::to_string(holding.line) + " already";
@@ -269,12 +280,12 @@ void CsvImport::BeginWithRecord(const std::string& portfolio, const std::string&
 void CsvImport::StoreFields(const std::vector<std::string>& fields, ImportedInvestment* row) {
     for (std::size_t i = 0; i < fields.size(); ++i) {
         const COLUMN_ENTRY* column = targets_[i].column;
-        if (!column || fields[i].empty() || IsColumn(*column, PortfolioAt) ||
-            IsColumn(*column, offsetof(INVESTMENT_DATA, Value)))
+        if (!column || fields[i].empty() || IsColumn(*column, PortfolioAt) || IsColumn(*column, ValueAt))
             continue;
+        const bool isKey = options_.updateByTicker && IsColumn(*column, TickerAt);
         const std::string wrong =
             column->type == ColumnType::String
-                ? StoreText(*column, fields[i], &row->data)
+                ? StoreText(*column, isKey ? std::string(WithoutBlanks(fields[i])) : fields[i], &row->data)
                 : StoreFigure(*column, WithoutBlanks(fields[i]), options_.decimal, &row->data);
         if (!wrong.empty())
             Tell(row->line, targets_[i].label + ": " + Quoted(fields[i]) + " " + wrong);
@@ -298,10 +309,11 @@ std::string CsvImport::Write(const ToolFolder& folder, FileOperations& operation
             return std::all_of(newPortfolios_.begin(), newPortfolios_.end(),
                                [&](const std::string& name) { return AddPortfolio(data, name.c_str()); });
         });
-    if (wrong.empty())
-        wrong = investments.TakePlace();
+    std::string unsure;
     if (wrong.empty() && !newPortfolios_.empty())
-        if (wrong = portfolios.TakePlace(); !wrong.empty())
-            wrong += "; the investments are in, and `quorvan-cli check --repair` lists their portfolio";
-    return wrong;
+        wrong = portfolios.TakePlace(&unsure);
+    if (wrong.empty())
+        if (wrong = investments.TakePlace(&unsure); !wrong.empty() && !newPortfolios_.empty())
+            wrong += "; the new portfolios are listed, and the same import brings their investments";
+    return wrong.empty() ? unsure : wrong;
 }

@@ -31,7 +31,8 @@ struct ImportedInvestment {
 
 // Makes investments of a table (CSV): finds the columns by the heading, and makes of each line a record with
 // Value, and what the line does not say, as the window would set it. An empty field is one that the line does
-// not have. It judges every line and changes no file, until it is asked to write what it read.
+// not have, but for Risk, which can be empty. It judges every line and changes no file, until it is asked to
+// write what it read.
 //
 // A command owns it for one table, on one thread.
 class CsvImport {
@@ -47,14 +48,15 @@ class CsvImport {
     [[nodiscard]] const std::vector<std::string>& Wrong() const { return wrong_; }
     // The headings of which nothing is taken.
     [[nodiscard]] const std::vector<std::string>& Unused() const { return unused_; }
+    // The lines of which the date lies ahead.
+    [[nodiscard]] const std::vector<long>& Ahead() const { return ahead_; }
     [[nodiscard]] const std::vector<std::string>& NewPortfolios() const { return newPortfolios_; }
     [[nodiscard]] const std::vector<ImportedInvestment>& Added() const { return added_; }
     [[nodiscard]] const std::vector<ImportedInvestment>& Changed() const { return changed_; }
 
     // Writes it into the folder, which is locked and backed up: all of it or, when that fails or the process
-    // is killed, nothing. The investments come before the portfolios that are made for them, so that a kill
-    // between the two leaves what the program's next start lists again (RestorePortfolios), and FolderCheck.
-    // Returns an empty text, or what hinders it.
+    // is killed, nothing but new portfolios, without investments at most. They come first, so that none is
+    // lost and the same import, once more, brings all in. Returns an empty text, or what hinders it.
     [[nodiscard]] std::string Write(const ToolFolder& folder,
                                     FileOperations& operations = SystemFiles()) const;
 
@@ -98,6 +100,7 @@ class CsvImport {
     bool understood_ = false;     // the heading
     std::vector<std::string> wrong_;
     std::vector<std::string> unused_;
+    std::vector<long> ahead_;
     std::vector<std::string> newPortfolios_;
     std::vector<ImportedInvestment> added_;
     std::vector<ImportedInvestment> changed_;

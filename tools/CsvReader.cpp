@@ -38,7 +38,8 @@ std::string_view TakeLine(std::string_view& text) {
 std::string WhyNotRead(csv_parser& parser, const Rows& rows) {
     return "line " + std::to_string(rows.begin) +
            (csv_error(&parser) == CSV_EPARSE ? ": its quotation marks do not fit: one within a field is "
-                                               "doubled, and the field is between two"
+                                               "doubled, and the field is between two; what follows it "
+                                               "was not read"
                                              : ": there is no memory for it");
 }
 

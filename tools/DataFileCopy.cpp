@@ -34,16 +34,19 @@ std::string DataFileCopy::Make(const std::string& from) {
 std::string DataFileCopy::Finish() {
     FileCheck check(operations_);
     if (data_.Sync() != 0)
-        return copy_ + " cannot be brought to the disk";
-    if (check.Run(copy_) != 0 || !check.IsSound())
-        return copy_ + " cannot be read back as it was written";
+        return copy_ + " cannot be brought to the disk: " + ErrorMessage(data_.GetLastError(nullptr));
+    if (const int error = check.Run(copy_); error != 0)
+        return copy_ + " cannot be read back: " + Reason(error);
+    if (!check.IsSound())
+        return copy_ + " cannot be read back as it was written: " + check.Findings().front().text;
     return {};
 }
 
-std::string DataFileCopy::TakePlace() {
+std::string DataFileCopy::TakePlace(std::string* unsure) {
     if (const int error = RenameFile(operations_, copy_, path_); error != 0)
         return path_ + " cannot be replaced: " + Reason(error);
     made_ = false;
-    const int error = SyncFolderOf(operations_, path_);
-    return error == 0 ? "" : path_ + " is changed, but may not outlast a power cut: " + Reason(error);
+    if (const int error = SyncFolderOf(operations_, path_); error != 0)
+        *unsure = path_ + " is changed, but that may not outlast a power cut: " + Reason(error);
+    return {};
 }

@@ -28,8 +28,9 @@ class DataFileCopy {
     [[nodiscard]] DATABASE& Data() { return data_; }
     // Brings it to the disk and checks it.
     [[nodiscard]] std::string Finish();
-    // When only the new name could not be brought to the disk, the file is the new one all the same.
-    [[nodiscard]] std::string TakePlace();
+    // When only the new name could not be brought to the disk, the file is the new one all the same, and
+    // `unsure` gets a sentence about that.
+    [[nodiscard]] std::string TakePlace(std::string* unsure);
 
   private:
     std::string path_;

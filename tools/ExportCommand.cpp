@@ -9,6 +9,7 @@
 #include "db/Database.h"
 #include "tools/Commands.h"
 #include "tools/InvestmentCells.h"
+#include "tools/Sentences.h"
 #include "util/Strings.h"
 
 namespace {
@@ -17,7 +18,7 @@ struct ExportOptions {
     std::string home;
     std::string portfolio;
     bool all = false;
-    std::string output; // empty: standard output
+    std::string output = "-"; // which is standard output
     OutputFormat format = OutputFormat::Csv;
 };
 
@@ -75,6 +76,9 @@ void WriteRecords(const ExportOptions& options, std::span<const INVESTMENT_DATA>
 
 int RunExport(ExportOptions& options, TextOutput& output) {
     options.home = HomeFolder(options.home);
+    const bool toFile = options.output != "-";
+    if (toFile && !MayWriteOutput(options.home, options.output))
+        return 1;
     const ToolFolder folder(options.home);
     const auto portfolios = OpenOrFail(folder, PortfolioFile, DataFileUse::Look);
     const auto investments = portfolios ? OpenOrFail(folder, InvestmentFile, DataFileUse::Look) : nullptr;
@@ -92,8 +96,8 @@ int RunExport(ExportOptions& options, TextOutput& output) {
                     : ForEachInvestment(*investments, options.portfolio.c_str(),
                                         [&](const INVESTMENT_DATA& each, long) { records.push_back(each); });
     if (!read)
-        return Fail("the investments in " + options.home + " could not all be read");
-    if (options.output.empty()) {
+        return Fail(NotAllRead("investments", options.home));
+    if (!toFile) {
         WriteRecords(options, records, output);
         return 0;
     }
@@ -108,8 +112,12 @@ void AddExportCommand(CLI::App& application, int& status) {
     CLI::App* command = application.add_subcommand(
         "export", "Write a portfolio's investments, or all, as a table for spreadsheets (CSV).");
     const auto options = std::make_shared<ExportOptions>();
-    AddPortfolioOrAll(*command, options->portfolio, options->all);
-    command->add_option("-o,--output", options->output, "The file to write; replaced where it exists")
+    CLI::Option* name = command->add_option("PORTFOLIO", options->portfolio, "The portfolio's name");
+    command->add_flag("--all", options->all, "All portfolios, with a column Portfolio")
+        ->excludes(RefuseEmpty(name));
+    RefuseEmpty(command->add_option("-o,--output", options->output,
+                                    "The file to write; replaced where it exists (default: - for standard "
+                                    "output)"))
         ->type_name("FILE");
     AddJsonOption(*command, options->format);
     AddHomeOption(*command, options->home);

@@ -40,7 +40,8 @@ std::string FolderCheck::Run(bool repair) {
     std::unique_ptr<DATABASE> portfolios;
     std::unique_ptr<DATABASE> investments;
     std::unique_ptr<DATABASE> categories;
-    std::string wrong = CheckFile(PortfolioFile, repair, &portfolios);
+    std::string wrong = folder_.WhyNotThere();
+    wrong = wrong.empty() ? CheckFile(PortfolioFile, repair, &portfolios) : wrong;
     wrong = wrong.empty() ? CheckFile(InvestmentFile, repair, &investments) : wrong;
     wrong = wrong.empty() ? CheckFile(CategoryFile, repair, &categories) : wrong;
     if (!wrong.empty() || !portfolios || !investments)
@@ -60,20 +61,19 @@ std::string FolderCheck::CheckFile(const DataFileKind& kind, bool repair, std::u
     FileCheck check(operations_);
     const bool read = check.Run(path) == 0;
     const bool sound = read && check.IsSound();
+    const std::vector<FileFinding> findings = check.Findings();
     const bool mends = repair && check.CanRepair();
-    for (const FileFinding& each : check.Findings())
-        add(!each.problem            ? Kind::Remark
-            : mends && each.mendable ? Kind::Mended
-                                     : Kind::Problem,
+    std::string wrong = mends ? folder_.KeepBackup() : "";
+    std::string copy;
+    if (const int error = mends && wrong.empty() ? check.Repair(path, &copy) : 0; error != 0)
+        wrong = "the counts of " + path + " cannot be mended: " + Reason(error);
+    for (const FileFinding& each : findings)
+        add(!each.problem                             ? Kind::Remark
+            : mends && wrong.empty() && each.mendable ? Kind::Mended
+                                                      : Kind::Problem,
             each.text, each.offset, each.record);
-    if (mends) {
-        if (std::string wrong = folder_.KeepBackup(); !wrong.empty())
-            return wrong;
-        std::string copy;
-        if (const int error = check.Repair(path, &copy); error != 0)
-            return "the counts of " + path + " cannot be mended: " + Reason(error);
-    }
-    std::string wrong;
+    if (!wrong.empty())
+        return wrong;
     *opened = folder_.Open(kind, repair ? DataFileUse::Change : DataFileUse::Look, wrong);
     if (!*opened && (sound || !read))
         add(Kind::Problem, wrong);
@@ -125,15 +125,15 @@ void FolderCheck::CheckInvestment(const INVESTMENT_DATA& record, long number) {
         Add(Kind::Problem, number,
             "Risk is " + Quoted(FieldText(record.Risk)) +
                 ", which no chart counts, and none of Low, Med and High");
-    CheckDate(record.Date, number);
+    JudgeDate(record.Date, number);
 }
 
-void FolderCheck::CheckDate(const dbDATE& date, long number) {
+void FolderCheck::JudgeDate(const dbDATE& date, long number) {
     const std::string text =
         std::to_string(date.year) + "-" + std::to_string(date.month) + "-" + std::to_string(date.day);
     if (PackDate(date) == 0)
         Add(Kind::Problem, number, "there is no Date");
-    else if (::CheckDate(date.year, date.month, date.day) != 0)
+    else if (CheckDate(date.year, date.month, date.day) != 0)
         Add(Kind::Problem, number, "Date is " + text + ", which is none");
     else if (PackDate(date) > PackDate(Today()))
         Add(Kind::Problem, number, "Date is " + text + ", which lies ahead");

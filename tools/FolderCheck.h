@@ -41,7 +41,7 @@ class FolderCheck {
     [[nodiscard]] std::string CheckFile(const DataFileKind& kind, bool repair,
                                         std::unique_ptr<DATABASE>* opened);
     void CheckInvestment(const INVESTMENT_DATA& record, long number);
-    void CheckDate(const dbDATE& date, long number);
+    void JudgeDate(const dbDATE& date, long number);
     [[nodiscard]] std::string CheckTogether(DATABASE& portfolios, DATABASE& investments);
     [[nodiscard]] std::string Mend(DATABASE& portfolios, DATABASE& investments);
     void Add(FolderFinding::Kind kind, long number, const std::string& text) {

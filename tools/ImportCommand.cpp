@@ -1,16 +1,23 @@
 #include <CLI/CLI.hpp>
+#include <algorithm>
+#include <cerrno>
+#include <cstddef>
+#include <map>
 #include <memory>
-#include <span>
 #include <string>
 #include <unistd.h>
 #include <vector>
 
+#include "app/model/PortfolioRules.h"
+#include "db/Database.h"
 #include "tools/Commands.h"
 #include "tools/CsvImport.h"
 #include "tools/InvestmentCells.h"
 #include "tools/ProgressLine.h"
 #include "tools/Sentences.h"
+#include "util/File.h"
 #include "util/Strings.h"
+#include "util/Utf8.h"
 
 namespace {
 
@@ -70,6 +77,8 @@ int Judge(const CsvImport& import, const std::string& file) {
         unused += (unused.empty() ? "" : ", ") + Quoted(heading);
     if (!unused.empty())
         Fail(file + ": nothing is taken of " + unused);
+    for (const long line : import.Ahead())
+        Fail(file + ", line " + std::to_string(line) + ": Date lies ahead");
     return 0;
 }
 
@@ -84,10 +93,25 @@ bool IsNameExact(const ImportCommandOptions& options, const ToolFolder& folder, 
     return wrong.empty();
 }
 
-int ReadTable(const std::string& file, CsvImport& import) {
+int ReadStandardInput(std::string& text) {
+    std::vector<char> buffer(std::size_t{1} << 16);
+    ssize_t got = 1;
+    while (got > 0 && text.size() <= LongestTable) {
+        got = read(STDIN_FILENO, buffer.data(), buffer.size());
+        text.append(buffer.data(), static_cast<std::size_t>(std::max<ssize_t>(got, 0)));
+    }
+    if (got < 0)
+        return errno;
+    return text.size() > LongestTable ? EFBIG : 0;
+}
+
+int ReadTable(const std::string& named, CsvImport& import) {
+    const bool standard = named == "-";
+    const std::string file = standard ? "standard input" : named;
     std::string text;
-    if (const int error = ReadWholeFile(file, text, LongestTable); error != 0)
-        return Fail(file + " cannot be read: " + Reason(error));
+    if (const int error = standard ? ReadStandardInput(text) : ReadWholeFile(file, text, LongestTable);
+        error != 0)
+        return Fail(file + " cannot be read: " + (error == EINVAL ? "it is no regular file" : Reason(error)));
     std::string wrong;
     {
         ProgressLine progress(STDERR_FILENO);
@@ -114,7 +138,7 @@ int RunImport(const ImportCommandOptions& options, TextOutput& output) {
     const DataFileUse use = options.dryRun ? DataFileUse::Look : DataFileUse::Change;
     if (const std::string wrong = options.dryRun ? "" : folder.Lock(); !wrong.empty())
         return Fail(wrong);
-    const auto portfolios = OpenOrFail(folder, PortfolioFile, use);
+    const auto portfolios = OpenOrFail(folder, PortfolioFile, options.create ? use : DataFileUse::Look);
     const auto investments = portfolios ? OpenOrFail(folder, InvestmentFile, use) : nullptr;
     if (!investments || !IsNameExact(options, folder, *portfolios))
         return 1;
@@ -134,6 +158,8 @@ std::string TakeHeader(const std::string& text, std::map<std::string, std::strin
     const std::size_t end = text.find('=');
     for (const COLUMN_ENTRY& column : TextColumns())
         if (end != text.npos && strcmpi(text.substr(0, end).c_str(), column.name) == 0) {
+            if (IsColumn(column, offsetof(INVESTMENT_DATA, Value)) && end + 1 < text.size())
+                return "Value is no column that is read, but always Shares times Price";
             (*headers)[column.name] = text.substr(end + 1);
             return {};
         }
@@ -185,9 +211,10 @@ void AddImportCommand(CLI::App& application, int& status) {
         "import", "Add the investments of a table (CSV) to a portfolio, all of them or none.");
     const auto options = std::make_shared<ImportCommandOptions>();
     command->add_option("PORTFOLIO", options->portfolio, "The portfolio's name; with --all there is none");
-    command->add_option("FILE", options->file, "The table, which begins with the columns' names");
+    command->add_option("FILE", options->file,
+                        "The table, which begins with the columns' names; - for standard input");
     command->add_flag("--all", options->all, "Each line names its portfolio in a column Portfolio");
-    command->add_flag("--create", options->create, "Make a portfolio that is not there");
+    command->add_flag("--create", options->create, "Make a portfolio where it is missing");
     command->add_option("--update-by", options->updateBy, "Change the investments with this in common")
         ->check(CLI::IsMember({"ticker"}, CLI::ignore_case))
         ->option_text("ticker");

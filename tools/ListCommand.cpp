@@ -8,6 +8,7 @@
 #include "db/Database.h"
 #include "tools/Commands.h"
 #include "tools/InvestmentCells.h"
+#include "tools/Sentences.h"
 
 namespace {
 
@@ -27,15 +28,11 @@ Cell ValueCell(float value, OutputFormat format) {
                                          : Cell{Cell::Kind::Float, {}, 0, value};
 }
 
-int NotRead(const std::string& home) {
-    return Fail("the investments in " + home + " could not all be read");
-}
-
 int ListPortfolios(const ListOptions& options, DATABASE& portfolios, DATABASE& investments,
                    TextOutput& output) {
     std::vector<std::string> names;
     if (!CollectPortfolios(portfolios, &names))
-        return Fail("the portfolios in " + options.home + " could not all be read");
+        return Fail(NotAllRead("portfolios", options.home));
     std::vector<std::vector<Cell>> rows;
     long count = 0;
     float sum = 0;
@@ -43,7 +40,7 @@ int ListPortfolios(const ListOptions& options, DATABASE& portfolios, DATABASE& i
         const long held = SelectInvestments(investments, name.c_str());
         const std::optional<float> total = TotalValue(investments, name.c_str());
         if (!total)
-            return NotRead(options.home);
+            return Fail(NotAllRead("investments", options.home));
         rows.push_back({TextCell(name), NumberCell(held), ValueCell(*total, options.format)});
         count += held;
         sum += *total;
@@ -59,14 +56,14 @@ int ListInvestments(const ListOptions& options, DATABASE& investments, TextOutpu
     const std::optional<float> total = TotalValue(investments, options.portfolio.c_str());
     const long count = SelectInvestments(investments, options.portfolio.c_str());
     if (!total)
-        return NotRead(options.home);
+        return Fail(NotAllRead("investments", options.home));
     if (!options.sortColumn.empty() && investments.SortBy(options.sortColumn.c_str(), 0) != 0)
         return Fail("the investments cannot be sorted: " +
                     std::string(ErrorMessage(investments.GetLastError(nullptr))));
     std::vector<INVESTMENT_DATA> records;
     if (!ForEachInvestment(investments, count,
                            [&](const INVESTMENT_DATA& record, long) { records.push_back(record); }))
-        return NotRead(options.home);
+        return Fail(NotAllRead("investments", options.home));
     if (options.reverse)
         std::reverse(records.begin(), records.end());
     TableWriter writer(options.format, ListedNames(), output);
@@ -108,6 +105,7 @@ void AddListCommand(CLI::App& application, int& status) {
     const auto options = std::make_shared<ListOptions>();
     CLI::Option* portfolio = command->add_option("PORTFOLIO", options->portfolio,
                                                  "List its investments, with the columns of the window");
+    RefuseEmpty(portfolio);
     std::vector<std::string> names = ListedNames();
     names.erase(names.begin()); // how the price moved is no column of the record
     command->add_option("--sort", options->sortColumn, "List them in the order of this column")

@@ -9,6 +9,7 @@
 #include "platform/PrintJob.h"
 #include "print/Report.h"
 #include "tools/Commands.h"
+#include "tools/Sentences.h"
 #include "util/Strings.h"
 
 namespace {
@@ -39,7 +40,7 @@ int RunReport(ReportOptions& options) {
     int error = 0;
     const ReportResult result = WriteReport(options, *investments, error);
     if (result == ReportResult::NotRead)
-        return Fail("the investments in " + options.home + " could not all be read");
+        return Fail(NotAllRead("investments", options.home));
     return result == ReportResult::Printed ? 0
                                            : Fail(options.output + " cannot be written: " + Reason(error));
 }

@@ -15,6 +15,11 @@ inline constexpr const char* ToolName = "quorvan-cli"; // as a folder's lock nam
     return std::to_string(count) + " " + thing + (count == 1 ? "" : "s");
 }
 
+// `what` are the investments or the portfolios.
+[[nodiscard]] inline std::string NotAllRead(const char* what, const std::string& folder) {
+    return std::string("the ") + what + " in " + folder + " could not all be read";
+}
+
 // A text of any bytes between quotation marks.
 [[nodiscard]] inline std::string Quoted(std::string_view text) {
     std::string quoted = "'";

@@ -307,8 +307,12 @@ int FolderSetup::Run() {
     MakeFile("Quorvan.ini", FirstSettings());
     MakeFile("Quorvan.cfg", FirstQuoteSources());
     MakeHelp();
-    InstallProgram("quorvan", options_.program);
     InstallProgram("quorvan-cli", options_.companion);
+    // The version of the program tells the launcher whether all the rest is up to date, so it comes last.
+    if (failed_ && FileExists(PathOf("quorvan")))
+        Kept("quorvan", "until all before it can be made");
+    else
+        InstallProgram("quorvan", options_.program);
     if (options_.desktop && !failed_)
         AddToDesktop();
     return failed_ ? 1 : 0;

@@ -31,8 +31,7 @@ void AddSetupCommand(CLI::App& application, int& status) {
     command->add_option("FOLDER", options->folder, "The folder; made where it does not exist")->required();
     command->add_flag("--sample", options->sample, "Fill new data files with two sample portfolios");
     command->add_option("--program", options->program,
-                        "The quorvan executable to copy (default: the one found beside "
-                        "quorvan-cli)");
+                        "The quorvan executable to copy (default: the one found beside quorvan-cli)");
     command->add_flag("--update-program", options->updateProgram,
                       "Replace the folder's program and help when they are another version's");
     CLI::Option* desktop = command->add_flag(

@@ -3,6 +3,7 @@
 #include <cerrno>
 #include <cstring>
 #include <filesystem>
+#include <system_error>
 
 #include "app/model/DataFolders.h"
 #include "db/Database.h"
@@ -29,13 +30,23 @@ std::string ToolFolder::PathOf(const DataFileKind& file) const {
     return (std::filesystem::path(folder_) / file.name).string();
 }
 
+std::string ToolFolder::WhyNotThere() const {
+    std::error_code error;
+    // Where that may not be seen, what is opened or made says so.
+    return std::filesystem::is_directory(folder_, error) || error == std::errc::permission_denied
+               ? ""
+               : "there is no folder " + folder_;
+}
+
 std::string ToolFolder::Lock() {
-    std::string wrong;
+    std::string wrong = WhyNotThere();
+    if (!wrong.empty())
+        return wrong;
     const auto goesOn = [&wrong](const FolderLock& lock, const std::string& folder,
                                  FolderLock::Outcome outcome) {
         if (const std::string use = UseOf(lock, folder, outcome); !use.empty())
             wrong = "the folder" + use + (outcome == FolderLock::Outcome::Held ? "; nothing is changed" : "");
-        // Where there is no folder, there is no file either.
+        // Where a link leads to no folder, there is no file either.
         else if (outcome == FolderLock::Outcome::Failed && lock.Error() != ENOENT)
             wrong = "other programs cannot be kept out of the folder: " + folder + "/" +
                     FolderLock::FileName +
@@ -55,6 +66,9 @@ std::string ToolFolder::KeepBackup() {
 
 std::unique_ptr<DATABASE> ToolFolder::Open(const DataFileKind& file, DataFileUse use,
                                            std::string& wrong) const {
+    wrong = WhyNotThere();
+    if (!wrong.empty())
+        return nullptr;
     const std::string path = PathOf(file);
     const bool change = use == DataFileUse::Change;
     if (change)
@@ -81,7 +95,7 @@ std::string ToolFolder::FindPortfolio(DATABASE& portfolios, std::string& name, L
     const void* found = count > 0 ? portfolios.QueryGetFirst(nullptr) : nullptr;
     if (!found)
         return count == 0 ? "there is no portfolio \"" + name + "\" in " + folder_
-                          : "the portfolios in " + folder_ + " could not all be read";
+                          : NotAllRead("portfolios", folder_);
     PORTFOLIO_DATA record;
     std::memcpy(&record, found, sizeof record);
     const std::string written(FieldText(record.Name));

@@ -40,6 +40,8 @@ class ToolFolder {
     [[nodiscard]] const std::string& Path() const { return folder_; }
     [[nodiscard]] std::string PathOf(const DataFileKind& file) const;
 
+    // Whether there is such a folder. Lock and Open ask that first.
+    [[nodiscard]] std::string WhyNotThere() const;
     // Keeps other programs out of the folder, and of those in which the files really lie.
     [[nodiscard]] std::string Lock();
     // Makes sure of today's backups.

@@ -7,6 +7,7 @@
 #include <csignal>
 #include <cstdint>
 #include <iostream>
+#include <map>
 #include <memory>
 #include <optional>
 #include <ostream>
@@ -25,6 +26,7 @@
 #include "util/FailureTexts.h"
 #include "util/IniFile.h"
 #include "util/Numbers.h"
+#include "util/Strings.h"
 #include "util/Utf8.h"
 
 namespace {
@@ -203,7 +205,7 @@ std::vector<std::string> WantedPortfolios(const UpdateOptions& options, const To
         return {};
     std::string wrong;
     if (options.all && !CollectPortfolios(*portfolios, &names))
-        wrong = "the portfolios in " + folder.Path() + " could not all be read";
+        wrong = NotAllRead("portfolios", folder.Path());
     for (std::string& name : names)
         if (wrong.empty())
             wrong = folder.FindPortfolio(*portfolios, name, ToolFolder::Letters::Exact);
@@ -214,24 +216,27 @@ std::vector<std::string> WantedPortfolios(const UpdateOptions& options, const To
 
 // The records of the investments that are wanted. False, with a sentence for the person, when they cannot be
 // read, or none has one of the tickers.
-bool FindRecords(const UpdateOptions& options, const std::vector<std::string>& portfolios,
-                 DATABASE& investments, std::vector<long>& records) {
-    std::set<std::string> missing(options.tickers.begin(), options.tickers.end());
-    const std::set<std::string> wanted = missing;
+bool FindRecords(const UpdateOptions& options, const ToolFolder& folder,
+                 const std::vector<std::string>& portfolios, DATABASE& investments,
+                 std::vector<long>& records) {
+    std::map<std::string, std::string> missing; // as it was typed, by its lowered letters
+    for (const std::string& ticker : options.tickers)
+        missing.emplace(Lowered(ticker), ticker);
+    const auto wanted = missing;
     std::set<long> seen; // a portfolio may be named twice
     const auto take = [&](const INVESTMENT_DATA& record, long number) {
-        const std::string ticker(FieldText(record.Ticker));
+        const std::string ticker = Lowered(FieldText(record.Ticker));
         missing.erase(ticker);
         if ((wanted.empty() || wanted.contains(ticker)) && seen.insert(number).second)
             records.push_back(number);
     };
     for (const std::string& portfolio : portfolios)
         if (!ForEachInvestment(investments, portfolio.c_str(), take)) {
-            Fail("the investments could not all be read");
+            Fail(NotAllRead("investments", folder.Path()));
             return false;
         }
-    if (!missing.empty())
-        Fail("no investment there has the ticker " + *missing.begin());
+    for (const auto& [lowered, ticker] : missing)
+        Fail("no investment there has the ticker " + ticker);
     return missing.empty();
 }
 
@@ -256,7 +261,7 @@ int RunUpdate(const UpdateOptions& options) {
     const auto investments =
         portfolios.empty() ? nullptr : OpenOrFail(folder, InvestmentFile, DataFileUse::Change);
     std::vector<long> records;
-    if (!investments || !FindRecords(options, portfolios, *investments, records))
+    if (!investments || !FindRecords(options, folder, portfolios, *investments, records))
         return 1;
     CatchSignals();
     const std::string sourcePath = folder.Path() + "/Quorvan.cfg";
@@ -283,18 +288,19 @@ void AddUpdateCommand(CLI::App& application, int& status) {
     CLI::Option* names =
         command->add_option("PORTFOLIO", options->portfolios, "The portfolios to bring up to date");
     command->add_flag("--all", options->all, "All portfolios")->excludes(names);
-    command->add_option("--ticker", options->tickers, "Only investments of these tickers")->type_name("T");
+    command
+        ->add_option("--ticker", options->tickers, "Only investments of this ticker; may be given repeatedly")
+        ->type_name("T")
+        ->allow_extra_args(false);
     AddJsonOption(*command, options->format);
     AddHomeOption(*command, options->home);
     command->footer(
         "On a terminal one line tells how far it is. Elsewhere each investment gets a line: ticker, old "
-        "price, "
-        "new price and change, or why there is none. An investment without a ticker is passed over. Ctrl+C "
-        "ends the run within a second.\n\n"
+        "price, new price and change, or why there is none. An investment without a ticker is passed over. "
+        "Ctrl+C ends the run within a second.\n\n"
         "Exit status: 0 when all have a price, 3 when some have none, 1 when the run could not go on, 2 when "
-        "the "
-        "command line is wrong, 130 when it was stopped.\n\n"
-        "Example: quorvan-cli update 'My Retirement Fund' --ticker ABC XYZ\n\n"
+        "the command line is wrong, 130 when it was stopped.\n\n"
+        "Example: quorvan-cli update 'My Retirement Fund' --ticker ABC --ticker XYZ\n\n"
         "Every weekday evening, by cron:\n"
         "  30 18 * * 1-5 quorvan-cli update --all >/dev/null\n"
         "or by systemd, ~/.config/systemd/user/quorvan-update.service:\n"

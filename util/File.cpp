@@ -43,8 +43,15 @@ int FlagsOf(FileMode mode) {
     return O_RDWR | common;
 }
 
+// Whether the path, in which no folder is a link, is a name for what a process has open.
+bool LeadsToOpenFile(const std::string& path) {
+    return path.starts_with("/proc/");
+}
+
 // The errno number that tells why there is something that a file must not replace, or 0.
 int WhyNotReplaced(const std::string& path) {
+    if (LeadsToOpenFile(path))
+        return EOPNOTSUPP;
     struct stat status {};
     if (stat(path.c_str(), &status) != 0)
         return 0;
@@ -301,7 +308,7 @@ std::string FollowLinks(const std::string& path) {
         if (error)
             return {};
         current = folder / current.filename();
-        if (!fs::is_symlink(fs::symlink_status(current, error)))
+        if (LeadsToOpenFile(current.string()) || !fs::is_symlink(fs::symlink_status(current, error)))
             return current.string();
         fs::path target = fs::read_symlink(current, error);
         if (error)

@@ -116,7 +116,8 @@ class File {
 // Tells whether a file, folder or symbolic link of that name exists.
 [[nodiscard]] bool FileExists(const std::string& path);
 // The absolute path of the file that `path` leads to through symbolic links, also when that file does not
-// exist (yet). Empty when the folder does not exist or the links form a ring.
+// exist (yet). Empty when the folder does not exist or the links form a ring. A link in /proc, where that of
+// /dev/stdout leads, is not followed: it stands for what a process has open.
 [[nodiscard]] std::string FollowLinks(const std::string& path);
 
 // Small files read and written as a whole: a reader finds the old content or the new one, never a part.
@@ -137,7 +138,7 @@ enum class ExistingFile { Replace, Keep };
                                  std::string_view content, mode_t mode, ExistingFile existing);
 
 // WriteWholeFile for a file that a person named: it is as private as the person wants new files, a link to it
-// stays a link, and what is no regular file or may not be written is left alone.
+// stays a link, and what is no regular file, may not be written or lies in /proc is left alone.
 [[nodiscard]] int WriteNamedFile(const std::string& path, std::string_view content);
 
 // Renames `from` to `to`, which must not exist, not even as a link that leads nowhere: EEXIST then. Returns 0

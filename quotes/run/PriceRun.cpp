@@ -4,6 +4,7 @@
 
 #include "app/model/PortfolioRules.h"
 #include "db/Database.h"
+#include "db/DatesTimes.h"
 #include "quotes/QuoteRetrieval.h"
 #include "util/File.h"
 #include "util/Strings.h"
@@ -27,9 +28,7 @@ QuoteOutcome ApplyQuote(INVESTMENT_DATA& record, float quote) {
     record.PrevPrice = record.Price;
     record.Price = quote;
     record.Value = value;
-    dbDATE today;
-    DATABASE(nullptr).SetToCurrentDate(&today);
-    record.Date = today;
+    record.Date = Today();
     record.QuoteError = 0;
     return QuoteOutcome::Priced;
 }

@@ -106,10 +106,12 @@ TEST(ApplyQuote, ChangesWhatItShall) {
         const QuoteOutcome outcome = quote == 12.5F ? Priced : unknown ? NoPrice : Failed;
         INVESTMENT_DATA record = Holding("T", 11, 5);
         INVESTMENT_DATA expected = outcome == Priced ? Holding("T", quote, 11) : record;
-        expected.Date = outcome == Priced ? Today() : expected.Date;
+        const dbDATE began = Today();
         record.QuoteError = 7;
         expected.QuoteError = outcome == Priced ? 0 : outcome == NoPrice ? 1 : 7;
         EXPECT_EQ(ApplyQuote(record, quote), outcome) << quote;
+        if (outcome == Priced)
+            expected.Date = PackDate(record.Date) == PackDate(began) ? began : Today();
         EXPECT_EQ(std::memcmp(&record, &expected, sizeof record), 0) << quote;
     }
 }

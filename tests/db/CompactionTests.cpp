@@ -1,5 +1,5 @@
-#include "Shell.h"
 #include "SampleFile.h"
+#include "Shell.h"
 
 namespace {
 

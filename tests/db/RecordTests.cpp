@@ -1,7 +1,7 @@
 #include <random>
 
-#include "Shell.h"
 #include "SampleFile.h"
+#include "Shell.h"
 
 namespace {
 

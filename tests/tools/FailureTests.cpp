@@ -14,6 +14,7 @@ TEST_F(FailureTest, AWrongCommandLineDoesNothing) {
         "|quote|chart A 2000|report A|report -o A|setup|db A|db A create|db A query a b|list --sort Name|"
         "list A --sort Status|export|export A --all|import A|import --all|import --all A t.csv|"
         "import A t.csv --decimal x|import A t.csv --delimiter ab|import A t.csv --column Amount=N|"
+        "list ''|export ''|export A -o ''|report A -o ''|import A t.csv --column Value=N|"
         "import A t.csv --update-by name|import A t.csv --json|quote A --home home --source 'n h /q Last 2'|"
         "setup new --desktop --remove-desktop|db A delete 1 --where 'N = 1'|db A undelete --where 'N = 1'|"
         "quote ''|chart A 2000 -o new.gif|chart A 2000 -o new.png --scale nan|db new.db query --format xml|"
@@ -32,7 +33,7 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
     ASSERT_TRUE(
         Works(Setup("--sample") + R"sh(; db() { quorvan-cli db "$@"; }; db home/portfol.db append Name=A
         for _ in 1 2; do db home/invest.db append Portfolio=A Value=3e38; done
-        db a.db create --column N:byte --column Name:string:8; db a.db append N=1; mkfifo p; ln -s p pipe.png
+        db a.db create --column N:byte --column Name:string:8; db a.db append N=1; mkfifo p; ln -s p pipe.png; ln -s home/misc.db misc.svg
         head -c 36 a.db >bad.db; printf '\11' >>bad.db; tail -c +38 a.db >>bad.db
         mkdir other held left block folder.png; echo old >old.png
         cp home/*.db other; cp a.db other/invest.db; cp a.db held
@@ -56,7 +57,7 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
         {"quorvan-cli chart --home home A 2007 -o old.png", "a value in the portfolio is not a number, or "},
         {chart + "pipe.png", "pipe.png cannot be written: "},
         {"ulimit -f 4; trap '' XFSZ; " + chart + "old.png", "old.png cannot be written: "},
-        {"quorvan-cli report --home nowhere A -o old.pdf", "nowhere/portfol.db cannot be opened"},
+        {"quorvan-cli report --home nowhere A -o old.pdf", "there is no folder nowhere\n"},
         {"quorvan-cli report --home other 'My Retirement Fund' -o a", "other/invest.db has other columns"},
         {"quorvan-cli report --home home A -o missing/a", "missing/a cannot be written: No such file"},
         {Setup("", "built/home"), "cannot be made: Not a directory"},
@@ -99,6 +100,13 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
         {"quorvan-cli import A t.csv --home bad", "bad/invest.db is damaged: its header disagrees with it"},
         {reader + " import A t.csv --home read", "programs cannot be kept out of the folder: read/"},
         {"quorvan-cli check --repair --home held", held},
+        {"quorvan-cli check --home nowhere >/dev/full", "quorvan-cli: there is no folder nowhere\n"},
+        {"quorvan-cli import ' ' t.csv --create --home home", "can be no portfolio's name"},
+        {"quorvan-cli import A left --home home", "left cannot be read: it is no regular file"},
+        {"quorvan-cli export A --home home -o home/invest.db", "is the folder's own invest.db, which"},
+        {"quorvan-cli report A --home home -o home/cut.db", "home/cut.db is the folder's own cut.db, which"},
+        {"quorvan-cli chart A 2000 --home home -o misc.svg", "misc.svg is the folder's own misc.db, which"},
+        {"quorvan-cli export A --home home -o /dev/stdout >>old.png", "what is open already, which is not"},
     };
     for (const auto& [command, reason] : cases)
         EXPECT_TRUE(folder_.Fails(command, 1, reason));

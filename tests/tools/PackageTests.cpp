@@ -61,6 +61,10 @@ TEST_F(Installed, HasAllInItsPlaceAndNothingThatRunsOnRemoval) {
         {"HOME= quorvan", "quorvan: There is no home folder; name a folder: quorvan FOLDER\n"},
         {"chmod -x half/quorvan; quorvan half", "quorvan: The program half/quorvan cannot be started.\n"},
         {"quorvan --new 2>told; echo $?; quorvan a b 2>told; echo $?", "2\n2\n"},
+        {"quorvan -h | head -n 1; ln -s gone link; quorvan link",
+         "Usage: quorvan [FOLDER]\nquorvan: link is a link to a folder that is not there.\n"},
+        {"rm 'a b/misc.db'; quorvan 'a b'; ls 'a b/misc.db'",
+         "quorvan: Made what was missing in the folder a b.\nstarts a b/quorvan\na b/misc.db\n"},
     };
     for (const auto& [command, told] : cases)
         EXPECT_EQ(Told(command).substr(0, std::string(told).size()), told);
@@ -69,12 +73,14 @@ TEST_F(Installed, HasAllInItsPlaceAndNothingThatRunsOnRemoval) {
 TEST_F(Installed, MakesAFolderAndKeepsItUpToDate) {
     EXPECT_EQ(
         Told(R"(provide 1.0; quorvan; cat me/Quorvan/*.db | md5sum >sum; quorvan
-        provide 1.10; cd me/Quorvan; echo old >help/Quorvan.html; echo 'host: elsewhere' >Quorvan.lock
+        provide 1.10; cd me/Quorvan; rm help/Quorvan.html; mkdir help/Quorvan.html; quorvan 2>told
+        ./quorvan --version; rm -r told help/Quorvan.html; echo old >help/Quorvan.html; echo 'host: elsewhere' >Quorvan.lock
         quorvan; cat help/Quorvan.html; rm Quorvan.lock
         quorvan; ./quorvan --version; grep -c '<h1>' help/Quorvan.html; cd ../..
         provide 1.9; quorvan; me/Quorvan/quorvan --version; cat me/Quorvan/*.db | md5sum | cmp - sum; head -n 1 notices)"),
         "quorvan: Made the folder ./me/Quorvan for your portfolios.\n"
         "starts ./me/Quorvan/quorvan\nstarts ./me/Quorvan/quorvan\n"
+        "starts ./me/Quorvan/quorvan\nquorvan 1.0\n"
         "quorvan: The folder ./me/Quorvan was in use by another program; once that program has ended, delete "
         "./me/Quorvan/Quorvan.lock.\nstarts ./me/Quorvan/quorvan\nold\n"
         "starts ./me/Quorvan/quorvan\nquorvan 1.10\n1\n"

@@ -36,7 +36,7 @@ TEST_F(UpdateCommand, EndsWithAStatusForEachThingThatCanHappen) {
         in_ + "update() { quorvan-cli update --home . \"$@\"; }; ",
         {{"update A", "UP\t10.00\t12.50\t+2.50\nDOWN\t10.00\t9.75\t-0.25\nName of \tno ticker\n2 of 3 "
                       "investments priced\n"},
-         {"update B A --ticker UP \"$(printf 'GO\\tNE')\"",
+         {"update B --ticker up A --ticker \"$(printf 'GO\\tNE')\"",
           "GO\\tNE\tno price: marker not found in the 7 bytes received, which begin: nothing\n"
           "UP\t12.50\t12.50\t0.00\n1 of 2 investments priced, 1 without a price\n",
           "", 3},
@@ -52,7 +52,8 @@ TEST_F(UpdateCommand, EndsWithAStatusForEachThingThatCanHappen) {
           notConnected},
          {"echo >Quorvan.ini; update A", "", notConnected},
          {"update a", "", "but \"A\""},
-         {"update A --ticker GONE", "", "quorvan-cli: no investment there has the ticker GONE\n"},
+         {"update --ticker Lost --ticker GONE A", "",
+          "the ticker GONE\nquorvan-cli: no investment there has the ticker Lost\n"},
          {"update", "", "a PORTFOLIO or --all", 2},
          {"update A --all", "", "excludes", 2}});
     EXPECT_EQ(Printed(in_ + "cat backups/*.db.* | grep -c 'Name of' -a"), "1\n");

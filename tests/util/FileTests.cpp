@@ -1,6 +1,7 @@
 #include <atomic>
 #include <thread>
 
+#include <fcntl.h>
 #include <sys/resource.h>
 
 #include "InChild.h"
@@ -34,6 +35,13 @@ TEST(File, CopiesWithItsOwnerForThoseWhoMayWriteOrFails) {
     ASSERT_EQ(file.Open(folder.File("new"), FileMode::CreateNew), 0);
     errno = 0;
     EXPECT_EQ(file.WriteAt(0, "x", 1), EIO);
+}
+
+TEST(File, WhatIsOpenIsNotReplaced) {
+    const TemporaryFolder folder;
+    const int log = creat(folder.File("log").c_str(), 0600);
+    EXPECT_EQ(WriteNamedFile("/dev/fd/" + std::to_string(log), "x"), EOPNOTSUPP);
+    EXPECT_TRUE(close(log) == 0 && folder.Read("log").empty());
 }
 
 TEST(File, AProbeFindsThatTheRoomEnds) {
