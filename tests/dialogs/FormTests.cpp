@@ -190,4 +190,10 @@ TEST(InvestmentInput, AmountsLeftAsShownStayWhatTheyWere) {
     }
 }
 
+TEST_F(FormTest, AHomeFolderThatIsTooLongIsNone) {
+    BApplication::SetExecutablePath((std::string(128, 'f') + "/quorvan").c_str());
+    char found[PathBufferSize] = "left over";
+    EXPECT_TRUE(!GetHomeDir(found) && *found == '\0');
+}
+
 } // namespace

@@ -14,6 +14,9 @@ class QuoteCommandTest : public CommandTest {
         {"/moved", {{"HTTP/1.0 301 Moved\r\nLocation: https://\x1B[2J\xFF\r\n\r\n"}}},
         {"/closes", {}},
         {"/comma", {{"Last>202,45<"}}},
+        {"/cut", {{"Last>12 3"}}},
+        {"/open", {{"Last>12 <"}}},
+        {"/whole", {{"Last>12<sup>1</sup>/<sub>2</sub> of 20"}}},
         {"/q?s=", {{std::string(100, 'a') + "\x1B[2JLast\\\n</td><b>45 3/8</b>" + std::string(100, 'z')}}}};
     LoopbackServer server_{
         [this](const std::string& request) { return pages_[request.substr(4, request.find("ABC") - 4)]; }};
@@ -52,6 +55,9 @@ TEST_F(QuoteCommandTest, SaysWhyThereIsNoPrice) {
          {source + "q?s= Last 0'", "ABC\t0.00\n", "  price text 'Last\\\\' read as 0.0000\n"},
          {source + "q?s= Last 1'", "ABC\t15.00\n", "  careful: the price text is no number", 0},
          {source + "closes Last 1'", "ABC\t-4.00\n", "  the server closed the connection without"},
+         {source + "cut Last 1'", "ABC\t12.00\n", "  careful: what was read as the price ends where a", 0},
+         {source + "open Last 1'", "ABC\t12.00\n", "  careful: what was read as the price ends where a", 0},
+         {source + "whole Last 1'", "ABC\t12.50\n", "of 20': fraction 0.5000\n  price 12.50\n", 0},
          {source + "comma Last 1'", "ABC\t202.00\n", "  careful: the price text is read only up to its", 0}});
 }
 
