@@ -28,8 +28,11 @@ std::vector<int> ReadNumbers(const INI_FILEx& settings, const char* key) {
 }
 
 void WriteNumbers(const INI_FILEx& settings, const char* key, const std::vector<int>& numbers) {
-    std::string text;
-    for (const int number : numbers)
-        text += (text.empty() ? "" : " ") + std::to_string(number);
-    static_cast<void>(settings.WriteString(DisplaySection, key, text.c_str()));
+    std::ostringstream text;
+    const char* between = "";
+    for (const int number : numbers) {
+        text << between << number;
+        between = " ";
+    }
+    static_cast<void>(settings.WriteString(DisplaySection, key, text.str().c_str()));
 }
