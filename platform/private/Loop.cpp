@@ -3,7 +3,6 @@
 #include <atomic>
 #include <chrono>
 #include <condition_variable>
-#include <deque>
 #include <memory>
 #include <mutex>
 #include <thread>
@@ -13,11 +12,7 @@
 #include <QDialog>
 #include <QEventLoop>
 #include <QPointer>
-#include <QSocketNotifier>
 #include <QTimer>
-
-#include <sys/eventfd.h>
-#include <unistd.h>
 
 #include "platform/Kernel.h"
 #include "platform/private/LooperCore.h"
@@ -27,55 +22,8 @@ namespace {
 
 constexpr int CancelPollMilliseconds = 50;
 
-std::mutex gPostMutex; // guards the box and its queue
-
-// Carries work to the interface thread, in order. The queue is our own and a file descriptor wakes the
-// toolkit's loop, so that everything handed over is guarded by a lock that thread checkers can see.
-//
-// One piece of work is done per wake-up: while it waits in a loop of its own, the inner loop goes on with the
-// rest.
-class PostBox {
-  public:
-    PostBox() {
-        QObject::connect(
-            &notifier_, &QSocketNotifier::activated, &notifier_, [this] { DoOne(); });
-    }
-    ~PostBox() {
-        notifier_.setEnabled(false);
-        close(wakeFd_);
-    }
-    PostBox(const PostBox&) = delete;
-    PostBox& operator=(const PostBox&) = delete;
-
-    // With the mutex held.
-    void Post(std::function<void()> work) {
-        queue_.push_back(std::move(work));
-        eventfd_write(wakeFd_, 1);
-    }
-
-  private:
-    void DoOne() {
-        std::function<void()> work;
-        {
-            const std::lock_guard guard(gPostMutex);
-            eventfd_t wakes = 0;
-            eventfd_read(wakeFd_, &wakes);
-            if (queue_.empty())
-                return;
-            work = std::move(queue_.front());
-            queue_.pop_front();
-            if (!queue_.empty())
-                eventfd_write(wakeFd_, 1);
-        }
-        work();
-    }
-
-    std::deque<std::function<void()>> queue_;
-    const int wakeFd_ = eventfd(0, EFD_CLOEXEC | EFD_NONBLOCK);
-    QSocketNotifier notifier_{wakeFd_, QSocketNotifier::Read};
-};
-
-std::unique_ptr<PostBox> gPostBox; // while there is an interface thread
+std::mutex gPostMutex;              // guards the receiver and what is handed over to it
+std::unique_ptr<QObject> gReceiver; // of work, while there is an interface thread
 std::atomic<std::thread::id> gInterfaceThread;
 
 // One lock for all semaphores and thread states: they are few, and waits on them rare.
@@ -140,8 +88,15 @@ bool OnInterfaceThread() {
 
 void RunOnInterfaceThread(std::function<void()> work) {
     const std::lock_guard guard(gPostMutex);
-    if (gPostBox)
-        gPostBox->Post(std::move(work));
+    if (!gReceiver)
+        return;
+    auto run = [work = std::move(work)] {
+        // Thread checkers do not see the toolkit's locks; ours tells them that work was handed over.
+        gPostMutex.lock();
+        gPostMutex.unlock();
+        work();
+    };
+    QMetaObject::invokeMethod(gReceiver.get(), std::move(run), Qt::QueuedConnection);
 }
 
 bool CallOnInterfaceThread(std::function<void()> work) {
@@ -232,11 +187,11 @@ bool RejectInnermostDialog() {
 void OpenInterfaceThread() {
     gInterfaceThread = std::this_thread::get_id();
     const std::lock_guard guard(gPostMutex);
-    gPostBox = std::make_unique<PostBox>();
+    gReceiver = std::make_unique<QObject>();
 }
 
 void CloseInterfaceThread() {
     const std::lock_guard guard(gPostMutex);
-    gPostBox.reset();
+    gReceiver.reset();
     gInterfaceThread = std::thread::id();
 }
