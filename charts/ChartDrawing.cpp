@@ -33,14 +33,12 @@ void DrawNothingToChart(BView* view) {
 }
 
 void DrawWholeText(BView* view, const BRect& rect, const std::string& text, uint8 flags) {
-    BFont font;
-    view->GetFont(&font);
-    const float room = rect.Width() - RightGap;
-    const float width = std::ceil(view->StringWidth(text.c_str()));
-    if (width > room)
-        view->SetFontSize(font.Size() * room / width);
-    DrawText(view, &rect, text.c_str(), flags);
+    BFont usual;
+    view->GetFont(&usual);
+    const BFont font = FittingFont(usual, text, rect.Width() - RightGap);
     view->SetFont(&font);
+    DrawText(view, &rect, text.c_str(), flags);
+    view->SetFont(&usual);
 }
 
 void DrawNote(BView* view, BPoint place, const std::string& text) {

@@ -14,9 +14,7 @@ constexpr float CellInset = 5; // from the column's line
 constexpr float LineWidth = 1;
 constexpr float RowGap = 5;
 constexpr float LeastTextSize = 7; // smaller than this, a text is better cut than unreadable
-constexpr float LeastFigureSize = 1;
-constexpr float SizeStep = 0.05F;
-constexpr float RightSlack = 2; // what placed text leaves at the right
+constexpr float RightSlack = 2;    // what placed text leaves at the right
 
 // The text of cell i, which ends with its stride at the latest.
 std::string Cell(const char* cells, int cellStride, int i) {
@@ -32,16 +30,6 @@ float FontHeightOf(const BView* view) {
 }
 
 } // namespace
-
-BFont FittingFont(BFont font, const std::string& text, float width, float leastSize) {
-    leastSize = std::min(leastSize, font.Size()); // which may be smaller already
-    const float wanted = font.StringWidth(text.c_str());
-    if (wanted > width)
-        font.SetSize(std::max(font.Size() * width / wanted, leastSize));
-    while (font.StringWidth(text.c_str()) > width && font.Size() > leastSize) // not quite in proportion
-        font.SetSize(std::max(font.Size() - SizeStep, leastSize));
-    return font;
-}
 
 PRINT_TABLE::PRINT_TABLE(BView* view, float left, float top, int columnCount, TABLE_COLUMN_ENTRY* columns,
                          float tableWidth)
@@ -135,7 +123,8 @@ void PRINT_TABLE::DrawText(const char* cells, int cellStride) {
         const bool right = (columns_[i].alignment & DrawTextRight) != 0;
         const std::string& widest = right ? widestFigures_[static_cast<std::size_t>(i)] : text;
         BRect frame = TextFrame(i);
-        const BFont font = FittingFont(usual, widest, frame.Width(), right ? LeastFigureSize : LeastTextSize);
+        const BFont font = right ? FittingFont(usual, widest, frame.Width())
+                                 : FittingFont(usual, widest, frame.Width(), LeastTextSize);
         view_->SetFont(&font);
         frame.right += RightSlack;
         ::DrawText(view_, &frame, text.c_str(), static_cast<uint8>(columns_[i].alignment | DrawTextMiddle));

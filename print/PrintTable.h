@@ -4,9 +4,9 @@
 #include <string>
 #include <vector>
 
-#include "platform/Font.h"
 #include "platform/Rect.h"
 
+class BFont;
 class BView;
 
 // One column of a printed table.
@@ -17,10 +17,6 @@ struct TABLE_COLUMN_ENTRY {
     float x = 0;             // left edge, from the table's; filled in by PRINT_TABLE
     float width = 0;         // in points; filled in by PRINT_TABLE
 };
-
-// The font, or where the text is wider in it than that, the largest in which it is not, down to the least
-// size.
-[[nodiscard]] BFont FittingFont(BFont font, const std::string& text, float width, float leastSize);
 
 // A table on a printed page: lays out columns in a view's font, and draws the heading, then row after row
 // downwards, then the lines. It knows nothing of what the cells mean, of pages or of their ends: the caller

@@ -59,7 +59,7 @@ void PrinterView::Draw(BRect page) {
     const BRect place(page.left, page.top + TableTop, page.right, page.bottom - BarHeight);
     BFont least(*be_fixed_font);
     least.SetSize(std::min(least.Size(), LeastTableFont));
-    least = FittingFont(least, std::string(TableCharacters(), 'm'), place.Width(), 1);
+    least = FittingFont(least, std::string(TableCharacters(), 'm'), place.Width());
     std::vector<Row> rows;
     const long all = ReadRows(PRINT_TABLE::RowsWithin(place.Height(), least), rows);
     DrawTable(place, rows);
@@ -91,7 +91,7 @@ long PrinterView::ReadRows(long wanted, std::vector<Row>& rows) {
 bool PrinterView::SetTableFont(BRect place, long rowCount) {
     BFont font(*be_fixed_font);
     font.SetSize(std::min(font.Size(), LargestFont));
-    font = FittingFont(font, std::string(TableCharacters(), 'm'), place.Width(), 1);
+    font = FittingFont(font, std::string(TableCharacters(), 'm'), place.Width());
     const float widest = font.Size();
     while (PRINT_TABLE::RowsWithin(place.Height(), font) < rowCount && font.Size() > LeastTableFont)
         font.SetSize(std::max(font.Size() - SizeStep, LeastTableFont));

@@ -14,6 +14,7 @@
 #include "quotes/QuoteRetrieval.h"
 #include "quotes/QuoteScanner.h"
 #include "util/CharacterBuffer.h"
+#include "util/Strings.h"
 
 namespace {
 
@@ -39,7 +40,7 @@ class PlainExchange {
     [[nodiscard]] bool Send(const char* path);
     // Until there is a price, or no more of the page.
     [[nodiscard]] bool Receive(QuoteScanner& scanner);
-    bool Fail(float status, const char* line, const char* reason = std::strerror(errno));
+    bool Fail(float status, const char* line, const std::string& reason = Reason(errno));
     [[nodiscard]] bool Wait(short events) const {
         return WaitUnlessStopped(socket_, events, context_.stopFd);
     }
@@ -58,7 +59,7 @@ float PlainExchange::Ask(const HostField& host, const char* path, QuoteScanner& 
     return scanner.Price();
 }
 
-bool PlainExchange::Fail(float status, const char* line, const char* reason) {
+bool PlainExchange::Fail(float status, const char* line, const std::string& reason) {
     status_ = status;
     report_.Log(std::string(line) + "\n");
     report_.Observer().Failed((std::string(line) + ": " + reason).c_str());
@@ -91,7 +92,7 @@ bool PlainExchange::Connect(std::uint16_t port) {
         getsockopt(socket_, SOL_SOCKET, SO_ERROR, &error, &size);
     }
     if (error != 0)
-        return Fail(QuoteNetworkFailure, "connect() error", std::strerror(error));
+        return Fail(QuoteNetworkFailure, "connect() error", Reason(error));
     report_.LogText("connected ok\n");
     char address[INET_ADDRSTRLEN] = "";
     inet_ntop(AF_INET, &address_, address, sizeof address);
@@ -102,7 +103,7 @@ bool PlainExchange::Connect(std::uint16_t port) {
 bool PlainExchange::Send(const char* path) {
     char request[BufferSize];
     if (!FormatInto(request, sizeof request, "GET %s HTTP/1.0\n\n", path))
-        return Fail(QuoteNetworkFailure, "send() error", std::strerror(EMSGSIZE));
+        return Fail(QuoteNetworkFailure, "send() error", Reason(EMSGSIZE));
     report_.LogText(request);
     // A new connection takes so little at once.
     const std::size_t length = std::strlen(request);

@@ -36,7 +36,7 @@ int DataFileTool::Query(const Selection& selection) {
 }
 
 // Walks the selected records as long as somebody takes the output. Returns an exit status.
-int DataFileTool::ForEachSelected(const std::function<void(long, const std::uint8_t*)>& use) {
+int DataFileTool::WalkSet(const std::function<void(long, const std::uint8_t*)>& use) {
     long number = 0;
     database_.GetLastError(nullptr);
     for (void* data = database_.QueryGetFirst(&number); data != nullptr && output_.IsWorking();
@@ -60,14 +60,14 @@ int DataFileTool::PrintSet() {
     };
     int status = 0;
     if (format_ == OutputFormat::Table)
-        status = ForEachSelected([&](long number, const std::uint8_t* data) {
+        status = WalkSet([&](long number, const std::uint8_t* data) {
             fill(number, data);
             writer.Measure(row);
         });
     if (status != 0)
         return status;
     writer.WriteHeading();
-    return ForEachSelected([&](long number, const std::uint8_t* data) {
+    return WalkSet([&](long number, const std::uint8_t* data) {
         fill(number, data);
         writer.WriteRow(row);
     });
@@ -160,7 +160,7 @@ int DataFileTool::Apply(const char* done, const std::function<int(long)>& apply,
     if (selection != nullptr) {
         if (!Select(*selection))
             return FailAsEngine();
-        if (ForEachSelected([&records](long number, const std::uint8_t*) { records.push_back(number); }) != 0)
+        if (WalkSet([&records](long number, const std::uint8_t*) { records.push_back(number); }) != 0)
             return 1;
     }
     int status = 0;

@@ -94,7 +94,7 @@ class DataFileTool {
     [[nodiscard]] std::vector<COLUMN_ENTRY> AllColumns();
     [[nodiscard]] bool Select(const Selection& selection);
     [[nodiscard]] int PrintSet();
-    [[nodiscard]] int ForEachSelected(const std::function<void(long, const std::uint8_t*)>& use);
+    [[nodiscard]] int WalkSet(const std::function<void(long, const std::uint8_t*)>& use);
     [[nodiscard]] std::string StoreValue(const std::vector<COLUMN_ENTRY>& columns,
                                          const std::string& assignment, std::vector<bool>& given,
                                          std::uint8_t* data) const;

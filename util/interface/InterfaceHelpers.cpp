@@ -5,7 +5,6 @@
 #include <cstring>
 
 #include "platform/Application.h"
-#include "platform/Font.h"
 #include "platform/View.h"
 #include "platform/Window.h"
 #include "util/CharacterBuffer.h"
@@ -17,6 +16,7 @@ constexpr bigtime_t WindowLockPatience = 200000; // microseconds
 // A text, and its width in the font that frames are laid out for.
 constexpr const char* SampleText = "  Cancel  ";
 constexpr float UsualSampleWidth = 56;
+constexpr float SizeStep = 0.05F; // of a font
 
 } // namespace
 
@@ -69,6 +69,16 @@ float GetFontHeight(const BFont* font) {
     font_height height;
     font->GetHeight(&height);
     return height.ascent + height.descent + height.leading;
+}
+
+BFont FittingFont(BFont font, const std::string& text, float width, float leastSize) {
+    leastSize = std::min(leastSize, font.Size()); // which may be smaller already
+    const float wanted = font.StringWidth(text.c_str());
+    if (wanted > width)
+        font.SetSize(std::max(font.Size() * width / wanted, leastSize));
+    while (font.StringWidth(text.c_str()) > width && font.Size() > leastSize) // not quite in proportion
+        font.SetSize(std::max(font.Size() - SizeStep, leastSize));
+    return font;
 }
 
 float GetFontGrowth() {

@@ -1,11 +1,13 @@
 #pragma once
 
+#include <string>
+
 #include "platform/Alert.h"
+#include "platform/Font.h"
 #include "platform/Types.h"
 #include "util/Strings.h"
 
 class BApplication;
-class BFont;
 class BView;
 class BWindow;
 struct BPoint;
@@ -68,6 +70,10 @@ void GetBRectCenter(const BRect* rect, BPoint* out);
 
 // Ascent, descent and leading of the font, in logical pixels.
 [[nodiscard]] float GetFontHeight(const BFont* font);
+
+// The font, or where the text is wider in it than that, the largest in which it is not, down to the least
+// size.
+[[nodiscard]] BFont FittingFont(BFont font, const std::string& text, float width, float leastSize = 1);
 
 // How many times wider than usual letters of the plain font are, and at least 1. What is laid out for the
 // usual font is stretched by it, so that nothing is cut off in a larger one.
