@@ -1,7 +1,8 @@
+#pragma once
+
 // Where columns lie, and which move together and where to when a header is dragged: arithmetic without a
 // window. All measures are logical pixels; a column from begin to end covers both edges, so that its width is
 // end minus begin and the next column begins at end plus 1.
-#pragma once
 
 #include <vector>
 

@@ -1,6 +1,7 @@
+#pragma once
+
 // The order of an outline: rows in one sequence, each followed by the rows below it, which have higher
 // levels. Rules without a window; the rows are borrowed.
-#pragma once
 
 #include <functional>
 #include <vector>

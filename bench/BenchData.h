@@ -1,6 +1,7 @@
+#pragma once
+
 // What the benchmarks on data files share: their options, a file of made-up investments, and the same
 // investments in SQLite.
-#pragma once
 
 #include <cstdio>
 #include <cstring>

@@ -1,5 +1,6 @@
-// The options that all benchmarks have, and how they take times.
 #pragma once
+
+// The options that all benchmarks have, and how they take times.
 
 #include <algorithm>
 #include <chrono>

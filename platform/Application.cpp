@@ -38,12 +38,6 @@ int gArgumentCount = 1;
 char gProgramName[] = "quorvan";
 char* gArguments[] = {gProgramName, nullptr};
 
-std::string RunningExecutable() {
-    std::error_code error;
-    const auto path = std::filesystem::read_symlink("/proc/self/exe", error);
-    return error ? std::string() : path.string();
-}
-
 bool OpenWithDesktop(const char* path) {
     return QDesktopServices::openUrl(QUrl::fromLocalFile(QString::fromUtf8(path)));
 }
@@ -148,9 +142,15 @@ bool BApplication::SetDesktopIdentity(const char* desktopId, std::string_view sv
 }
 
 status_t BApplication::GetAppInfo(app_info* info) const {
-    info->ref.path = gExecutablePath.empty() ? RunningExecutable() : gExecutablePath;
+    info->ref.path = ExecutablePath();
     info->signature = signature_;
     return B_OK;
+}
+
+std::string BApplication::ExecutablePath() {
+    std::error_code error;
+    return gExecutablePath.empty() ? std::filesystem::read_symlink("/proc/self/exe", error).string()
+                                   : gExecutablePath;
 }
 
 void BApplication::SetExecutablePath(const char* path) {

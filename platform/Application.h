@@ -50,8 +50,10 @@ class BApplication : public BLooper {
 
     // Always B_OK.
     status_t GetAppInfo(app_info* info) const;
-    // Makes GetAppInfo answer with this executable, so that a test has a home folder of its own. To be called
-    // before the application object is made; null goes back to the running program's own file.
+    // The file of the running program; empty when the system does not tell. Needs no application object.
+    [[nodiscard]] static std::string ExecutablePath();
+    // Makes the two answer with this file, so that a test has a home folder of its own. To be called before
+    // the application object is made; null goes back to the running program's.
     static void SetExecutablePath(const char* path);
 
   private:

@@ -1,5 +1,6 @@
-// Semaphores, threads and sleeping. Every call here may be made from any thread.
 #pragma once
+
+// Semaphores, threads and sleeping. Every call here may be made from any thread.
 
 #include "platform/Types.h"
 

@@ -1,5 +1,6 @@
-// Points and rectangles, in logical pixels.
 #pragma once
+
+// Points and rectangles, in logical pixels.
 
 struct BPoint {
     float x = 0;

@@ -1,5 +1,6 @@
-// Number types, status codes and colours that the whole platform layer shares.
 #pragma once
+
+// Number types, status codes and colours that the whole platform layer shares.
 
 #include <cstdint>
 

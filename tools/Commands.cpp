@@ -55,15 +55,10 @@ CLI::Option* AddJsonOption(CLI::App& command, OutputFormat& format) {
         "--json", [&format] { format = OutputFormat::Json; }, "Write an object on each line, for programs");
 }
 
-fs::path OwnPath() {
-    std::error_code error;
-    return fs::read_symlink("/proc/self/exe", error);
-}
-
 std::string HomeFolder(const std::string& named) {
     if (!named.empty())
         return named;
-    const fs::path own = OwnPath().parent_path();
+    const fs::path own = fs::path(BApplication::ExecutablePath()).parent_path();
     std::error_code error;
     if (!own.empty() && fs::is_regular_file(own / "invest.db", error))
         return own.string();

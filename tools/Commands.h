@@ -1,6 +1,5 @@
 #pragma once
 
-#include <filesystem>
 #include <functional>
 #include <memory>
 #include <string>
@@ -47,9 +46,6 @@ CLI::Option* AddHomeOption(CLI::App& command, std::string& home);
 
 // Adds --json, which makes `format` that.
 CLI::Option* AddJsonOption(CLI::App& command, OutputFormat& format);
-
-// The executable that runs; empty when it cannot be found out.
-[[nodiscard]] std::filesystem::path OwnPath();
 
 // The folder that --home named or else the usual one: that of quorvan-cli itself when it holds an invest.db,
 // else "Quorvan" in the person's own folder.

@@ -13,7 +13,7 @@ namespace {
 // when it is in none of them.
 std::string FindProgram() {
     std::error_code error;
-    const std::filesystem::path own = OwnPath().parent_path();
+    const auto own = std::filesystem::path(BApplication::ExecutablePath()).parent_path();
     for (const char* place : {"quorvan", "../quorvan", "../app/quorvan"}) {
         const std::filesystem::path candidate = (own / place).lexically_normal();
         if (std::filesystem::is_regular_file(candidate, error))
@@ -45,7 +45,7 @@ void AddSetupCommand(CLI::App& application, int& status) {
     command->callback([options, remove, &status] {
         if (options->program.empty())
             options->program = FindProgram();
-        options->companion = OwnPath();
+        options->companion = BApplication::ExecutablePath();
         options->dataFolder = PersonalDataFolder();
         status = *remove ? RunDesktopRemoval(*options, std::cout, std::cerr)
                          : RunSetup(*options, std::cout, std::cerr);

@@ -1,5 +1,6 @@
-// Between the layer's value types and the toolkit's. Only for the layer's own sources.
 #pragma once
+
+// Between the layer's value types and the toolkit's. Only for the layer's own sources.
 
 #include <QColor>
 #include <QFont>

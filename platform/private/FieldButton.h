@@ -1,5 +1,6 @@
-// The button of a menu field. Only for the layer's own sources.
 #pragma once
+
+// The button of a menu field. Only for the layer's own sources.
 
 #include <QPushButton>
 

@@ -1,6 +1,7 @@
+#pragma once
+
 // A label with a field to its right, the two parts of a text control and of a menu field. Only for the
 // layer's own sources.
-#pragma once
 
 #include <QWidget>
 

@@ -1,5 +1,6 @@
-// What a list view has on the toolkit's side. Only for the layer's own sources.
 #pragma once
+
+// What a list view has on the toolkit's side. Only for the layer's own sources.
 
 #include "platform/private/RowModel.h"
 #include "platform/private/RowSelection.h"

@@ -1,5 +1,6 @@
-// How the interface thread serves loopers and waits. Only for the layer's own sources.
 #pragma once
+
+// How the interface thread serves loopers and waits. Only for the layer's own sources.
 
 #include <functional>
 

@@ -1,5 +1,6 @@
-// What menus and their items have on the toolkit's side. Only for the layer's own sources.
 #pragma once
+
+// What menus and their items have on the toolkit's side. Only for the layer's own sources.
 
 #include <functional>
 #include <memory>

@@ -1,6 +1,7 @@
+#pragma once
+
 // Keyboard mnemonics (Alt and an underlined letter) for what a window shows. Only for the layer's own
 // sources.
-#pragma once
 
 #include <QString>
 #include <QVariant>

@@ -1,5 +1,6 @@
-// The file that a print job writes. Only for the layer's own sources.
 #pragma once
+
+// The file that a print job writes. Only for the layer's own sources.
 
 #include <string>
 

@@ -1,5 +1,6 @@
-// Where windows come to stand. Only for the layer's own sources.
 #pragma once
+
+// Where windows come to stand. Only for the layer's own sources.
 
 #include <QRect>
 

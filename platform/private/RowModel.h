@@ -1,5 +1,6 @@
-// The toolkit's view of a list's rows. Only for the layer's own sources.
 #pragma once
+
+// The toolkit's view of a list's rows. Only for the layer's own sources.
 
 #include <vector>
 

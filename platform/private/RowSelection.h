@@ -1,5 +1,6 @@
-// Which rows of a list are selected. Only for the layer's own sources.
 #pragma once
+
+// Which rows of a list are selected. Only for the layer's own sources.
 
 #include <QItemSelectionModel>
 

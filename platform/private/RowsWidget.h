@@ -1,5 +1,6 @@
-// The widget of a list view. Only for the layer's own sources.
 #pragma once
+
+// The widget of a list view. Only for the layer's own sources.
 
 #include <memory>
 

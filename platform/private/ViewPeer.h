@@ -1,5 +1,6 @@
-// What a view has on the toolkit's side. Only for the layer's own sources.
 #pragma once
+
+// What a view has on the toolkit's side. Only for the layer's own sources.
 
 #include <mutex>
 

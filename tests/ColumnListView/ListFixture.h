@@ -1,5 +1,6 @@
-// A list for a window, with rows whose columns can be told apart by colour and text.
 #pragma once
+
+// A list for a window, with rows whose columns can be told apart by colour and text.
 
 #include <memory>
 #include <sstream>
