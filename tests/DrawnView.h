@@ -87,9 +87,8 @@ struct Picture : QImage {
     // Near the point.
     [[nodiscard]] bool Has(BPoint point, rgb_color color) const {
         bool has = false;
-        for (float y = -3; y <= 3; ++y)
-            for (float x = -3; x <= 2; ++x)
-                has |= At(point + BPoint(x, y)) == color;
+        for (int i = 0; i < 42; ++i)
+            has |= At(point + BPoint(static_cast<float>(i % 6 - 3), static_cast<float>(i / 6 - 3))) == color;
         return has;
     }
 };

@@ -1,7 +1,5 @@
 #pragma once
 
-#include <source_location>
-
 #include <QAbstractItemView>
 
 #include "ColumnListView/ColumnListView.h"
@@ -27,8 +25,6 @@ inline constexpr const char* NothingToTake = "You must select a(n) investment(s)
 // waits in vain is told by its line.
 class Program : public DataFolder, public Driver {
   public:
-    using Place = std::source_location;
-
     Program() { BApplication::SetExecutablePath(File("quorvan").c_str()); }
 
     // From start to end, as main does it. The last step is to end the program. Returns its exit status.
@@ -39,23 +35,23 @@ class Program : public DataFolder, public Driver {
     }
     int RunAndClose() { return Close().Run(); }
 
-    Program& When(Condition condition, Action action, Place at = Place::current()) {
-        Driver::When("line " + std::to_string(at.line()), std::move(condition), std::move(action));
+    Program& When(Condition condition, Action action, int line = __builtin_LINE()) {
+        Driver::When("line " + std::to_string(line), std::move(condition), std::move(action));
         return *this;
     }
-    Program& Await(Condition condition, Place at = Place::current()) {
-        return When(std::move(condition), Action([] {}), at);
+    Program& Await(Condition condition, int line = __builtin_LINE()) {
+        return When(std::move(condition), Action([] {}), line);
     }
     Program& Answer(const std::string& text, const char* button = "Ok") {
         Driver::Answer(text, button);
         return *this;
     }
     // A step as soon as the main window is shown and nothing keeps the person out of it.
-    Program& Then(Action action, Place at = Place::current()) {
+    Program& Then(Action action, int line = __builtin_LINE()) {
         const auto free = [] {
             return Main() && !QApplication::activeModalWidget() && !QApplication::activePopupWidget();
         };
-        return When(free, std::move(action), at);
+        return When(free, std::move(action), line);
     }
     Program& Close() {
         return Then([] { Main()->close(); });
@@ -78,11 +74,11 @@ class Program : public DataFolder, public Driver {
     }
     // A step that waits until the list shows these investments, by name and in this order, and, if one is
     // given, this total.
-    Program& Expect(const Texts& names, const std::string& total = "", Place at = Place::current()) {
+    Program& Expect(const Texts& names, const std::string& total = "", int line = __builtin_LINE()) {
         const auto shown = [=] {
             return Main() && Names() == names && (total.empty() || Total() == "Total Value: " + total);
         };
-        return Await(shown, at);
+        return Await(shown, line);
     }
 
     static QWidget* Main() { return Driver::Window("Quorvan"); }

@@ -196,21 +196,24 @@ TEST_F(PriceUpdate, EndsWithAnAlertWhenNobodyCanBeAsked) {
     constexpr const char* notTrusted =
         "The server 127.0.0.1 could not be trusted: its certificate was refused, and it was not asked for a "
         "price.\nIs the name in Quorvan.cfg right, and the date of this computer?";
-    const std::tuple<std::string, std::string, const char*, const char*> cases[] = {
-        {"127.0.0.1", "", NoConnection, "Unable to open '"},
-        {"127.0.0.1\r", "reset 127.0.0.1:1 /a Last 1\n", NoConnection, "connect() error\n"},
-        {"127.0.0.1", toStranger, notTrusted, "https error: SSL certificate problem"},
-        {"", ";\n", NoConnection, "Checked '', no connection found!\n"}};
-    for (const auto& [host, sources, alert, logged] : cases) {
+    const struct {
+        std::string host, sources;
+        const char *alert, *logged;
+    } cases[] = {{"127.0.0.1", "", NoConnection, "Unable to open '"},
+                 {"127.0.0.1\r", "reset 127.0.0.1:1 /a Last 1\n", NoConnection, "connect() error\n"},
+                 {"127.0.0.1", toStranger, notTrusted, "https error: SSL certificate problem"},
+                 {"", ";\n", NoConnection, "Checked '', no connection found!\n"}};
+    for (const auto& each : cases) {
         Then([&] {
-            Write("Quorvan.ini", "[GENERAL]\nIsConnectedURL=" + host + "\n");
-            Write("Quorvan.cfg", sources);
-            if (sources.empty())
+            Write("Quorvan.ini", "[GENERAL]\nIsConnectedURL=" + each.host + "\n");
+            Write("Quorvan.cfg", each.sources);
+            if (each.sources.empty())
                 std::filesystem::remove(File("Quorvan.cfg"));
         });
-        Update().Answer(alert);
-        UntilDone().Then(
-            [&] { EXPECT_NE(Read("Quorvan.log").find(logged), std::string::npos) << Read("Quorvan.log"); });
+        Update().Answer(each.alert);
+        UntilDone().Then([&] {
+            EXPECT_NE(Read("Quorvan.log").find(each.logged), std::string::npos) << Read("Quorvan.log");
+        });
     }
     RunAndClose();
     ExpectUntouched(0, "RISE");

@@ -280,7 +280,8 @@ TEST_F(Controls, MenuFieldsAreOpenedAndChosenFromByKeyAndPointer) {
         menu->ItemAt(1)->SetMarked(marked);
         QTest::keyClick(button, key);
         QMenu* open = OpenMenu();
-        EXPECT_TRUE(QTest::qWaitFor([&] { return open->activeAction() == open->actions()[marked]; })) << key;
+        const QAction* wanted = open->actions()[marked];
+        EXPECT_TRUE(QTest::qWaitFor([&] { return open->activeAction() == wanted; })) << key;
         if (marked)
             QTest::keyClick(open, Qt::Key_Up);
         QTest::keyClick(open, Qt::Key_Return);

@@ -94,7 +94,8 @@ TEST(Drawing, WhatMeetsLeavesNoSeamAtAnyDensity) {
             [](BView* view) {
                 view->SetHighColor(Red);
                 view->SetLowColor(Red);
-                for (float left = 0; left < 99; left += 7) {
+                for (int i = 0; i < 15; ++i) {
+                    const float left = 7 * static_cast<float>(i);
                     view->FillRect({left, 0, left + 6, 9});
                     view->FillRectLow({left, 10, left + 6, 19});
                     view->StrokeLine({left, 20}, {left + 6, 20});

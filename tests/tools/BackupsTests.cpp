@@ -42,6 +42,7 @@ TEST_F(Backups, AreListedAndGoThereAndBack) {
     EXPECT_EQ(Printed(in_ + "backups"), "day         file        bytes  records  added  changed  removed\n"
                                         "2026-11-20  invest.db    1317        3      1        1        1\n"
                                         "2026-11-20  portfol.db    129        1      1        0        0\n");
+    EXPECT_TRUE(Works(in_ + "backups --json", R"({"day":"2026-11-20","file":"invest.db","bytes":1317,"rec)"));
     EXPECT_TRUE(folder_.Fails(in_ + "backups >/dev/full", 1, "No space left on device"));
     EXPECT_TRUE(
         Works(in_ + "chmod 640 invest.db; backups restore 2026-11-20", "restored invest.db, portfol.db of "));

@@ -10,17 +10,24 @@ namespace {
 class FailureTest : public CommandTest {};
 
 TEST_F(FailureTest, AWrongCommandLineDoesNothing) {
+    // With the reason, where it is not the command line's own.
     std::istringstream wrong(
         "|quote|chart A 2000|report A|report -o A|setup|db A|db A create|db A query a b|list --sort Name|"
-        "list A --sort Status|export|export A --all|import A|import --all|import --all A t.csv|"
-        "import A t.csv --decimal x|import A t.csv --delimiter ab|import A t.csv --column Amount=N|"
-        "list ''|export ''|export A -o ''|report A -o ''|import A t.csv --column Value=N|"
-        "import A t.csv --update-by name|import A t.csv --json|quote A --home home --source 'n h /q Last 2'|"
+        "list A --sort Status|export#PORTFOLIO or --all is|export A --all|import --all A t.csv|"
+        "import A#PORTFOLIO and FILE, or|import --all#PORTFOLIO and FILE, or|import A t.csv --decimal x|"
+        "import A t.csv --delimiter ab#is one character|import A t.csv --column Amount=N|list ''|export ''|"
+        "export A -o ''|report A -o ''|import A t.csv --column Value=N|import A t.csv --update-by name|"
+        "import A t.csv --json|quote A --home home --source 'n h /q Last 2'|"
         "setup new --desktop --remove-desktop|db A delete 1 --where 'N = 1'|db A undelete --where 'N = 1'|"
-        "quote ''|chart A 2000 -o new.gif|chart A 2000 -o new.png --scale nan|db new.db query --format xml|"
-        "db new.db set 'N = 1'|db new.db delete|db new.db append N|db new.db create --column N:text");
-    for (std::string arguments; std::getline(wrong, arguments, '|');)
-        EXPECT_EQ(folder_.Run("quorvan-cli " + arguments), 2) << arguments;
+        "quote ''#a ticker is empty|chart A 2000 -o new.gif#end with .png, .svg or .pdf|"
+        "chart A 2000 -o new.png --scale nan#must be a number|db new.db query --format xml|"
+        "db new.db set 'N = 1'#--where or --all is required|db new.db delete#A record's number is required|"
+        "db new.db append N|db new.db create --column N:text");
+    for (std::string line; std::getline(wrong, line, '|');) {
+        const std::size_t end = std::min(line.find('#'), line.size());
+        const std::string reason = end < line.size() ? line.substr(end + 1) : "Run with --help";
+        EXPECT_TRUE(folder_.Fails("quorvan-cli " + line.substr(0, end), 2, reason));
+    }
     EXPECT_TRUE(folder_.Fails("quorvan-cli quote \"$(printf 'A\\tB')\"", 2, "control characters"));
     EXPECT_TRUE(
         folder_.Fails("quorvan-cli quote A --source 'net h /q?s= Last'", 2, "fewer than five fields"));
@@ -34,7 +41,7 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
         Works(Setup("--sample") + R"sh(; db() { quorvan-cli db "$@"; }; db home/portfol.db append Name=A
         for _ in 1 2; do db home/invest.db append Portfolio=A Value=3e38; done
         db a.db create --column N:byte --column Name:string:8; db a.db append N=1; mkfifo p; ln -s p pipe.png; ln -s home/misc.db misc.svg
-        head -c 36 a.db >bad.db; printf '\11' >>bad.db; tail -c +38 a.db >>bad.db
+        head -c 36 a.db >bad.db; printf '\11' >>bad.db; tail -c +38 a.db >>bad.db; head -c 51 a.db >short.db
         mkdir other held left block folder.png; echo old >old.png
         cp home/*.db other; cp a.db other/invest.db; cp a.db held
         cp a.db block; echo >block/backups; cp a.db left/a.bak; cp a.db left/b.new
@@ -70,6 +77,9 @@ TEST_F(FailureTest, FailsInOneSentenceAndLeavesFilesAlone) {
         {"XDG_DATA_HOME=$PWD/full " + Setup("--desktop"), ".desktop cannot be made: Not a directory"},
         {Setup("--desktop", "\xFF"), "its path has a sign that no entry can hold"},
         {"quorvan-cli db folder.png info", "this is no regular file"},
+        {"quorvan-cli db short.db info", "the file ends after 51 of the header's 52 bytes"},
+        {"quorvan-cli db a.db query >/dev/full", "the output cannot be written: No space left on device"},
+        {"quorvan-cli db a.db load missing", "1801 "},
         {"quorvan-cli db a.db query Name=", ": a condition is a column, an operator and a value"},
         {"quorvan-cli db a.db query --sort Nome", "1701 "},
         {"quorvan-cli db a.db append N=1 N=2", "the column N is given twice"},
