@@ -61,6 +61,9 @@ function(quorvan_room)
   target_link_libraries(${target} PRIVATE quorvan_flags ${ROOM_PRIVATELY})
 endfunction()
 
+# What the ThreadSanitizer run builds.
+add_custom_target(thread_tests)
+
 # quorvan_test(NAME name SOURCES ... USES room ... [THREADS] [WINDOWS] [ALSO library ...])
 #
 # One GoogleTest program. THREADS marks it for the ThreadSanitizer run as well; WINDOWS gives it the toolkit's
@@ -72,8 +75,9 @@ function(quorvan_test)
   target_include_directories(${target} PRIVATE ${PROJECT_SOURCE_DIR}/tests)
   quorvan_link_rooms(${target} PRIVATE ${TEST_USES})
   target_link_libraries(${target} PRIVATE quorvan_flags ${TEST_ALSO})
-  # GoogleTest's checks hold an else of their own, which belongs to no if around them.
-  target_compile_options(${target} PRIVATE -Wno-dangling-else)
+  # GoogleTest's checks hold an else of their own, which belongs to no if around them. And what a test does itself takes
+  # no time, but optimising it does.
+  target_compile_options(${target} PRIVATE -Wno-dangling-else -O0)
   set(environment
     "TSAN_OPTIONS=halt_on_error=1:suppressions=${PROJECT_SOURCE_DIR}/tests/tsan.supp"
     "LSAN_OPTIONS=suppressions=${PROJECT_SOURCE_DIR}/tests/lsan.supp"
@@ -87,6 +91,7 @@ function(quorvan_test)
   set(properties "TIMEOUT 300")
   if(TEST_THREADS)
     string(APPEND properties " LABELS threads")
+    add_dependencies(thread_tests ${target})
   endif()
   gtest_discover_tests(${target} TEST_PREFIX ${TEST_NAME}. TEST_LIST ${target}_TESTS DISCOVERY_TIMEOUT 120)
   # Discovery takes properties apart at every semicolon, and the environment is a list: it is set when ctest reads
