@@ -227,10 +227,10 @@ void NorvelWindow::SaveLayout() const {
     WriteNumbers(settings_, OrderKey, investmentList_->DisplayOrder());
     int32 keys[InvestmentColumnCount];
     CLVSortMode modes[InvestmentColumnCount];
-    std::vector<int> sorted;
-    for (int32 i = 0; i < investmentList_->Sorting(keys, modes); ++i)
-        sorted.push_back(modes[i] == CLVSortMode::Descending ? -keys[i] : keys[i]);
-    WriteNumbers(settings_, SortKey, sorted);
+    const int32 count = investmentList_->Sorting(keys, modes);
+    for (int32 i = 0; i < count; ++i)
+        keys[i] = modes[i] == CLVSortMode::Descending ? -keys[i] : keys[i];
+    WriteNumbers(settings_, SortKey, {keys, keys + count});
 }
 
 void NorvelWindow::NameAfterPortfolio() {

@@ -58,7 +58,7 @@ long SortAll(DATABASE& database, const char* column) {
     return database.SortBy(column, 0) == 0 ? all : -1;
 }
 
-const WORK Works[] = {
+constexpr WORK Works[] = {
     {"NEW query, \"=\" on text", 0.5, 1.3,
      [](DATABASE& database) { return database.Query("Portfolio = portfolio 17", QueryMode::New); },
      [](Peer& peer) { return peer.Step("SELECT rowid FROM t WHERE Portfolio = 'portfolio 17'"); }},
@@ -96,7 +96,7 @@ struct CHANGE {
     const char* theirs;
 };
 
-const CHANGE Changes[] = {
+constexpr CHANGE Changes[] = {
     {"query and update of 1 %", 1, 1.5, "Portfolio = portfolio 17", "Retire = 1",
      "UPDATE t SET Retire = 1 WHERE Portfolio = 'portfolio 17'"},
     {"query and update of 10 %, text", 1, 0, "Risk = med", "Agent = Somebody Else",

@@ -22,23 +22,21 @@ inline constexpr int Divide = 4;
 // The quotient of two numbers; of integers the dividend when there is none, and the wrapped one.
 template <class T>
 [[nodiscard]] constexpr T Quotient(T field, T value) {
-    if constexpr (std::is_integral_v<T>) {
-        if (value == 0)
-            return field;
-        if (value == -1)
-            return static_cast<T>(0 - static_cast<std::uint64_t>(field)); // that of the smallest does not fit
-    }
-    return static_cast<T>(field / value);
+    if constexpr (std::is_integral_v<T>)
+        return value == 0 ? field : static_cast<T>(std::int64_t{field} / value);
+    else
+        return field / value;
 }
 
 // Changes a number in place. Integers wrap at their width, and dividing one by 0 leaves it as it is; floats
 // follow floating-point rules. Any other `op` than the five changes nothing.
 template <class T>
 constexpr void ChangeNumber(int op, T* field, T value) {
-    // Unsigned arithmetic wraps where signed arithmetic must not overflow.
-    using Wrapping = std::conditional_t<std::is_integral_v<T>, std::uint64_t, T>;
-    const auto a = static_cast<Wrapping>(*field);
-    const auto b = static_cast<Wrapping>(value);
+    // So wide that nothing overflows before it is wrapped.
+    static_assert(sizeof(T) <= 4);
+    using Wide = std::conditional_t<std::is_integral_v<T>, std::int64_t, T>;
+    const Wide a = *field;
+    const Wide b = value;
     switch (op) {
     case SetOperator::Assign:
         *field = value;

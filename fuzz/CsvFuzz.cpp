@@ -60,8 +60,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
         const std::vector<ImportedInvestment> again = Read(Written(rows), options);
         Require(rows.size() == again.size(), "written lines are not read");
         for (std::size_t i = 0; i < rows.size(); ++i)
-            Require(std::memcmp(&rows[i].data, &again[i].data, sizeof(INVESTMENT_DATA)) == 0,
-                    "a written line is read as another");
+            Require(AreSame(rows[i].data, again[i].data), "a written line is read as another");
     }
     return 0;
 }

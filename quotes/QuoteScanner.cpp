@@ -109,8 +109,8 @@ bool QuoteScanner::PassBrackets(std::string_view& rest) {
 }
 
 void QuoteScanner::ReadPrice(std::string_view token, std::string_view following) {
-    const std::string text(token);
-    report_.Log(std::string("value string is '") + text.c_str() + "'\n");
+    const std::string text(token.substr(0, token.find('\0')));
+    report_.Log("value string is '" + text + "'\n");
     double whole = 0;
     const bool readable = ReadDecimal(text.c_str(), &whole);
     std::string rest(following);

@@ -22,10 +22,11 @@ class StepDriver : public QObject {
 
     StepDriver() {
         self_ = this;
+        const auto start = [] { QTimer::singleShot(PollMilliseconds, self_, &StepDriver::Poll); };
         if (QCoreApplication::instance())
-            Poll();
+            start();
         else
-            qAddPreRoutine([] { QTimer::singleShot(PollMilliseconds, self_, &StepDriver::Poll); });
+            qAddPreRoutine(start);
     }
     ~StepDriver() override { self_ = nullptr; }
 

@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <filesystem>
 #include <fstream>
-#include <iterator>
+#include <sstream>
 #include <stdexcept>
 #include <stdlib.h>
 #include <string>
@@ -30,8 +30,9 @@ class TemporaryFolder {
         std::ofstream(File(name), std::ios::binary) << content;
     }
     [[nodiscard]] std::string Read(const std::string& name) const {
-        std::ifstream file(File(name), std::ios::binary);
-        return {std::istreambuf_iterator<char>(file), {}};
+        std::ostringstream content;
+        content << std::ifstream(File(name), std::ios::binary).rdbuf();
+        return content.str();
     }
     [[nodiscard]] bool Has(const std::string& name) const { return std::filesystem::exists(File(name)); }
     // The names of what lies in it, or in a folder below, in alphabetical order.

@@ -73,7 +73,7 @@ std::vector<BackupFile> FindBackups(const std::string& folder, const std::vector
     for (const std::string& name : names) {
         const std::string present = RealPath(folder + "/" + name);
         for (const auto& [kept, day] : DailyBackup::KeptIn(FolderOf(present)))
-            if (FolderOf(present) + "/" + kept == present)
+            if (present.ends_with("/" + kept))
                 found.push_back({name, day, DailyBackup::Kept(present, day), present});
     }
     std::stable_sort(found.begin(), found.end(),
@@ -120,7 +120,8 @@ std::string RestoreBackups(const ToolFolder& folder, const std::vector<BackupFil
     for (DataFileCopy& copy : copies) {
         if (const std::string wrong = copy.TakePlace(&unsure); !wrong.empty())
             return wrong + (done.empty() ? "" : "; restored already:" + done) + goesOn;
-        done += " " + *name++;
+        done += ' ';
+        done += *name++;
     }
     return unsure.empty() ? "" : unsure + goesOn;
 }

@@ -50,7 +50,7 @@ bool CollectAll(DATABASE& portfolios, DATABASE& investments, std::vector<INVESTM
 bool IsNameAlone(const INVESTMENT_DATA& record) {
     INVESTMENT_DATA alone{};
     std::memcpy(alone.Portfolio, record.Portfolio, sizeof alone.Portfolio);
-    return std::memcmp(&alone, &record, sizeof alone) == 0;
+    return AreSame(alone, record);
 }
 
 void WriteRecords(const ExportOptions& options, std::span<const INVESTMENT_DATA> records,

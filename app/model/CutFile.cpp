@@ -23,13 +23,6 @@ std::vector<COLUMN_ENTRY> Columns() {
     return columns;
 }
 
-bool AreSame(const INVESTMENT_DATA& one, const INVESTMENT_DATA& other) {
-    const auto bytes = [](const INVESTMENT_DATA& data) {
-        return std::string_view(reinterpret_cast<const char*>(&data), sizeof data);
-    };
-    return bytes(one) == bytes(other);
-}
-
 bool ReadAll(const std::string& path, std::vector<CutData>* kept) {
     DATABASE file(path.c_str());
     DATABASE_HEADER header{};

@@ -40,6 +40,9 @@ struct [[gnu::packed]] INVESTMENT_DATA {
     char Unused[208];       // zero; no column covers it
 };
 
+// Whether they agree in every byte.
+[[nodiscard]] bool AreSame(const INVESTMENT_DATA& one, const INVESTMENT_DATA& other);
+
 inline constexpr float NoPreviousPrice = -1.0F;
 
 // misc.db: one entry of a pick list. Category is "Type" or "Agent".

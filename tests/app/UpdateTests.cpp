@@ -81,9 +81,7 @@ class PriceUpdate : public testing::Test, protected Program {
         return record;
     }
     void ExpectUntouched(long number, const char* ticker) const {
-        const INVESTMENT_DATA before = Holding(ticker, 11, NoPreviousPrice);
-        const INVESTMENT_DATA record = Record(number);
-        EXPECT_EQ(std::memcmp(&record, &before, sizeof before), 0) << ticker;
+        EXPECT_TRUE(AreSame(Record(number), Holding(ticker, 11, NoPreviousPrice))) << ticker;
     }
 
     std::string held_; // the server says nothing when it is asked for this ticker
@@ -112,7 +110,7 @@ TEST(ApplyQuote, ChangesWhatItShall) {
         EXPECT_EQ(ApplyQuote(record, quote), outcome) << quote;
         if (outcome == Priced)
             expected.Date = PackDate(record.Date) == PackDate(began) ? began : Today();
-        EXPECT_EQ(std::memcmp(&record, &expected, sizeof record), 0) << quote;
+        EXPECT_TRUE(AreSame(record, expected)) << quote;
     }
 }
 

@@ -8,6 +8,7 @@
 #include <functional>
 #include <memory>
 #include <mutex>
+#include <stdexcept>
 #include <string>
 #include <sys/socket.h>
 #include <thread>
@@ -33,7 +34,8 @@ class LoopbackSocket {
     LoopbackSocket() {
         auto* const address = reinterpret_cast<sockaddr*>(&address_);
         socklen_t size = sizeof address_;
-        bind(fd_, address, size);
+        if (bind(fd_, address, size) != 0)
+            throw std::runtime_error("no loopback socket");
         getsockname(fd_, address, &size);
     }
     LoopbackSocket(const LoopbackSocket&) = delete;
