@@ -85,7 +85,7 @@ std::string ReadCsv(std::string_view text, char delimiter, const CsvRow& use) {
 }
 
 PlainNumber ReadPlainNumber(std::string_view text, char decimal) {
-    const PlainNumber none{{}, "is no number"};
+    PlainNumber none{{}, "is no number"};
     const char mark = decimal == 0 ? '.' : decimal;
     PlainNumber number;
     if (text.starts_with('-') || text.starts_with('+')) {

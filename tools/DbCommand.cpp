@@ -187,11 +187,12 @@ void DbCommand::AddMarkingCommands() {
         {"undelete", "Take deleted records back", "undeleted", &DATABASE::UnDelete},
     };
     for (const auto& [name, description, done, mark] : commands) {
-        CLI::App* command = Add(name, description, [done, mark](auto& tool, const auto& options) {
-            if (options.records.empty() && Selected(options) == nullptr)
-                throw CLI::RequiredError("A record's number");
-            return tool.Mark(done, mark, options.records, Selected(options));
-        });
+        CLI::App* command =
+            Add(name, description, [done = done, mark = mark](auto& tool, const auto& options) {
+                if (options.records.empty() && Selected(options) == nullptr)
+                    throw CLI::RequiredError("A record's number");
+                return tool.Mark(done, mark, options.records, Selected(options));
+            });
         command->add_option("RECORD", options_->records, "The records' numbers");
         if (mark == &DATABASE::UnDelete)
             continue; // a selection has no deleted records

@@ -73,8 +73,10 @@ int Judge(const CsvImport& import, const std::string& file) {
     if (!import.Wrong().empty())
         return 1;
     std::string unused;
-    for (const std::string& heading : import.Unused())
-        unused += (unused.empty() ? "" : ", ") + Quoted(heading);
+    for (const std::string& heading : import.Unused()) {
+        unused += unused.empty() ? "" : ", ";
+        unused += Quoted(heading);
+    }
     if (!unused.empty())
         Fail(file + ": nothing is taken of " + unused);
     for (const long line : import.Ahead())
