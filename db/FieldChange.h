@@ -35,20 +35,18 @@ constexpr void ChangeNumber(int op, T* field, T value) {
     // So wide that nothing overflows before it is wrapped.
     static_assert(sizeof(T) <= 4);
     using Wide = std::conditional_t<std::is_integral_v<T>, std::int64_t, T>;
-    const Wide a = *field;
-    const Wide b = value;
     switch (op) {
     case SetOperator::Assign:
         *field = value;
         break;
     case SetOperator::Add:
-        *field = static_cast<T>(a + b);
+        *field = static_cast<T>(Wide{*field} + value);
         break;
     case SetOperator::Subtract:
-        *field = static_cast<T>(a - b);
+        *field = static_cast<T>(Wide{*field} - value);
         break;
     case SetOperator::Multiply:
-        *field = static_cast<T>(a * b);
+        *field = static_cast<T>(Wide{*field} * value);
         break;
     case SetOperator::Divide:
         *field = Quotient(*field, value);

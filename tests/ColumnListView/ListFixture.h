@@ -20,11 +20,13 @@ template <class AnswerAt>
 std::string Runs(float begin, float end, float step, const AnswerAt& answerAt) {
     std::ostringstream runs;
     std::string last;
-    for (float x = begin; x < end; x += step)
+    for (int i = 0; begin + step * static_cast<float>(i) < end; ++i) {
+        const float x = begin + step * static_cast<float>(i);
         if (const std::string answer = answerAt(x); answer != last) {
             runs << x << answer << " ";
             last = answer;
         }
+    }
     return runs.str();
 }
 

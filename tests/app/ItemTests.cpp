@@ -29,19 +29,19 @@ TEST(NorvelItem, EachMoveHasItsPicture) {
     program.Write("Quorvan.ini", "[DISPLAY]\nColumnWidth0=20\n");
     program.AddPortfolio("A");
     static constexpr struct {
+        QPoint pixel; // one that the picture draws
+        const char* words;
         float previous;
         std::int8_t error;
-        QPoint pixel; // one that the picture draws
         uint8 color;
-        const char* words;
-    } cases[] = {{9, 0, {7, 8}, 143, "price up"},
-                 {11, 0, {7, 8}, 228, "price down"},
-                 {10, 0, {7, 6}, 191, "price unchanged"},
-                 {-1, 0, {7, 9}, 163, "no earlier price"},
-                 {0, 0, {7, 9}, 163, "no earlier price"},
-                 {std::numeric_limits<float>::quiet_NaN(), 0, {7, 9}, 163, "no earlier price"},
-                 {9, 1, {3, 3}, 0, "no price found"},
-                 {-1, -1, {4, 4}, 252, "no price found"}};
+    } cases[] = {{{7, 8}, "price up", 9, 0, 143},
+                 {{7, 8}, "price down", 11, 0, 228},
+                 {{7, 6}, "price unchanged", 10, 0, 191},
+                 {{7, 9}, "no earlier price", -1, 0, 163},
+                 {{7, 9}, "no earlier price", 0, 0, 163},
+                 {{7, 9}, "no earlier price", std::numeric_limits<float>::quiet_NaN(), 0, 163},
+                 {{3, 3}, "no price found", 9, 1, 0},
+                 {{4, 4}, "no price found", -1, -1, 252}};
     for (const auto& each : cases) {
         INVESTMENT_DATA record = MakeInvestment("A", "a");
         record.PrevPrice = each.previous;

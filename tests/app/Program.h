@@ -92,7 +92,7 @@ class Program : public DataFolder, public Driver {
     template <class View>
     static View* Find(BView* view = Window()->FindView("top view")) {
         auto* found = dynamic_cast<View*>(view);
-        for (int32 i = 0; !found && i < view->CountChildren(); ++i)
+        for (int32 i = 0; !found && view && i < view->CountChildren(); ++i)
             found = Find<View>(view->ChildAt(i));
         return found;
     }

@@ -12,12 +12,12 @@ namespace {
 
 using Names = std::vector<std::string>;
 
-std::time_t now_ = 0;
+std::time_t gNow = 0;
 
 // Noon of a day of November 2026.
 void SetDay(int day) {
     std::tm noon{0, 0, 12, day, 10, 2026 - 1900, 0, 0, -1, 0, nullptr};
-    now_ = std::mktime(&noon);
+    gNow = std::mktime(&noon);
 }
 
 class BackupTest : public testing::Test {
@@ -33,7 +33,7 @@ class BackupTest : public testing::Test {
     }
     [[nodiscard]] std::unique_ptr<DailyBackup> MakeBackup(FileOperations& files = SystemFiles()) const {
         return std::make_unique<DailyBackup>(
-            folder_.Path(), Names{"portfol.db", "invest.db"}, files, [] { return now_; });
+            folder_.Path(), Names{"portfol.db", "invest.db"}, files, [] { return gNow; });
     }
     [[nodiscard]] Names Kept() const { return folder_.Names("backups"); }
 

@@ -239,8 +239,9 @@ TEST_F(MainWindow, OpensOnTheScreenWhateverIsStored) {
         {"9000 9000 400 300", "", "", 401},
         {"-90 0 400 9000", "-1 1 2 3 4 5 6 7 8 9 10", "1-1", 401}};
     for (const auto& [place, order, keys, width] : cases) {
+        const std::string first = "[DISPLAY]\nWindowPlace=" + place;
         Write("Quorvan.ini",
-              "[DISPLAY]\nWindowPlace=" + place + "\nColumnOrder=" + order + "\nSortKeys=" + keys + "\n");
+              std::string(first).append("\nColumnOrder=").append(order) + "\nSortKeys=" + keys);
         Await(
             [] { return Main() && Main()->screen()->availableGeometry().contains(Main()->frameGeometry()); });
         Then([&place = place, width = width] {

@@ -65,11 +65,12 @@ TEST_F(QueryTest, RefusesAndKeepsTheSetAndTheFile) {
     ASSERT_EQ(Find("Name contains growth"), "12");
     const std::string start = folder_.Read("rows.db");
     EXPECT_EQ(Code(database_.Query("Name = x", 3)), 1608);
+    const auto wrong =
+        Cases("Name =: 1608; Name = \t: 1608; Name=Fund: 1608; Name == x: 1603; Price contains 1: 1606; " +
+              token31 + " = x: 1602; " + token31 + "v = x: 1608; Name = " + token31 + "v: 1608; Name = x" +
+              std::string(120, '\t') + ": 1608");
     for (const char* mode : {"new ", "and ", "or "})
-        for (const auto& [statement, code] : Cases(
-                 "Name =: 1608; Name = \t: 1608; Name=Fund: 1608; Name == x: 1603; Price contains 1: 1606; " +
-                 token31 + " = x: 1602; " + token31 + "v = x: 1608; Name = " + token31 + "v: 1608; Name = x" +
-                 std::string(120, '\t') + ": 1608"))
+        for (const auto& [statement, code] : wrong)
             EXPECT_EQ(std::to_string(Run(mode + statement)), code) << statement;
     EXPECT_EQ(Code(database_.QueryUpdate(nullptr)), 2201);
     Play("change: 2201; change Name: 2205; change Name =: 2205; change Name ~ x: 2201; "
@@ -232,7 +233,7 @@ TEST_F(RowsTest, SetStatementsChangeTheSetAndNothingElse) {
     const std::string start = folder_.Read("rows.db");
     for (const std::string query : {"new Tag = 3", "new Small < 2", "new Count = -1"}) {
         for (const std::string cache : {"cache 0", "cache 1", "cache 256"}) {
-            SCOPED_TRACE(query + " " + cache);
+            SCOPED_TRACE(query + cache);
             ASSERT_EQ(Open(start) + Run(cache), 0);
             Run(query);
             ASSERT_EQ(cache == "cache 1" ? 0 : Run("sort Name"), 0);
