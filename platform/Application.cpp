@@ -43,7 +43,7 @@ bool OpenWithDesktop(const char* path) {
 }
 
 bool (*gLauncher)(const char*) = OpenWithDesktop;
-const BRoster gRoster;
+const BRoster Roster;
 
 // Controls in light colours, black on grey and white, whatever the desktop's theme: they stand between what
 // views paint in colours of their own. The person's fonts are left alone.
@@ -187,7 +187,7 @@ void ApplicationAccess::QuitWhenNothingWaits(BApplication& application) {
     QApplication::quit();
 }
 
-const BRoster* be_roster = &gRoster;
+const BRoster* be_roster = &Roster;
 
 status_t BRoster::Launch(const entry_ref* ref) const {
     if (!QFileInfo::exists(QString::fromUtf8(ref->path.c_str())))

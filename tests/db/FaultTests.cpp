@@ -7,25 +7,25 @@ namespace {
 // Each operation that changes a file.
 struct OPERATION {
     const char* step;
-    int result;              // when nothing fails
     std::vector<int> codes;  // of each of its calls that fails; none where another test has them
+    int result;              // when nothing fails
     bool byRecord = false;   // it may end between two records
     bool leavesSync = true;  // its bytes are still to be brought to the disk
     bool changesFile = true; // and not another one
 };
 
 const OPERATION Operations[] = {
-    {"append", 150, {2801, 2801, 2901}},
-    {"write 3", 0, {1309}},
-    {"delete 2", 0, {1409, 2901}},
-    {"undelete 1", 0, {1509, 2901}},
-    {"lock 0", 0, {2309}},
-    {"unlock 3", 0, {2409}},
-    {"compress", 0, {}, false, false},
-    {"change Name = other", 3, {1309, 1309, 1309}, true}, // 0, 140 and 141
-    {"append-all", 150, {2801, 2901, 2801, 2901}},
-    {"load \t\n", 8000, {2801, 2901, 2801, 2901, 2901, 2801, 2901}, true}, // in more than one batch
-    {"export 1", 149, {1901, 1901, 1909, 1909}, false, false, false},      // in more than one block
+    {"append", {2801, 2801, 2901}, 150},
+    {"write 3", {1309}, 0},
+    {"delete 2", {1409, 2901}, 0},
+    {"undelete 1", {1509, 2901}, 0},
+    {"lock 0", {2309}, 0},
+    {"unlock 3", {2409}, 0},
+    {"compress", {}, 0, false, false},
+    {"change Name = other", {1309, 1309, 1309}, 3, true}, // 0, 140 and 141
+    {"append-all", {2801, 2901, 2801, 2901}, 150},
+    {"load \t\n", {2801, 2901, 2801, 2901, 2901, 2801, 2901}, 8000, true}, // in more than one batch
+    {"export 1", {1901, 1901, 1909, 1909}, 149, false, false, false},      // in more than one block
 };
 
 // Whether the content is the old one or, where an operation works by record, that of a moment between.

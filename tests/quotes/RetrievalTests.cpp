@@ -79,7 +79,7 @@ TEST_F(Retrieval, AsksByABareRequestAndLogsEveryStep) {
     for (const auto& [reply, log, price] : cases) {
         LoopbackServer server(reply);
         EXPECT_EQ(Ask(server.Host()), price) << log;
-        EXPECT_EQ(Log(), "Checking '" + server.Host() + asked + log);
+        EXPECT_EQ(Log(), ("Checking '" + server.Host()).append(asked) + log);
         EXPECT_EQ(server.Requests(), std::vector{request});
     }
 }

@@ -62,8 +62,9 @@ TEST_F(SetupTest, TheDesktopStartsTheProgramOfAnyFolder) {
     for (const std::string name : {"home", "My Folder", "a\"b`c`d$HOME$$e", "\\back\\\\slash\\", "100% %f %%",
                                    "a=b %", "F\xC3\xBCr sp\xC3\xA4ter; (x) & ~ # * ? < > | [y]"}) {
         ASSERT_TRUE(Works(Setup("--desktop", name)));
-        EXPECT_EQ(Printed("find data -type f | sort"), Entry + "\n" + Icon + "\n" + Metainfo + "\n");
-        ASSERT_TRUE(Works("desktop-file-validate " + Entry + " && gio launch " + Entry)) << name;
+        EXPECT_EQ(Printed("find data -type f | sort"),
+                  (Entry + "\n").append(Icon + "\n").append(Metainfo + "\n"));
+        ASSERT_TRUE(Works("f=" + Entry + "; desktop-file-validate $f && gio launch $f")) << name;
         const auto started = [&] { return folder_.Read(name + "/started") == "0\n"; }; // no argument
         EXPECT_TRUE(WaitUntil(started)) << folder_.Read(Entry);
     }
@@ -86,7 +87,7 @@ TEST_F(SetupTest, TheLastFolderIsStartedAndTakenOut) {
 TEST_F(SetupTest, TheDesktopsForeignFilesAreNotHarmed) {
     for (const std::string& foreign : {"echo >" + Entry, "ln -s nowhere " + Icon, "echo >" + Metainfo}) {
         const std::string name = foreign.substr(foreign.find("data/"));
-        ASSERT_TRUE(Works("rm -rf data; " + Setup("--desktop") + "; rm " + name + "; " + foreign));
+        ASSERT_TRUE(Works(("rm -rf data; " + Setup("--desktop") + "; rm " + name).append("; " + foreign)));
         const std::string before = State(name);
         EXPECT_TRUE(folder_.Fails(Setup("--desktop"), 1, name + " is there already and is not Quorvan's"));
         EXPECT_EQ(Printed(Setup("--remove-desktop >told") + "; find data ! -type d"), name + "\n");
