@@ -106,6 +106,7 @@ constexpr bool AllInPlace() {
 static_assert(AllInPlace());
 
 } // namespace
+
 bool AreSame(const INVESTMENT_DATA& one, const INVESTMENT_DATA& other) {
     const auto bytes = [](const INVESTMENT_DATA& data) {
         return std::string_view(reinterpret_cast<const char*>(&data), sizeof data);

@@ -63,7 +63,9 @@ status_t WaitOnInterfaceThread(const std::function<bool()>& condition, bigtime_t
         timer.start(std::chrono::milliseconds((timeout + 999) / 1000));
     gInterfaceWaits.push_back({&condition, &loop});
     gWaitDepth++;
-    // A change between the check above and here left its notice in the toolkit's queue, so it is not missed.
+    // What is in the toolkit's queue already, a change's notice among it, may be served only behind something
+    // new.
+    RunOnInterfaceThread(CheckInterfaceWaits);
     loop.exec();
     gWaitDepth--;
     gInterfaceWaits.pop_back();

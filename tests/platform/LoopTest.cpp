@@ -1,8 +1,8 @@
 // Loopers, semaphores and threads on a real application object.
 #include <atomic>
 #include <numeric>
+#include <thread>
 
-#include <QTimer>
 #include <poll.h>
 
 #include "Stage.h"
@@ -33,11 +33,11 @@ TEST_F(Loopers, HandleOneMessageAfterTheOtherWhileOthersGoOn) {
             EXPECT_EQ(WaitFor(sem), B_BAD_SEM_ID);
         EXPECT_EQ(window->received.size(), code) << "the second message must wait for the first's return";
     };
-    const Worker worker([&] {
+    std::thread([&] {
         for (const uint32 code : posted)
             window->PostMessage(code);
-    });
-    QTimer::singleShot(20, [&] { other->PostMessage(7); });
+    }).join();
+    other->PostMessage(7); // it is there already when the wait begins, and nothing comes after it
     EXPECT_EQ(Received(posted.size()), posted);
     EXPECT_EQ(other->received, Codes{7});
 }
