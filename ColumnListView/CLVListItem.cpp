@@ -5,6 +5,7 @@
 
 #include "ColumnListView/CLVColumn.h"
 #include "ColumnListView/ColumnListView.h"
+#include "util/Strings.h"
 
 CLVListItem::CLVListItem(uint32 outlineLevel, bool superitem, bool expanded, float minHeight)
     : BListItem(outlineLevel, expanded), superitem_(superitem), minHeight_(minHeight) {}
@@ -58,7 +59,6 @@ void CLVListItem::Update(BView* owner, const BFont* font) {
 char* ToUpperStr(const char* text) {
     const std::size_t size = std::strlen(text) + 1;
     char* copy = new char[size];
-    std::transform(text, text + size, copy,
-                   [](char c) { return c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c; });
+    std::transform(text, text + size, copy, Raised);
     return copy;
 }

@@ -87,7 +87,7 @@ NorvelWindow::NorvelWindow()
     : BWindow(FirstFrame(), WindowTitle, B_DOCUMENT_WINDOW, B_WILL_ACCEPT_FIRST_CLICK),
       settings_(app_state->settingsPath) {
     SetSizeLimits(LeastSize, GreatestSize, LeastSize, GreatestSize);
-    BView* topView = AddTopView();
+    BView* topView = AddTopView(*this);
     const float barHeight = AddMenus(topView)->Frame().Height();
     AddSelector(topView, barHeight + 1);
     AddTotalValueView(topView, barHeight + 1, barHeight);
@@ -116,13 +116,6 @@ void NorvelWindow::Quit() {
     ClearInvestmentList();
     Unlock();
     BWindow::Quit();
-}
-
-BView* NorvelWindow::AddTopView() {
-    auto* topView = new BView(Bounds(), "top view", B_FOLLOW_ALL_SIDES, B_WILL_DRAW);
-    topView->SetViewColor(colors::gray);
-    AddChild(topView);
-    return topView;
 }
 
 BMenuBar* NorvelWindow::AddMenus(BView* topView) {

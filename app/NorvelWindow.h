@@ -69,8 +69,6 @@ class NorvelWindow : public BWindow {
     // Tells the person when the disk fails.
     static void SyncDataFiles();
 
-    // --- building ---
-    BView* AddTopView();
     BMenuBar* AddMenus(BView* topView);
     void LoadMenus(BMenuBar* bar);
     void AddSelector(BView* topView, float top);

@@ -37,7 +37,7 @@ bool MeasureRename(const OPTIONS& options, DATABASE& portfolios, DATABASE& inves
     const char* const names[] = {"Growth", "Retirement"};
     const double ours = Shortest(options.rounds, [&] {
         good &= RenamePortfolio(portfolios, investments, names[turn % 2], names[(turn + 1) % 2]);
-        turn++;
+        ++turn;
     });
     const char* const updates[] = {"UPDATE t SET Portfolio = 'Retirement' WHERE Portfolio = 'Growth'",
                                    "UPDATE t SET Portfolio = 'Growth' WHERE Portfolio = 'Retirement'"};

@@ -5,6 +5,7 @@
 #include <cstring>
 #include <functional>
 #include <new>
+#include <span>
 #include <stdexcept>
 
 #include "util/CharacterBuffer.h"
@@ -15,7 +16,6 @@ namespace {
 enum Set { ByInvestment, ByTicker, ByType, ByCategory, ByRisk, ByRetirement, SharesByInvestment };
 
 constexpr const char* Categories[] = {"Fund", "Stock", "Other"};
-constexpr const char* Risks[] = {"Low", "Med", "High"};
 constexpr const char* Retirement[] = {"Retirement", "Non-Retirement"};
 
 constexpr long LeastCapacity = 3; // the fixed slices
@@ -25,11 +25,10 @@ void SetLabel(ChartLabel& label, std::string_view text) {
     std::memcpy(label.data(), text.data(), std::min(text.size(), label.size() - 1));
 }
 
-template <std::size_t Size>
-void Preset(CHART_DATA_SET& set, const char* const (&labels)[Size]) {
-    for (std::size_t i = 0; i < Size; ++i)
+void Preset(CHART_DATA_SET& set, std::span<const char* const> labels) {
+    for (std::size_t i = 0; i < labels.size(); ++i)
         SetLabel(set.labels[i], labels[i]);
-    set.count = static_cast<std::int32_t>(Size);
+    set.count = static_cast<std::int32_t>(labels.size());
 }
 
 std::size_t CategoryOf(std::string_view type) {
@@ -58,7 +57,7 @@ int ChartDataSets::GenerateDataSets(long capacity) {
         return 1;
     }
     Preset(sets_[ByCategory], Categories);
-    Preset(sets_[ByRisk], Risks);
+    Preset(sets_[ByRisk], RiskNames);
     Preset(sets_[ByRetirement], Retirement);
     return 0;
 }
@@ -77,10 +76,8 @@ int ChartDataSets::AccumulateDataSet(int index, const INVESTMENT_DATA& record) {
     AddKeyed(sets_[ByTicker], tickers_, FieldText(record.Ticker), record.Value);
     AddKeyed(sets_[ByType], types_, type, record.Value);
     sets_[ByCategory].values[CategoryOf(type)] += record.Value;
-    const std::string risk(FieldText(record.Risk));
-    for (std::size_t i = 0; i < std::size(Risks); ++i)
-        if (strcmpi(risk.c_str(), Risks[i]) == 0)
-            sets_[ByRisk].values[i] += record.Value;
+    if (const std::optional<std::size_t> risk = RiskIndex(FieldText(record.Risk)))
+        sets_[ByRisk].values[*risk] += record.Value;
     sets_[ByRetirement].values[record.Retire ? 0 : 1] += record.Value;
     AddKeyed(sets_[SharesByInvestment], names_, name, record.Shares);
     return 0;

@@ -80,12 +80,10 @@ void ShowDataSet(PieChartView& view, const ChartDataSets& dataSets, uint32 code)
 }
 
 ChartWindow::ChartWindow(float left, float top, const char* portfolio)
-    : BWindow(FrameOnScreen(left, top), "Quorvan", B_FLOATING_WINDOW_LOOK, B_MODAL_APP_WINDOW_FEEL,
+    : BWindow(FrameOnScreen(left, top), WindowTitle, B_FLOATING_WINDOW_LOOK, B_MODAL_APP_WINDOW_FEEL,
               B_NOT_RESIZABLE | B_NOT_ZOOMABLE | B_WILL_ACCEPT_FIRST_CLICK),
       portfolio_(portfolio),
-      topView_(new BView(Bounds(), "top view", B_FOLLOW_ALL_SIDES, B_WILL_DRAW)) {
-    topView_->SetViewColor(colors::gray);
-    AddChild(topView_);
+      topView_(AddTopView(*this)) {
     CreateGraphTypeMenu();
     CreatePictureMenu();
     const BRect chart = AboveMenu(Bounds());

@@ -51,11 +51,9 @@ struct BDialog::Outcome {
 BDialog::BDialog(BRect frame, const char* title, uint16 flags)
     : BWindow(Narrowed(frame), title, B_FLOATING_WINDOW_LOOK, B_MODAL_APP_WINDOW_FEEL,
               B_NOT_RESIZABLE | B_NOT_ZOOMABLE | B_WILL_ACCEPT_FIRST_CLICK),
-      topView_(new BView(Bounds(), "top view", B_FOLLOW_ALL_SIDES, B_WILL_DRAW)),
+      topView_(AddTopView(*this)),
       fontHeight_(GetFontHeight(be_bold_font)),
       outcome_(std::make_shared<Outcome>()) {
-    topView_->SetViewColor(colors::gray);
-    AddChild(topView_);
     BRect above = Bounds();
     above.bottom = AddButtons(flags) - 1;
     form_ = new BFormView(above, "form", B_FOLLOW_ALL_SIDES);

@@ -4,8 +4,8 @@
 #include <cstring>
 #include <limits>
 
+#include "db/DatesTimes.h"
 #include "util/CharacterBuffer.h"
-#include "util/Dates.h"
 #include "util/Numbers.h"
 #include "util/Strings.h"
 
@@ -35,18 +35,6 @@ InvestmentCheck ReadAmount(const std::string& text, const std::string& shown, fl
         return tooLarge;
     *amount = static_cast<float>(number);
     return InvestmentCheck::Accepted;
-}
-
-dbDATE Today() {
-    int year = 0;
-    int month = 0;
-    int day = 0;
-    GetDate(&year, &month, &day);
-    dbDATE date{};
-    date.day = static_cast<std::int8_t>(day);
-    date.month = static_cast<std::int8_t>(month);
-    date.year = static_cast<std::int16_t>(year);
-    return date;
 }
 
 } // namespace

@@ -72,7 +72,7 @@ int32 ShowAlert(const AlertText& alert, const std::function<bool()>& cancelled) 
     ShowIcon(box, LookOf(alert.type));
     const std::vector<QPushButton*> buttons = AddButtons(box, alert);
     RunDialog(box, cancelled);
-    for (std::size_t index = 0; index < buttons.size(); index++)
+    for (std::size_t index = 0; index < buttons.size(); ++index)
         if (box.clickedButton() == buttons[index])
             return static_cast<int32>(index);
     return alert.LastButton();

@@ -98,7 +98,7 @@ void BApplication::MessageReceived(BMessage* message) {
 }
 
 bool BApplication::QuitRequested() {
-    for (int32 index = 0; BWindow* window = WindowAt(index); index++)
+    for (int32 index = 0; BWindow* window = WindowAt(index); ++index)
         if (!window->QuitRequested())
             return false;
     return true;
@@ -177,7 +177,7 @@ void ApplicationAccess::QuitWhenNothingWaits(BApplication& application) {
                            [&application] { QuitWhenNothingWaits(application); });
         return;
     }
-    for (int32 index = application.CountWindows() - 1; index >= 0; index--)
+    for (int32 index = application.CountWindows() - 1; index >= 0; --index)
         application.WindowAt(index)->Quit();
     if (application.CountWindows() > 0) {
         QTimer::singleShot(QuitRetryMilliseconds, application.peer_->toolkit.get(),

@@ -31,7 +31,7 @@ constexpr uint8 Spread(int value, int steps) {
 
 QList<QRgb> MakeColorTable() {
     QList<QRgb> table;
-    for (int index = 0; index < 256; index++)
+    for (int index = 0; index < 256; ++index)
         table.append(ToQt(color_map_entry(static_cast<uint8>(index))).rgba());
     return table;
 }

@@ -36,7 +36,7 @@ status_t LooperCore::Lock(bigtime_t timeout) {
     if (!alive_)
         return B_BAD_VALUE;
     holder_ = caller;
-    depth_++;
+    ++depth_;
     return B_OK;
 }
 
@@ -78,14 +78,14 @@ void LooperCore::ServeNext() {
 
 void LooperCore::Deliver(Queued queued) {
     BHandler* handler = queued.forLooper ? looper_ : queued.handler->handler.load();
-    handling_++;
+    ++handling_;
     if (handler) {
         BMessage* outer = current_;
         current_ = &queued.message;
         LooperAccess::Dispatch(*looper_, &queued.message, handler);
         current_ = outer;
     }
-    handling_--;
+    --handling_;
     Unlock();
     if (destroyWhenDone_) {
         Destroy();

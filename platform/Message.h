@@ -11,7 +11,7 @@
 // A message code written as four letters, first letter in the highest byte.
 constexpr uint32 message_code(const char (&letters)[5]) {
     uint32 code = 0;
-    for (int i = 0; i < 4; i++)
+    for (int i = 0; i < 4; ++i)
         code = code << 8 | static_cast<uint8>(letters[i]);
     return code;
 }

@@ -49,7 +49,7 @@ int32 Whole(const BMessage& settings, const char* name, int32 fallback, int32 le
 // The size with the given key, else the one with the given measures, else the present one.
 QPageSize PageSizeOf(const BMessage& settings, const QPageSize& present) {
     const QString key = QString::fromStdString(Text(settings, "page size"));
-    for (int id = 0; id <= QPageSize::LastPageSize; id++)
+    for (int id = 0; id <= QPageSize::LastPageSize; ++id)
         if (id != QPageSize::Custom && QPageSize::key(static_cast<QPageSize::PageSizeId>(id)) == key)
             return QPageSize(static_cast<QPageSize::PageSizeId>(id));
     const QSizeF size(Number(settings, "page width", 0), Number(settings, "page height", 0));

@@ -15,8 +15,7 @@ struct BPoint {
 };
 
 // A rectangle that includes its right and bottom edges: (0, 0, 15, 15) covers 16 x 16 pixels, though its
-// Width() is
-// 15. The default rectangle (0, 0, -1, -1) is invalid: it covers nothing.
+// Width() is 15. The default rectangle (0, 0, -1, -1) is invalid: it covers nothing.
 struct BRect {
     float left = 0;
     float top = 0;

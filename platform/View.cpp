@@ -219,7 +219,7 @@ BView* BView::FindView(const char* name) const {
 void BView::EnterWindow(BWindow* window) {
     window_ = window;
     AttachedToWindow();
-    for (std::size_t i = 0; i < children_.size(); i++)
+    for (std::size_t i = 0; i < children_.size(); ++i)
         children_[i]->EnterWindow(window);
     if (focusWanted_) {
         focusWanted_ = false;

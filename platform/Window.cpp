@@ -99,7 +99,7 @@ void WindowAccess::Activated(BWindow* window) {
 }
 
 void ApplicationAccess::QuitModalWindows(BApplication& application) {
-    for (int32 index = application.CountWindows() - 1; index >= 0; index--) {
+    for (int32 index = application.CountWindows() - 1; index >= 0; --index) {
         BWindow* window = application.WindowAt(index);
         if (WindowAccess::Peer(window)->modal)
             window->Quit();

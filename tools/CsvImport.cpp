@@ -53,10 +53,8 @@ std::string Replace(const COLUMN_ENTRY& column, std::string_view text, INVESTMEN
 std::string StoreText(const COLUMN_ENTRY& column, const std::string& text, INVESTMENT_DATA* data) {
     if (!IsColumn(column, RiskAt))
         return IsUtf8(text) ? Replace(column, text, data) : "is no UTF-8";
-    for (const char* risk : RiskNames)
-        if (strcmpi(std::string(WithoutBlanks(text)).c_str(), risk) == 0)
-            return Replace(column, risk, data);
-    return "is none of Low, Med and High";
+    const std::optional<std::size_t> risk = RiskIndex(WithoutBlanks(text));
+    return risk ? Replace(column, RiskNames[*risk], data) : "is none of Low, Med and High";
 }
 
 std::string StoreFigure(const COLUMN_ENTRY& column, std::string_view text, char decimal,

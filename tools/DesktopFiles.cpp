@@ -10,6 +10,7 @@
 
 #include "resources/DesktopFiles.h"
 #include "util/File.h"
+#include "util/Strings.h"
 #include "util/Utf8.h"
 
 namespace {
@@ -93,8 +94,8 @@ class Work {
         errors_ << "quorvan-cli: " << sentence << '\n';
         done_ = false;
     }
-    void FailToDo(const std::string& what, const std::string& path, const std::error_code& error) {
-        Fail(path + " cannot be " + what + ": " + error.message() + ".");
+    void FailToDo(const std::string& what, const std::string& path, int error) {
+        Fail(path + " cannot be " + what + ": " + Reason(error) + ".");
     }
     void Say(const char* fate, const std::string& path, const std::string& remark = "") {
         output_ << fate << "  " << path << (remark.empty() ? "" : ": ") << remark << '\n';
@@ -132,13 +133,12 @@ void Work::Install(const DesktopFile& file, std::string_view content) {
         return Fail(path + " is there already and is not Quorvan's; move it away and try again.");
     if (found == Found::Ours && present == content)
         return Say("kept", path);
-    std::error_code error;
-    fs::create_directories(fs::path(path).parent_path(), error);
-    if (!error)
-        error = {WriteWholeFile(path, path + ".part", content, ReadableByAll,
-                                found == Found::Ours ? ExistingFile::Replace : ExistingFile::Keep),
-                 std::generic_category()};
-    if (error)
+    std::error_code noFolder;
+    fs::create_directories(fs::path(path).parent_path(), noFolder);
+    const ExistingFile existing = found == Found::Ours ? ExistingFile::Replace : ExistingFile::Keep;
+    const int error =
+        noFolder ? noFolder.value() : WriteWholeFile(path, path + ".part", content, ReadableByAll, existing);
+    if (error != 0)
         return FailToDo("made", path, error);
     const std::string before = ValueOf(present, "TryExec");
     Say("made", path,
@@ -154,7 +154,7 @@ void Work::Remove(const DesktopFile& file) {
     if (found == Found::Nothing)
         return;
     if (const int error = RemoveFile(SystemFiles(), path); error != 0)
-        FailToDo("removed", path, {error, std::generic_category()});
+        FailToDo("removed", path, error);
     else
         Say("removed", path);
 }

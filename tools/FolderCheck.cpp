@@ -22,12 +22,6 @@ std::string Text(float number) {
     return {&buffer[0], std::to_chars(buffer, std::end(buffer), number).ptr};
 }
 
-bool IsCounted(std::string_view risk) {
-    return std::any_of(
-        RiskNames.begin(), RiskNames.end(),
-        [risk](const char* name) { return strcmpi(std::string(risk).c_str(), name) == 0; });
-}
-
 } // namespace
 
 bool FolderCheck::IsSound() const {
@@ -121,7 +115,7 @@ void FolderCheck::CheckInvestment(const INVESTMENT_DATA& record, long number) {
         Add(Kind::Problem, number,
             "Value is " + Text(value) + ", and Shares times Price " + Text(shares * price));
     }
-    if (!IsCounted(FieldText(record.Risk)))
+    if (!RiskIndex(FieldText(record.Risk)))
         Add(Kind::Problem, number,
             "Risk is " + Quoted(FieldText(record.Risk)) +
                 ", which no chart counts, and none of Low, Med and High");

@@ -8,14 +8,6 @@
 
 #include "util/Utf8.h"
 
-namespace {
-
-bool IsContinuation(char byte) {
-    return (static_cast<unsigned char>(byte) & 0xC0U) == 0x80U;
-}
-
-} // namespace
-
 std::string_view CutToBytes(std::string_view text, std::size_t maxBytes) {
     if (text.size() <= maxBytes)
         return text;

@@ -10,10 +10,6 @@ bool IsAscii(char c) {
     return static_cast<std::uint8_t>(c) < FirstNonAscii;
 }
 
-char Raised(char c) {
-    return c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c;
-}
-
 } // namespace
 
 void ReplaceCharacter(char* text, char from, char to) {

@@ -18,6 +18,11 @@ inline constexpr std::uint8_t FirstNonAscii = 128;
     return static_cast<std::uint8_t>(c + (static_cast<std::uint8_t>(c - 'A') < 26 ? 'a' - 'A' : 0));
 }
 
+// a to z in capitals, every other byte as it is.
+[[nodiscard]] constexpr char Raised(char c) {
+    return c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c;
+}
+
 // Copies `size` bytes to `lowered` in lower letters, as far as letters count as such. The copy goes on behind
 // a NUL.
 inline void CopyLowered(const std::uint8_t* text, std::size_t size, std::uint8_t* lowered) {

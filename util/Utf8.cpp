@@ -63,7 +63,7 @@ Utf8Character DecodeFirst(std::string_view text) {
         return {};
     char32_t code = byte(0) & (0xFFU >> (length + 1));
     for (std::size_t i = 1; i < length; ++i) {
-        if ((byte(i) & 0xC0U) != 0x80U)
+        if (!IsContinuation(text[i]))
             return {};
         code = code << 6U | (byte(i) & 0x3FU);
     }
@@ -117,7 +117,7 @@ std::string TruncatedLabel(std::string_view text, float width,
     std::string shown(text);
     while (!text.empty() && measure(shown) > width) {
         std::size_t cut = text.size() - 1;
-        while (cut > 0 && (static_cast<unsigned char>(text[cut]) & 0xC0U) == 0x80U)
+        while (cut > 0 && IsContinuation(text[cut]))
             --cut;
         text = text.substr(0, cut);
         shown = std::string(text) + "...";

@@ -8,6 +8,11 @@
 // Text of any bytes taken for UTF-8, and how it is shown in one line of a terminal or of a tab-separated
 // file.
 
+// Whether the byte goes on a character that began before it.
+[[nodiscard]] constexpr bool IsContinuation(char byte) {
+    return (static_cast<unsigned char>(byte) & 0xC0U) == 0x80U;
+}
+
 struct Utf8Character {
     char32_t code = 0;
     std::size_t length = 0; // in bytes; 0 when the bytes begin no valid character

@@ -1,7 +1,9 @@
 #include "app/model/RecordLayouts.h"
 
 #include <bit>
-#include <string_view>
+#include <string>
+
+#include "util/Strings.h"
 
 namespace {
 
@@ -106,6 +108,14 @@ constexpr bool AllInPlace() {
 static_assert(AllInPlace());
 
 } // namespace
+
+std::optional<std::size_t> RiskIndex(std::string_view text) {
+    const std::string wanted = Lowered(text);
+    for (std::size_t i = 0; i < RiskNames.size(); ++i)
+        if (Lowered(RiskNames[i]) == wanted)
+            return i;
+    return std::nullopt;
+}
 
 bool AreSame(const INVESTMENT_DATA& one, const INVESTMENT_DATA& other) {
     const auto bytes = [](const INVESTMENT_DATA& data) {

@@ -3,6 +3,8 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
+#include <optional>
+#include <string_view>
 
 #include "db/RecordTypes.h"
 
@@ -53,6 +55,8 @@ struct CATEGORY_DATA {
 
 // What Risk can be.
 inline constexpr std::array<const char*, 3> RiskNames = {"Low", "Med", "High"};
+// Which of them it is, in any letter case.
+[[nodiscard]] std::optional<std::size_t> RiskIndex(std::string_view text);
 
 // The columns that the files are created with, in the order of the fields and with their offsets.
 extern const std::array<COLUMN_ENTRY, 1> PortfolioColumns;

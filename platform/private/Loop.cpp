@@ -62,12 +62,12 @@ status_t WaitOnInterfaceThread(const std::function<bool()>& condition, bigtime_t
     if (timeout != B_INFINITE_TIMEOUT)
         timer.start(std::chrono::milliseconds((timeout + 999) / 1000));
     gInterfaceWaits.push_back({&condition, &loop});
-    gWaitDepth++;
+    ++gWaitDepth;
     // What is in the toolkit's queue already, a change's notice among it, may be served only behind something
     // new.
     RunOnInterfaceThread(CheckInterfaceWaits);
     loop.exec();
-    gWaitDepth--;
+    --gWaitDepth;
     gInterfaceWaits.pop_back();
     return holds() ? B_OK : B_TIMED_OUT;
 }
@@ -166,9 +166,9 @@ int RunDialog(QDialog& dialog, const std::function<bool()>& cancelled) {
     const QPointer<QWidget> before = WindowBelow();
     PlaceDialog(dialog, before);
     gOpenDialogs.push_back(&dialog);
-    gWaitDepth++;
+    ++gWaitDepth;
     const int result = dialog.exec();
-    gWaitDepth--;
+    --gWaitDepth;
     gOpenDialogs.pop_back();
     if (before)
         before->activateWindow();

@@ -15,7 +15,7 @@ using Letters = QSet<QChar>;
 // -1 when every letter is taken. The letter is taken.
 qsizetype TakeLetter(const QString& label, Letters& taken) {
     for (const bool wordsOnly : {true, false}) {
-        for (qsizetype at = 0; at < label.size(); at++) {
+        for (qsizetype at = 0; at < label.size(); ++at) {
             const QChar letter = label[at].toLower();
             const bool begins = at == 0 || !label[at - 1].isLetterOrNumber();
             if (!letter.isLetterOrNumber() || (wordsOnly && !begins) || taken.contains(letter))

@@ -61,7 +61,7 @@ bool OutputFile::Begin(const std::string& path) {
 bool OutputFile::MakeTemporary(const std::string& folderAndStem, const std::string& extension) {
     constexpr int attempts = 100;
     const std::string begin = folderAndStem + "." + std::to_string(getpid());
-    for (int i = 0; i < attempts; i++) {
+    for (int i = 0; i < attempts; ++i) {
         std::string name = begin;
         name.append("-").append(std::to_string(i)).append(extension);
         const int file = open(name.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666);

@@ -88,7 +88,7 @@ QWidget* WindowBelow() {
         return dialog;
     if (QWidget* active = QApplication::activeWindow())
         return active;
-    for (int32 index = be_app->CountWindows() - 1; index >= 0; index--)
+    for (int32 index = be_app->CountWindows() - 1; index >= 0; --index)
         if (QWidget* window = WindowAccess::Widget(be_app->WindowAt(index)); window->isVisible())
             return window;
     return nullptr;

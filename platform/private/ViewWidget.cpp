@@ -146,7 +146,7 @@ void DrawTree(BView* view, QPainter& painter, const BRect& part) {
         const PaintPass pass(view, &painter);
         view->Draw(part);
     }
-    for (int32 index = 0; BView* child = view->ChildAt(index); index++) {
+    for (int32 index = 0; BView* child = view->ChildAt(index); ++index) {
         const BPoint shift = child->Frame().LeftTop() - child->Bounds().LeftTop();
         BRect inner = part & child->Frame();
         if (child->IsHidden() || !inner.IsValid())

@@ -49,14 +49,11 @@ UpdateWindow::~UpdateWindow() {
 }
 
 void UpdateWindow::AddStatusBar(float maximum) {
-    auto* topView = new BView(Bounds(), "top view", B_FOLLOW_ALL_SIDES, B_WILL_DRAW);
-    topView->SetViewColor(colors::gray);
-    AddChild(topView);
     BRect frame = Bounds();
     frame.InsetBy(Margin, Margin);
     statusBar_ = new BStatusBar(frame, "Status Bar", "Checking:");
     statusBar_->SetMaxValue(maximum);
-    topView->AddChild(statusBar_);
+    AddTopView(*this)->AddChild(statusBar_);
 }
 
 void UpdateWindow::StartWorker() {

@@ -20,13 +20,12 @@ template <class AnswerAt>
 std::string Runs(float begin, float end, float step, const AnswerAt& answerAt) {
     std::ostringstream runs;
     std::string last;
-    for (int i = 0; begin + step * static_cast<float>(i) < end; ++i) {
-        const float x = begin + step * static_cast<float>(i);
-        if (const std::string answer = answerAt(x); answer != last) {
-            runs << x << answer << " ";
+    const auto place = [&](int i) { return begin + step * static_cast<float>(i); };
+    for (int i = 0; place(i) < end; ++i)
+        if (const std::string answer = answerAt(place(i)); answer != last) {
+            runs << place(i) << answer << " ";
             last = answer;
         }
-    }
     return runs.str();
 }
 

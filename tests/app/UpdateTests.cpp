@@ -209,9 +209,7 @@ TEST_F(PriceUpdate, EndsWithAnAlertWhenNobodyCanBeAsked) {
                 std::filesystem::remove(File("Quorvan.cfg"));
         });
         Update().Answer(each.alert);
-        UntilDone().Then([&] {
-            EXPECT_NE(Read("Quorvan.log").find(each.logged), std::string::npos) << Read("Quorvan.log");
-        });
+        UntilDone().Then([&] { EXPECT_NE(Read("Quorvan.log").find(each.logged), std::string::npos); });
     }
     RunAndClose();
     ExpectUntouched(0, "RISE");

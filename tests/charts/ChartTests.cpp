@@ -52,12 +52,11 @@ class Chart : public testing::Test {
     };
     static void Follow(BView& view, const std::string& title, const std::vector<Step>& steps) {
         const std::string atRest = view.AccessibleDescription();
-        const std::string begin = title + ": ";
         for (const auto& [place, key, told] : steps) {
             EXPECT_TRUE(!key || view.KeyDown(key)) << told;
             if (!key)
                 view.MouseMoved(place, B_INSIDE_VIEW);
-            EXPECT_EQ(view.AccessibleDescription(), told.empty() ? atRest : begin + told);
+            EXPECT_EQ(view.AccessibleDescription(), told.empty() ? atRest : (title + ": ").append(told));
             const Written note = TextsIn(view.Name()).back();
             const BPoint beside(static_cast<float>(note.box.left()) - 2, static_cast<float>(note.box.top()));
             EXPECT_TRUE(told.empty() || (note.text == told && note.size >= be_plain_font->Size() &&

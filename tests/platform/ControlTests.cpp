@@ -72,8 +72,8 @@ std::pair<double, double> Luminances(const QWidget* widget) {
     const QImage shown =
         widget->window()->grab(QRect(place, widget->size()).adjusted(frame, frame, -frame, -frame)).toImage();
     std::set<double> luminances;
-    for (int y = 0; y < shown.height(); y++)
-        for (int x = 0; x < shown.width(); x++)
+    for (int y = 0; y < shown.height(); ++y)
+        for (int x = 0; x < shown.width(); ++x)
             luminances.insert(std::pow(qGray(shown.pixel(x, y)) / 255.0, 2.2));
     return {*luminances.begin(), *luminances.rbegin()};
 }
@@ -168,7 +168,7 @@ TEST_F(Controls, StatusBarsShowWhatAWorkerTellsThem) {
     bar->SetMaxValue(4);
     Show();
     const Worker worker([&] {
-        for (int step = 0; step < 3; step++) {
+        for (int step = 0; step < 3; ++step) {
             window->Lock();
             bar->Update(1);
             bar->SetText((" T" + std::to_string(step)).c_str());
@@ -295,7 +295,7 @@ TEST_F(Controls, MenuFieldsAreOpenedAndChosenFromByKeyAndPointer) {
     EXPECT_EQ(Received(1), Codes{1}); // choosing the marked one again
 
     // Many long items stay on the screen, in one column.
-    for (int number = 0; number < 200; number++)
+    for (int number = 0; number < 200; ++number)
         menu->AddItem(new BMenuItem((std::string(28, 'W') + std::to_string(number)).c_str(), nullptr));
     menu->ItemAt(150)->SetMarked(true);
     QTest::keyClick(button, Qt::Key_Down);

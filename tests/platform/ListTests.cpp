@@ -58,7 +58,7 @@ struct ListStage : Stage {
     explicit ListStage(int32 count, list_view_type type = B_MULTIPLE_SELECTION_LIST) : list(new List(type)) {
         Add(new BScrollView("scroll", list, B_FOLLOW_LEFT | B_FOLLOW_TOP, 0, true, true, B_NO_BORDER));
         BList added;
-        for (int32 number = 0; number < count; number++)
+        for (int32 number = 0; number < count; ++number)
             added.AddItem(static_cast<BListItem*>(&rows.emplace_back(number)));
         EXPECT_TRUE(list->AddList(&added));
         list->MakeFocus();
@@ -79,7 +79,7 @@ struct ListStage : Stage {
     static void Key(Qt::Key key, Qt::KeyboardModifiers keys = {}) { QTest::keyClick(Widget(), key, keys); }
     std::vector<int32> Selected() const {
         std::vector<int32> found;
-        for (int32 at = 0; list->CurrentSelection(at) >= 0; at++)
+        for (int32 at = 0; list->CurrentSelection(at) >= 0; ++at)
             found.push_back(list->CurrentSelection(at));
         return found;
     }

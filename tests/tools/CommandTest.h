@@ -14,8 +14,7 @@ class CommandTest : public testing::Test {
         unsetenv("DISPLAY");
         unsetenv("XDG_RUNTIME_DIR");
         setenv("XDG_DATA_HOME", folder_.File("data").c_str(), 1);
-        const char* path = getenv("PATH");
-        setenv("PATH", (QUORVAN_CLI_FOLDER ":" + std::string(path ? path : "")).c_str(), 1);
+        setenv("PATH", std::string(QUORVAN_CLI_FOLDER ":").append(getenv("PATH")).c_str(), 1);
         folder_.Write("built", "#!/bin/sh\necho \"$#\" >\"$(dirname \"$0\")/started\"\n");
     }
 

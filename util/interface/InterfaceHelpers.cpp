@@ -56,6 +56,13 @@ bool GetHomeDir(char (&out)[PathBufferSize]) {
     return fits;
 }
 
+BView* AddTopView(BWindow& window) {
+    auto* view = new BView(window.Bounds(), "top view", B_FOLLOW_ALL_SIDES, B_WILL_DRAW);
+    view->SetViewColor(colors::gray);
+    window.AddChild(view);
+    return view;
+}
+
 void GetScreenCenter(BPoint* out) {
     const BRect screen = BScreen().Frame();
     GetBRectCenter(&screen, out);

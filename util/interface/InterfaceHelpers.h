@@ -63,6 +63,9 @@ void TellNotTrusted(const char* host);
 // empty string is the answer, with true.) Any thread.
 [[nodiscard]] bool GetHomeDir(char (&out)[PathBufferSize]);
 
+// Fills the window with a grey view, for its controls, which the window owns.
+BView* AddTopView(BWindow& window);
+
 // The centre of the main screen.
 void GetScreenCenter(BPoint* out);
 
