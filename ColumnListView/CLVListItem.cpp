@@ -59,6 +59,6 @@ void CLVListItem::Update(BView* owner, const BFont* font) {
 char* ToUpperStr(const char* text) {
     const std::size_t size = std::strlen(text) + 1;
     char* copy = new char[size];
-    std::transform(text, text + size, copy, Raised);
+    std::transform(text, text + size, copy, [](char c) { return Raised(c); });
     return copy;
 }
