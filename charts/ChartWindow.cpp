@@ -95,7 +95,7 @@ ChartWindow::ChartWindow(float left, float top, const char* portfolio)
     valueView_ = new ValueChartView(chart, currentValue_);
     valueView_->Hide();
     topView_->AddChild(valueView_);
-    SetAccessibleName((std::string("Quorvan, charts of ") + portfolio).c_str());
+    SetAccessibleName((std::string(WindowTitle) + ", charts of " + portfolio).c_str());
     for (BView* view : {static_cast<BView*>(pieView_), static_cast<BView*>(valueView_)})
         NameChart(*view, portfolio);
     Show();

@@ -13,8 +13,6 @@
 
 namespace {
 
-constexpr const char* JobName = "Quorvan";
-
 // Attaches the hidden view to the window, if there is one, while it lives.
 class HiddenPage {
   public:
@@ -111,7 +109,7 @@ BMessage FirstPrintSettings() {
 
 ReportResult RunReportJob(BWindow* window, const char* portfolio, DATABASE& investments,
                           std::unique_ptr<BMessage>& settings) {
-    BPrintJob job(JobName);
+    BPrintJob job(ReportJobName);
     job.ProposeFile(portfolio);
     if (!ConfigureJob(job, settings))
         return ReportResult::Cancelled;

@@ -17,6 +17,9 @@ enum class ReportResult {
     NotRead,    // the investments could not all be read
 };
 
+// What the desktop's list of jobs calls it.
+inline constexpr const char* ReportJobName = "Quorvan";
+
 // Prints the portfolio's report, exactly one page, on a job that is set up and not begun. The page's view is
 // attached to window meanwhile; null for none. Unless the result is Printed, nothing was. The investment
 // file's result set is left on the portfolio.

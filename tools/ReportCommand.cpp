@@ -26,7 +26,7 @@ ReportResult WriteReport(const ReportOptions& options, DATABASE& investments, in
     settings.AddString("output file", options.output.c_str());
     settings.AddString("page size", options.page.c_str());
     settings.AddBool("landscape", options.landscape);
-    BPrintJob job("Quorvan");
+    BPrintJob job(ReportJobName);
     job.SetSettings(&settings);
     const ReportResult result = PrintReport(job, nullptr, options.portfolio.c_str(), investments);
     error = errno;

@@ -10,6 +10,7 @@
 #include <unistd.h>
 
 #include "util/CharacterBuffer.h"
+#include "util/Utf8.h"
 
 namespace {
 
@@ -45,10 +46,8 @@ std::string LocalTime() {
 
 // Anybody may have written the file: what is shown of it is short and in one line.
 std::string Shown(std::string_view field) {
-    std::string text(CutToBytes(field, MostField));
-    for (char& letter : text)
-        if (static_cast<unsigned char>(letter) < ' ' || letter == '\x7f')
-            letter = '?';
+    std::string text;
+    AppendEscaped(text, CutToBytes(field, MostField));
     return text;
 }
 

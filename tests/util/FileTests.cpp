@@ -218,7 +218,7 @@ TEST_F(FolderLockTest, DescribesItsHolderInOneLine) {
     EXPECT_EQ(DescribeHolder({}), "another program");
     folder_.Write(LockName, "program: " + std::string(500, 'x') + "\nhost: a\rb\nprocess: 5\n");
     ASSERT_EQ(Take(), Outcome::Doubtful);
-    EXPECT_EQ(DescribeHolder(lock_.Holder()), std::string(100, 'x') + " (process 5 on the computer a?b)");
+    EXPECT_EQ(DescribeHolder(lock_.Holder()), std::string(100, 'x') + " (process 5 on the computer a\\rb)");
 }
 
 TEST_F(FolderLockTest, FailsWhereItsFileCannotBe) {
